@@ -1,0 +1,31 @@
+# Everything that kvt needs from outside. Nothing is fetched: each package is found on the machine, and where it is
+# not, the message says which Debian or Ubuntu package brings it.
+
+# kvt_find(NAME what INSTALL package PACKAGE arguments-of-find_package...)
+macro(kvt_find)
+    cmake_parse_arguments(KVT_FIND "" "NAME;INSTALL" "PACKAGE" ${ARGN})
+    find_package(${KVT_FIND_PACKAGE} QUIET)
+    list(GET KVT_FIND_PACKAGE 0 KVT_FIND_ID)
+    if(NOT ${KVT_FIND_ID}_FOUND)
+        message(FATAL_ERROR
+            "kvt needs ${KVT_FIND_NAME}, which was not found.\n"
+            "On Debian or Ubuntu: apt-get install ${KVT_FIND_INSTALL}\n"
+            "or './dev setup', which installs everything that is missing.")
+    endif()
+endmacro()
+
+kvt_find(NAME "POSIX threads" INSTALL "libc6-dev" PACKAGE Threads)
+kvt_find(NAME "ICU 58 or later (its uc library)" INSTALL "libicu-dev" PACKAGE ICU 58 COMPONENTS uc)
+kvt_find(NAME "the Boost headers, 1.74 or later" INSTALL "libboost1.81-dev (or libboost-dev)" PACKAGE Boost 1.74)
+kvt_find(NAME "double-conversion" INSTALL "libdouble-conversion-dev" PACKAGE double-conversion CONFIG)
+
+if(KVT_BUILD_TOOLS)
+    kvt_find(NAME "CLI11, for the kvt command" INSTALL "libcli11-dev" PACKAGE CLI11 CONFIG)
+    kvt_find(NAME "nlohmann-json, for the kvt command" INSTALL "nlohmann-json3-dev" PACKAGE nlohmann_json CONFIG)
+endif()
+if(KVT_BUILD_TESTS)
+    kvt_find(NAME "GoogleTest, for the tests" INSTALL "libgtest-dev" PACKAGE GTest CONFIG)
+endif()
+if(KVT_BUILD_BENCH)
+    kvt_find(NAME "Google Benchmark, for the benchmarks" INSTALL "libbenchmark-dev" PACKAGE benchmark CONFIG)
+endif()

@@ -1,0 +1,44 @@
+# What `cmake --install` lays down: the shared library, the public headers as a file set, a package config for
+# find_package(kvt CONFIG) and kvt.pc. All of it can be moved to another prefix as a whole.
+
+include(CMakePackageConfigHelpers)
+
+set(KVT_INSTALL_CMAKEDIR "${CMAKE_INSTALL_LIBDIR}/cmake/kvt")
+
+install(TARGETS kvt
+    EXPORT kvtTargets
+    LIBRARY DESTINATION "${CMAKE_INSTALL_LIBDIR}"
+    FILE_SET HEADERS DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}")
+install(EXPORT kvtTargets NAMESPACE kvt:: DESTINATION "${KVT_INSTALL_CMAKEDIR}")
+
+# The command finds the library of its own prefix, wherever that has been moved to.
+if(TARGET kvt_tool AND NOT IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" AND NOT IS_ABSOLUTE "${CMAKE_INSTALL_BINDIR}")
+    file(RELATIVE_PATH KVT_LIBDIR_FROM_BINDIR "/prefix/${CMAKE_INSTALL_BINDIR}" "/prefix/${CMAKE_INSTALL_LIBDIR}")
+    set_target_properties(kvt_tool PROPERTIES INSTALL_RPATH "$ORIGIN/${KVT_LIBDIR_FROM_BINDIR}")
+endif()
+
+configure_package_config_file(
+    "${PROJECT_SOURCE_DIR}/cmake/kvtConfig.cmake.in" "${PROJECT_BINARY_DIR}/kvtConfig.cmake"
+    INSTALL_DESTINATION "${KVT_INSTALL_CMAKEDIR}")
+write_basic_package_version_file("${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake" COMPATIBILITY SameMinorVersion)
+install(FILES "${PROJECT_BINARY_DIR}/kvtConfig.cmake" "${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake"
+    DESTINATION "${KVT_INSTALL_CMAKEDIR}")
+
+# kvt.pc finds its prefix from its own place, so that `cmake --install --prefix` and later moves keep it right;
+# only a library folder given as an absolute path nails it down.
+if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}")
+    set(KVT_PC_PREFIX "${CMAKE_INSTALL_PREFIX}")
+    set(KVT_PC_LIBDIR "${CMAKE_INSTALL_LIBDIR}")
+else()
+    file(RELATIVE_PATH KVT_PC_UP "/prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig" "/prefix")
+    string(REGEX REPLACE "/$" "" KVT_PC_UP "${KVT_PC_UP}")
+    set(KVT_PC_PREFIX "\${pcfiledir}/${KVT_PC_UP}")
+    set(KVT_PC_LIBDIR "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
+endif()
+if(IS_ABSOLUTE "${CMAKE_INSTALL_INCLUDEDIR}")
+    set(KVT_PC_INCLUDEDIR "${CMAKE_INSTALL_INCLUDEDIR}")
+else()
+    set(KVT_PC_INCLUDEDIR "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}")
+endif()
+configure_file("${PROJECT_SOURCE_DIR}/cmake/kvt.pc.in" "${PROJECT_BINARY_DIR}/kvt.pc" @ONLY)
+install(FILES "${PROJECT_BINARY_DIR}/kvt.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")

@@ -1,0 +1,58 @@
+# The library's targets, and the two functions with which each folder of kvt/ names what it brings.
+#
+#   kvt_objects   every source, compiled once
+#   kvt           the shared library, alias kvt::kvt; exports what is marked KVT_EXPORT, and nothing else
+#   kvt_static    the same objects with the private parts within reach; for tests, never installed
+#
+# The public headers are known to CMake as a file set of kvt, and to the header tests as the global property
+# KVT_PUBLIC_HEADERS (paths from the include root, such as kvt/string/ustring.h).
+
+add_library(kvt_objects OBJECT)
+target_compile_features(kvt_objects PUBLIC cxx_std_20)
+target_include_directories(kvt_objects PUBLIC "${PROJECT_SOURCE_DIR}")
+target_link_libraries(kvt_objects PRIVATE ICU::uc Boost::headers double-conversion::double-conversion Threads::Threads)
+set_target_properties(kvt_objects PROPERTIES
+    POSITION_INDEPENDENT_CODE ON
+    CXX_VISIBILITY_PRESET hidden
+    VISIBILITY_INLINES_HIDDEN ON)
+kvt_warnings(kvt_objects)
+
+add_library(kvt SHARED)
+add_library(kvt::kvt ALIAS kvt)
+add_library(kvt_static STATIC)
+set_target_properties(kvt PROPERTIES
+    VERSION ${PROJECT_VERSION}
+    SOVERSION ${PROJECT_VERSION_MAJOR}
+    LINK_DEPENDS "${PROJECT_SOURCE_DIR}/cmake/kvt.map")
+target_link_options(kvt PRIVATE
+    "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map"
+    $<$<NOT:$<BOOL:${KVT_SANITIZE}>>:LINKER:--no-undefined>)
+
+# Names the sources of one folder, relative to it.
+function(kvt_sources)
+    list(TRANSFORM ARGN PREPEND "${CMAKE_CURRENT_SOURCE_DIR}/")
+    target_sources(kvt_objects PRIVATE ${ARGN})
+endfunction()
+
+# Names the public headers of one folder, relative to it.
+function(kvt_public_headers)
+    list(TRANSFORM ARGN PREPEND "${CMAKE_CURRENT_SOURCE_DIR}/")
+    target_sources(kvt PUBLIC FILE_SET HEADERS BASE_DIRS "${PROJECT_SOURCE_DIR}" FILES ${ARGN})
+    foreach(header IN LISTS ARGN)
+        file(RELATIVE_PATH name "${PROJECT_SOURCE_DIR}" "${header}")
+        set_property(GLOBAL APPEND PROPERTY KVT_PUBLIC_HEADERS "${name}")
+    endforeach()
+endfunction()
+
+# Makes both libraries from the objects; called once, after all folders have named their sources.
+function(kvt_finish_library)
+    foreach(library IN ITEMS kvt kvt_static)
+        target_sources(${library} PRIVATE $<TARGET_OBJECTS:kvt_objects>)
+        target_link_libraries(${library} PRIVATE
+            ICU::uc double-conversion::double-conversion Threads::Threads)
+        set_target_properties(${library} PROPERTIES LINKER_LANGUAGE CXX)
+    endforeach()
+    target_compile_features(kvt INTERFACE cxx_std_17)
+    target_compile_features(kvt_static INTERFACE cxx_std_20)
+    target_include_directories(kvt_static INTERFACE "${PROJECT_SOURCE_DIR}")
+endfunction()

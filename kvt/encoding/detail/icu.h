@@ -1,0 +1,94 @@
+// ICU's converters as this library uses them. icu.cpp behind this header is the only source of the folder that
+// includes ICU; no header does.
+#pragma once
+
+#include <kvt/encoding/detail/shortcut.h>
+#include <kvt/encoding/encoding.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <string_view>
+
+struct UConverter;
+
+namespace kvt::ex::detail::icu {
+
+/// The canonical name behind any name that ICU knows: the MIME name, else the IANA name, else ICU's own. Empty when
+/// ICU cannot open the name.
+std::string standardName(const char* name);
+
+/// ICU's name of an error code, as "U_ILLEGAL_ARGUMENT_ERROR".
+std::string_view errorName(int error);
+
+/// Is told of what a converter cannot convert, before the converter writes its substitution. The calls come from
+/// within ICU and must not throw.
+class LossListener {
+public:
+    /// Bytes that are no text. `behind` is the place in the converter's input behind them, `error` ICU's code.
+    virtual void onBadInput(std::string_view bytes, const char* behind, int error) noexcept = 0;
+    /// A character without a form in the converter's encoding; `behind` as above.
+    virtual void onNotRepresentable(char32_t codePoint, const char16_t* behind, int error) noexcept = 0;
+
+protected:
+    ~LossListener() = default;
+};
+
+/// How a step of a conversion ended.
+struct Progress {
+    enum End { inputTaken, outputFull, failed };
+    End end;
+    int error; ///< ICU's code when `end` is `failed`
+};
+
+/// Owns one ICU converter. What cannot be converted is replaced by U+FFFD in the Unicode forms and by "?" in all
+/// other encodings.
+class Converter {
+public:
+    /// No converter.
+    Converter() noexcept = default;
+    /// Opens the converter of `encoding`, if ICU can.
+    explicit Converter(Encoding encoding);
+
+    bool isOpen() const noexcept { return converter_ != nullptr; }
+    /// Sends losses to `listener`, which must outlive the converter or the next call.
+    void setListener(LossListener& listener);
+    void reset();
+
+    /// The bytes of the longest character.
+    int maxCharSize() const;
+    /// The bytes that stand for a lost character; empty when ICU does not tell.
+    std::string substitution() const;
+    /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
+    Form form();
+
+    /// Whether the converter holds input of which it has not given the output yet.
+    bool holdsBytes() const;
+    bool holdsUnits() const;
+    /// Bytes held as the beginning of a character.
+    std::size_t heldBytes() const;
+
+    /// From bytes to UTF-16. `source` and `target` are moved on; `offsets` gets, for each unit, the place in
+    /// `source` of the character it comes from, -1 when that began in an earlier call.
+    Progress toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
+                       std::int32_t* offsets, bool flush);
+    /// From UTF-16 to bytes.
+    Progress fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target, const char* targetEnd,
+                         bool flush);
+
+    /// From bytes of `from` to bytes of `to`, by way of a pivot that carries text from call to call.
+    static Progress convert(Converter& to, Converter& from, char*& target, const char* targetEnd, const char*& source,
+                            const char* sourceEnd, char16_t* pivot, char16_t*& pivotSource, char16_t*& pivotTarget,
+                            const char16_t* pivotEnd, bool reset, bool flush);
+
+private:
+    struct Close {
+        void operator()(UConverter* converter) const noexcept;
+    };
+
+    std::unique_ptr<UConverter, Close> converter_;
+    Encoding encoding_ = Encoding::Unknown;
+};
+
+} // namespace kvt::ex::detail::icu

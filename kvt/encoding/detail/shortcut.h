@@ -1,0 +1,40 @@
+// Conversion without ICU, where a shorter way gives the same bytes and the same failures.
+//
+// This is the one place that decides. The caller converts a prefix here and gives ICU the rest:
+//
+// - between two Unicode forms, as far as the input is well-formed and complete;
+// - between any two encodings that keep ASCII as it is, as far as the input is ASCII.
+//
+// What is taken here is text that converts without any loss, so nothing has to be reported, and it ends at a
+// character boundary in the initial state of both converters, so ICU can go on from there.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace kvt::ex::detail {
+
+/// How the bytes of an encoding can be read and written without ICU.
+enum class Form : std::uint8_t {
+    other,           ///< only by ICU
+    asciiCompatible, ///< stateless, and bytes below 128 are the ASCII characters, alone and between others
+    utf8,
+    utf16le,
+    utf16be,
+    utf32le,
+    utf32be,
+};
+
+/// Converts the longest prefix of the bytes `in` that needs no ICU, appends it to `out`, and returns the bytes taken
+/// from `in`; 0 when there is no shorter way between the two forms. The two forms belong to different encodings.
+/// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted.
+template <typename CharOut>
+std::size_t convertPrefix(Form from, Form to, std::string_view in, std::basic_string<CharOut>& out);
+
+extern template std::size_t convertPrefix<char>(Form, Form, std::string_view, std::basic_string<char>&);
+extern template std::size_t convertPrefix<char16_t>(Form, Form, std::string_view, std::basic_string<char16_t>&);
+extern template std::size_t convertPrefix<char32_t>(Form, Form, std::string_view, std::basic_string<char32_t>&);
+
+} // namespace kvt::ex::detail

@@ -1,0 +1,201 @@
+// The one place where ICU's converters are opened and called.
+#include <kvt/encoding/detail/icu.h>
+
+#include <unicode/ucnv.h>
+#include <unicode/ucnv_cb.h>
+#include <unicode/ucnv_err.h>
+#include <unicode/utypes.h>
+
+#include <array>
+
+namespace kvt::ex::detail::icu {
+namespace {
+
+bool isUnicodeForm(Encoding encoding) {
+    const std::uint32_t id = encoding.evaluate();
+    return id == Encoding::Utf8 || (id >= Encoding::Utf16LE && id <= Encoding::Utf32BE);
+}
+
+// Reset, close and clone reach the callbacks too, and are no losses.
+bool isLoss(UConverterCallbackReason reason) {
+    return reason == UCNV_UNASSIGNED || reason == UCNV_ILLEGAL || reason == UCNV_IRREGULAR;
+}
+
+void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, const char* bytes, std::int32_t length,
+                       UConverterCallbackReason reason, UErrorCode* error) {
+    if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
+        auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
+        listener->onBadInput({bytes, static_cast<std::size_t>(length)}, arguments->source, *error);
+    }
+    UCNV_TO_U_CALLBACK_SUBSTITUTE(nullptr, arguments, bytes, length, reason, error);
+}
+
+void fromUnicodeCallback(const void* context, UConverterFromUnicodeArgs* arguments, const char16_t* units,
+                         std::int32_t length, UChar32 codePoint, UConverterCallbackReason reason, UErrorCode* error) {
+    if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
+        auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
+        listener->onNotRepresentable(static_cast<char32_t>(codePoint), arguments->source, *error);
+    }
+    UCNV_FROM_U_CALLBACK_SUBSTITUTE(nullptr, arguments, units, length, codePoint, reason, error);
+}
+
+Progress progressOf(UErrorCode error) {
+    if (error == U_BUFFER_OVERFLOW_ERROR) {
+        return {Progress::outputFull, error};
+    }
+    return {U_SUCCESS(error) ? Progress::inputTaken : Progress::failed, error};
+}
+
+// Whether the converter reads and writes each of the 128 ASCII characters as its own byte. That holds between any
+// other characters too, as only stateless kinds of converters are asked.
+bool keepsAscii(UConverter* converter) {
+    switch (ucnv_getType(converter)) {
+    case UCNV_SBCS:
+    case UCNV_DBCS:
+    case UCNV_MBCS:
+    case UCNV_LATIN_1:
+    case UCNV_US_ASCII:
+    case UCNV_CESU8:
+        break;
+    default:
+        return false;
+    }
+    std::array<char, 128> bytes;
+    std::array<char16_t, 128> units;
+    for (std::size_t i = 0; i < bytes.size(); ++i) {
+        bytes[i] = static_cast<char>(i);
+        units[i] = static_cast<char16_t>(i);
+    }
+    constexpr auto count = static_cast<std::int32_t>(units.size());
+    // One more than expected, so that a longer result shows.
+    std::array<char16_t, 129> decoded{};
+    std::array<char, 129> encoded{};
+    UErrorCode error = U_ZERO_ERROR;
+    const std::int32_t decodedCount =
+        ucnv_toUChars(converter, decoded.data(), count + 1, bytes.data(), count, &error);
+    const std::int32_t encodedCount =
+        ucnv_fromUChars(converter, encoded.data(), count + 1, units.data(), count, &error);
+    return U_SUCCESS(error) && decodedCount == count && encodedCount == count &&
+           std::equal(units.begin(), units.end(), decoded.begin()) &&
+           std::equal(bytes.begin(), bytes.end(), encoded.begin());
+}
+
+} // namespace
+
+std::string standardName(const char* name) {
+    UErrorCode error = U_ZERO_ERROR;
+    const std::unique_ptr<UConverter, decltype(&ucnv_close)> converter(ucnv_open(name, &error), &ucnv_close);
+    if (converter == nullptr) {
+        return {};
+    }
+    error = U_ZERO_ERROR;
+    const char* const canonical = ucnv_getName(converter.get(), &error);
+    for (const char* const standard : {"MIME", "IANA"}) {
+        error = U_ZERO_ERROR;
+        const char* const standardised = ucnv_getStandardName(canonical, standard, &error);
+        if (standardised != nullptr) {
+            return standardised;
+        }
+    }
+    return canonical;
+}
+
+std::string_view errorName(int error) {
+    return u_errorName(static_cast<UErrorCode>(error));
+}
+
+void Converter::Close::operator()(UConverter* converter) const noexcept {
+    ucnv_close(converter);
+}
+
+Converter::Converter(Encoding encoding) : encoding_(encoding) {
+    UErrorCode error = U_ZERO_ERROR;
+    converter_.reset(ucnv_open(encoding.getName().data(), &error));
+    // Compound text is left with ICU's own substitution: once another is set, ucnv_close frees what is not its own.
+    if (converter_ == nullptr || isUnicodeForm(encoding) || ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {
+        return;
+    }
+    // Where ICU refuses, its own substitution stays.
+    error = U_ZERO_ERROR;
+    ucnv_setSubstString(converter_.get(), u"?", 1, &error);
+}
+
+void Converter::setListener(LossListener& listener) {
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_setFromUCallBack(converter_.get(), &fromUnicodeCallback, &listener, nullptr, nullptr, &error);
+    error = U_ZERO_ERROR;
+    ucnv_setToUCallBack(converter_.get(), &toUnicodeCallback, &listener, nullptr, nullptr, &error);
+}
+
+void Converter::reset() {
+    ucnv_reset(converter_.get());
+}
+
+int Converter::maxCharSize() const {
+    return ucnv_getMaxCharSize(converter_.get());
+}
+
+std::string Converter::substitution() const {
+    std::array<char, 20> bytes;
+    auto length = static_cast<std::int8_t>(bytes.size());
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_getSubstChars(converter_.get(), bytes.data(), &length, &error);
+    return U_SUCCESS(error) ? std::string(bytes.data(), static_cast<std::size_t>(length)) : std::string();
+}
+
+Form Converter::form() {
+    switch (encoding_.evaluate()) {
+    case Encoding::Utf8:
+        return Form::utf8;
+    case Encoding::Utf16LE:
+        return Form::utf16le;
+    case Encoding::Utf16BE:
+        return Form::utf16be;
+    case Encoding::Utf32LE:
+        return Form::utf32le;
+    case Encoding::Utf32BE:
+        return Form::utf32be;
+    default:
+        return isOpen() && keepsAscii(converter_.get()) ? Form::asciiCompatible : Form::other;
+    }
+}
+
+std::size_t Converter::heldBytes() const {
+    UErrorCode error = U_ZERO_ERROR;
+    const std::int32_t held = ucnv_toUCountPending(converter_.get(), &error);
+    return U_SUCCESS(error) && held > 0 ? static_cast<std::size_t>(held) : 0;
+}
+
+bool Converter::holdsBytes() const {
+    return heldBytes() != 0;
+}
+
+bool Converter::holdsUnits() const {
+    UErrorCode error = U_ZERO_ERROR;
+    return ucnv_fromUCountPending(converter_.get(), &error) != 0;
+}
+
+Progress Converter::toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
+                              std::int32_t* offsets, bool flush) {
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_toUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, offsets, flush ? 1 : 0, &error);
+    return progressOf(error);
+}
+
+Progress Converter::fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target,
+                                const char* targetEnd, bool flush) {
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_fromUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, nullptr, flush ? 1 : 0, &error);
+    return progressOf(error);
+}
+
+Progress Converter::convert(Converter& to, Converter& from, char*& target, const char* targetEnd, const char*& source,
+                            const char* sourceEnd, char16_t* pivot, char16_t*& pivotSource, char16_t*& pivotTarget,
+                            const char16_t* pivotEnd, bool reset, bool flush) {
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_convertEx(to.converter_.get(), from.converter_.get(), &target, targetEnd, &source, sourceEnd, pivot,
+                   &pivotSource, &pivotTarget, pivotEnd, reset ? 1 : 0, flush ? 1 : 0, &error);
+    return progressOf(error);
+}
+
+} // namespace kvt::ex::detail::icu

@@ -1,0 +1,102 @@
+// The conversion rules for encodings known at run time.
+#include <kvt/string/detail/convert_chars.h>
+
+#include <kvt/codec/wwjd.h>
+#include <kvt/encoding/icu_transcoder.h>
+#include <kvt/foundation/throwable.h>
+#include <kvt/string/detail/ascii_check.h>
+#include <kvt/string/ustring.h>
+
+#include <cstring>
+
+namespace kvt::ex::detail {
+
+template <typename CharOut>
+void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
+    if constexpr (sizeof(CharOut) == 1) {
+        out.assign(bytes);
+    } else {
+        // The bytes may be those of `out`, which then keeps its size.
+        out.resize(bytes.size() / sizeof(CharOut));
+        std::memmove(out.data(), bytes.data(), out.size() * sizeof(CharOut));
+    }
+}
+
+template <typename CharOut>
+void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    ICUTranscoder(from, to).transcode(bytes, out);
+}
+
+template <typename CharOut>
+void fromAscii(Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    if (to.supports7BitASCII()) {
+        copyBytes(bytes, out);
+    } else {
+        transcodeBytes(Encoding::UsAscii, to, bytes, out);
+    }
+}
+
+template <typename CharOut>
+void toAsciiChecked(Encoding from, std::string_view bytes, std::basic_string<CharOut>& out) {
+    if constexpr (sizeof(CharOut) == 1) {
+        if (from == Encoding(Encoding::Utf8)) {
+            utf8ToAscii(bytes, out);
+            return;
+        }
+        if (from.supports7BitASCII() && from.isSingleByte()) {
+            singleByteToAscii(from, bytes, out);
+            return;
+        }
+    }
+    transcodeBytes(from, Encoding::UsAscii, bytes, out);
+}
+
+template <typename CharOut>
+void fromUtf16(Encoding to, std::u16string_view units, std::basic_string<CharOut>& out) {
+    transcodeBytes(Encoding::Utf16LE, to,
+                   {reinterpret_cast<const char*>(units.data()), units.size() * sizeof(char16_t)}, out);
+}
+
+void throwBinary(std::string_view bytes) {
+    throw UStringBinaryTranscodingException(UString<28>(UStringView<28>(bytes)));
+}
+
+template <typename CharOut>
+void convertChars(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    const std::uint32_t source = from.evaluate();
+    const std::uint32_t target = to.evaluate();
+    if (source == target || (target == Encoding::Binary && source != Encoding::Binary)) {
+        copyBytes(bytes, out);
+    } else if (source == Encoding::Binary) {
+        throwBinary(bytes);
+    } else if (source == Encoding::Wwjd) {
+        const UString<2> text = wwjdToUtf16(bytes);
+        fromUtf16(to, {text.rawData(), text.size()}, out);
+    } else if (target == Encoding::Wwjd) {
+        std::u16string text;
+        convertChars(from, Encoding::Utf16LE, bytes, text);
+        copyBytes(utf16ToWwjd(text), out);
+    } else if (source == Encoding::UsAscii) {
+        fromAscii(to, bytes, out);
+    } else if (target == Encoding::UsAscii) {
+        toAsciiChecked(from, bytes, out);
+    } else {
+        transcodeBytes(from, to, bytes, out);
+    }
+}
+
+#define KVT_INSTANTIATE(CharOut)                                                                                      \
+    template void copyBytes(std::string_view, std::basic_string<CharOut>&);                                           \
+    template void transcodeBytes(Encoding, Encoding, std::string_view, std::basic_string<CharOut>&);                  \
+    template void fromAscii(Encoding, std::string_view, std::basic_string<CharOut>&);                                 \
+    template void toAsciiChecked(Encoding, std::string_view, std::basic_string<CharOut>&);                            \
+    template void fromUtf16(Encoding, std::u16string_view, std::basic_string<CharOut>&);                              \
+    template void convertChars(Encoding, Encoding, std::string_view, std::basic_string<CharOut>&);
+
+KVT_INSTANTIATE(char)
+KVT_INSTANTIATE(char16_t)
+KVT_INSTANTIATE(char32_t)
+
+#undef KVT_INSTANTIATE
+
+} // namespace kvt::ex::detail

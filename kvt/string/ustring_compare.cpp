@@ -1,0 +1,39 @@
+// Comparison and hash: of the units as they are stored, never of characters.
+#include <kvt/string/detail/instantiate.h>
+
+#include <kvt/foundation/detail/fnv.h>
+
+#include <algorithm>
+#include <cstring>
+
+namespace kvt::ex {
+namespace {
+
+int compareUnits(const char* left, const char* right, std::size_t count) {
+    return count == 0 ? 0 : std::memcmp(left, right, count);
+}
+
+template <typename CharT>
+int compareUnits(const CharT* left, const CharT* right, std::size_t count) {
+    const auto [l, r] = std::mismatch(left, left + count, right);
+    return l == left + count ? 0 : *l < *r ? -1 : 1;
+}
+
+} // namespace
+
+template <std::uint32_t N>
+int UString<N>::compare(UStringView<N> other, detail::case_sensitive_t) const noexcept {
+    if (const int difference = compareUnits(rawData(), other.data(), std::min(size(), other.size()))) {
+        return difference;
+    }
+    return size() == other.size() ? 0 : size() < other.size() ? -1 : 1;
+}
+
+template <std::uint32_t N>
+std::uint64_t UString<N>::hash() const noexcept {
+    return detail::fnv1a({reinterpret_cast<const char*>(rawData()), size() * sizeof(value_type)});
+}
+
+KVT_FOR_EACH_USTRING(KVT_INSTANTIATE_USTRING)
+
+} // namespace kvt::ex
