@@ -25,8 +25,10 @@ set_target_properties(kvt PROPERTIES
     SOVERSION ${PROJECT_VERSION_MAJOR}
     LINK_DEPENDS "${PROJECT_SOURCE_DIR}/cmake/kvt.map")
 target_link_options(kvt PRIVATE
-    "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map"
-    $<$<NOT:$<BOOL:${KVT_SANITIZE}>>:LINKER:--no-undefined>)
+    "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map")
+if(NOT KVT_SANITIZE) # a sanitizer's run-time is in the program, not in its libraries
+    target_link_options(kvt PRIVATE LINKER:--no-undefined)
+endif()
 
 # Names the sources of one folder, relative to it.
 function(kvt_sources)

@@ -177,7 +177,7 @@ bool StreamTranscoder::Impl::fillPivot(const char*& source, const char* sourceEn
 
     callInput_ = {source, static_cast<std::size_t>(sourceEnd - source)};
     callBegin_ = position_;
-    const std::uint64_t openCharacter = position_ - std::min<std::uint64_t>(position_, from_.heldBytes());
+    const std::size_t held = from_.heldBytes();
     std::array<std::int32_t, pivotUnits> offsets;
     char16_t* target = units_.data() + historyUnits;
     const Progress progress =
@@ -189,11 +189,15 @@ bool StreamTranscoder::Impl::fillPivot(const char*& source, const char* sourceEn
     requireSuccess(progress);
 
     filled_ = static_cast<std::size_t>(target - units_.data()) - historyUnits;
+    // Units of a character that an earlier call began. Some converters give them the offset -1, others 0.
+    const bool pairFirst = filled_ > 1 && (units_[historyUnits] & 0xFC00) == 0xD800;
+    const std::size_t openUnits = held == 0 ? 0 : pairFirst ? 2 : 1;
     for (std::size_t i = 0; i < filled_; ++i) {
-        origins_[historyUnits + i] =
-            offsets[i] >= 0 ? callBegin_ + static_cast<std::uint64_t>(offsets[i]) : openCharacter;
+        origins_[historyUnits + i] = i < openUnits || offsets[i] < 0
+                                         ? callBegin_ - held
+                                         : callBegin_ + static_cast<std::uint64_t>(offsets[i]);
     }
-    pivotEndsAt_ = position_ - std::min<std::uint64_t>(position_, from_.heldBytes());
+    pivotEndsAt_ = position_ - from_.heldBytes();
     return progress.end == Progress::outputFull;
 }
 
