@@ -14,7 +14,9 @@ namespace {
 std::string resolveSystemName() {
     const platform::CodeSet codeSet = platform::processCodeSet();
     for (const std::string_view name : {codePageName(codeSet.codePage), std::string_view(codeSet.name)}) {
-        if (std::string normalised = EncodingRegistry::normaliseName(name); !normalised.empty()) {
+        // Some versions of ICU take an empty name for their own default.
+        std::string normalised = name.empty() ? std::string() : EncodingRegistry::normaliseName(name);
+        if (!normalised.empty()) {
             return normalised;
         }
     }
@@ -131,11 +133,7 @@ std::string_view EncodingRegistry::nameOf(std::uint32_t id) {
 }
 
 std::string EncodingRegistry::normaliseName(std::string_view name) {
-    // ICU takes an empty name for its default converter, and wants a terminated one: text behind a zero would not
-    // count, and a name with such text is nobody's.
-    if (name.empty() || name.find('\0') != std::string_view::npos) {
-        return {};
-    }
+    // ICU wants a terminated name, so that text behind a zero does not count.
     // The buffer is kept so that odd spellings do not allocate each time.
     thread_local std::string terminated;
     terminated = name;

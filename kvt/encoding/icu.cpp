@@ -6,6 +6,7 @@
 #include <unicode/ucnv_err.h>
 #include <unicode/utypes.h>
 
+#include <algorithm>
 #include <array>
 
 namespace kvt::ex::detail::icu {
@@ -25,7 +26,7 @@ void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, 
                        UConverterCallbackReason reason, UErrorCode* error) {
     if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
         auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
-        listener->onBadInput({bytes, static_cast<std::size_t>(length)}, arguments->source, *error);
+        listener->onBadInput({bytes, static_cast<std::size_t>(length)}, *error);
     }
     UCNV_TO_U_CALLBACK_SUBSTITUTE(nullptr, arguments, bytes, length, reason, error);
 }
@@ -34,7 +35,7 @@ void fromUnicodeCallback(const void* context, UConverterFromUnicodeArgs* argumen
                          std::int32_t length, UChar32 codePoint, UConverterCallbackReason reason, UErrorCode* error) {
     if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
         auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
-        listener->onNotRepresentable(static_cast<char32_t>(codePoint), arguments->source, *error);
+        listener->onNotRepresentable(static_cast<char32_t>(codePoint), *error);
     }
     UCNV_FROM_U_CALLBACK_SUBSTITUTE(nullptr, arguments, units, length, codePoint, reason, error);
 }
@@ -121,14 +122,28 @@ Converter::Converter(Encoding encoding) : encoding_(encoding) {
 }
 
 void Converter::setListener(LossListener& listener) {
+    listener_ = &listener;
     UErrorCode error = U_ZERO_ERROR;
     ucnv_setFromUCallBack(converter_.get(), &fromUnicodeCallback, &listener, nullptr, nullptr, &error);
     error = U_ZERO_ERROR;
     ucnv_setToUCallBack(converter_.get(), &toUnicodeCallback, &listener, nullptr, nullptr, &error);
 }
 
+// To ICU, compound text has no state to reset, though its converter goes on in the character set that was last written.
+bool Converter::forgetsToReset() const {
+    return isOpen() && ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT;
+}
+
 void Converter::reset() {
-    ucnv_reset(converter_.get());
+    if (!forgetsToReset()) {
+        ucnv_reset(converter_.get());
+        return;
+    }
+    LossListener* const listener = listener_;
+    *this = Converter(encoding_);
+    if (isOpen() && listener != nullptr) {
+        setListener(*listener);
+    }
 }
 
 int Converter::maxCharSize() const {
@@ -160,14 +175,49 @@ Form Converter::form() {
     }
 }
 
+bool Converter::isStateless() const {
+    switch (ucnv_getType(converter_.get())) {
+    case UCNV_SBCS:
+    case UCNV_DBCS:
+    case UCNV_MBCS:
+    case UCNV_LATIN_1:
+    case UCNV_US_ASCII:
+    case UCNV_UTF8:
+    case UCNV_UTF16_BigEndian:
+    case UCNV_UTF16_LittleEndian:
+    case UCNV_UTF32_BigEndian:
+    case UCNV_UTF32_LittleEndian:
+    case UCNV_CESU8:
+        return true;
+    default:
+        return false;
+    }
+}
+
+Converter Converter::clone() const {
+    Converter copy;
+    // A bytewise copy, as ICU makes it of compound text, shares what both would release.
+    if (ucnv_getType(converter_.get()) != UCNV_COMPOUND_TEXT) {
+        UErrorCode error = U_ZERO_ERROR;
+#if U_ICU_VERSION_MAJOR_NUM >= 71
+        copy.converter_.reset(ucnv_clone(converter_.get(), &error));
+#else
+        copy.converter_.reset(ucnv_safeClone(converter_.get(), nullptr, nullptr, &error));
+#endif
+        copy.encoding_ = encoding_;
+        copy.listener_ = listener_;
+    }
+    return copy;
+}
+
 std::size_t Converter::heldBytes() const {
     UErrorCode error = U_ZERO_ERROR;
     const std::int32_t held = ucnv_toUCountPending(converter_.get(), &error);
     return U_SUCCESS(error) && held > 0 ? static_cast<std::size_t>(held) : 0;
 }
 
-bool Converter::holdsBytes() const {
-    return heldBytes() != 0;
+bool Converter::countsHeldBytes() const {
+    return ucnv_getType(converter_.get()) != UCNV_HZ;
 }
 
 bool Converter::holdsUnits() const {
@@ -176,9 +226,9 @@ bool Converter::holdsUnits() const {
 }
 
 Progress Converter::toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
-                              std::int32_t* offsets, bool flush) {
+                              bool flush) {
     UErrorCode error = U_ZERO_ERROR;
-    ucnv_toUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, offsets, flush ? 1 : 0, &error);
+    ucnv_toUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, nullptr, flush ? 1 : 0, &error);
     return progressOf(error);
 }
 
@@ -192,6 +242,11 @@ Progress Converter::fromUnicode(const char16_t*& source, const char16_t* sourceE
 Progress Converter::convert(Converter& to, Converter& from, char*& target, const char* targetEnd, const char*& source,
                             const char* sourceEnd, char16_t* pivot, char16_t*& pivotSource, char16_t*& pivotTarget,
                             const char16_t* pivotEnd, bool reset, bool flush) {
+    for (Converter* const converter : {&to, &from}) {
+        if (reset && converter->forgetsToReset()) {
+            converter->reset();
+        }
+    }
     UErrorCode error = U_ZERO_ERROR;
     ucnv_convertEx(to.converter_.get(), from.converter_.get(), &target, targetEnd, &source, sourceEnd, pivot,
                    &pivotSource, &pivotTarget, pivotEnd, reset ? 1 : 0, flush ? 1 : 0, &error);

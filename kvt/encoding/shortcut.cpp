@@ -220,6 +220,24 @@ struct Run {
     bool ended;
 };
 
+/// Moves one character; says whether there was one to take. `end` is that of the input or a nearer place behind the
+/// character: where it is a fixed distance away, no comparisons with it are left in the code.
+template <typename From, typename To>
+bool moveCharacter(const char*& p, const char* end, char*& q) {
+    const Character character = From::read(p, end);
+    if (character.length == 0) {
+        return false;
+    }
+    if constexpr (To::last < From::last) {
+        if (character.codePoint > To::last) {
+            return false;
+        }
+    }
+    p += character.length;
+    q += To::write(q, character.codePoint);
+    return true;
+}
+
 /// Converts from `p` on until the input ends, the output has no room for another block, or ICU has to look.
 template <typename From, typename To>
 Run convertRun(const char* p, const char* end, char* q, const char* outEnd) {
@@ -227,22 +245,23 @@ Run convertRun(const char* p, const char* end, char* q, const char* outEnd) {
     constexpr std::size_t toBlock = blockLength * sizeof(typename To::Unit);
     constexpr std::size_t room = blockLength * longestCharacter;
     while (static_cast<std::size_t>(outEnd - q) >= room) {
-        if (static_cast<std::size_t>(end - p) >= fromBlock && isAsciiBlock<From>(p)) {
+        const auto left = static_cast<std::size_t>(end - p);
+        if (left >= fromBlock && isAsciiBlock<From>(p)) {
             copyAsciiBlock<From, To>(p, q);
             p += fromBlock;
             q += toBlock;
-            continue;
-        }
-        for (std::size_t i = 0; i < blockLength; ++i) {
-            if (p == end) {
-                return {p, q, true};
+        } else if (left >= room) {
+            for (std::size_t i = 0; i < blockLength; ++i) {
+                if (!moveCharacter<From, To>(p, p + longestCharacter, q)) {
+                    return {p, q, true};
+                }
             }
-            const Character character = From::read(p, end);
-            if (character.length == 0 || character.codePoint > To::last) {
-                return {p, q, true};
+        } else {
+            for (std::size_t i = 0; i < blockLength; ++i) {
+                if (p == end || !moveCharacter<From, To>(p, end, q)) {
+                    return {p, q, true};
+                }
             }
-            p += character.length;
-            q += To::write(q, character.codePoint);
         }
     }
     return {p, q, false};

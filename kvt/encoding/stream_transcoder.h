@@ -69,7 +69,7 @@ public:
     kvt::future::string_view substitution() const noexcept;
 
 private:
-    class Impl;
+    class KVT_HIDDEN Impl;
     std::unique_ptr<Impl> impl_;
 };
 

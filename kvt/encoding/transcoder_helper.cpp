@@ -28,14 +28,14 @@ bool TranscoderHelper::takeLoss() {
 }
 
 // Input that is this converter's own substitution was lost earlier, and is no new loss.
-void TranscoderHelper::onBadInput(std::string_view bytes, const char*, int error) noexcept {
+void TranscoderHelper::onBadInput(std::string_view bytes, int error) noexcept {
     if (bytes != substitutionChars_) {
         lastError_ = error;
     }
 }
 
 // The same goes for the replacement character.
-void TranscoderHelper::onNotRepresentable(char32_t codePoint, const char16_t*, int error) noexcept {
+void TranscoderHelper::onNotRepresentable(char32_t codePoint, int error) noexcept {
     if (lastError_ == 0 && codePoint != U'\uFFFD') {
         lastError_ = error;
     }

@@ -142,9 +142,10 @@ public:
         } else {
             // The new element is made before the old ones move, since it may be made from one of them.
             Storage larger(grownCapacity(1));
-            ::new (static_cast<void*>(larger.data + size_)) T(std::forward<Arguments>(arguments)...);
+            larger.element = ::new (static_cast<void*>(larger.data + size_)) T(std::forward<Arguments>(arguments)...);
             std::uninitialized_move(begin(), end(), larger.data);
             adopt(larger);
+            larger.element = nullptr;
         }
         ++size_;
         return back();
@@ -205,7 +206,7 @@ public:
     friend bool operator!=(const vector& left, const vector& right) { return !(left == right); }
 
 private:
-    // An array without elements, on its way into a vector, with the function that releases it.
+    // An array on its way into a vector, with the function that releases it, and a first element if there is one.
     struct Storage {
         explicit Storage(size_type count) : capacity(count) {
             if (count > max_size()) {
@@ -219,6 +220,9 @@ private:
         Storage(const Storage&) = delete;
         Storage& operator=(const Storage&) = delete;
         ~Storage() {
+            if (element != nullptr) {
+                std::destroy_at(element);
+            }
             if (data != nullptr) {
                 deleter(data);
             }
@@ -227,6 +231,7 @@ private:
         size_type capacity;
         std::function<void(T*)> deleter;
         T* data = nullptr;
+        T* element = nullptr;
     };
 
     // Puts `storage`, into which the elements have been moved, in the place of the present array.

@@ -1,5 +1,5 @@
-// The table of operations through which a host reaches a string: its slots by their places in the virtual table, as
-// a host compiled elsewhere calls them, and what each does for the three widths of unit.
+// The table of operations through which a host reaches a string: its slots by their places in the virtual
+// table, as a host compiled elsewhere calls them, and what each does for the three widths of unit.
 
 #include <kvt/codec/string_adaptors.h>
 #include <kvt/foundation/throwable.h>
@@ -19,8 +19,9 @@ using kvt::ex::Encoding;
 using kvt::ex::UString;
 using kvt::ex::detail::IZQTUStringAdaptor;
 
-/// The function in a slot, counted from 1. With the ABI of this platform the object begins with the address of the
-/// table, and the table has the virtual functions in the order of their declaration, the destructor twice.
+/// The function in a slot, counted from 1. With the ABI of this platform the object begins with the address
+/// of the table, and the table has the virtual functions in the order of their declaration, the destructor
+/// twice.
 template <typename Function>
 Function* slot(const IZQTString& string, int number) {
     void* const* table = nullptr;
@@ -97,8 +98,8 @@ TYPED_TEST(Adaptor, Slot5IsTheLengthInBytes) {
 }
 
 TYPED_TEST(Adaptor, Slots6To9ThrowAndLeaveTheString) {
-    const char* const names[] = {"encodeToZQTParsableText", "decodeFromZQTParsableText", "encodeUtf8ToZQTParsableText",
-                                 "decodeUtf8FromZQTParsableText"};
+    const char* const names[] = {"encodeToZQTParsableText", "decodeFromZQTParsableText",
+                                 "encodeUtf8ToZQTParsableText", "decodeUtf8FromZQTParsableText"};
     for (int number = 6; number <= 9; ++number) {
         EXPECT_EQ(failureOf([&] { slot<Parsable>(this->string, number)(&this->string); }),
                   notImplementedFailure(names[number - 6]));

@@ -56,9 +56,10 @@ std::size_t unitOf(const std::string& name) {
 }
 
 /// Compares all ways that there are between two encodings, for one text.
-void compare(const std::string& from, const std::string& to, std::string_view bytes, const std::string& what) {
-    const std::string where = what + ": " + from + " to " + to + ", " + std::to_string(bytes.size()) + " bytes " +
-                              hex(bytes, 48);
+void compare(const std::string& from, const std::string& to, std::string_view bytes,
+             const std::string& what) {
+    const std::string where =
+        what + ": " + from + " to " + to + ", " + std::to_string(bytes.size()) + " bytes " + hex(bytes, 48);
     const Outcome expected = expectedTranscode(from, to, bytes);
     EXPECT_EQ((transcode<char, char>(from, to, bytes)), expected) << where;
     EXPECT_EQ(assign(from, to, bytes), expectedAssign(from, to, bytes)) << where << " by assign";
@@ -81,10 +82,12 @@ void compare(const std::string& from, const std::string& to, std::string_view by
         EXPECT_EQ((transcode<char32_t, char>(from, to, bytes)), expected) << where << " char32_t to char";
     }
     if (in == 2 && out == 4) {
-        EXPECT_EQ((transcode<char16_t, char32_t>(from, to, bytes)), expected) << where << " char16_t to char32_t";
+        EXPECT_EQ((transcode<char16_t, char32_t>(from, to, bytes)), expected)
+            << where << " char16_t to char32_t";
     }
     if (in == 4 && out == 2) {
-        EXPECT_EQ((transcode<char32_t, char16_t>(from, to, bytes)), expected) << where << " char32_t to char16_t";
+        EXPECT_EQ((transcode<char32_t, char16_t>(from, to, bytes)), expected)
+            << where << " char32_t to char16_t";
     }
 }
 
@@ -92,8 +95,10 @@ void compare(const std::string& from, const std::string& to, std::string_view by
 /// ignorable characters, U+FFFD, noncharacters, NUL, controls, supplementary and unassigned characters.
 const std::u16string mixedText =
     u"\uFEFFAbc \u00E9\u00FF\u0100 \u20AC \u0416\u0436 \u03B1\u03A9 \u05D0\u0634 \u0915\u094D\u0937 \u0E01 "
-    u"\u304B\u309A\u30AB\uFF76\u4E2D\u6587\uAC00\uE000\uF8FF e\u0301 \u00AD\u200B\u034F\uFFFD\uFDD0\uFFFE\uFFFF "
-    u"\U0001F600\U00020000\U000E0100\U0010FFFF\u0378 ~{}\\[^]+&\u007F\u0080\u0085\u2028 \x01\x0E\x0F\x1A\x1B\r\n" +
+    u"\u304B\u309A\u30AB\uFF76\u4E2D\u6587\uAC00\uE000\uF8FF e\u0301 "
+    u"\u00AD\u200B\u034F\uFFFD\uFDD0\uFFFE\uFFFF "
+    u"\U0001F600\U00020000\U000E0100\U0010FFFF\u0378 ~{}\\[^]+&\u007F\u0080\u0085\u2028 "
+    u"\x01\x0E\x0F\x1A\x1B\r\n" +
     std::u16string(1, u'\0') + u"end";
 
 std::u16string slice(std::size_t start, std::size_t count) {
@@ -142,8 +147,8 @@ TEST_P(IcuDifferential, ValidTextOfTheConverterItself) {
             const std::u16string text = ownText(name, length, seed * 100 + length);
             const std::string bytes = encodeWithIcu(name, text);
             for (const std::string& to :
-                 {std::string("UTF-8"), std::string("UTF-16LE"), std::string("UTF-32BE"), std::string("US-ASCII"),
-                  std::string("windows-1252"), next}) {
+                 {std::string("UTF-8"), std::string("UTF-16LE"), std::string("UTF-32BE"),
+                  std::string("US-ASCII"), std::string("windows-1252"), next}) {
                 compare(name, to, bytes, "own text");
             }
             for (const std::string from : {"UTF-8", "UTF-16LE", "UTF-16BE", "UTF-32LE"}) {
@@ -170,8 +175,8 @@ TEST_P(IcuDifferential, RandomBytes) {
         std::mt19937_64 random(seed);
         for (int round = 0; round < 60; ++round) {
             const std::string bytes = randomBytes(random, 1 + random() % (round % 10 == 0 ? 400 : 24));
-            for (const std::string& to : {std::string("UTF-8"), std::string("UTF-16LE"), std::string("UTF-32LE"),
-                                          std::string("US-ASCII"), next}) {
+            for (const std::string& to : {std::string("UTF-8"), std::string("UTF-16LE"),
+                                          std::string("UTF-32LE"), std::string("US-ASCII"), next}) {
                 compare(name, to, bytes, "random bytes");
             }
             compare("UTF-8", name, bytes, "random bytes");
@@ -214,7 +219,8 @@ class Straddling {
 public:
     enum Filling { ascii, own, lost };
 
-    static std::u16string text(const std::string& name, std::size_t length, Filling filling, std::uint64_t seed) {
+    static std::u16string text(const std::string& name, std::size_t length, Filling filling,
+                               std::uint64_t seed) {
         std::u16string text;
         if (filling == own) {
             text = ownText(name, length, seed);
@@ -236,7 +242,8 @@ void compareAcrossBorders(const std::string& name, Straddling::Filling filling, 
         for (std::size_t length = border - 4; length <= border + 4; ++length) {
             const std::u16string text = Straddling::text(name, length, filling, seed);
             const std::string bytes = encodeWithIcu(name, text);
-            const std::string what = "border " + std::to_string(border) + ", length " + std::to_string(length);
+            const std::string what =
+                "border " + std::to_string(border) + ", length " + std::to_string(length);
             // The border is met by units of the pivot; bytes of the source and the target meet it where they are
             // as many, so for sources and targets of one byte a character and in all texts of ASCII.
             compare(name, length % 2 == 0 ? "UTF-8" : "UTF-16LE", bytes, what);
@@ -297,7 +304,8 @@ TEST_P(UnicodeDifferential, RandomBytesAndDamagedText) {
 }
 
 TEST_P(UnicodeDifferential, EachKindOfCharacterAtEachPlaceNearABorder) {
-    for (const std::u16string tail : {u"a", u"\u00E9", u"\u20AC", u"\U0001F600", u"\uFFFD", u"\uFFFF", u"\uFEFF"}) {
+    for (const std::u16string tail :
+         {u"a", u"\u00E9", u"\u20AC", u"\U0001F600", u"\uFFFD", u"\uFFFF", u"\uFEFF"}) {
         for (const char16_t filler : {u'a', u'\u00E9', u'\u4E2D'}) {
             for (const std::size_t border : borders) {
                 for (std::size_t length = border - 4; length <= border + 4; ++length) {
@@ -313,7 +321,9 @@ TEST_P(UnicodeDifferential, EachKindOfCharacterAtEachPlaceNearABorder) {
 }
 
 TEST_P(UnicodeDifferential, BadInputNearABorder) {
-    const std::string bad = from() == "UTF-8" ? "\xED\xA0\x80" : from().starts_with("UTF-16") ? "\xD8\xD8" : "\x11\x22\x33\x44";
+    const std::string bad = from() == "UTF-8"              ? "\xED\xA0\x80"
+                            : from().starts_with("UTF-16") ? "\xD8\xD8"
+                                                           : "\x11\x22\x33\x44";
     for (const std::size_t border : borders) {
         for (std::size_t length = border - 4; length <= border + 4; ++length) {
             std::string bytes = encodeWithIcu(from(), std::u16string(length, u'\u4E2D'));

@@ -33,8 +33,12 @@ std::ostream& operator<<(std::ostream& stream, const NamedForm& form) {
 }
 
 const NamedForm forms[] = {
-    {Form::asciiCompatible, "windows-1252", 1}, {Form::utf8, "UTF-8", 1},       {Form::utf16le, "UTF-16LE", 2},
-    {Form::utf16be, "UTF-16BE", 2},             {Form::utf32le, "UTF-32LE", 4}, {Form::utf32be, "UTF-32BE", 4},
+    {Form::asciiCompatible, "windows-1252", 1},
+    {Form::utf8, "UTF-8", 1},
+    {Form::utf16le, "UTF-16LE", 2},
+    {Form::utf16be, "UTF-16BE", 2},
+    {Form::utf32le, "UTF-32LE", 4},
+    {Form::utf32be, "UTF-32BE", 4},
 };
 
 class ShortcutPair : public testing::TestWithParam<std::tuple<NamedForm, NamedForm>> {
@@ -64,7 +68,8 @@ public:
         std::string out = "before";
         const std::size_t taken = convertPrefix(from().form, to().form, bytes, out);
         EXPECT_EQ(taken, expected.size()) << hex(bytes);
-        EXPECT_EQ(hex(out.substr(6)), hex(convertWithIcu(from().name, to().name, expected).bytes)) << hex(bytes);
+        EXPECT_EQ(hex(out.substr(6)), hex(convertWithIcu(from().name, to().name, expected).bytes))
+            << hex(bytes);
         EXPECT_EQ(out.substr(0, 6), "before");
     }
 
@@ -83,9 +88,10 @@ INSTANTIATE_TEST_SUITE_P(Forms, ShortcutPair,
                          testing::Combine(testing::ValuesIn(forms), testing::ValuesIn(forms)));
 
 TEST_P(ShortcutPair, TakesTheLongestPrefixThatIcuConvertsQuietly) {
-    const std::u16string characters[] = {u"a",      u"\u007F", u"\u0080", u"\u07FF", u"\u0800",     u"\uD7FF",
-                                         u"\uE000", u"\uFDD0", u"\uFEFF", u"\uFFFD", u"\uFFFE",     u"\uFFFF",
-                                         u"\U00010000", u"\U0010FFFF", std::u16string(1, u'\0')};
+    const std::u16string characters[] = {
+        u"a",      u"\u007F", u"\u0080",     u"\u07FF",     u"\u0800",
+        u"\uD7FF", u"\uE000", u"\uFDD0",     u"\uFEFF",     u"\uFFFD",
+        u"\uFFFE", u"\uFFFF", u"\U00010000", u"\U0010FFFF", std::u16string(1, u'\0')};
     for (const std::u16string& first : characters) {
         for (const std::u16string& second : characters) {
             const std::string bytes = encodeWithIcu(from().name, first + second);
@@ -102,8 +108,10 @@ TEST_P(ShortcutPair, TakesTheLongestPrefixThatIcuConvertsQuietly) {
 TEST_P(ShortcutPair, AgreesOnRandomUnits) {
     std::mt19937_64 random(11);
     // Bytes near the borders of what is well-formed, in all orders.
-    const std::string_view bytes("\x00\x01\x41\x7F\x80\x8F\x90\x9F\xA0\xBF\xC0\xC2\xD7\xD8\xDB\xDC\xDF\xE0\xED\xEF"
-                                 "\xF0\xF4\xF5\xFE\xFF\x10\x11", 27);
+    const std::string_view bytes(
+        "\x00\x01\x41\x7F\x80\x8F\x90\x9F\xA0\xBF\xC0\xC2\xD7\xD8\xDB\xDC\xDF\xE0\xED\xEF"
+        "\xF0\xF4\xF5\xFE\xFF\x10\x11",
+        27);
     for (int round = 0; round < 3000; ++round) {
         std::string text(1 + random() % 9, '\0');
         for (char& byte : text) {
@@ -118,7 +126,8 @@ TEST_P(ShortcutPair, AgreesOnRandomUnits) {
 
 TEST_P(ShortcutPair, TakesAllOfALongTextFromAnyAlignmentToAnyLength) {
     for (const char16_t filler : {u'x', onlyAscii() ? u'y' : u'\u4E2D'}) {
-        for (const std::size_t length : {0, 1, 15, 16, 17, 31, 33, 2047, 2048, 4095, 4097, 8191, 8192, 8193, 40000}) {
+        for (const std::size_t length :
+             {0, 1, 15, 16, 17, 31, 33, 2047, 2048, 4095, 4097, 8191, 8192, 8193, 40000}) {
             const std::string bytes = encodeWithIcu(from().name, std::u16string(length, filler));
             for (std::size_t shift = 0; shift < 3; ++shift) {
                 const std::string shifted = std::string(shift, ' ') + bytes;
@@ -139,9 +148,30 @@ TEST_P(ShortcutPair, StopsAtTheFirstBadPlaceWhereverItIsInABlock) {
         const std::string rest = encodeWithIcu(from().name, std::u16string(40, u'y'));
         std::string out;
         // A byte that no text of the form begins with; in UTF-16 and UTF-32 a unit.
-        const std::string bad = from().unit == 1 ? "\xFF" : from().unit == 2 ? "\xDC\xDC" : "\xFF\xFF\xFF\xFF";
+        const std::string bad = from().unit == 1   ? "\xFF"
+                                : from().unit == 2 ? "\xDC\xDC"
+                                                   : "\xFF\xFF\xFF\xFF";
         EXPECT_EQ(convertPrefix(from().form, to().form, good + bad + rest, out), good.size()) << place;
         EXPECT_EQ(hex(out), hex(encodeWithIcu(to().name, text))) << place;
+    }
+}
+
+TEST_P(ShortcutPair, SeesTheOneOtherCharacterInABlockOfAscii) {
+    // U+20AC is the byte 0x80 in windows-1252, which has none of the others.
+    for (const char16_t other : {u'\u20AC', u'\u0080', u'\u0100', u'\u8000'}) {
+        if (from().form == Form::asciiCompatible && other != u'\u20AC') {
+            continue;
+        }
+        for (std::size_t place = 0; place < 66; ++place) {
+            std::u16string text(48, place % 2 == 0 ? u'x' : u'\0');
+            text[place / 2] = other;
+            const std::string bytes = encodeWithIcu(from().name, text);
+            std::string out;
+            const std::size_t taken = convertPrefix(from().form, to().form, bytes, out);
+            const std::u16string expected = onlyAscii() ? text.substr(0, place / 2) : text;
+            EXPECT_EQ(taken, encodeWithIcu(from().name, expected).size()) << place;
+            EXPECT_EQ(hex(out), hex(encodeWithIcu(to().name, expected))) << place;
+        }
     }
 }
 

@@ -30,9 +30,13 @@ public:
 };
 
 template <typename T>
-concept HasPublicAllocate = requires(T t) { t.allocate(std::size_t{1}); };
+concept HasPublicAllocate = requires(T t) {
+    t.allocate(std::size_t{1});
+};
 template <typename T>
-concept HasPublicDeallocate = requires(T t) { t.deallocate(nullptr, std::size_t{1}); };
+concept HasPublicDeallocate = requires(T t) {
+    t.deallocate(nullptr, std::size_t{1});
+};
 
 TEST(Memory, ClassesFormOneStatelessLine) {
     static_assert(std::is_empty_v<DefaultAllocator>);
@@ -41,7 +45,8 @@ TEST(Memory, ClassesFormOneStatelessLine) {
                                     TypedAllocator<int, BasicDllAllocator<DefaultAllocator>>>);
     static_assert(std::is_empty_v<TypedAllocator<int>>);
     static_assert(std::is_same_v<TypedAllocator<int>::value_type, int>);
-    static_assert(std::is_same_v<TypedAllocator<int>, TypedAllocator<int, BasicDllAllocator<DefaultAllocator>>>);
+    static_assert(
+        std::is_same_v<TypedAllocator<int>, TypedAllocator<int, BasicDllAllocator<DefaultAllocator>>>);
     SUCCEED();
 }
 
@@ -66,7 +71,8 @@ TEST(Memory, AllocateTakesTheBytesFromTheGlobalFunction) {
 
 TEST(Memory, DeallocateDoesNotLookAtTheSize) {
     const std::ptrdiff_t before = kvt_test::livingBlocks();
-    for (const std::size_t claimed : {std::size_t{0}, std::size_t{1}, std::numeric_limits<std::size_t>::max()}) {
+    for (const std::size_t claimed :
+         {std::size_t{0}, std::size_t{1}, std::numeric_limits<std::size_t>::max()}) {
         Allocator::deallocate(Allocator::allocate(64), claimed);
     }
     Allocator::deallocate(nullptr, 64);
@@ -102,9 +108,11 @@ TEST(Memory, AssignmentsDoNothingAndReturnTheObject) {
 TEST(FutureTypes, AreTheStandardOnes) {
     static_assert(std::is_same_v<kvt::future::string_view, std::string_view>);
     static_assert(std::is_same_v<kvt::future::basic_string_view<char16_t>, std::u16string_view>);
-    static_assert(std::is_same_v<kvt::future::basic_string_view<char, std::char_traits<char>>, std::string_view>);
+    static_assert(
+        std::is_same_v<kvt::future::basic_string_view<char, std::char_traits<char>>, std::string_view>);
     static_assert(std::is_same_v<kvt::future::optional<int>, std::optional<int>>);
-    static_assert(kvt::future::detail::basic_string_view_constants::npos == std::numeric_limits<std::uint64_t>::max());
+    static_assert(kvt::future::detail::basic_string_view_constants::npos ==
+                  std::numeric_limits<std::uint64_t>::max());
     SUCCEED();
 }
 

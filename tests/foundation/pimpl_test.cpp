@@ -179,9 +179,10 @@ public:
 TEST(PimplShared, HoldsOnePointerToABlockWithImplMutexAndA64BitCount) {
     static_assert(sizeof(PimplShared<NotedImpl, NotedMutex>) == sizeof(void*));
     static_assert(std::is_same_v<decltype(std::declval<Handle&>().d()), SharedDataT<NotedImpl, NotedMutex>&>);
+    static_assert(std::is_same_v<decltype(std::declval<const Handle&>().d()),
+                                 const SharedDataT<NotedImpl, NotedMutex>&>);
     static_assert(
-        std::is_same_v<decltype(std::declval<const Handle&>().d()), const SharedDataT<NotedImpl, NotedMutex>&>);
-    static_assert(std::is_same_v<decltype(SharedDataT<NotedImpl, NotedMutex>::handles), std::atomic<std::uint64_t>>);
+        std::is_same_v<decltype(SharedDataT<NotedImpl, NotedMutex>::handles), std::atomic<std::uint64_t>>);
     EXPECT_EQ(Handle().count(), 1u);
 }
 
@@ -199,6 +200,7 @@ TEST(PimplShared, CopiesShareTheBlockAndMovesHandItOn) {
 }
 
 TEST(PimplShared, TheLastHandleDestroysMutexImplAndBlock) {
+    std::vector<std::string>().swap(Record::events);
     const std::ptrdiff_t before = kvt_test::livingBlocks();
     {
         Handle first("impl");
@@ -209,7 +211,7 @@ TEST(PimplShared, TheLastHandleDestroysMutexImplAndBlock) {
         EXPECT_TRUE(Record::events.empty());
     }
     EXPECT_EQ(Record::events, (std::vector<std::string>{"mutex", "impl"}));
-    Record::events = {};
+    std::vector<std::string>().swap(Record::events);
     EXPECT_EQ(kvt_test::livingBlocks(), before);
 }
 

@@ -75,7 +75,8 @@ protected:
         }
         case 2: {
             const T v = value();
-            EXPECT_EQ(&vector_.emplace_back(v), &vector_.back());
+            const T* const added = &vector_.emplace_back(v);
+            EXPECT_EQ(added, &vector_.back());
             model_.emplace_back(v);
             break;
         }

@@ -96,8 +96,9 @@ TEST(VectorType, FieldsAreSizeCapacityDeleterData) {
 template <typename T>
 class VectorOfEachElementType : public testing::Test {};
 
-using ElementTypes = testing::Types<char, std::uint64_t, std::pair<std::size_t, std::size_t>, UString<0>, UString<1>,
-                                    UString<2>, UString<3>, UString<27>, UString<28>, UString<29>, UString<30>>;
+using ElementTypes =
+    testing::Types<char, std::uint64_t, std::pair<std::size_t, std::size_t>, UString<0>, UString<1>,
+                   UString<2>, UString<3>, UString<27>, UString<28>, UString<29>, UString<30>>;
 TYPED_TEST_SUITE(VectorOfEachElementType, ElementTypes);
 
 TYPED_TEST(VectorOfEachElementType, GrowsShrinksCopiesAndMoves) {
@@ -208,8 +209,7 @@ TEST_F(VectorTest, MoveAssignmentReleasesWhatTheTargetHeld) {
         target = std::move(self);
         EXPECT_EQ(values(target), iota(3));
     }
-    Tracked::counts.destroyed = {};
-    Tracked::counts.destroyed.shrink_to_fit();
+    std::vector<int>().swap(Tracked::counts.destroyed);
     EXPECT_EQ(livingBlocks(), before);
 }
 
@@ -508,8 +508,10 @@ TYPED_TEST(VectorOfStrings, AfterGrowthEachAdaptorStandsForItsOwnElement) {
     ASSERT_EQ(moved.size(), expected.size());
     for (std::size_t i = 0; i < expected.size(); ++i) {
         const auto& adaptor = moved[i].getAsIZQTString();
-        const auto bytes = static_cast<std::uint32_t>(expected[i].size() * sizeof(typename TypeParam::value_type));
-        EXPECT_EQ(static_cast<const void*>(adaptor.data()), static_cast<const void*>(moved[i].rawData())) << i;
+        const auto bytes =
+            static_cast<std::uint32_t>(expected[i].size() * sizeof(typename TypeParam::value_type));
+        EXPECT_EQ(static_cast<const void*>(adaptor.data()), static_cast<const void*>(moved[i].rawData()))
+            << i;
         EXPECT_EQ(adaptor.byteLength(), bytes) << i;
         EXPECT_TRUE(moved[i] == expected[i]) << i;
     }

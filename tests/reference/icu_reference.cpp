@@ -67,6 +67,8 @@ ConverterPtr prepare(const std::string& name, Notes& notes) {
         const UChar mark = u'?';
         ucnv_setSubstString(converter.get(), &mark, 1, &error);
     }
+    // Where ICU refuses "?", its own stays.
+    error = U_ZERO_ERROR;
     char buffer[20];
     int8_t length = sizeof buffer;
     ucnv_getSubstChars(converter.get(), buffer, &length, &error);
@@ -79,12 +81,20 @@ ConverterPtr prepare(const std::string& name, Notes& notes) {
     return converter;
 }
 
+/// A few of ICU's converters (in ICU 72 those of ISCII, ISO-2022-KR, LMBCS and SCSU) give other bytes when the output is full
+/// in between. For them the size of the library's buffers decides what comes out.
+Raw convertAsTheLibrary(const std::string& from, const std::string& to, std::string_view bytes) {
+    static const std::set<std::string> forgetful = {"ISO-2022-KR", "LMBCS-1", "SCSU"};
+    const bool matters = bytes.size() > 256 && (to.starts_with("ISCII") || forgetful.contains(to));
+    return convertWithIcu(from, to, bytes, matters ? Buffers{1024, 4096} : Buffers{});
+}
+
 /// The text in UTF-8 for the parameters of a failure: what ICU gives, losses or not.
 std::string readable(const std::string& name, std::string_view bytes) {
     if (name == "UTF-8" || name == "US-ASCII") {
         return std::string(bytes);
     }
-    return convertWithIcu(name, "UTF-8", bytes).bytes;
+    return convertAsTheLibrary(name, "UTF-8", bytes).bytes;
 }
 
 std::string substitutionOf(const std::string& name) {
@@ -93,16 +103,16 @@ std::string substitutionOf(const std::string& name) {
     return notes.substitution;
 }
 
-Outcome badEncoding(std::string output, std::string_view bytes, const std::string& from, const std::string& lossy,
-                    const std::string& substitution) {
+Outcome badEncoding(std::string output, std::string_view bytes, const std::string& from,
+                    const std::string& lossy, const std::string& substitution) {
     return {std::move(output),
             910002,
             {escaped(bytes), from},
             {{"substituted_conversion", lossy}, {"substitution_characters", substitution}}};
 }
 
-Outcome lostCharacter(std::string output, std::string_view bytes, const std::string& from, const std::string& to,
-                      const std::string& lossy, const std::string& substitution) {
+Outcome lostCharacter(std::string output, std::string_view bytes, const std::string& from,
+                      const std::string& to, const std::string& lossy, const std::string& substitution) {
     return {std::move(output),
             910003,
             {readable(from, bytes), from, to},
@@ -175,7 +185,8 @@ Outcome utf8ToAscii(std::string_view bytes) {
 
 Outcome singleByteToAscii(const std::string& from, std::string_view bytes) {
     std::string text(bytes);
-    std::replace_if(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) > 127; }, '\x1A');
+    std::replace_if(
+        text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) > 127; }, '\x1A');
     if (text == bytes) {
         return {text, 0, {}, {}};
     }
@@ -187,8 +198,8 @@ Outcome singleByteToAscii(const std::string& from, std::string_view bytes) {
 std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
     stream << outcome.bytes.size() << " bytes " << hex(outcome.bytes) << ", failure " << outcome.number;
     for (const std::string& parameter : outcome.parameters) {
-        stream << "\n  %" << parameter.size() << " bytes " << hex(parameter) << " \"" << parameter.substr(0, 80)
-               << '"';
+        stream << "\n  %" << parameter.size() << " bytes " << hex(parameter) << " \""
+               << parameter.substr(0, 80) << '"';
     }
     for (const auto& [name, value] : outcome.pairs) {
         stream << "\n  " << name << '=' << value.size() << " bytes " << hex(value);
@@ -222,32 +233,33 @@ std::string canonicalName(const std::string& name) {
     return result == "UTF-16" || result == "UTF-32" ? result + "LE" : result;
 }
 
-Raw convertWithIcu(const std::string& from, const std::string& to, std::string_view bytes) {
+Raw convertWithIcu(const std::string& from, const std::string& to, std::string_view bytes, Buffers buffers) {
     Notes fromNotes;
     Notes toNotes;
     const ConverterPtr source = prepare(from, fromNotes);
     const ConverterPtr target = prepare(to, toNotes);
     // Escapes, shifts and substitutions stay below this many bytes for each byte of the input.
-    std::string out(bytes.size() * 16 + 64, '\0');
-    std::u16string pivot(bytes.size() * 8 + 64, u'\0');
+    std::string out(buffers.outputBytes != 0 ? buffers.outputBytes : bytes.size() * 16 + 64, '\0');
+    std::u16string pivot(buffers.pivotUnits != 0 ? buffers.pivotUnits : bytes.size() * 8 + 64, u'\0');
     UChar* pivotSource = pivot.data();
     UChar* pivotTarget = pivot.data();
-    char* outPosition = out.data();
     const char* inPosition = bytes.data();
-    UErrorCode error = U_ZERO_ERROR;
-    ucnv_convertEx(target.get(), source.get(), &outPosition, out.data() + out.size(), &inPosition,
-                   bytes.data() + bytes.size(), pivot.data(), &pivotSource, &pivotTarget,
-                   pivot.data() + pivot.size(), true, true, &error);
+    UErrorCode error = U_BUFFER_OVERFLOW_ERROR;
     Raw raw;
+    for (bool first = true; error == U_BUFFER_OVERFLOW_ERROR; first = false) {
+        char* outPosition = out.data();
+        error = U_ZERO_ERROR;
+        ucnv_convertEx(target.get(), source.get(), &outPosition, out.data() + out.size(), &inPosition,
+                       bytes.data() + bytes.size(), pivot.data(), &pivotSource, &pivotTarget,
+                       pivot.data() + pivot.size(), first, true, &error);
+        if (U_SUCCESS(error) || error == U_BUFFER_OVERFLOW_ERROR) {
+            raw.bytes.append(out.data(), outPosition);
+        }
+    }
     raw.badInput = fromNotes.error;
     raw.notRepresentable = toNotes.error;
     raw.calls = fromNotes.calls + toNotes.calls;
-    if (U_SUCCESS(error)) {
-        out.resize(static_cast<std::size_t>(outPosition - out.data()));
-        raw.bytes = out;
-    } else {
-        raw.status = error;
-    }
+    raw.status = U_SUCCESS(error) ? 0 : error;
     return raw;
 }
 
@@ -255,7 +267,7 @@ Outcome expectedTranscode(const std::string& from, const std::string& to, std::s
     if (from == to || bytes.empty()) {
         return {std::string(bytes), 0, {}, {}};
     }
-    const Raw raw = convertWithIcu(from, to, bytes);
+    const Raw raw = convertAsTheLibrary(from, to, bytes);
     if (raw.badInput == 0 && raw.notRepresentable == 0) {
         return {raw.bytes, 0, {}, {}};
     }

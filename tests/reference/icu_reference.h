@@ -36,8 +36,14 @@ struct Raw {
     int calls = 0;            ///< calls of the two callbacks, whatever became of them
     int status = 0;           ///< ICU's code at the end, 0 when it did not give up
 };
+/// How much room ICU has at a time; 0 for more than the text can need.
+struct Buffers {
+    std::size_t pivotUnits = 0;
+    std::size_t outputBytes = 0;
+};
 /// Both names are canonical ones.
-Raw convertWithIcu(const std::string& from, const std::string& to, std::string_view bytes);
+Raw convertWithIcu(const std::string& from, const std::string& to, std::string_view bytes,
+                   Buffers buffers = {});
 
 /// What ICUTranscoder has to do.
 Outcome expectedTranscode(const std::string& from, const std::string& to, std::string_view bytes);

@@ -1,5 +1,5 @@
-// The wwjd codec once more, slow and plain: one character at a time, tokens found by trying every name. It shares
-// nothing with the library and serves as its oracle.
+// The wwjd codec once more, slow and plain: one character at a time, tokens found by trying every name. It
+// shares nothing with the library and serves as its oracle.
 #pragma once
 
 #include <cstddef>
@@ -17,11 +17,15 @@ struct WwjdName {
 
 /// The named tokens.
 inline constexpr WwjdName wwjdNames[] = {
-    {"lt", u'<'},         {"space", u' '},        {"semicolon", u';'},   {"gt", u'>'},        {"comma", u','},
-    {"lf", 10},           {"quote", u'"'},        {"openparen", u'('},   {"cr", 13},          {"amp", u'&'},
-    {"closeparen", u')'}, {"tab", 9},             {"backslash", u'\\'},  {"openbracket", u'['}, {"bell", 7},
-    {"solidus", u'/'},    {"closebracket", u']'}, {"backspace", 8},      {"apos", u'\''},     {"opencurly", u'{'},
-    {"verttab", 11},      {"dollar", u'$'},       {"closecurly", u'}'},  {"formfeed", 12},    {"at", u'@'},
+    {"lt", u'<'},         {"space", u' '},        {"semicolon", u';'},
+    {"gt", u'>'},         {"comma", u','},        {"lf", 10},
+    {"quote", u'"'},      {"openparen", u'('},    {"cr", 13},
+    {"amp", u'&'},        {"closeparen", u')'},   {"tab", 9},
+    {"backslash", u'\\'}, {"openbracket", u'['},  {"bell", 7},
+    {"solidus", u'/'},    {"closebracket", u']'}, {"backspace", 8},
+    {"apos", u'\''},      {"opencurly", u'{'},    {"verttab", 11},
+    {"dollar", u'$'},     {"closecurly", u'}'},   {"formfeed", 12},
+    {"at", u'@'},
 };
 
 inline std::string wwjdEncoded(std::u16string_view text) {
@@ -44,7 +48,8 @@ inline std::string wwjdEncoded(std::u16string_view text) {
     return encoded;
 }
 
-/// The hexadecimal number at the start of `text`, cut to 16 bits: white space, a sign and "0x" may stand before it.
+/// The hexadecimal number at the start of `text`, cut to 16 bits: white space, a sign and "0x" may stand
+/// before it.
 inline char16_t leadingHex(std::string_view text) {
     const auto digit = [&](std::size_t at) -> int {
         constexpr std::string_view digits = "0123456789abcdef0123456789ABCDEF";

@@ -1,4 +1,5 @@
-// What a call threw, flattened to plain text so that a test compares all of it at once and prints what differs.
+// What a call threw, flattened to plain text so that a test compares all of it at once and prints what
+// differs.
 //
 //     EXPECT_EQ(failureOf([&] { UString<1>("\xC3\xA9"); }),
 //               transcodingFailure("\u00e9", "UTF-8", "US-ASCII", "\x1A", "\x1A"));
@@ -19,7 +20,7 @@
 namespace kvt::test {
 
 /// Control bytes and bytes from 128 up as \xHH, as failures show them.
-inline std::string escaped(std::string_view bytes) {
+inline std::string printable(std::string_view bytes) {
     std::string text;
     for (const char c : bytes) {
         const auto byte = static_cast<unsigned char>(c);
@@ -44,10 +45,10 @@ struct FailureRecord {
         }
         stream << record.type << ' ' << record.number;
         for (const std::string& parameter : record.parameters) {
-            stream << " [" << escaped(parameter) << ']';
+            stream << " [" << printable(parameter) << ']';
         }
         for (const auto& [name, value] : record.pairs) {
-            stream << ' ' << name << "=[" << escaped(value) << ']';
+            stream << ' ' << name << "=[" << printable(value) << ']';
         }
         return stream << (record.text.empty() ? "" : " text: ") << record.text;
     }
@@ -57,18 +58,17 @@ inline FailureRecord recordOf(const kvt::ex::Throwable& failure) {
     using kvt::ex::UString;
     FailureRecord record;
     record.type = failure.className().toStdString();
-    failure.processInfo(
-        [&](const UString<0>& message) { record.text += message.toStdString(); },
-        [&](const UString<0>&, const UString<0>&, int) { record.text += "(a stack frame)"; },
-        [&](const UString<0>& name, const UString<0>& value) {
-            record.pairs.emplace_back(name.toStdString(), value.toStdString());
-        },
-        [&](unsigned long number, const kvt::ex::UStringArray<0>& parameters) {
-            record.number = number;
-            for (const UString<0>& parameter : parameters) {
-                record.parameters.push_back(parameter.toStdString());
-            }
-        });
+    failure.processInfo([&](const UString<0>& message) { record.text += message.toStdString(); },
+                        [&](const UString<0>&, const UString<0>&, int) { record.text += "(a stack frame)"; },
+                        [&](const UString<0>& name, const UString<0>& value) {
+                            record.pairs.emplace_back(name.toStdString(), value.toStdString());
+                        },
+                        [&](unsigned long number, const kvt::ex::UStringArray<0>& parameters) {
+                            record.number = number;
+                            for (const UString<0>& parameter : parameters) {
+                                record.parameters.push_back(parameter.toStdString());
+                            }
+                        });
     return record;
 }
 
@@ -98,8 +98,9 @@ inline FailureRecord badEncodingFailure(std::string_view bytes, std::string_view
                                         std::string_view substitution) {
     return {"kvt::ex::UStringBadEncodingException",
             910002,
-            {escaped(bytes), std::string(from)},
-            {{"substituted_conversion", std::string(lossy)}, {"substitution_characters", std::string(substitution)}},
+            {printable(bytes), std::string(from)},
+            {{"substituted_conversion", std::string(lossy)},
+             {"substitution_characters", std::string(substitution)}},
             ""};
 }
 
@@ -108,12 +109,13 @@ inline FailureRecord transcodingFailure(std::string_view text, std::string_view 
     return {"kvt::ex::UStringTranscodingException",
             910003,
             {std::string(text), std::string(from), std::string(to)},
-            {{"substituted_conversion", std::string(lossy)}, {"substitution_characters", std::string(substitution)}},
+            {{"substituted_conversion", std::string(lossy)},
+             {"substitution_characters", std::string(substitution)}},
             ""};
 }
 
 inline FailureRecord binaryFailure(std::string_view bytes) {
-    return {"kvt::ex::UStringBinaryTranscodingException", 910004, {escaped(bytes)}, {}, ""};
+    return {"kvt::ex::UStringBinaryTranscodingException", 910004, {printable(bytes)}, {}, ""};
 }
 
 inline FailureRecord invalidEncodingFailure(std::string_view name) {

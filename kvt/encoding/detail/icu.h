@@ -26,10 +26,10 @@ std::string_view errorName(int error);
 /// within ICU and must not throw.
 class LossListener {
 public:
-    /// Bytes that are no text. `behind` is the place in the converter's input behind them, `error` ICU's code.
-    virtual void onBadInput(std::string_view bytes, const char* behind, int error) noexcept = 0;
-    /// A character without a form in the converter's encoding; `behind` as above.
-    virtual void onNotRepresentable(char32_t codePoint, const char16_t* behind, int error) noexcept = 0;
+    /// Bytes that are no text; `error` is ICU's code.
+    virtual void onBadInput(std::string_view bytes, int error) noexcept = 0;
+    /// A character without a form in the converter's encoding.
+    virtual void onNotRepresentable(char32_t codePoint, int error) noexcept = 0;
 
 protected:
     ~LossListener() = default;
@@ -63,16 +63,20 @@ public:
     /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
     Form form();
 
-    /// Whether the converter holds input of which it has not given the output yet.
-    bool holdsBytes() const;
-    bool holdsUnits() const;
-    /// Bytes held as the beginning of a character.
-    std::size_t heldBytes() const;
+    /// Whether nothing but the beginning of a character is ever carried from one piece of text to the next.
+    bool isStateless() const;
+    /// A converter in the same state, with the same listener; not open when ICU cannot copy this one.
+    Converter clone() const;
 
-    /// From bytes to UTF-16. `source` and `target` are moved on; `offsets` gets, for each unit, the place in
-    /// `source` of the character it comes from, -1 when that began in an earlier call.
+    /// Bytes held as the beginning of a character, none where the converter does not count them.
+    std::size_t heldBytes() const;
+    bool countsHeldBytes() const;
+    /// Whether UTF-16 is held of which the output has not been given yet.
+    bool holdsUnits() const;
+
+    /// From bytes to UTF-16. `source` and `target` are moved on.
     Progress toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
-                       std::int32_t* offsets, bool flush);
+                       bool flush);
     /// From UTF-16 to bytes.
     Progress fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target, const char* targetEnd,
                          bool flush);
@@ -87,8 +91,11 @@ private:
         void operator()(UConverter* converter) const noexcept;
     };
 
+    bool forgetsToReset() const;
+
     std::unique_ptr<UConverter, Close> converter_;
     Encoding encoding_ = Encoding::Unknown;
+    LossListener* listener_ = nullptr;
 };
 
 } // namespace kvt::ex::detail::icu

@@ -19,7 +19,7 @@ namespace kvt::ex::detail {
 /// How the bytes of an encoding can be read and written without ICU.
 enum class Form : std::uint8_t {
     other,           ///< only by ICU
-    asciiCompatible, ///< stateless, and bytes below 128 are the ASCII characters, alone and between others
+    asciiCompatible, ///< stateless, and a byte below 128 where a character begins is that ASCII character
     utf8,
     utf16le,
     utf16be,
@@ -34,7 +34,9 @@ template <typename CharOut>
 std::size_t convertPrefix(Form from, Form to, std::string_view in, std::basic_string<CharOut>& out);
 
 extern template std::size_t convertPrefix<char>(Form, Form, std::string_view, std::basic_string<char>&);
-extern template std::size_t convertPrefix<char16_t>(Form, Form, std::string_view, std::basic_string<char16_t>&);
-extern template std::size_t convertPrefix<char32_t>(Form, Form, std::string_view, std::basic_string<char32_t>&);
+extern template std::size_t convertPrefix<char16_t>(Form, Form, std::string_view,
+                                                    std::basic_string<char16_t>&);
+extern template std::size_t convertPrefix<char32_t>(Form, Form, std::string_view,
+                                                    std::basic_string<char32_t>&);
 
 } // namespace kvt::ex::detail

@@ -32,8 +32,8 @@ public:
     bool takeLoss();
 
 private:
-    void onBadInput(std::string_view bytes, const char* behind, int error) noexcept override;
-    void onNotRepresentable(char32_t codePoint, const char16_t* behind, int error) noexcept override;
+    void onBadInput(std::string_view bytes, int error) noexcept override;
+    void onNotRepresentable(char32_t codePoint, int error) noexcept override;
 
     icu::Converter converter_;
     std::int32_t lastError_ = 0;

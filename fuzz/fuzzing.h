@@ -1,0 +1,88 @@
+// What the fuzzers share: how an input is read, and how one of them says that something is wrong.
+#pragma once
+
+#include <reference/icu_reference.h>
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <cstdlib>
+#include <iostream>
+#include <string>
+#include <string_view>
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);
+
+namespace kvt::fuzz {
+
+/// Reads decisions from the front of an input; what is left is the text.
+class Input {
+public:
+    Input(const std::uint8_t* data, std::size_t size) : rest_(reinterpret_cast<const char*>(data), size) {}
+
+    /// 0 when the input has ended.
+    unsigned byte() {
+        if (rest_.empty()) {
+            return 0;
+        }
+        const auto value = static_cast<unsigned char>(rest_.front());
+        rest_.remove_prefix(1);
+        return value;
+    }
+    std::string_view rest() const { return rest_; }
+
+    /// One of a table.
+    template <typename T, std::size_t N>
+    const T& pick(const T (&table)[N]) {
+        return table[byte() % N];
+    }
+
+private:
+    std::string_view rest_;
+};
+
+/// Stops the fuzzer, with what was seen and what should have been.
+template <typename Actual, typename Expected>
+void requireEqual(const Actual& actual, const Expected& expected, const std::string& what) {
+    if (!(actual == expected)) {
+        std::cerr << what << "\nis:       " << actual << "\nexpected: " << expected << '\n';
+        std::abort();
+    }
+}
+
+inline void require(bool condition, const std::string& what) {
+    if (!condition) {
+        std::cerr << what << '\n';
+        std::abort();
+    }
+}
+
+/// One converter of each kind that ICU has, by canonical names. The order is part of the corpus: add at the end.
+inline constexpr const char* encodings[] = {
+    "UTF-8",
+    "UTF-16LE",
+    "UTF-16BE",
+    "UTF-32LE",
+    "UTF-32BE",
+    "US-ASCII",
+    "ISO-8859-1",
+    "windows-1252",
+    "KOI8-R",
+    "Shift_JIS",
+    "EUC-JP",
+    "GB18030",
+    "Big5",
+    "ISO-2022-JP",
+    "UTF-7",
+    "CESU-8",
+    "SCSU",
+    "BOCU-1",
+    "HZ-GB-2312",
+    "IBM037",
+    "ibm-930_P120-1999",
+    "ibm-16684_P110-2003",
+    "IMAP-mailbox-name",
+    "ISO-2022-CN",
+};
+
+} // namespace kvt::fuzz

@@ -1,0 +1,124 @@
+// Strings of each type made from bytes in any encoding, against ICU alone; and from each of them to all others,
+// which must end in a string or in one of the stated failures, whatever the bytes are.
+//
+// Input: encoding, then the bytes.
+#include <fuzzing.h>
+#include <reference/wwjd_reference.h>
+#include <support/outcome.h>
+
+#include <kvt/string/ustring.h>
+
+#include <stdexcept>
+
+using namespace kvt::ex;
+using namespace kvt::fuzz;
+using kvt::test::Outcome;
+
+namespace {
+
+template <std::uint32_t N>
+std::string bytesOf(const UString<N>& string) {
+    return {reinterpret_cast<const char*>(string.rawData()),
+            string.size() * sizeof(typename UString<N>::value_type)};
+}
+
+/// A failed construction leaves no string behind, so that only the failure can be compared.
+template <std::uint32_t N>
+Outcome construct(std::string_view bytes, const std::string& from) {
+    std::string made;
+    Outcome outcome =
+        kvt::test::outcomeOf([&] { made = bytesOf(UString<N>(bytes.data(), bytes.size(), Encoding(from))); });
+    outcome.bytes = made;
+    return outcome;
+}
+
+Outcome expected(const std::string& from, const std::string& to, std::string_view bytes) {
+    if (from == to && to.starts_with("UTF-16")) {
+        bytes.remove_suffix(bytes.size() % 2);
+    }
+    if (from == to && to.starts_with("UTF-32")) {
+        bytes.remove_suffix(bytes.size() % 4);
+    }
+    Outcome outcome = kvt::test::expectedAssign(from, to, bytes);
+    if (outcome.number != 0) {
+        outcome.bytes.clear();
+    }
+    return outcome;
+}
+
+template <std::uint32_t N>
+void checkConstruction(const std::string& from, const std::string& to, std::string_view bytes) {
+    requireEqual(construct<N>(bytes, from), expected(from, to, bytes),
+                 "UString<" + std::to_string(N) + "> from " + from + " " + kvt::test::hex(bytes));
+}
+
+void checkWwjd(const std::string& from, std::string_view bytes) {
+    const Outcome utf16 = expected(from, "UTF-16LE", bytes);
+    const Outcome outcome = construct<29>(bytes, from);
+    requireEqual(outcome.number, utf16.number, "UString<29> from " + from + " " + kvt::test::hex(bytes));
+    if (utf16.number == 0) {
+        std::u16string units(utf16.bytes.size() / 2, u'\0');
+        utf16.bytes.copy(reinterpret_cast<char*>(units.data()), units.size() * 2);
+        requireEqual(outcome.bytes, kvt::test::reference::wwjdEncoded(units), "UString<29> from " + from);
+    }
+}
+
+/// Whatever a string holds, a conversion gives a string or a failure of its own kind.
+template <std::uint32_t N, std::uint32_t M>
+void convertTo(const UString<N>& source) {
+    try {
+        UString<M> target(source);
+        target.assign(source);
+        require(target.rawData()[target.size()] == 0, "no zero behind the text");
+    } catch (const Throwable& failure) {
+        require(!failure.what().isEmpty(), "a failure without contents");
+    } catch (const std::invalid_argument&) {
+        require(N == 29 || (N == 30 && source.encoding() == Encoding(Encoding::Wwjd)),
+                "a number outside of wwjd");
+    }
+}
+
+template <std::uint32_t N>
+void convertToAll(const UString<N>& source) {
+    convertTo<N, 0>(source);
+    convertTo<N, 1>(source);
+    convertTo<N, 2>(source);
+    convertTo<N, 3>(source);
+    convertTo<N, 27>(source);
+    convertTo<N, 28>(source);
+    convertTo<N, 29>(source);
+    convertTo<N, 30>(source);
+}
+
+template <std::uint32_t N>
+void convertBytesLabelled(std::string_view bytes) {
+    convertToAll(UString<N>(bytes.data(), bytes.size(), static_cast<Encoding::Type>(N)));
+}
+
+} // namespace
+
+int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+    Input input(data, size);
+    const std::string from = input.pick(encodings);
+    const std::string_view bytes = input.rest();
+    checkConstruction<0>(from, "UTF-8", bytes);
+    checkConstruction<1>(from, "US-ASCII", bytes);
+    checkConstruction<2>(from, "UTF-16LE", bytes);
+    checkConstruction<3>(from, "UTF-32LE", bytes);
+    checkConstruction<27>(from, std::string(Encoding(Encoding::System).getName()), bytes);
+    checkWwjd(from, bytes);
+    requireEqual(construct<28>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<28>");
+    requireEqual(construct<30>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<30>");
+
+    convertBytesLabelled<0>(bytes);
+    convertBytesLabelled<1>(bytes);
+    convertBytesLabelled<2>(bytes);
+    convertBytesLabelled<3>(bytes);
+    convertBytesLabelled<27>(bytes);
+    convertBytesLabelled<28>(bytes);
+    convertBytesLabelled<29>(bytes);
+    convertBytesLabelled<30>(bytes);
+    convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding(from)));
+    convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding::Wwjd));
+    return 0;
+}

@@ -1,0 +1,128 @@
+// The command line: help, version, and what is said about words that nobody knows.
+
+#include "host_test.h"
+
+#include <sstream>
+
+namespace kvt::test {
+
+class KvtCommandLine : public HostTest {};
+
+TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
+    for (const std::vector<std::string>& command : {std::vector<std::string>{},
+                                                    {"convert"},
+                                                    {"encodings"},
+                                                    {"wwjd"},
+                                                    {"wwjd", "encode"},
+                                                    {"wwjd", "decode"},
+                                                    {"explain"}}) {
+        for (const char* option : {"--help", "-h"}) {
+            std::vector<std::string> arguments = command;
+            arguments.push_back(option);
+            const ChildResult result = kvt(arguments);
+            const std::string name = command.empty() ? "kvt" : command.back();
+            EXPECT_EQ(result.status, 0) << name;
+            EXPECT_EQ(result.err, "") << name;
+            EXPECT_TRUE(result.out.starts_with("Example:\n  ")) << result.out;
+            EXPECT_TRUE(contains(result.out.substr(0, result.out.find('\n', 12)), "kvt")) << result.out;
+            const std::size_t statuses = result.out.find("\nExit status");
+            ASSERT_NE(statuses, std::string::npos) << name;
+            EXPECT_NE(result.out.find("\n  0  ", statuses), std::string::npos) << name;
+            EXPECT_NE(result.out.find("\n  2  ", statuses), std::string::npos) << name;
+        }
+    }
+    EXPECT_TRUE(contains(kvt({"convert", "--help"}).out, "\n  1  "));
+}
+
+TEST_F(KvtCommandLine, HelpFitsATerminal) {
+    for (const std::string command : {"convert", "encodings", "explain"}) {
+        std::istringstream lines(kvt({command, "--help"}).out);
+        for (std::string line; std::getline(lines, line) && !line.empty();) {
+            // Examples are command lines and stay whole.
+        }
+        for (std::string line; std::getline(lines, line);) {
+            EXPECT_LE(line.size(), 81u) << line;
+        }
+    }
+}
+
+TEST_F(KvtCommandLine, HelpOfTheProgramListsTheCommands) {
+    const std::string help = kvt({"--help"}).out;
+    for (const char* command : {"convert", "encodings", "wwjd", "explain"}) {
+        EXPECT_TRUE(contains(help, std::string("\n  ") + command + " ")) << help;
+    }
+}
+
+TEST_F(KvtCommandLine, VersionNamesTheLibraryIcuAndBoost) {
+    const ChildResult result = kvt({"--version"});
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.err, "");
+    std::istringstream words(result.out);
+    std::string kvtWord, kvtVersion, icuWord, icuVersion, boostWord, boostVersion, more;
+    words >> kvtWord >> kvtVersion >> icuWord >> icuVersion >> boostWord >> boostVersion;
+    EXPECT_EQ(kvtWord, "kvt");
+    EXPECT_EQ(kvtVersion, KVT_VERSION);
+    EXPECT_EQ(icuWord, "ICU");
+    EXPECT_GE(std::stod(icuVersion), 58.0);
+    EXPECT_EQ(boostWord, "Boost");
+    EXPECT_TRUE(boostVersion.starts_with("1.")) << boostVersion;
+    EXPECT_FALSE(words >> more);
+}
+
+TEST_F(KvtCommandLine, NoCommandShowsTheHelpOnStandardError) {
+    const ChildResult result = kvt({});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.out, "");
+    EXPECT_TRUE(result.err.starts_with("Example:")) << result.err;
+}
+
+TEST_F(KvtCommandLine, UnknownWordsSuggestTheNearest) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string error;
+    };
+    const std::string tryKvt = "Try 'kvt --help'.\n";
+    const std::string tryConvert = "Try 'kvt convert --help'.\n";
+    const std::vector<Row> rows = {
+        {{"convrt"}, "kvt: unknown command 'convrt'. Did you mean 'convert'?\n" + tryKvt},
+        {{"encoding", "UTF-8"}, "kvt: unknown command 'encoding'. Did you mean 'encodings'?\n" + tryKvt},
+        {{"xyzzy"}, "kvt: unknown command 'xyzzy'.\n" + tryKvt},
+        {{"--verison"}, "kvt: unknown option '--verison'. Did you mean '--version'?\n" + tryKvt},
+        {{"convert", "--form", "UTF-8", "--to", "UTF-8"},
+         "kvt: unknown option '--form'. Did you mean '--from'?\n" + tryConvert},
+        {{"convert", "--from", "UTF-8", "--to", "UTF-8", "--on-eror=stop"},
+         "kvt: unknown option '--on-eror'. Did you mean '--on-error'?\n" + tryConvert},
+        {{"convert", "--from", "UTF-8", "--to", "UTF-8", "--zzzzzz"},
+         "kvt: unknown option '--zzzzzz'.\n" + tryConvert},
+        {{"encodings", "--jsno"},
+         "kvt: unknown option '--jsno'. Did you mean '--json'?\nTry 'kvt encodings --help'.\n"},
+        {{"wwjd", "encdoe"},
+         "kvt: unknown command 'encdoe'. Did you mean 'encode'?\nTry 'kvt wwjd --help'.\n"},
+        {{"wwjd"}, "kvt: which command? There are 'encode', 'decode'.\nTry 'kvt wwjd --help'.\n"},
+        {{"wwjd", "encode", "--ouptut", "x"},
+         "kvt: unknown option '--ouptut'. Did you mean '--output'?\nTry 'kvt wwjd encode --help'.\n"},
+    };
+    for (const Row& row : rows) {
+        const ChildResult result = kvt(row.arguments);
+        EXPECT_EQ(result.status, 2) << row.error;
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.err, row.error);
+    }
+}
+
+TEST_F(KvtCommandLine, MissingOptionsAreNamed) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string part;
+    };
+    for (const Row& row :
+         {Row{{"convert", "--to", "UTF-8"}, "--from"}, Row{{"convert", "--from", "UTF-8"}, "--to"},
+          Row{{"convert", "--from", "UTF-8", "--to"}, "--to"}, Row{{"explain"}, "NUMBER"}}) {
+        const ChildResult result = kvt(row.arguments);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.out, "");
+        EXPECT_TRUE(contains(result.err, row.part)) << result.err;
+    }
+}
+
+} // namespace kvt::test

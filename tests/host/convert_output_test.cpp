@@ -1,0 +1,211 @@
+// Output files: whole or not at all, whatever happens on the way.
+
+#include "encode.h"
+#include "host_test.h"
+
+#include <csignal>
+#include <sys/stat.h>
+
+namespace kvt::test {
+
+namespace {
+
+mode_t modeOf(const std::string& path) {
+    struct stat file {};
+    return ::stat(path.c_str(), &file) == 0 ? file.st_mode & 07777 : 0;
+}
+
+} // namespace
+
+class KvtConvertOutput : public HostTest {
+protected:
+    // Waits until the program has its temporary file.
+    void waitForTemporary(std::size_t files) {
+        for (int tries = 0; tries < 1000 && names().size() < files; ++tries) {
+            ::usleep(10000);
+        }
+        ASSERT_EQ(names().size(), files);
+    }
+};
+
+TEST_F(KvtConvertOutput, AnInterruptedConversionLeavesWhatWasThere) {
+    for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
+        write("out", "old");
+        RunningChild child(
+            setup({"convert", "--from", "UTF-8", "--to", "US-ASCII", "--report", "losses", "-o", "out"}));
+        child.write(std::string(300000, 'x') + "\u0141");
+        waitForTemporary(3);
+        EXPECT_EQ(read("out"), "old");
+        child.signal(number);
+        EXPECT_EQ(child.wait(), 128 + number);
+        EXPECT_EQ(names(), std::vector<std::string>{"out"}) << number;
+        EXPECT_EQ(read("out"), "old");
+    }
+}
+
+TEST_F(KvtConvertOutput, AKilledConversionLeavesWhatWasThere) {
+    write("out", "old");
+    RunningChild child(setup({"convert", "--from", "UTF-8", "--to", "UTF-8", "-o", "out"}));
+    child.write(std::string(300000, 'x'));
+    waitForTemporary(2);
+    child.signal(SIGKILL);
+    EXPECT_EQ(child.wait(), 128 + SIGKILL);
+    EXPECT_EQ(read("out"), "old");
+}
+
+TEST_F(KvtConvertOutput, AnIgnoredSignalStaysIgnored) {
+    ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-8", "-o", "out"});
+    made.ignoredSignal = SIGHUP;
+    RunningChild child(made);
+    child.write("text");
+    waitForTemporary(1);
+    child.signal(SIGHUP);
+    child.write(" goes on");
+    EXPECT_EQ(child.wait(), 0);
+    EXPECT_EQ(read("out"), "text goes on");
+}
+
+TEST_F(KvtConvertOutput, AFailureLeavesWhatWasThere) {
+    write("out", "old");
+    EXPECT_EQ(convert("UTF-8", "US-ASCII", "a\u0141", {"-o", "out"}).status, 2);
+    EXPECT_EQ(convert("UTF-8", "US-ASCII", "a", {"-o", "out", "-", "missing"}).status, 2);
+    EXPECT_EQ(read("out"), "old");
+    EXPECT_EQ(names(), std::vector<std::string>{"out"});
+}
+
+TEST_F(KvtConvertOutput, InputAndOutputMayBeOneFile) {
+    const std::u32string text(400000, U'\u00e9');
+    write("file", utf8Of(text));
+    EXPECT_EQ(convert("UTF-8", "UTF-16LE", "", {"file", "-o", "file"}).status, 0);
+    EXPECT_EQ(read("file"), utf16Of(text, false));
+    EXPECT_EQ(names(), std::vector<std::string>{"file"});
+    // Through a link, and with a loss.
+    std::filesystem::create_symlink("file", path("link"));
+    EXPECT_EQ(convert("UTF-16LE", "US-ASCII", "", {"file", "-o", "link"}).status, 2);
+    EXPECT_EQ(read("file"), utf16Of(text, false));
+}
+
+TEST_F(KvtConvertOutput, StandardOutputThatIsTheInputIsRefused) {
+    // Each block that is written would be read again, for ever.
+    write("file", "text");
+    ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-8", "file"});
+    made.outputFile = path("file");
+    made.appendOutput = true;
+    const ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: file is both input and output; use -o, which writes beside it\n");
+    EXPECT_EQ(read("file"), "text");
+}
+
+TEST_F(KvtConvertOutput, ANewFileHasTheModeThatTheMaskAllows) {
+    const mode_t before = ::umask(027);
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "a", {"-o", "out"}).status, 0);
+    ::umask(before);
+    EXPECT_EQ(modeOf(path("out")), 0640u);
+}
+
+TEST_F(KvtConvertOutput, AReplacedFileKeepsItsMode) {
+    write("out", "old");
+    ::chmod(path("out").c_str(), 0751);
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "new", {"-o", "out"}).status, 0);
+    EXPECT_EQ(modeOf(path("out")), 0751u);
+    EXPECT_EQ(read("out"), "new");
+}
+
+TEST_F(KvtConvertOutput, ASymbolicLinkStaysOne) {
+    std::filesystem::create_directory(path("folder"));
+    write("folder/target", "old");
+    std::filesystem::create_symlink("folder/target", path("link"));
+    std::filesystem::create_symlink("folder/new", path("dangling"));
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "one", {"-o", "link"}).status, 0);
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "two", {"-o", "dangling"}).status, 0);
+    EXPECT_TRUE(std::filesystem::is_symlink(path("link")));
+    EXPECT_TRUE(std::filesystem::is_symlink(path("dangling")));
+    EXPECT_EQ(read("folder/target"), "one");
+    EXPECT_EQ(read("folder/new"), "two");
+}
+
+TEST_F(KvtConvertOutput, AVeryLongNameIsWritten) {
+    const std::string name(255, 'n');
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "a", {"-o", name}).status, 0);
+    EXPECT_EQ(read(name), "a");
+}
+
+TEST_F(KvtConvertOutput, PlacesThatCannotBeWrittenAreRefused) {
+    struct Row {
+        std::string output;
+        std::string error;
+    };
+    std::filesystem::create_directory(path("folder"));
+    for (const Row& row : {Row{"folder", "kvt: cannot write folder: Is a directory\n"},
+                           Row{"missing/out", "kvt: cannot create missing/out: No such file or directory\n"},
+                           Row{"/proc/out", "kvt: cannot create /proc/out: No such file or directory\n"}}) {
+        const ChildResult result = convert("UTF-8", "UTF-8", "a", {"-o", row.output});
+        EXPECT_EQ(result.status, 2) << row.output;
+        EXPECT_EQ(result.err, row.error);
+        EXPECT_EQ(names(), std::vector<std::string>{"folder"});
+    }
+}
+
+TEST_F(KvtConvertOutput, AFullDiskIsAFailure) {
+    const std::string full = "No space left on device\n";
+    ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-8"});
+    made.input = "text";
+    made.outputFile = "/dev/full";
+    ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write to standard output: " + full);
+
+    result = convert("UTF-8", "UTF-8", "text", {"-o", "/dev/full"});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write /dev/full: " + full);
+
+    result = convert("UTF-8", "US-ASCII", "\u0141", {"--report", "/dev/full", "-o", "out"});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write /dev/full: " + full);
+    EXPECT_TRUE(names().empty());
+
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"encodings"}, {"--help"}, {"--version"}, {"explain", "910002"}}) {
+        ChildSetup other = setup(arguments);
+        other.outputFile = "/dev/full";
+        EXPECT_EQ(runChild(other).status, 2) << arguments.front();
+    }
+}
+
+TEST_F(KvtConvertOutput, AFileThatGrowsTooLongIsAFailure) {
+    write("out", "old");
+    ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-16LE", "-o", "out"});
+    made.input = std::string(300000, 'x');
+    made.mostFileBytes = 100000;
+    const ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write out: File too large\n");
+    EXPECT_EQ(read("out"), "old");
+    EXPECT_EQ(names(), std::vector<std::string>{"out"});
+}
+
+TEST_F(KvtConvertOutput, DevicesAreWrittenToAndNotReplaced) {
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "text", {"-o", "/dev/null"}).status, 0);
+    EXPECT_TRUE(std::filesystem::is_character_file("/dev/null"));
+    const ChildResult result = convert("UTF-8", "UTF-8", "text", {"-o", "/dev/stdout"});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out, "text");
+}
+
+TEST_F(KvtConvertOutput, AWriteProtectedFileIsNotReplaced) {
+    write("out", "old");
+    ::chmod(path("out").c_str(), 0444);
+    const ChildResult result = convert("UTF-8", "UTF-8", "new", {"-o", "out"});
+    // For root no file is protected.
+    if (::geteuid() == 0) {
+        EXPECT_EQ(result.status, 0);
+        EXPECT_EQ(read("out"), "new");
+    } else {
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.err, "kvt: cannot write out: Permission denied\n");
+        EXPECT_EQ(read("out"), "old");
+    }
+}
+
+} // namespace kvt::test

@@ -1,0 +1,7 @@
+// The commands, one line for each, in the order in which the help lists them. Included by whoever wants the list,
+// with KVT_COMMAND(name) defined for the purpose; hence no include guard.
+
+KVT_COMMAND(convert)
+KVT_COMMAND(encodings)
+KVT_COMMAND(wwjd)
+KVT_COMMAND(explain)

@@ -1,0 +1,49 @@
+// All encodings by name: those that the library knows by heart and every converter of ICU, with all their names.
+#pragma once
+
+#include <kvt/encoding/encoding.h>
+
+#include <cstdint>
+#include <map>
+#include <string>
+#include <vector>
+
+namespace host {
+
+struct EncodingEntry {
+    std::string name;
+    std::uint32_t id;
+    bool singleByte;
+    bool asciiCompatible;
+    /// Every other name under which the library finds it and ICU lists it.
+    std::vector<std::string> aliases;
+};
+
+class EncodingCatalogue {
+public:
+    EncodingCatalogue();
+
+    /// The fixed ids first, then the others by name.
+    std::vector<EncodingEntry> all() const;
+    /// For an encoding that is not `Unknown`; it need not be one of all().
+    EncodingEntry entry(kvt::ex::Encoding encoding) const;
+    /// Every name and alias, for suggestions.
+    std::vector<std::string> names() const;
+
+private:
+    struct Known {
+        kvt::ex::Encoding encoding;
+        std::vector<std::string> aliases;
+    };
+    std::vector<std::string>& aliasesFor(kvt::ex::Encoding encoding);
+
+    std::map<std::uint32_t, Known> known_;
+};
+
+/// The encoding of that name, which must have a converter. Throws Failure with suggestions.
+kvt::ex::Encoding textEncoding(const std::string& name);
+
+/// What to say about a name that nobody knows.
+std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue);
+
+} // namespace host

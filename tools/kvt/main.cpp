@@ -1,0 +1,30 @@
+// The kvt program. What it does stands in the *_command.cpp files; here is what becomes of a failure.
+
+#include "command_line.h"
+#include "diagnostics.h"
+#include "exit_status.h"
+#include "failure.h"
+#include "interrupt.h"
+#include "messages.h"
+
+#include <kvt/foundation/throwable.h>
+
+#include <exception>
+#include <new>
+
+int main(int argc, char** argv) {
+    host::prepareProcess();
+    host::Diagnostics diagnostics;
+    try {
+        return host::runCommandLine(argc, argv, diagnostics);
+    } catch (const host::ClosedPipe&) {
+        // Nobody listens, so there is nothing to say.
+    } catch (const kvt::ex::Throwable& failure) {
+        diagnostics.say(host::describe(failure));
+    } catch (const std::bad_alloc&) {
+        diagnostics.say("out of memory");
+    } catch (const std::exception& failure) {
+        diagnostics.say(failure.what());
+    }
+    return host::NotDone;
+}
