@@ -26,7 +26,7 @@ void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, 
                        UConverterCallbackReason reason, UErrorCode* error) {
     if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
         auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
-        listener->onBadInput({bytes, static_cast<std::size_t>(length)}, *error);
+        listener->onBadInput({bytes, static_cast<std::size_t>(length)}, arguments->target, *error);
     }
     UCNV_TO_U_CALLBACK_SUBSTITUTE(nullptr, arguments, bytes, length, reason, error);
 }
@@ -79,6 +79,13 @@ bool keepsAscii(UConverter* converter) {
     return U_SUCCESS(error) && decodedCount == count && encodedCount == count &&
            std::equal(units.begin(), units.end(), decoded.begin()) &&
            std::equal(bytes.begin(), bytes.end(), encoded.begin());
+}
+
+// Whether each character is one byte, and each byte by itself a character or none. US-ASCII is left out, which needs
+// no table.
+bool isSingleByte(UConverter* converter) {
+    const UConverterType type = ucnv_getType(converter);
+    return (type == UCNV_SBCS || type == UCNV_LATIN_1) && ucnv_getMaxCharSize(converter) == 1;
 }
 
 } // namespace
@@ -171,8 +178,15 @@ Form Converter::form() {
     case Encoding::Utf32BE:
         return Form::utf32be;
     default:
-        return isOpen() && keepsAscii(converter_.get()) ? Form::asciiCompatible : Form::other;
+        break;
     }
+    if (!isOpen()) {
+        return Form::other;
+    }
+    if (isSingleByte(converter_.get())) {
+        return keepsAscii(converter_.get()) ? Form::asciiSingleByte : Form::singleByte;
+    }
+    return keepsAscii(converter_.get()) ? Form::asciiCompatible : Form::other;
 }
 
 bool Converter::isStateless() const {
@@ -217,7 +231,14 @@ std::size_t Converter::heldBytes() const {
 }
 
 bool Converter::countsHeldBytes() const {
-    return ucnv_getType(converter_.get()) != UCNV_HZ;
+    switch (ucnv_getType(converter_.get())) {
+    case UCNV_HZ:
+    case UCNV_UTF7:
+    case UCNV_IMAP_MAILBOX:
+        return false;
+    default:
+        return true;
+    }
 }
 
 bool Converter::holdsUnits() const {

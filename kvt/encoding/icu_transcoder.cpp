@@ -40,7 +40,7 @@ Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderH
     if (bytes.empty()) {
         return Losses::none;
     }
-    bytes.remove_prefix(detail::convertPrefix(from.form(), to.form(), bytes, out));
+    bytes.remove_prefix(detail::convertPrefix(from.side(), to.side(), bytes, out));
     CharOut buffer[outputUnits];
     bool reset = true;
     while (!bytes.empty()) {

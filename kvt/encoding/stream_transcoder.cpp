@@ -8,11 +8,13 @@
 
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
+#include <kvt/encoding/detail/single_byte_table.h>
 #include <kvt/foundation/throwable.h>
 
 #include <algorithm>
 #include <array>
 #include <exception>
+#include <optional>
 #include <vector>
 
 namespace kvt::ex {
@@ -62,7 +64,7 @@ struct Unit {
 class StreamTranscoder::Impl final : private detail::icu::LossListener {
 public:
     Impl(Encoding from, Encoding to)
-        : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()),
+        : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from), toTable_(to),
           hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
           isStateless_(from_.isStateless() && to_.isStateless()), substitution_(to_.substitution()) {
         from_.setListener(*this);
@@ -75,7 +77,7 @@ public:
         while (!block.empty()) {
             std::size_t taken = 0;
             if (hasShortcut_ && holdsNothing()) {
-                taken = detail::convertPrefix(fromForm_, toForm_, block, out);
+                taken = detail::convertPrefix({fromForm_, &fromTable_}, {toForm_, &toTable_}, block, out);
                 passOver(block.substr(0, taken));
                 block.remove_prefix(taken);
             }
@@ -94,6 +96,7 @@ public:
         recent_.clear();
         position_ = 0;
         characterBegin_ = 0;
+        settledEnd_ = 0;
     }
 
     std::uint64_t position() const { return position_; }
@@ -111,29 +114,37 @@ private:
     void keepRecent(std::string_view bytes);
     void report(const LossHandler& onLoss);
 
-    void onBadInput(std::string_view bytes, int error) noexcept override;
+    void onBadInput(std::string_view bytes, const char16_t* target, int error) noexcept override;
     void onNotRepresentable(char32_t codePoint, int error) noexcept override;
+    void recordBadInput(std::string_view bytes, std::size_t index);
     void recordNotRepresentable(char32_t codePoint);
+    std::optional<std::uint64_t> placeOfBadInput(std::string_view bytes, std::size_t between) const;
+    void attribute(std::size_t behind, std::uint64_t end);
+    std::uint64_t recentBegin() const { return position_ - recent_.size(); }
     std::string bytesOfInput(std::uint64_t begin, std::uint64_t end) const;
 
     Converter from_;
     Converter to_;
     Form fromForm_;
     Form toForm_;
+    detail::SingleByteTable fromTable_;
+    detail::SingleByteTable toTable_;
     bool hasShortcut_;
     bool isStateless_;
     std::string substitution_;
 
     std::uint64_t position_ = 0;
-    std::uint64_t characterBegin_ = 0; // The place behind the last character that came out.
-    std::string recent_;               // The last bytes before position_.
+    std::uint64_t characterBegin_ = 0; // where the bytes held by the source's converter begin
+    std::uint64_t settledEnd_ = 0;     // behind the last character that came out, before shifts that followed it
+    std::string recent_;               // the last bytes before position_
 
     std::array<char16_t, bufferUnits> buffer_{};
     std::size_t filled_ = 0;
 
     bool isTracing_ = false;
     bool lossSeen_ = false;
-    std::size_t badInputs_ = 0;    // of the byte under way
+    std::size_t attributed_ = 0;   // units of the buffer whose bytes are known
+    bool isReadAgain_ = false;     // Bad input was met in the byte under way.
     std::vector<Unit> units_;      // which the target's converter has not settled yet
     std::vector<Loss> losses_;     // which have not been told yet
     std::exception_ptr exception_; // that a callback could not throw through ICU
@@ -167,6 +178,7 @@ bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& ou
     if (isSettled) {
         passOver(slice);
         characterBegin_ = position_ - from_.heldBytes();
+        settledEnd_ = characterBegin_;
         return true;
     }
     out.resize(outSize);
@@ -207,15 +219,13 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
     const char* source = byte.data();
     Progress progress{Progress::outputFull, 0};
     while (progress.end == Progress::outputFull) {
-        badInputs_ = 0;
+        attributed_ = 0;
+        isReadAgain_ = false;
         progress = decode(source, byte.data() + byte.size(), flush);
-        const std::uint64_t end = position_ - from_.heldBytes();
-        // The substitutions for bad input come first: what follows them is what the byte has completed.
-        for (std::size_t i = 0; i < filled_; ++i) {
-            units_.push_back({buffer_[i], characterBegin_, end, i < badInputs_});
-        }
-        if (filled_ > 0 || from_.countsHeldBytes()) {
-            characterBegin_ = end;
+        if (filled_ > attributed_) {
+            attribute(filled_, position_ - from_.heldBytes());
+        } else if (from_.countsHeldBytes()) {
+            characterBegin_ = position_ - from_.heldBytes();
         }
         encode(flush && progress.end != Progress::outputFull, out);
     }
@@ -258,6 +268,7 @@ void StreamTranscoder::Impl::passOver(std::string_view bytes) {
     keepRecent(bytes);
     position_ += bytes.size();
     characterBegin_ = position_;
+    settledEnd_ = position_;
 }
 
 void StreamTranscoder::Impl::keepRecent(std::string_view bytes) {
@@ -285,18 +296,60 @@ void StreamTranscoder::Impl::report(const LossHandler& onLoss) {
     }
 }
 
-void StreamTranscoder::Impl::onBadInput(std::string_view bytes, int) noexcept {
+void StreamTranscoder::Impl::onBadInput(std::string_view bytes, const char16_t* target, int) noexcept {
     lossSeen_ = true;
     if (!isTracing_) {
         return;
     }
     try {
-        losses_.push_back({Loss::BadInput, characterBegin_, std::string(bytes), U'\uFFFD'});
-        characterBegin_ += bytes.size();
-        ++badInputs_;
+        recordBadInput(bytes, static_cast<std::size_t>(target - buffer_.data()));
     } catch (...) {
         exception_ = std::current_exception();
     }
+}
+
+// One byte can end more than one character: bytes that turn out not to belong together are read again one by one. What
+// came out before the bad ones stands between the last place known and them.
+void StreamTranscoder::Impl::recordBadInput(std::string_view bytes, std::size_t index) {
+    isReadAgain_ = true;
+    const std::optional<std::uint64_t> found = placeOfBadInput(bytes, index - attributed_);
+    if (index > attributed_) {
+        attribute(index, found ? *found : characterBegin_ + (index - attributed_));
+    }
+    // Where ICU puts together what does not stand together, all that came to nothing is the bad input.
+    const std::uint64_t begin = found ? *found : settledEnd_;
+    const std::uint64_t end = found ? begin + bytes.size() : position_;
+    losses_.push_back({Loss::BadInput, begin, bytesOfInput(begin, end), U'\uFFFD'});
+    units_.push_back({u'\uFFFD', begin, end, true});
+    characterBegin_ = end;
+    settledEnd_ = end;
+    attributed_ = index + 1;
+}
+
+// Where bad bytes stand: behind the last character that came out and `between` further ones, or earlier where the
+// converter did not count all that it held.
+std::optional<std::uint64_t> StreamTranscoder::Impl::placeOfBadInput(std::string_view bytes,
+                                                                     std::size_t between) const {
+    for (const std::uint64_t from : {characterBegin_ + between, settledEnd_}) {
+        const std::size_t found = recent_.find(bytes, std::max(from, recentBegin()) - recentBegin());
+        if (found != std::string::npos) {
+            return recentBegin() + found;
+        }
+    }
+    return std::nullopt;
+}
+
+// The units of the buffer up to `behind` come from the bytes up to `end`: all of them from all, unless bytes were read
+// again one by one and the numbers agree.
+void StreamTranscoder::Impl::attribute(std::size_t behind, std::uint64_t end) {
+    const bool oneEach = isReadAgain_ && end - characterBegin_ == behind - attributed_;
+    for (; attributed_ < behind; ++attributed_) {
+        const std::uint64_t begin = characterBegin_;
+        units_.push_back({buffer_[attributed_], begin, oneEach ? begin + 1 : end, false});
+        characterBegin_ += oneEach ? 1 : 0;
+    }
+    characterBegin_ = end;
+    settledEnd_ = end;
 }
 
 void StreamTranscoder::Impl::onNotRepresentable(char32_t codePoint, int) noexcept {
@@ -335,9 +388,8 @@ void StreamTranscoder::Impl::recordNotRepresentable(char32_t codePoint) {
 }
 
 std::string StreamTranscoder::Impl::bytesOfInput(std::uint64_t begin, std::uint64_t end) const {
-    const std::uint64_t recentBegin = position_ - recent_.size();
-    begin = std::max(begin, recentBegin);
-    return begin < end ? recent_.substr(begin - recentBegin, end - begin) : std::string();
+    begin = std::max(begin, recentBegin());
+    return begin < end ? recent_.substr(begin - recentBegin(), end - begin) : std::string();
 }
 
 StreamTranscoder::StreamTranscoder(Encoding from, Encoding to) : impl_(std::make_unique<Impl>(from, to)) {}

@@ -14,6 +14,7 @@ void TranscoderHelper::open(Encoding encoding) {
     if (isOpen()) {
         substitutionChars_ = converter_.substitution();
         form_ = converter_.form();
+        table_ = SingleByteTable(encoding);
         converter_.setListener(*this);
     }
 }
@@ -28,7 +29,7 @@ bool TranscoderHelper::takeLoss() {
 }
 
 // Input that is this converter's own substitution was lost earlier, and is no new loss.
-void TranscoderHelper::onBadInput(std::string_view bytes, int error) noexcept {
+void TranscoderHelper::onBadInput(std::string_view bytes, const char16_t*, int error) noexcept {
     if (bytes != substitutionChars_) {
         lastError_ = error;
     }

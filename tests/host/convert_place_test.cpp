@@ -115,8 +115,31 @@ class KvtConvertPlace : public HostTest {
 protected:
     // The places of all losses of converting to `form.to`, as reported.
     std::vector<Found> reported(const Form& form, const std::string& bytes) {
-        const ChildResult result = convert(form.name, form.to, bytes, {"--report", "losses", "-o", "out"});
-        EXPECT_LT(result.status, 2) << form.name << ": " << result.err;
+        ChildSetup made = conversion(form);
+        made.input = bytes;
+        return placesOf(made);
+    }
+
+    // The same, with the input coming in pieces of so many bytes.
+    std::vector<Found> reportedInPieces(const Form& form, const std::string& bytes, std::size_t size) {
+        ChildSetup made = conversion(form);
+        std::size_t sent = 0;
+        made.oneByOne = true;
+        made.makeInput = [&]() -> std::string_view {
+            const std::string_view piece = std::string_view(bytes).substr(sent, size);
+            sent += piece.size();
+            return piece;
+        };
+        return placesOf(made);
+    }
+
+    ChildSetup conversion(const Form& form) {
+        return setup({"convert", "--from", form.name, "--to", form.to, "--report", "losses", "-o", "out"});
+    }
+
+    std::vector<Found> placesOf(const ChildSetup& made) {
+        const ChildResult result = runChild(made);
+        EXPECT_LT(result.status, 2) << result.err;
         std::vector<Found> places;
         std::istringstream in(read("losses"));
         for (std::string line; std::getline(in, line);) {
@@ -197,24 +220,25 @@ TEST_F(KvtConvertPlace, BlockBordersWithinWideUnitsMoveNoPlace) {
 }
 
 TEST_F(KvtConvertPlace, PiecesOfAPipeThatEndAnywhereMoveNoPlace) {
-    // One byte at a time, so that every unit and every line end is split.
+    // Every unit and every line end is split somewhere.
     const std::u32string text = U"ab\r\n\u0141\n\U0001F600\r\ra\u0141\n";
     for (const Form* form : {&utf8, &utf16le, &utf16be, &utf32le, &utf32be}) {
-        const std::string bytes = form->encode(text);
-        std::size_t sent = 0;
-        ChildSetup made = setup({"convert", "--from", form->name, "--to", "US-ASCII", "--report", "losses"});
-        made.makeInput = [&]() -> std::string_view {
-            ::usleep(1000);
-            return sent == bytes.size() ? std::string_view() : std::string_view(bytes).substr(sent++, 1);
-        };
-        EXPECT_EQ(runChild(made).status, 1);
-        std::vector<Found> places;
-        std::istringstream in(read("losses"));
-        for (std::string line; std::getline(in, line);) {
-            const auto loss = nlohmann::json::parse(line);
-            places.push_back({loss["offset"], loss["line"], loss["column"]});
+        for (const std::size_t size : {1u, 3u, 5u}) {
+            EXPECT_EQ(reportedInPieces(*form, form->encode(text), size), expectedPlaces(*form, text))
+                << form->name << " by " << size;
         }
-        EXPECT_EQ(places, expectedPlaces(*form, text)) << form->name;
+    }
+}
+
+TEST_F(KvtConvertPlace, HalvesOfUnitsThatLookLikeLineEndsAreNone) {
+    // The second byte of one unit and the first of the next are those of a LF or a CR.
+    for (const std::u32string pattern : {U"\u0A41\u0100", U"\u0D41\u0100"}) {
+        const std::u32string text = pattern + pattern + pattern + pattern + pattern;
+        const std::string bytes = utf16Of(text, false) + "\x3d\xd8";
+        const Form form = {"UTF-16LE", utf8Of, "UTF-8"};
+        for (const std::size_t size : {1u, 3u, 5u, 7u}) {
+            EXPECT_EQ(reportedInPieces(form, bytes, size), (std::vector<Found>{{20, 1, 11}})) << size;
+        }
     }
 }
 

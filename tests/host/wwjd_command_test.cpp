@@ -64,8 +64,8 @@ TEST_F(KvtWwjd, TokensMayComeByteByByte) {
     const std::string tokens = "<closebracket><ud83d><ude00><<lt><u20ac>";
     std::size_t sent = 0;
     ChildSetup made = setup({"wwjd", "decode"});
+    made.oneByOne = true;
     made.makeInput = [&]() -> std::string_view {
-        ::usleep(1000);
         return sent == tokens.size() ? std::string_view() : std::string_view(tokens).substr(sent++, 1);
     };
     EXPECT_EQ(runChild(made).out, "]\U0001F600<<\u20ac");
@@ -87,7 +87,7 @@ TEST_F(KvtWwjd, LongTextsMakeTheRoundTrip) {
     EXPECT_EQ(encode("", {"in", "-o", "middle"}).status, 0);
     for (const char c : read("middle")) {
         ASSERT_TRUE(c != 0 && (c & 0x80) == 0 &&
-                    std::string_view(" ,;\"'&<>()[]{}\n").substr(0, 6).find(c) == std::string_view::npos);
+                    std::string_view(" ,;\"'&()[]{}\\/$@\n\r\t\a\b\v\f").find(c) == std::string_view::npos);
     }
     EXPECT_EQ(decode("", {"middle", "-o", "back"}).status, 0);
     EXPECT_TRUE(read("back") == bytes);

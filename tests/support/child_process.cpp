@@ -8,6 +8,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <stdexcept>
+#include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -130,6 +131,11 @@ public:
 
 private:
     void feed() {
+        int unread = 0;
+        if (setup_.oneByOne && ::ioctl(in_, FIONREAD, &unread) == 0 && unread > 0) {
+            ::usleep(100);
+            return;
+        }
         if (piece_.empty() && setup_.makeInput) {
             piece_ = setup_.makeInput();
         }

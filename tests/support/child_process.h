@@ -17,7 +17,8 @@ struct ChildSetup {
     std::string folder;                                           ///< to run in; empty: this one
     std::vector<std::pair<std::string, std::string>> environment; ///< added to ours
     std::string input;                                            ///< all of standard input
-    std::function<std::string_view()> makeInput;      ///< in its place: pieces, an empty one at the end
+    std::function<std::string_view()> makeInput; ///< in its place: pieces, an empty one at the end
+    bool oneByOne = false; ///< a piece is written only when the one before has been read
     std::function<void(std::string_view)> takeOutput; ///< gets standard output in place of ChildResult::out
     std::string outputFile;        ///< standard output is written to it, without emptying it
     bool appendOutput = false;     ///< opens outputFile for appending

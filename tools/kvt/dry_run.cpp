@@ -99,6 +99,7 @@ int dryRun(const ConvertOptions& options, Encoding from, const std::vector<Encod
            Diagnostics& diagnostics) {
     checkMark(options.mark, from);
     std::vector<Target> targets;
+    targets.reserve(encodings.size());
     for (const Encoding to : encodings) {
         targets.emplace_back(from, to);
     }

@@ -31,8 +31,10 @@ bool isPrintable(char32_t character) {
 }
 
 std::vector<std::string> converterNames() {
+    const int32_t count = ucnv_countAvailable();
     std::vector<std::string> names;
-    for (int32_t index = 0; index < ucnv_countAvailable(); ++index) {
+    names.reserve(static_cast<std::size_t>(count));
+    for (int32_t index = 0; index < count; ++index) {
         names.emplace_back(ucnv_getAvailableName(index));
     }
     return names;

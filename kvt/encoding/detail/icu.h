@@ -26,8 +26,8 @@ std::string_view errorName(int error);
 /// within ICU and must not throw.
 class LossListener {
 public:
-    /// Bytes that are no text; `error` is ICU's code.
-    virtual void onBadInput(std::string_view bytes, int error) noexcept = 0;
+    /// Bytes that are no text; `target` is where the substitution is about to be written, `error` ICU's code.
+    virtual void onBadInput(std::string_view bytes, const char16_t* target, int error) noexcept = 0;
     /// A character without a form in the converter's encoding.
     virtual void onNotRepresentable(char32_t codePoint, int error) noexcept = 0;
 

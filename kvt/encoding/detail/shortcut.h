@@ -3,6 +3,8 @@
 // This is the one place that decides. The caller converts a prefix here and gives ICU the rest:
 //
 // - between two Unicode forms, as far as the input is well-formed and complete;
+// - between a single-byte encoding and a Unicode form or another single-byte encoding, as far as the tables of
+//   detail/single_byte_table.h go;
 // - between any two encodings that keep ASCII as it is, as far as the input is ASCII.
 //
 // What is taken here is text that converts without any loss, so nothing has to be reported, and it ends at a
@@ -20,6 +22,8 @@ namespace kvt::ex::detail {
 enum class Form : std::uint8_t {
     other,           ///< only by ICU
     asciiCompatible, ///< stateless, and a byte below 128 where a character begins is that ASCII character
+    asciiSingleByte, ///< the same, and all characters have one byte
+    singleByte,      ///< all characters have one byte, and ASCII has other ones than in ASCII
     utf8,
     utf16le,
     utf16be,
@@ -27,16 +31,24 @@ enum class Form : std::uint8_t {
     utf32be,
 };
 
+class SingleByteTable;
+
+/// The source or the target of a conversion.
+struct Side {
+    Form form = Form::other;
+    SingleByteTable* table = nullptr; ///< of the two single-byte forms; built when the first text needs it
+};
+
 /// Converts the longest prefix of the bytes `in` that needs no ICU, appends it to `out`, and returns the bytes taken
-/// from `in`; 0 when there is no shorter way between the two forms. The two forms belong to different encodings.
+/// from `in`; 0 when there is no shorter way between the two sides. The two sides belong to different encodings.
 /// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted.
 template <typename CharOut>
-std::size_t convertPrefix(Form from, Form to, std::string_view in, std::basic_string<CharOut>& out);
+std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
 
-extern template std::size_t convertPrefix<char>(Form, Form, std::string_view, std::basic_string<char>&);
-extern template std::size_t convertPrefix<char16_t>(Form, Form, std::string_view,
+extern template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);
+extern template std::size_t convertPrefix<char16_t>(Side, Side, std::string_view,
                                                     std::basic_string<char16_t>&);
-extern template std::size_t convertPrefix<char32_t>(Form, Form, std::string_view,
+extern template std::size_t convertPrefix<char32_t>(Side, Side, std::string_view,
                                                     std::basic_string<char32_t>&);
 
 } // namespace kvt::ex::detail

@@ -3,6 +3,7 @@
 
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
+#include <kvt/encoding/detail/single_byte_table.h>
 #include <kvt/encoding/encoding.h>
 
 #include <cstdint>
@@ -24,7 +25,8 @@ public:
 
     icu::Converter& converter() { return converter_; }
     Encoding encoding() const { return encoding_; }
-    Form form() const { return form_; }
+    /// What this encoding is in a conversion without ICU.
+    Side side() { return {form_, &table_}; }
     /// The bytes that the converter writes for a lost character.
     const std::string& substitutionChars() const { return substitutionChars_; }
 
@@ -32,7 +34,7 @@ public:
     bool takeLoss();
 
 private:
-    void onBadInput(std::string_view bytes, int error) noexcept override;
+    void onBadInput(std::string_view bytes, const char16_t* target, int error) noexcept override;
     void onNotRepresentable(char32_t codePoint, int error) noexcept override;
 
     icu::Converter converter_;
@@ -40,6 +42,7 @@ private:
     Encoding encoding_ = Encoding::Unknown;
     std::string substitutionChars_;
     Form form_ = Form::other;
+    SingleByteTable table_;
 };
 
 /// The calling thread's helper for an encoding, opened when this is its first use. It lives as long as the thread.
