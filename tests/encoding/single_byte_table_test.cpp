@@ -91,9 +91,9 @@ private:
 /// One encoding on all ways.
 class Subject {
 public:
-    explicit Subject(const std::string& name)
-        : name(name), icu(name), form_(kvt::ex::detail::icu::Converter(Encoding(name)).form()),
-          table_(Encoding(name)) {}
+    explicit Subject(const std::string& itsName)
+        : name(itsName), icu(itsName), form_(kvt::ex::detail::icu::Converter(Encoding(itsName)).form()),
+          table_(Encoding(itsName)) {}
 
     bool isSingleByte() const { return form_ == Form::asciiSingleByte || form_ == Form::singleByte; }
     bool keepsAscii() const { return form_ == Form::asciiSingleByte; }
@@ -193,16 +193,17 @@ TEST(SingleByteTables, WriteEachUnitAsIcuDoesWhereSomeByteIsThatUnit) {
             const std::optional<std::string> bytes = isSurrogate ? std::nullopt : subject.icu.encode(text);
             const std::optional<std::string> way = wayOf(utf16, subject.side(), asBytes(text));
             // What ICU makes of a character that is no byte's own is left to ICU, whatever it is.
-            ASSERT_EQ(way.has_value(), bytes.has_value() && own.count(text) == 1) << subject.name << ' ' << c;
+            ASSERT_EQ(way.has_value(), bytes.has_value() && own.count(text) == 1)
+                << subject.name << ' ' << hex(asBytes(text));
             if (way) {
                 ++taken;
-                ASSERT_EQ(hex(*way), hex(*bytes)) << subject.name << ' ' << c;
+                ASSERT_EQ(hex(*way), hex(*bytes)) << subject.name << ' ' << hex(asBytes(text));
             }
             if (isSurrogate) {
                 continue;
             }
             ASSERT_EQ(wayOf(utf32, subject.side(), {reinterpret_cast<const char*>(&c), sizeof c}), way)
-                << subject.name << ' ' << c;
+                << subject.name << ' ' << hex(asBytes(text));
         }
         ASSERT_GT(taken, 60U) << subject.name;
     });
