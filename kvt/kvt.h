@@ -1,6 +1,7 @@
 // Every public header of the library.
 #pragma once
 
+#include <kvt/codec/float_text.h>
 #include <kvt/codec/string_adaptors.h>
 #include <kvt/codec/wwjd.h>
 #include <kvt/encoding/encoding.h>
