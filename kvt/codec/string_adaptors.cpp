@@ -25,7 +25,9 @@ const char* IZQTUStringAdaptor<T>::text() const {
 template <typename T>
 void IZQTUStringAdaptor<T>::assignBytes(const char* data, std::uint32_t byteLength) {
     std::basic_string<T> units(byteLength / sizeof(T), T());
-    std::memcpy(units.data(), data, units.size() * sizeof(T));
+    if (!units.empty()) { // no bytes may come from a null address, which memcpy refuses
+        std::memcpy(units.data(), data, units.size() * sizeof(T));
+    }
     *owner_ = std::move(units);
 }
 

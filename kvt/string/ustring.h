@@ -222,6 +222,8 @@ public:
     UString<27> getAsSystem() const;
     UString<30> getAsEncoding(Encoding encoding) const;
 
+    /// The units; valid as a UStringView of this string is.
+    operator kvt::future::basic_string_view<value_type>() const noexcept { return this->storage_; }
     /// The units of an 8-bit string.
     template <std::uint32_t M = N, OnlyNarrow<M> = 0>
     std::string toStdString() const {
@@ -358,8 +360,8 @@ public:
 
     // ---- Split (include ustring_array.h for the result)
 
-    /// What happens to empty pieces.
-    enum SplitBehaviour { KeepEmptyParts = 0, SkipEmptyParts = 1 };
+    /// What happens to empty pieces. Any value but 0 skips them.
+    enum SplitBehaviour : std::uint32_t { KeepEmptyParts = 0, SkipEmptyParts = 1 };
 
     /// Cuts the string at each delimiter: a unit, any unit of a set, a string, or any string of an array. At most
     /// `maxCount` pieces are cut off, skipped ones not counted; what is left then is one more piece, whatever it
@@ -457,6 +459,35 @@ extern template class KVT_EXPORT UString<27>;
 extern template class KVT_EXPORT UString<28>;
 extern template class KVT_EXPORT UString<29>;
 extern template class KVT_EXPORT UString<30>;
+
+namespace detail {
+
+/// What operator<< and the formatters write for a string.
+template <std::uint32_t N>
+std::string outputText(const UString<N>& string);
+
+/// That text, without a copy of what is UTF-8 already: it lives as long as this object and the string.
+template <std::uint32_t N>
+class OutputText {
+public:
+    explicit OutputText(const UString<N>& string) : text_(outputText(string)) {}
+    operator kvt::future::string_view() const noexcept { return text_; }
+
+private:
+    std::string text_;
+};
+
+template <>
+class OutputText<Encoding::Utf8> {
+public:
+    explicit OutputText(const UString<0>& string) noexcept : string_(&string) {}
+    operator kvt::future::string_view() const noexcept { return *string_; }
+
+private:
+    const UString<0>* string_;
+};
+
+} // namespace detail
 
 } // namespace kvt::ex
 

@@ -40,16 +40,17 @@ bool isUsable(UErrorCode status) {
     return status == U_ZERO_ERROR || status == U_STRING_NOT_TERMINATED_WARNING || status == U_BUFFER_OVERFLOW_ERROR;
 }
 
-// Maps `source` with `map`, a function of ICU's shape, into a string that is at least as long as the source.
-template <typename Unit, typename Map>
-std::basic_string<Unit> icuStringHelper(std::basic_string_view<Unit> source, Map map) {
-    std::basic_string<Unit> result;
-    if (source.empty()) {
+// Maps `source` with `map`, a function of ICU's shape, into a string that is at least as long as the source. The string
+// is made in place, so that the common case costs one allocation.
+template <std::uint32_t N, typename Map>
+UString<N> icuStringHelper(UStringView<N> source, Map map) {
+    UString<N> result;
+    if (source.isEmpty()) {
         return result;
     }
     const auto call = [&] {
         UErrorCode status = U_ZERO_ERROR;
-        const std::int32_t needed = map(result.data(), static_cast<std::int32_t>(result.size()), source.data(),
+        const std::int32_t needed = map(&result[0], static_cast<std::int32_t>(result.size()), source.data(),
                                         static_cast<std::int32_t>(source.size()), &status);
         if (!isUsable(status)) {
             throw UStringException("icuStringHelper() failed");
@@ -65,8 +66,8 @@ std::basic_string<Unit> icuStringHelper(std::basic_string_view<Unit> source, Map
     return result;
 }
 
-std::basic_string<char> mapUtf8(Mapping mapping, std::string_view source) {
-    const UCaseMap* const caseMap = source.empty() ? nullptr : defaultCaseMap();
+UString<0> mapUtf8(Mapping mapping, UStringView<0> source) {
+    const UCaseMap* const caseMap = source.isEmpty() ? nullptr : defaultCaseMap();
     return icuStringHelper(source, [&](char* target, std::int32_t capacity, const char* text, std::int32_t length,
                                        UErrorCode* status) {
         switch (mapping) {
@@ -80,7 +81,7 @@ std::basic_string<char> mapUtf8(Mapping mapping, std::string_view source) {
     });
 }
 
-std::basic_string<char16_t> mapUtf16(Mapping mapping, std::u16string_view source) {
+UString<2> mapUtf16(Mapping mapping, UStringView<2> source) {
     return icuStringHelper(source, [&](char16_t* target, std::int32_t capacity, const char16_t* text,
                                        std::int32_t length, UErrorCode* status) {
         switch (mapping) {
@@ -158,15 +159,13 @@ UString<N> map(UStringView<N> view, const char* name) {
     if constexpr (N == Encoding::Binary) {
         throw UStringNotImplementedException(name);
     } else if constexpr (N == Encoding::Utf8) {
-        return guarded(utf8Contexts[index], bytes, encoding,
-                       [&] { return UString<N>(UStringView<N>(mapUtf8(mapping, view))); });
+        return guarded(utf8Contexts[index], bytes, encoding, [&] { return mapUtf8(mapping, view); });
     } else if constexpr (N == Encoding::Utf16LE) {
-        return guarded(utf16Contexts[index], bytes, encoding,
-                       [&] { return UString<N>(UStringView<N>(mapUtf16(mapping, view))); });
+        return guarded(utf16Contexts[index], bytes, encoding, [&] { return mapUtf16(mapping, view); });
     } else if constexpr (N == Encoding::UsAscii) {
-        std::string text(bytes);
-        std::transform(text.begin(), text.end(), text.begin(), mapAscii<mapping>);
-        return UString<N>(UStringView<N>(text));
+        UString<N> result(view);
+        std::transform(result.begin(), result.end(), &result[0], mapAscii<mapping>);
+        return result;
     } else {
         // A view of a UString<30> has no encoding, so that this conversion refuses it.
         return UString<N>(mapped<mapping>(UString<2>(bytes.data(), bytes.size(), encoding)));

@@ -37,24 +37,25 @@ void replaceUnits(std::basic_string<Unit>& text, std::size_t pos, std::size_t co
     text.replace(pos, count, with.data(), with.size());
 }
 
-// `text` with each `from` replaced by `to`, in one pass. What was put in is not searched.
+// `text` with each `from` replaced by `to`, in one pass; the first one stands at `found`. What was put in is not
+// searched. Each replacement has to leave room for the text that follows, as if it were done in place.
 template <typename Unit>
-std::basic_string<Unit> allReplaced(detail::Units<Unit> text, detail::Units<Unit> from, detail::Units<Unit> to) {
+std::basic_string<Unit> allReplaced(detail::Units<Unit> text, detail::Units<Unit> from, detail::Units<Unit> to,
+                                    std::size_t found) {
     std::basic_string<Unit> result;
+    result.reserve(text.size());
     std::size_t done = 0;
-    while (done < text.size()) {
-        const std::size_t found = detail::findUnits(text, from, done);
-        if (found == detail::notFound) {
-            break;
-        }
-        requireRoom(result, 0, found - done);
+    do {
         result.append(text.substr(done, found - done));
-        requireRoom(result, 0, to.size());
-        result.append(to);
         done = found + from.size();
-    }
-    requireRoom(result, 0, text.size() - std::min(done, text.size()));
-    return result.append(text.substr(std::min(done, text.size())));
+        const std::size_t rest = text.size() - done;
+        if (to.size() > result.max_size() - result.size() - rest) {
+            throw std::length_error("string too long");
+        }
+        result.append(to);
+        found = done < text.size() ? detail::findUnits(text, from, done) : detail::notFound;
+    } while (found != detail::notFound);
+    return result.append(text.substr(done));
 }
 
 template <std::uint32_t N>
@@ -119,8 +120,9 @@ UString<N> UString<N>::operator+(const UString& other) const {
 
 template <std::uint32_t N>
 UString<N>& UString<N>::replaceAll(UStringView<N> from, UStringView<N> to, detail::case_sensitive_t) {
-    if (!isEmpty() && find(from) != npos) {
-        this->storage_ = allReplaced<value_type>(this->storage_, unitsOf(from), unitsOf(to));
+    const std::uint64_t found = isEmpty() ? npos : find(from);
+    if (found != npos) {
+        this->storage_ = allReplaced<value_type>(this->storage_, unitsOf(from), unitsOf(to), found);
     }
     return *this;
 }
@@ -132,18 +134,16 @@ UString<N>& UString<N>::replaceAll(UStringView<N> from, UStringView<N> to, detai
     if constexpr (N == Encoding::Binary) {
         return replaceAll(from, to, case_sensitive);
     } else {
-        if (isEmpty()) {
+        std::uint64_t found = isEmpty() ? npos : find(from, 0, tag);
+        if (found == npos) {
             return *this;
         }
         UString result(*this);
-        std::uint64_t pos = 0;
-        while ((pos = result.find(from, pos, tag)) != npos) {
-            result.replace(pos, from.size(), to);
-            pos += to.size();
-            if (pos >= result.size()) {
-                break;
-            }
-        }
+        do {
+            result.replace(found, from.size(), to);
+            const std::uint64_t behind = found + to.size();
+            found = behind < result.size() ? result.find(from, behind, tag) : npos;
+        } while (found != npos);
         this->storage_.swap(result.storage_);
         return *this;
     }

@@ -21,7 +21,7 @@ UnitsOf<N> unitsOf(UStringView<N> view) {
 template <std::uint32_t N>
 bool anyStandsAt(UnitsOf<N> text, std::size_t pos, const UStringArray<N>& needles) {
     return std::any_of(needles.begin(), needles.end(), [&](const UString<N>& needle) {
-        return text.substr(pos, needle.size()) == unitsOf<N>(needle);
+        return detail::sameUnits(text.substr(pos, needle.size()), unitsOf<N>(needle));
     });
 }
 
@@ -35,7 +35,7 @@ int UString<N>::compare(UStringView<N> other, detail::case_insensitive_t) const 
 
 template <std::uint32_t N>
 bool UString<N>::beginsWith(UStringView<N> needle, detail::case_sensitive_t) const noexcept {
-    return unitsOf<N>(*this).substr(0, needle.size()) == unitsOf(needle);
+    return detail::sameUnits(unitsOf<N>(*this).substr(0, needle.size()), unitsOf(needle));
 }
 
 template <std::uint32_t N>
@@ -46,7 +46,8 @@ bool UString<N>::beginsWith(UStringView<N> needle, detail::case_insensitive_t) c
 
 template <std::uint32_t N>
 bool UString<N>::endsWith(UStringView<N> needle, detail::case_sensitive_t) const noexcept {
-    return needle.size() <= size() && unitsOf<N>(*this).substr(size() - needle.size()) == unitsOf(needle);
+    return needle.size() <= size() &&
+           detail::sameUnits(unitsOf<N>(*this).substr(size() - needle.size()), unitsOf(needle));
 }
 
 template <std::uint32_t N>
