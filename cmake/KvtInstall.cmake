@@ -42,3 +42,13 @@ else()
 endif()
 configure_file("${PROJECT_SOURCE_DIR}/cmake/kvt.pc.in" "${PROJECT_BINARY_DIR}/kvt.pc" @ONLY)
 install(FILES "${PROJECT_BINARY_DIR}/kvt.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
+
+# The pretty-printers of gdb, for this very library: gdb looks for a file with the library's full name and path under
+# its folder of scripts. The path is that of where the library will be found, known when it is installed.
+install(CODE "
+    set(libdir \"${CMAKE_INSTALL_LIBDIR}\")
+    cmake_path(ABSOLUTE_PATH libdir BASE_DIRECTORY \"\${CMAKE_INSTALL_PREFIX}\" NORMALIZE)
+    file(REAL_PATH \"\${libdir}\" libdir)
+    file(INSTALL DESTINATION \"\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_DATADIR}/gdb/auto-load\${libdir}\"
+        TYPE FILE RENAME \"libkvt.so.${PROJECT_VERSION}-gdb.py\"
+        FILES \"${PROJECT_SOURCE_DIR}/tools/gdb/kvt_gdb.py\")")

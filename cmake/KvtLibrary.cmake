@@ -5,7 +5,8 @@
 #   kvt_static    the same objects with the private parts within reach; for tests, never installed
 #
 # The public headers are known to CMake as a file set of kvt, and to the header tests as the global property
-# KVT_PUBLIC_HEADERS (paths from the include root, such as kvt/string/ustring.h).
+# KVT_PUBLIC_HEADERS (paths from the include root, such as kvt/string/ustring.h). Those that need another library's
+# headers, which <kvt/kvt.h> leaves out, stand in KVT_OPTIONAL_HEADERS as well.
 
 add_library(kvt_objects OBJECT)
 target_compile_features(kvt_objects PUBLIC cxx_std_20)
@@ -43,6 +44,15 @@ function(kvt_public_headers)
     foreach(header IN LISTS ARGN)
         file(RELATIVE_PATH name "${PROJECT_SOURCE_DIR}" "${header}")
         set_property(GLOBAL APPEND PROPERTY KVT_PUBLIC_HEADERS "${name}")
+    endforeach()
+endfunction()
+
+# Names the public headers of one folder that only users of another library include.
+function(kvt_optional_headers)
+    kvt_public_headers(${ARGN})
+    foreach(header IN LISTS ARGN)
+        file(RELATIVE_PATH name "${PROJECT_SOURCE_DIR}" "${CMAKE_CURRENT_SOURCE_DIR}/${header}")
+        set_property(GLOBAL APPEND PROPERTY KVT_OPTIONAL_HEADERS "${name}")
     endforeach()
 endfunction()
 

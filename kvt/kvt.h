@@ -1,6 +1,7 @@
-// Every public header of the library.
+// Every public header of the library that needs nothing but the standard library.
 #pragma once
 
+#include <kvt/codec/float_text.h>
 #include <kvt/codec/string_adaptors.h>
 #include <kvt/codec/wwjd.h>
 #include <kvt/encoding/encoding.h>
@@ -16,4 +17,5 @@
 #include <kvt/foundation/vector.h>
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
+#include <kvt/string/ustring_format.h>
 #include <kvt/string/ustring_view.h>

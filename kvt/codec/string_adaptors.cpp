@@ -7,6 +7,7 @@
 #include <cstring>
 
 IZQTString::~IZQTString() = default;
+IZQTStringArray::~IZQTStringArray() = default;
 
 namespace kvt::ex::detail {
 

@@ -34,6 +34,41 @@ public:
     virtual ~IZQTString();
 };
 
+/// The host's view of an array of strings. Indexes and counts are 32 bits. Arrays of UTF-16 and UTF-32 do not take
+/// zero-terminated bytes: slots 2, 9 and 13 throw UStringNotImplementedException with the function's name on them.
+class KVT_EXPORT IZQTStringArray {
+public:
+    /// Slots 1 and 2: add a last element with the given units as they stand; in an array of strings of run-time
+    /// encodings it carries `Unknown`.
+    virtual void append(const IZQTString& string) = 0;
+    virtual void append(const char* text) = 0;
+    /// Slot 3: the first unit of an element. The index is not checked.
+    virtual const char* elementText(std::uint32_t index) const = 0;
+    /// Slot 4: copies an element into `target` and returns 0; returns 1, and does nothing, when there is no such
+    /// element.
+    virtual int getElement(std::uint32_t index, IZQTString& target) const = 0;
+    /// Slot 5: sets an element to the units of `source` and returns 0, or 1 as above.
+    virtual int setElement(std::uint32_t index, const IZQTString& source) = 0;
+    /// Slot 6: the number of elements.
+    virtual std::uint32_t entries() const = 0;
+    /// Slot 7: removes all elements.
+    virtual void clear() = 0;
+    /// Slots 8 and 9: whether an element has just these units.
+    virtual bool contains(const IZQTString& string) const = 0;
+    virtual bool contains(const char* text) const = 0;
+    /// Slots 10 and 11, which the arrays of this library do not offer: they throw UStringNotImplementedException
+    /// with the function's name.
+    virtual void appendCSVString(const char* text) = 0;
+    virtual void appendTokenizeString(const char* text, const char* delimiters) = 0;
+    /// Slots 12 and 13: remove every element with just these units and return how many there were.
+    virtual std::uint32_t removeAll(const IZQTString& string) = 0;
+    virtual std::uint32_t removeAll(const char* text) = 0;
+    /// Slot 14: an element. The index is not checked.
+    virtual IZQTString& element(std::uint32_t index) = 0;
+    /// Slot 15.
+    virtual ~IZQTStringArray();
+};
+
 namespace kvt::ex::detail {
 
 /// The table for a string of unit `T`: it stands for the storage it is constructed with, of which it owns nothing.

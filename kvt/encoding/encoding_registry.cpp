@@ -2,6 +2,7 @@
 #include <kvt/encoding/detail/encoding_registry.h>
 
 #include <kvt/encoding/detail/code_page_names.h>
+#include <kvt/encoding/detail/debugger_view.h>
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/platform/code_page.h>
 
@@ -39,6 +40,8 @@ std::array<std::string_view, EncodingRegistry::firstDynamic> namesWithSystem(std
 }
 
 } // namespace
+
+DebuggerView encodingNames{};
 
 EncodingRegistry& EncodingRegistry::instance() {
     static EncodingRegistry registry;
@@ -88,7 +91,9 @@ EncodingRegistry::EncodingRegistry()
           {"BINARY", Encoding::Binary},
           {"binary", Encoding::Binary},
       },
-      typeNames_(namesWithSystem(systemName_)) {}
+      typeNames_(namesWithSystem(systemName_)) {
+    encodingNames = {typeNames_.data(), &dynamicNames_};
+}
 
 std::uint32_t EncodingRegistry::lookupId(std::string_view name) {
     if (const auto id = staticIds_.find(name)) {

@@ -19,6 +19,7 @@
 #include <kvt/codec/string_adaptors.h>
 #include <kvt/encoding/encoding.h>
 #include <kvt/foundation/export.h>
+#include <kvt/foundation/optional.h>
 #include <kvt/string/ustring_view.h>
 
 #include <cstddef>
@@ -84,6 +85,11 @@ public:
 KVT_EXPORT std::size_t actualUStringSize() noexcept;
 
 } // namespace detail
+
+template <std::uint32_t N>
+class UStringArray;
+template <typename T>
+class vector;
 
 template <std::uint32_t N>
 class KVT_EXPORT UString : private detail::UStringFields<N> {
@@ -216,15 +222,56 @@ public:
     UString<27> getAsSystem() const;
     UString<30> getAsEncoding(Encoding encoding) const;
 
+    /// The units; valid as a UStringView of this string is.
+    operator kvt::future::basic_string_view<value_type>() const noexcept { return this->storage_; }
     /// The units of an 8-bit string.
     template <std::uint32_t M = N, OnlyNarrow<M> = 0>
     std::string toStdString() const {
         return this->storage_;
     }
 
+    // ---- Comparison and search
+    //
+    // They look at code units, never at characters, and nothing in them converts. The forms with the tag
+    // case_insensitive fold both sides each time (see getAsFoldedCase()) and then do the same on the folded copies:
+    // a position that they take or return is one of the folded text, which may have more units than the stored one.
+    // They fail as getAsFoldedCase(): always on UString<30> and, given a true case_insensitive_t, on UString<28>.
+    // The others never fail, whatever the position.
+
     /// Negative, zero or positive as this string's units come before, equal or follow those of `other`, compared as
     /// unsigned numbers; a prefix comes first. UTF-16 is ordered by unit, not by code point.
     int compare(UStringView<N> other, detail::case_sensitive_t = {}) const noexcept;
+    int compare(UStringView<N> other, detail::case_insensitive_t) const;
+
+    /// An empty needle is contained in every string, at its beginning and at its end.
+    bool beginsWith(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept;
+    bool beginsWith(UStringView<N> needle, detail::case_insensitive_t) const;
+    bool endsWith(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept;
+    bool endsWith(UStringView<N> needle, detail::case_insensitive_t) const;
+    bool contains(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept { return find(needle) != npos; }
+    bool contains(UStringView<N> needle, detail::case_insensitive_t tag) const { return find(needle, 0, tag) != npos; }
+
+    /// The first position at or after `pos` where the needle begins, else npos. An empty needle is found at `pos`
+    /// itself up to the size.
+    std::uint64_t find(UStringView<N> needle, std::uint64_t pos = 0, detail::case_sensitive_t = {}) const noexcept;
+    std::uint64_t find(UStringView<N> needle, std::uint64_t pos, detail::case_insensitive_t) const;
+    std::uint64_t find(value_type unit, std::uint64_t pos = 0) const noexcept;
+
+    /// The last position at or before `pos` where the needle begins, else npos. An empty needle is found at the
+    /// smaller of `pos` and the size.
+    std::uint64_t rfind(UStringView<N> needle, std::uint64_t pos = npos, detail::case_sensitive_t = {}) const noexcept;
+    std::uint64_t rfind(UStringView<N> needle, std::uint64_t pos, detail::case_insensitive_t) const;
+    std::uint64_t rfind(value_type unit, std::uint64_t pos = npos) const noexcept;
+
+    /// The first position at or after `pos`, or the last one at or before it, whose unit is in the set; else npos.
+    std::uint64_t findFirstOf(const vector<value_type>& set, std::uint64_t pos = 0) const noexcept;
+    std::uint64_t findLastOf(const vector<value_type>& set, std::uint64_t pos = npos) const noexcept;
+
+    /// The first position at or after `pos` and below the size where any of the strings begins, else npos.
+    std::uint64_t findFirstOf(const UStringArray<N>& needles, std::uint64_t pos = 0) const noexcept;
+    /// The last position *below* `pos` where any of the strings begins, else npos. `pos` itself is not looked at,
+    /// unlike with a set of units; the match may run on past it.
+    std::uint64_t findLastOf(const UStringArray<N>& needles, std::uint64_t pos = npos) const noexcept;
 
     /// Comparisons of the units alone: the encoding of a UString<30> takes no part.
     bool operator==(const UString& other) const noexcept { return compare(other) == 0; }
@@ -236,6 +283,126 @@ public:
 
     /// 64-bit FNV-1a over the bytes of the units in memory order.
     std::uint64_t hash() const noexcept;
+
+    // ---- Editing
+    //
+    // Positions and counts are code units; a multi-byte character may be cut. A view may be one of this string's own
+    // text. The encoding of a UString<30> stays and what is put in is taken as it is.
+    // A position beyond the size throws std::out_of_range "invalid string position", a result beyond the largest
+    // size std::length_error "string too long", and lack of memory std::bad_alloc; the string is then unchanged.
+
+    UString& append(UStringView<N> text);
+    UString& operator+=(const UString& other) { return append(other); }
+    UString& prepend(UStringView<N> text) { return insert(0, text); }
+    UString& insert(std::uint64_t pos, UStringView<N> text);
+    UString& insert(std::uint64_t pos, value_type unit);
+    /// Up to `count` units from `pos`, as many as there are, go.
+    UString& erase(std::uint64_t pos, std::uint64_t count = npos);
+    UString& replace(std::uint64_t pos, std::uint64_t count, UStringView<N> text);
+    void push_back(value_type unit);
+    /// Cuts the string, or fills it up to `size` units.
+    void resize(std::uint64_t size, value_type unit = value_type());
+
+    /// A view of up to `count` units from `pos`, empty at the end when `pos` is beyond it; it never fails, and is
+    /// valid until the string next changes.
+    UStringView<N> substr(std::uint64_t pos, std::uint64_t count = npos) const noexcept {
+        const std::size_t start = pos < size() ? pos : size();
+        return {begin() + start, count < size() - start ? count : size() - start};
+    }
+
+    /// Both texts in a new string, which has the encoding of the left one.
+    UString operator+(const UString& other) const;
+
+    /// Replaces each `from`, searched from the left and behind what was put in. Nothing happens when there is none.
+    /// `from` must not be empty, unless the string is: an empty one is found for ever.
+    /// The case-insensitive form replaces, at the position found in the folded text, as many units as `from` has;
+    /// where folding changes the number of units those are the wrong ones. Its time grows with the square of the
+    /// length. On UString<28> it is the same as the case-sensitive form.
+    UString& replaceAll(UStringView<N> from, UStringView<N> to, detail::case_sensitive_t = {});
+    UString& replaceAll(UStringView<N> from, UStringView<N> to, detail::case_insensitive_t);
+    /// Replace the first or the last `from`; unlike replaceAll() they throw std::out_of_range "invalid string
+    /// position" when there is none.
+    UString& replaceFirst(UStringView<N> from, UStringView<N> to, detail::case_sensitive_t = {});
+    UString& replaceFirst(UStringView<N> from, UStringView<N> to, detail::case_insensitive_t);
+    UString& replaceLast(UStringView<N> from, UStringView<N> to, detail::case_sensitive_t = {});
+    UString& replaceLast(UStringView<N> from, UStringView<N> to, detail::case_insensitive_t);
+
+    /// Replaces each unit that equals `from`, or that is in the set.
+    UString& replaceAll(value_type from, value_type to) noexcept;
+    UString& replaceAll(const vector<value_type>& set, value_type to) noexcept;
+    /// Drops each unit that equals `unit`.
+    UString& removeAll(value_type unit) noexcept;
+    /// Drops units in the set from the front only, and from the back only.
+    UString& strip(const vector<value_type>& set) noexcept;
+    UString& rstrip(const vector<value_type>& set) noexcept;
+
+    // ---- Case
+    //
+    // UTF-8 and UTF-16 are mapped by ICU, with its default locale for upper and lower case and full case folding;
+    // UString<1> maps the ASCII letters only and never fails; 3, 27 and 29 go by way of UTF-16 and fail as that
+    // conversion does. UString<28> throws UStringNotImplementedException with the member's name. UString<30> throws
+    // InvalidEncodingException (910005, %0 = "unknown"), whatever its encoding: convert it first. ICU's own failures
+    // come as UStringException. A failure leaves the string unchanged, and one on UTF-8 or UTF-16 carries a line with
+    // the text.
+    //
+    // A result of UTF-8 or UTF-16 is never shorter than its source: where the mapping shrinks (the Kelvin sign folds
+    // to "k"), zero units fill it up, which count as units of the text.
+
+    void toUpperCase();
+    void toLowerCase();
+    void toFoldedCase();
+    UString getAsUpperCase() const;
+    UString getAsLowerCase() const;
+    UString getAsFoldedCase() const;
+    static UString getAsUpperCase(UStringView<N> text);
+    static UString getAsLowerCase(UStringView<N> text);
+    static UString getAsFoldedCase(UStringView<N> text);
+
+    // ---- Split (include ustring_array.h for the result)
+
+    /// What happens to empty pieces. Any value but 0 skips them.
+    enum SplitBehaviour : std::uint32_t { KeepEmptyParts = 0, SkipEmptyParts = 1 };
+
+    /// Cuts the string at each delimiter: a unit, any unit of a set, a string, or any string of an array. At most
+    /// `maxCount` pieces are cut off, skipped ones not counted; what is left then is one more piece, whatever it
+    /// holds. Of a delimiter only the first unit is consumed, also where it has more: "axyb" at "xy" gives "a" and
+    /// "yb". Pieces of a UString<30> carry `Unknown`. Throws std::length_error "vector<T> too long".
+    UStringArray<N> split(value_type delimiter, SplitBehaviour behaviour = KeepEmptyParts,
+                          std::uint64_t maxCount = npos) const;
+    UStringArray<N> split(const vector<value_type>& delimiters, SplitBehaviour behaviour = KeepEmptyParts,
+                          std::uint64_t maxCount = npos) const;
+    UStringArray<N> split(UStringView<N> delimiter, SplitBehaviour behaviour = KeepEmptyParts,
+                          std::uint64_t maxCount = npos) const;
+    UStringArray<N> split(const UStringArray<N>& delimiters, SplitBehaviour behaviour = KeepEmptyParts,
+                          std::uint64_t maxCount = npos) const;
+
+    // ---- Numbers
+
+    /// The decimal text of an integer, or the shortest text of a floating-point number as float_text.h writes it.
+    /// A UString<30> is labelled `UsAscii`.
+    template <typename Number, std::enable_if_t<std::is_arithmetic_v<Number>, int> = 0>
+    static UString fromNumber(Number number) {
+        static_assert(!std::is_same_v<Number, long double>, "there is no shortest text of a long double");
+        if constexpr (std::is_floating_point_v<Number>) {
+            return fromNumber_helper(number);
+        } else if constexpr (std::is_signed_v<Number>) {
+            return fromNumber_helper(static_cast<std::int64_t>(number));
+        } else {
+            return fromNumber_helper(static_cast<std::uint64_t>(number));
+        }
+    }
+
+    /// The integer at the beginning of the text, by the rules of strtoll and strtoull: white space and a sign before
+    /// it and anything behind it are passed over, and a negative number wraps when unsigned. Empty when there is no
+    /// digit or the number is out of range. Fails as getAsUtf8().
+    kvt::future::optional<std::int64_t> asSigned() const { return toSigned(); }
+    kvt::future::optional<std::uint64_t> asUnsigned() const { return toUnsigned(); }
+
+    /// The text of a foreign string, converted from `encoding`; a UString<30> takes the bytes and carries
+    /// `encoding`. Fails as the constructor from bytes.
+    static UString fromIZQTString(const IZQTString& string, Encoding encoding) {
+        return UString(string.data(), string.byteLength(), encoding);
+    }
 
 protected:
     /// The initialisers behind the constructors, for derived classes. They set up a new object: init() an empty
@@ -257,6 +424,13 @@ protected:
     void init(const UString<M>& other);
 
 private:
+    static UString fromNumber_helper(std::int64_t number);
+    static UString fromNumber_helper(std::uint64_t number);
+    static UString fromNumber_helper(double number);
+    static UString fromNumber_helper(float number);
+    kvt::future::optional<std::int64_t> toSigned() const;
+    kvt::future::optional<std::uint64_t> toUnsigned() const;
+
     template <std::uint32_t M = N, OnlyAny<M> = 0>
     Encoding lookupEncoding() const noexcept {
         return this->encoding_;
@@ -285,6 +459,35 @@ extern template class KVT_EXPORT UString<27>;
 extern template class KVT_EXPORT UString<28>;
 extern template class KVT_EXPORT UString<29>;
 extern template class KVT_EXPORT UString<30>;
+
+namespace detail {
+
+/// What operator<< and the formatters write for a string.
+template <std::uint32_t N>
+std::string outputText(const UString<N>& string);
+
+/// That text, without a copy of what is UTF-8 already: it lives as long as this object and the string.
+template <std::uint32_t N>
+class OutputText {
+public:
+    explicit OutputText(const UString<N>& string) : text_(outputText(string)) {}
+    operator kvt::future::string_view() const noexcept { return text_; }
+
+private:
+    std::string text_;
+};
+
+template <>
+class OutputText<Encoding::Utf8> {
+public:
+    explicit OutputText(const UString<0>& string) noexcept : string_(&string) {}
+    operator kvt::future::string_view() const noexcept { return *string_; }
+
+private:
+    const UString<0>* string_;
+};
+
+} // namespace detail
 
 } // namespace kvt::ex
 

@@ -1,5 +1,6 @@
 // Comparison and hash: of the units as they are stored, never of characters.
 #include <kvt/string/detail/instantiate.h>
+#include <kvt/string/detail/unit_search.h>
 
 #include <kvt/foundation/detail/fnv.h>
 
@@ -15,6 +16,12 @@ int compareUnits(const char* left, const char* right, std::size_t count) {
 
 template <typename CharT>
 int compareUnits(const CharT* left, const CharT* right, std::size_t count) {
+    // Equal parts are passed over as bytes; the order of bytes is not that of units.
+    constexpr std::size_t block = 64;
+    for (; count > block && detail::sameUnits(left, right, block); count -= block) {
+        left += block;
+        right += block;
+    }
     const auto [l, r] = std::mismatch(left, left + count, right);
     return l == left + count ? 0 : *l < *r ? -1 : 1;
 }

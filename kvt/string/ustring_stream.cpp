@@ -1,4 +1,4 @@
-// Output of strings to a standard stream.
+// Strings as text for people: the text itself, and its output to a standard stream.
 #include <kvt/string/detail/instantiate.h>
 
 #include <kvt/foundation/detail/escape.h>
@@ -8,16 +8,23 @@
 namespace kvt::ex {
 
 template <std::uint32_t N>
-std::ostream& operator<<(std::ostream& stream, const UString<N>& string) {
+std::string detail::outputText(const UString<N>& string) {
     if constexpr (N == Encoding::Binary) {
-        return stream << detail::escapeBytes({string.rawData(), string.size()});
+        return escapeBytes(string);
     } else {
-        const UString<0> text = string.getAsUtf8();
-        return stream << std::string_view(text.rawData(), text.size());
+        return string.getAsUtf8().toStdString();
     }
 }
 
-#define KVT_INSTANTIATE(N) template KVT_EXPORT std::ostream& operator<<(std::ostream&, const UString<N>&);
+template <std::uint32_t N>
+std::ostream& operator<<(std::ostream& stream, const UString<N>& string) {
+    const detail::OutputText<N> text(string);
+    return stream << std::string_view(text);
+}
+
+#define KVT_INSTANTIATE(N)                                                                                   \
+    template KVT_EXPORT std::string detail::outputText(const UString<N>&);                                   \
+    template KVT_EXPORT std::ostream& operator<<(std::ostream&, const UString<N>&);
 
 KVT_FOR_EACH_USTRING(KVT_INSTANTIATE)
 

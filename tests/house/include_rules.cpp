@@ -23,6 +23,15 @@ std::string readFile(const fs::path& path) {
     return {std::istreambuf_iterator<char>(in), {}};
 }
 
+std::set<std::string> linesOf(const fs::path& path) {
+    std::set<std::string> lines;
+    std::istringstream text(readFile(path));
+    for (std::string line; std::getline(text, line);) {
+        lines.insert(line);
+    }
+    return lines;
+}
+
 bool isHeader(const std::string& file) {
     return file.ends_with(".h");
 }
@@ -99,7 +108,7 @@ std::vector<Include> includesOf(const std::string& file, const std::string& text
     return found;
 }
 
-Tree readTree(const fs::path& root, const fs::path& publicHeaderList) {
+Tree readTree(const fs::path& root, const fs::path& publicHeaderList, const fs::path& optionalHeaderList) {
     Tree tree;
     for (const char* top : {"kvt", "tools"}) {
         if (!fs::exists(root / top)) {
@@ -116,10 +125,8 @@ Tree readTree(const fs::path& root, const fs::path& publicHeaderList) {
             tree.includes.insert(tree.includes.end(), includes.begin(), includes.end());
         }
     }
-    std::istringstream headers(readFile(publicHeaderList));
-    for (std::string header; std::getline(headers, header);) {
-        tree.publicHeaders.insert(header);
-    }
+    tree.publicHeaders = linesOf(publicHeaderList);
+    tree.optionalHeaders = linesOf(optionalHeaderList);
     return tree;
 }
 
@@ -224,6 +231,7 @@ Offences memoryKnowsNoString(const Tree& tree) {
 Offences publicHeadersStandAlone(const Tree& tree) {
     static const std::vector<std::string> behind = {"unicode/", "double-conversion/", "date/", "CLI/",
                                                     "nlohmann/"};
+    static const std::vector<std::string> forUsersOf = {"fmt/"};
     Offences offences;
     for (const Include& include : tree.includes) {
         if (!tree.publicHeaders.contains(include.file)) {
@@ -234,6 +242,11 @@ Offences publicHeadersStandAlone(const Tree& tree) {
             offences.push_back(offence(include, "a public header includes public headers only"));
         } else if (beginsWithOneOf(include.target, behind)) {
             offences.push_back(offence(include, "no public header needs headers of that library"));
+        } else if (beginsWithOneOf(include.target, forUsersOf) &&
+                   !tree.optionalHeaders.contains(include.file)) {
+            offences.push_back(offence(include, "only an optional header needs headers of that library"));
+        } else if (tree.optionalHeaders.contains(include.target)) {
+            offences.push_back(offence(include, "an optional header is included by users only"));
         } else if (include.target.starts_with("boost/") && folder != "mmap" && folder != "datetime") {
             offences.push_back(offence(include, "Boost shows in public headers of mmap and datetime only"));
         }
@@ -258,7 +271,7 @@ Offences everyHeaderIsPublicOrPrivate(const Tree& tree) {
         if (isPrivate(header)) {
             offences.push_back(header + ":1: private, yet listed among the public headers");
         }
-        if (header != "kvt/kvt.h" && !inUmbrella.contains(header)) {
+        if (header != "kvt/kvt.h" && !tree.optionalHeaders.contains(header) && !inUmbrella.contains(header)) {
             offences.push_back("kvt/kvt.h:1: does not include " + header);
         }
     }

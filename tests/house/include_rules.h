@@ -22,14 +22,16 @@ struct Include {
 struct Tree {
     std::set<std::string> files;
     std::set<std::string> publicHeaders;
+    std::set<std::string> optionalHeaders; // those among them that are for users of another library
     std::vector<Include> includes;
 };
 
 using Offences = std::vector<std::string>;
 
-/// Reads all C++ files under `kvt` and `tools` of the repository at `root`; `publicHeaderList` is a file that names
-/// the public headers, one a line.
-Tree readTree(const std::filesystem::path& root, const std::filesystem::path& publicHeaderList);
+/// Reads all C++ files under `kvt` and `tools` of the repository at `root`; the two lists are files that name the
+/// public headers and the optional ones among them, one a line.
+Tree readTree(const std::filesystem::path& root, const std::filesystem::path& publicHeaderList,
+              const std::filesystem::path& optionalHeaderList);
 
 /// The `#include` lines of one text.
 std::vector<Include> includesOf(const std::string& file, const std::string& text);
@@ -42,9 +44,10 @@ Offences noCycles(const Tree& tree);
 Offences foldersKnowOnlyTheirNeighbours(const Tree& tree);
 /// pimpl.h and memory.h reach no header about strings, not even through another header.
 Offences memoryKnowsNoString(const Tree& tree);
-/// A public header includes public headers, and none of the libraries that are used behind them.
+/// A public header includes public headers, and none of the libraries that are used behind them. An optional header
+/// is included by no other and may include the library that it is for.
 Offences publicHeadersStandAlone(const Tree& tree);
-/// Headers outside detail/ and platform/ are the public ones, and <kvt/kvt.h> includes them all.
+/// Headers outside detail/ and platform/ are the public ones, and <kvt/kvt.h> includes them all but the optional ones.
 Offences everyHeaderIsPublicOrPrivate(const Tree& tree);
 /// ICU and the operating system are touched in the files that are there for it.
 Offences outsideIsBehindItsDoor(const Tree& tree);

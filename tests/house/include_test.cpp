@@ -13,7 +13,7 @@ namespace {
 using Rule = Offences (*)(const Tree&);
 
 const Tree& repository() {
-    static const Tree tree = readTree(KVT_SOURCE_DIR, KVT_PUBLIC_HEADER_LIST);
+    static const Tree tree = readTree(KVT_SOURCE_DIR, KVT_PUBLIC_HEADER_LIST, KVT_OPTIONAL_HEADER_LIST);
     return tree;
 }
 
@@ -28,6 +28,7 @@ std::string joined(const Offences& offences) {
 TEST(Includes, RepositoryIsFoundAtAll) {
     EXPECT_TRUE(repository().files.contains("kvt/foundation/export.h"));
     EXPECT_TRUE(repository().publicHeaders.contains("kvt/foundation/export.h"));
+    EXPECT_TRUE(repository().optionalHeaders.contains("kvt/string/ustring_fmt.h"));
     EXPECT_GT(repository().includes.size(), 20U);
 }
 
@@ -90,14 +91,21 @@ void PrintTo(const Planted& row, std::ostream* out) {
 // A tree in order, to which each row adds one file.
 Tree treeWith(const std::string& file, const std::string& text) {
     Tree tree;
-    tree.publicHeaders = {"kvt/foundation/pimpl.h",  "kvt/foundation/memory.h", "kvt/foundation/vector.h",
-                          "kvt/foundation/export.h", "kvt/string/ustring.h",    "kvt/kvt.h"};
+    tree.publicHeaders = {"kvt/foundation/pimpl.h",
+                          "kvt/foundation/memory.h",
+                          "kvt/foundation/vector.h",
+                          "kvt/foundation/export.h",
+                          "kvt/string/ustring.h",
+                          "kvt/string/ustring_fmt.h",
+                          "kvt/kvt.h"};
+    tree.optionalHeaders = {"kvt/string/ustring_fmt.h"};
     const std::vector<std::pair<std::string, std::string>> files = {
         {"kvt/foundation/export.h", ""},
         {"kvt/foundation/pimpl.h", "#include <utility>\n"},
         {"kvt/foundation/memory.h", "#include <kvt/foundation/export.h>\n"},
         {"kvt/foundation/vector.h", "#include <kvt/foundation/memory.h>\n"},
         {"kvt/string/ustring.h", "#include <kvt/foundation/vector.h>\n"},
+        {"kvt/string/ustring_fmt.h", "#include <kvt/string/ustring.h>\n"},
         {"kvt/string/detail/search.h", ""},
         {"kvt/platform/code_page.h", ""},
         {"kvt/kvt.h", "#include <kvt/foundation/export.h>\n#include <kvt/foundation/memory.h>\n"
@@ -168,6 +176,13 @@ const Planted plantedRows[] = {
      "kvt/string/ustring.h:1:"},
     {__LINE__, publicHeadersStandAlone, "kvt/string/ustring.h", "#include <boost/regex.hpp>",
      "kvt/string/ustring.h:1:"},
+    {__LINE__, publicHeadersStandAlone, "kvt/string/ustring_fmt.h", "#include <fmt/format.h>", ""},
+    {__LINE__, publicHeadersStandAlone, "kvt/string/ustring.h", "#include <fmt/format.h>",
+     "kvt/string/ustring.h:1:"},
+    {__LINE__, publicHeadersStandAlone, "kvt/string/ustring.h", "#include <kvt/string/ustring_fmt.h>",
+     "kvt/string/ustring.h:1:"},
+    {__LINE__, publicHeadersStandAlone, "kvt/string/ustring_fmt.h", "#include <unicode/ucnv.h>",
+     "kvt/string/ustring_fmt.h:1:"},
     {__LINE__, everyHeaderIsPublicOrPrivate, "kvt/string/detail/more.h", "", ""},
     {__LINE__, everyHeaderIsPublicOrPrivate, "kvt/string/more.h", "", "kvt/string/more.h:1:"},
     {__LINE__, everyHeaderIsPublicOrPrivate, "kvt/kvt.h",

@@ -1,0 +1,83 @@
+// std::format writes strings of all eight types: their text as UTF-8, with the specifications of text. Where the
+// run-time has no <format>, there is nothing that could be called and this file is empty.
+
+#include <string/formatter_rows.h>
+#include <support/failure_record.h>
+
+#include <kvt/string/ustring_array.h>
+#include <kvt/string/ustring_format.h>
+
+#include <gtest/gtest.h>
+
+#ifdef __cpp_lib_format
+
+#include <format>
+#include <iterator>
+#include <string>
+#include <type_traits>
+
+namespace {
+
+using namespace kvt::test;
+using kvt::ex::Encoding;
+using kvt::ex::UString;
+
+template <typename... Arguments>
+std::string formatted(std::string_view specification, const Arguments&... arguments) {
+    return std::vformat(specification, std::make_format_args(arguments...));
+}
+
+template <std::uint32_t N>
+void writesTheRows() {
+    for (const FormatRow& row : formatRows) {
+        EXPECT_EQ(formatted(row.specification, rowText<N>()), row.ofText)
+            << N << ' ' << row.specification << ": " << row.why;
+    }
+}
+
+TEST(UStringFormat, WritesTextAsUtf8WhateverItsType) {
+    writesTheRows<0>();
+    writesTheRows<2>();
+    writesTheRows<3>();
+    writesTheRows<27>();
+    writesTheRows<29>();
+    writesTheRows<30>();
+}
+
+TEST(UStringFormat, WritesAsciiAndBytes) {
+    EXPECT_EQ(formatted("{:>5}", UString<1>("abc")), "  abc");
+    EXPECT_EQ(formatted("{}", UString<28>("caf\xE9\n", 5)), "caf\\xE9\\x0A");
+    EXPECT_EQ(formatted("{:.5}|{:>8}", UString<28>("caf\xE9"), UString<28>("\x01")), "caf\\x|    \\x01");
+}
+
+TEST(UStringFormat, WritesZerosAndLongTexts) {
+    EXPECT_EQ(formatted("{}", UString<0>("a\0b", 3)), std::string("a\0b", 3));
+    EXPECT_EQ(formatted("{}", UString<2>(u"a\0b", 3)), std::string("a\0b", 3));
+    const std::string text(10000, 'x');
+    EXPECT_EQ(formatted("{}", UString<3>(text.c_str())), text);
+    EXPECT_EQ(formatted("[{}]", UString<0>()), "[]");
+}
+
+TEST(UStringFormat, TakesWidthsFromArguments) {
+    EXPECT_EQ(formatted("{:>{}}|{:.{}}", UString<0>("ab"), 4, UString<0>("abcd"), 2), "  ab|ab");
+    EXPECT_EQ(formatted("{1} {0}", UString<2>("world"), UString<0>("hello")), "hello world");
+}
+
+TEST(UStringFormat, ChecksSpecificationsOfTextAtCompileTime) {
+    EXPECT_EQ(std::format("{:>6}", UString<2>(u"caf\u00e9", 4)), "  caf\u00e9");
+    std::string text;
+    std::format_to(std::back_inserter(text), "{}", UString<0>("abc"));
+    EXPECT_EQ(text, "abc");
+    EXPECT_THROW(formatted("{:d}", UString<0>("abc")), std::format_error) << "no number";
+}
+
+TEST(UStringFormat, FailsAsTheConversionToUtf8) {
+    EXPECT_EQ(failureOf([] { formatted("{}", UString<2>(u"a\xD800", 2)); }),
+              badEncodingFailure({"a\0\0\xD8", 4}, "UTF-16LE", "a\uFFFD", "\uFFFD"));
+    EXPECT_EQ(failureOf([] { formatted("{}", UString<30>("a", 1, Encoding::Unknown)); }),
+              invalidEncodingFailure("unknown"));
+}
+
+} // namespace
+
+#endif
