@@ -3,7 +3,7 @@
 //
 //     fmt::print("{:>10}", text)
 //
-// A string is formatted as the UTF-8 text that operator<< writes, with the specification of a string view: fill,
+// A string is formatted as the UTF-8 text that operator<< writes, with the options of a string view: fill,
 // alignment, width, precision. It fails as operator<<.
 #pragma once
 

@@ -2,7 +2,7 @@
 //
 //     std::format("{:>10}", text)
 //
-// A string is formatted as the UTF-8 text that operator<< writes, with the specification of a std::string_view: fill,
+// A string is formatted as the UTF-8 text that operator<< writes, with the options of a std::string_view: fill,
 // alignment, width, precision. It fails as operator<<. With a run-time that has no <format>, this header is empty.
 #pragma once
 

@@ -1,4 +1,4 @@
-// What the formatters have to write, for both libraries: rows of a specification and the result.
+// What the formatters have to write, for both libraries: rows of format options and the result.
 #pragma once
 
 #include <kvt/string/ustring.h>
@@ -9,7 +9,7 @@
 namespace kvt::test {
 
 struct FormatRow {
-    const char* specification;
+    const char* options;
     const char* ofText; ///< for "caf\u00e9 <"
     const char* why;
 };

@@ -1,4 +1,4 @@
-// {fmt} writes strings of all eight types: their text as UTF-8, with the specifications of text.
+// {fmt} writes strings of all eight types: their text as UTF-8, with the optionss of text.
 
 #include <string/formatter_rows.h>
 #include <support/failure_record.h>
@@ -20,15 +20,15 @@ using kvt::ex::Encoding;
 using kvt::ex::UString;
 
 template <typename... Arguments>
-std::string formatted(fmt::string_view specification, const Arguments&... arguments) {
-    return fmt::vformat(specification, fmt::make_format_args(arguments...));
+std::string formatted(fmt::string_view options, const Arguments&... arguments) {
+    return fmt::vformat(options, fmt::make_format_args(arguments...));
 }
 
 template <std::uint32_t N>
 void writesTheRows() {
     for (const FormatRow& row : formatRows) {
-        EXPECT_EQ(formatted(row.specification, rowText<N>()), row.ofText)
-            << N << ' ' << row.specification << ": " << row.why;
+        EXPECT_EQ(formatted(row.options, rowText<N>()), row.ofText)
+            << N << ' ' << row.options << ": " << row.why;
     }
 }
 

@@ -1,4 +1,4 @@
-// std::format writes strings of all eight types: their text as UTF-8, with the specifications of text. Where the
+// std::format writes strings of all eight types: their text as UTF-8, with the optionss of text. Where the
 // run-time has no <format>, there is nothing that could be called and this file is empty.
 
 #include <string/formatter_rows.h>
@@ -23,15 +23,15 @@ using kvt::ex::Encoding;
 using kvt::ex::UString;
 
 template <typename... Arguments>
-std::string formatted(std::string_view specification, const Arguments&... arguments) {
-    return std::vformat(specification, std::make_format_args(arguments...));
+std::string formatted(std::string_view options, const Arguments&... arguments) {
+    return std::vformat(options, std::make_format_args(arguments...));
 }
 
 template <std::uint32_t N>
 void writesTheRows() {
     for (const FormatRow& row : formatRows) {
-        EXPECT_EQ(formatted(row.specification, rowText<N>()), row.ofText)
-            << N << ' ' << row.specification << ": " << row.why;
+        EXPECT_EQ(formatted(row.options, rowText<N>()), row.ofText)
+            << N << ' ' << row.options << ": " << row.why;
     }
 }
 
