@@ -71,8 +71,8 @@ private:
 DecimalDigits shortestDigits(double value, DoubleToStringConverter::DtoaMode mode) {
     DecimalDigits digits{};
     bool sign = false;
-    DoubleToStringConverter::DoubleToAscii(value, mode, 0, digits.buffer, sizeof digits.buffer, &sign, &digits.length,
-                                           &digits.point);
+    DoubleToStringConverter::DoubleToAscii(value, mode, 0, digits.buffer, sizeof digits.buffer, &sign,
+                                           &digits.length, &digits.point);
     return digits;
 }
 
@@ -103,8 +103,8 @@ void layOut(const DecimalDigits& digits, int limit, OutputBuilder& out) {
     }
 }
 
-std::uint64_t toText(double value, DoubleToStringConverter::DtoaMode mode, int limit, const SpecialTexts& texts,
-                     char* buffer) {
+std::uint64_t toText(double value, DoubleToStringConverter::DtoaMode mode, int limit,
+                     const SpecialTexts& texts, char* buffer) {
     OutputBuilder out(buffer, floatTextBuffer);
     const bool isNan = std::isnan(value);
     if (std::signbit(value) && (!isNan || texts.nanHasSign)) {

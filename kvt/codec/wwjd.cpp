@@ -25,11 +25,11 @@ struct Token {
 
 // Sorted by name as bytes.
 constexpr std::array<Token, 25> tokens = {{
-    {"amp", '&'},          {"apos", '\''},        {"at", '@'},           {"backslash", '\\'}, {"backspace", '\b'},
-    {"bell", '\a'},        {"closebracket", ']'}, {"closecurly", '}'},   {"closeparen", ')'}, {"comma", ','},
-    {"cr", '\r'},          {"dollar", '$'},       {"formfeed", '\f'},    {"gt", '>'},         {"lf", '\n'},
-    {"lt", '<'},           {"openbracket", '['},  {"opencurly", '{'},    {"openparen", '('},  {"quote", '"'},
-    {"semicolon", ';'},    {"solidus", '/'},      {"space", ' '},        {"tab", '\t'},       {"verttab", '\v'},
+    {"amp", '&'},       {"apos", '\''},        {"at", '@'},         {"backslash", '\\'}, {"backspace", '\b'},
+    {"bell", '\a'},     {"closebracket", ']'}, {"closecurly", '}'}, {"closeparen", ')'}, {"comma", ','},
+    {"cr", '\r'},       {"dollar", '$'},       {"formfeed", '\f'},  {"gt", '>'},         {"lf", '\n'},
+    {"lt", '<'},        {"openbracket", '['},  {"opencurly", '{'},  {"openparen", '('},  {"quote", '"'},
+    {"semicolon", ';'}, {"solidus", '/'},      {"space", ' '},      {"tab", '\t'},       {"verttab", '\v'},
 }};
 
 constexpr bool byName(const Token& left, const Token& right) {
@@ -121,8 +121,13 @@ std::string utf16ToWwjd(std::u16string_view text) {
     out.reserve(text.size() * 4);
     for (const char16_t unit : text) {
         if (unit > 127) {
-            out += {'<', 'u', digits[unit >> 12], digits[(unit >> 8) & 15], digits[(unit >> 4) & 15],
-                    digits[unit & 15], '>'};
+            out += {'<',
+                    'u',
+                    digits[unit >> 12],
+                    digits[(unit >> 8) & 15],
+                    digits[(unit >> 4) & 15],
+                    digits[unit & 15],
+                    '>'};
         } else if (const std::string_view name = tokenNames[unit]; !name.empty()) {
             out.append(1, '<').append(name).append(1, '>');
         } else {
@@ -157,7 +162,8 @@ UString<2> wwjdToUtf16(std::string_view text) {
     }
     valid = appendAscii(scanner.rest(), out) && valid;
     if (!valid) {
-        const std::string_view units(reinterpret_cast<const char*>(out.data()), out.size() * sizeof(char16_t));
+        const std::string_view units(reinterpret_cast<const char*>(out.data()),
+                                     out.size() * sizeof(char16_t));
         throw UStringBadEncodingException(UString<28>(UStringView<28>(scanner.rest())), Encoding::Wwjd,
                                           lossyUtf8(units, Encoding::Utf16LE), "\xEF\xBF\xBD");
     }
@@ -192,7 +198,7 @@ void wwjdDecode(kvt::future::basic_string_view<CharT, std::char_traits<CharT>> t
     size = decoded.size();
 }
 
-template KVT_EXPORT void wwjdDecode<char>(kvt::future::basic_string_view<char, std::char_traits<char>>, const char*&,
-                                          std::uint64_t&);
+template KVT_EXPORT void wwjdDecode<char>(kvt::future::basic_string_view<char, std::char_traits<char>>,
+                                          const char*&, std::uint64_t&);
 
 } // namespace kvt::ex::detail

@@ -41,8 +41,9 @@ template <typename CharT>
 void wwjdDecode(kvt::future::basic_string_view<CharT, std::char_traits<CharT>> text, const CharT*& data,
                 std::uint64_t& size);
 
-extern template KVT_EXPORT void wwjdDecode<char>(kvt::future::basic_string_view<char, std::char_traits<char>> text,
-                                                 const char*& data, std::uint64_t& size);
+extern template KVT_EXPORT void
+wwjdDecode<char>(kvt::future::basic_string_view<char, std::char_traits<char>> text, const char*& data,
+                 std::uint64_t& size);
 
 } // namespace detail
 } // namespace kvt::ex

@@ -15,25 +15,44 @@ struct CodePage {
 };
 
 constexpr std::array codePages = {
-    CodePage{708, "ISO-8859-6"},         CodePage{720, "ibm-720_P100-1997"},
-    CodePage{852, "IBM852"},             CodePage{862, "IBM862"},
-    CodePage{866, "IBM866"},             CodePage{874, "windows-874-2000"},
-    CodePage{932, "Shift_JIS"},          CodePage{936, "GBK"},
-    CodePage{949, "EUC-KR"},             CodePage{950, "Big5"},
-    CodePage{951, "ibm-5471_P100-2006"}, CodePage{1200, "ISO-8859-1"},
-    CodePage{1201, "ISO-8859-1"},        CodePage{1250, "windows-1250"},
-    CodePage{1251, "windows-1251"},      CodePage{1252, "windows-1252"},
-    CodePage{1253, "windows-1253"},      CodePage{1254, "windows-1254"},
-    CodePage{1255, "windows-1255"},      CodePage{1256, "windows-1256"},
-    CodePage{1257, "windows-1257"},      CodePage{1258, "windows-1258"},
-    CodePage{20866, "KOI8-R"},           CodePage{28592, "ISO-8859-2"},
-    CodePage{28593, "ISO-8859-3"},       CodePage{28594, "ISO-8859-4"},
-    CodePage{28595, "ISO-8859-5"},       CodePage{28596, "ISO-8859-6"},
-    CodePage{28597, "ISO-8859-7"},       CodePage{28598, "ISO-8859-8"},
-    CodePage{38598, "ISO-8859-8"},       CodePage{50220, "Shift_JIS"},
-    CodePage{50225, "ISO-2022-KR"},      CodePage{51932, "EUC-JP"},
-    CodePage{51949, "EUC-KR"},           CodePage{52936, "HZ-GB-2312"},
-    CodePage{65000, "UTF-7"},            CodePage{65001, "UTF-8"},
+    CodePage{708, "ISO-8859-6"},
+    CodePage{720, "ibm-720_P100-1997"},
+    CodePage{852, "IBM852"},
+    CodePage{862, "IBM862"},
+    CodePage{866, "IBM866"},
+    CodePage{874, "windows-874-2000"},
+    CodePage{932, "Shift_JIS"},
+    CodePage{936, "GBK"},
+    CodePage{949, "EUC-KR"},
+    CodePage{950, "Big5"},
+    CodePage{951, "ibm-5471_P100-2006"},
+    CodePage{1200, "ISO-8859-1"},
+    CodePage{1201, "ISO-8859-1"},
+    CodePage{1250, "windows-1250"},
+    CodePage{1251, "windows-1251"},
+    CodePage{1252, "windows-1252"},
+    CodePage{1253, "windows-1253"},
+    CodePage{1254, "windows-1254"},
+    CodePage{1255, "windows-1255"},
+    CodePage{1256, "windows-1256"},
+    CodePage{1257, "windows-1257"},
+    CodePage{1258, "windows-1258"},
+    CodePage{20866, "KOI8-R"},
+    CodePage{28592, "ISO-8859-2"},
+    CodePage{28593, "ISO-8859-3"},
+    CodePage{28594, "ISO-8859-4"},
+    CodePage{28595, "ISO-8859-5"},
+    CodePage{28596, "ISO-8859-6"},
+    CodePage{28597, "ISO-8859-7"},
+    CodePage{28598, "ISO-8859-8"},
+    CodePage{38598, "ISO-8859-8"},
+    CodePage{50220, "Shift_JIS"},
+    CodePage{50225, "ISO-2022-KR"},
+    CodePage{51932, "EUC-JP"},
+    CodePage{51949, "EUC-KR"},
+    CodePage{52936, "HZ-GB-2312"},
+    CodePage{65000, "UTF-7"},
+    CodePage{65001, "UTF-8"},
 };
 
 } // namespace
@@ -47,23 +66,23 @@ std::string_view codePageName(std::uint32_t codePage) {
 } // namespace detail
 
 // A page by its name: looked up at the first call, and again at the next when that throws.
-#define KVT_NAMED_PAGE(family, number, name)                                                                          \
-    template <>                                                                                                       \
-    Encoding Encoding::family<number>() {                                                                             \
-        static const Encoding encoding{kvt::future::string_view(name)};                                               \
-        return encoding;                                                                                              \
+#define KVT_NAMED_PAGE(family, number, name)                                                                 \
+    template <>                                                                                              \
+    Encoding Encoding::family<number>() {                                                                    \
+        static const Encoding encoding{kvt::future::string_view(name)};                                      \
+        return encoding;                                                                                     \
     }
 // A page with a fixed id.
-#define KVT_FIXED_PAGE(family, number, type)                                                                          \
-    template <>                                                                                                       \
-    Encoding Encoding::family<number>() {                                                                             \
-        return type;                                                                                                  \
+#define KVT_FIXED_PAGE(family, number, type)                                                                 \
+    template <>                                                                                              \
+    Encoding Encoding::family<number>() {                                                                    \
+        return type;                                                                                         \
     }
 // A page that is the same in both families.
-#define KVT_SHARED_PAGE(number)                                                                                       \
-    template <>                                                                                                       \
-    Encoding Encoding::windowsCodePage<number>() {                                                                    \
-        return ibmCodePage<number>();                                                                                 \
+#define KVT_SHARED_PAGE(number)                                                                              \
+    template <>                                                                                              \
+    Encoding Encoding::windowsCodePage<number>() {                                                           \
+        return ibmCodePage<number>();                                                                        \
     }
 
 KVT_NAMED_PAGE(ibmCodePage, 37, "IBM037")

@@ -49,9 +49,18 @@ bool Encoding::supports7BitASCII() const {
         return false;
     }
     static const std::set<Encoding> compatible = {
-        Encoding("ibm-5471_P100-2006"), windowsCodePage<874>(),   windowsCodePage<936>(),   windowsCodePage<949>(),
-        windowsCodePage<950>(),         windowsCodePage<10000>(), windowsCodePage<10006>(), windowsCodePage<10007>(),
-        windowsCodePage<10029>(),       Encoding("EUC-JP"),       Encoding("EUC-KR"),       Encoding("KOI8-R"),
+        Encoding("ibm-5471_P100-2006"),
+        windowsCodePage<874>(),
+        windowsCodePage<936>(),
+        windowsCodePage<949>(),
+        windowsCodePage<950>(),
+        windowsCodePage<10000>(),
+        windowsCodePage<10006>(),
+        windowsCodePage<10007>(),
+        windowsCodePage<10029>(),
+        Encoding("EUC-JP"),
+        Encoding("EUC-KR"),
+        Encoding("KOI8-R"),
     };
     return compatible.count(*this) != 0;
 }

@@ -25,12 +25,14 @@ std::string resolveSystemName() {
 }
 
 constexpr std::array<std::string_view, EncodingRegistry::firstDynamic> fixedNames = {
-    "UTF-8",        "US-ASCII",     "UTF-16LE",     "UTF-32LE",         "UTF-16BE",     "UTF-32BE",
-    "ISO-8859-1",   "ISO-8859-2",   "ISO-8859-3",   "ISO-8859-4",       "ISO-8859-5",   "ISO-8859-6",
-    "ISO-8859-7",   "ISO-8859-8",   "ISO-8859-9",   "iso-8859-11-2001", "ISO-8859-13",  "ISO-8859-15",
-    "windows-1250", "windows-1251", "windows-1252", "windows-1253",     "windows-1254", "windows-1255",
-    "windows-1256", "windows-1257", "windows-1258", "" /* System */,    "zqt-binary",   "zqt-wwjd",
-    "Unknown Encoding",
+    "UTF-8",        "US-ASCII",     "UTF-16LE",         "UTF-32LE",
+    "UTF-16BE",     "UTF-32BE",     "ISO-8859-1",       "ISO-8859-2",
+    "ISO-8859-3",   "ISO-8859-4",   "ISO-8859-5",       "ISO-8859-6",
+    "ISO-8859-7",   "ISO-8859-8",   "ISO-8859-9",       "iso-8859-11-2001",
+    "ISO-8859-13",  "ISO-8859-15",  "windows-1250",     "windows-1251",
+    "windows-1252", "windows-1253", "windows-1254",     "windows-1255",
+    "windows-1256", "windows-1257", "windows-1258",     "" /* System */,
+    "zqt-binary",   "zqt-wwjd",     "Unknown Encoding",
 };
 
 std::array<std::string_view, EncodingRegistry::firstDynamic> namesWithSystem(std::string_view systemName) {

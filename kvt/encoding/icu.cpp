@@ -22,8 +22,8 @@ bool isLoss(UConverterCallbackReason reason) {
     return reason == UCNV_UNASSIGNED || reason == UCNV_ILLEGAL || reason == UCNV_IRREGULAR;
 }
 
-void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, const char* bytes, std::int32_t length,
-                       UConverterCallbackReason reason, UErrorCode* error) {
+void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, const char* bytes,
+                       std::int32_t length, UConverterCallbackReason reason, UErrorCode* error) {
     if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
         auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
         listener->onBadInput({bytes, static_cast<std::size_t>(length)}, arguments->target, *error);
@@ -32,7 +32,8 @@ void toUnicodeCallback(const void* context, UConverterToUnicodeArgs* arguments, 
 }
 
 void fromUnicodeCallback(const void* context, UConverterFromUnicodeArgs* arguments, const char16_t* units,
-                         std::int32_t length, UChar32 codePoint, UConverterCallbackReason reason, UErrorCode* error) {
+                         std::int32_t length, UChar32 codePoint, UConverterCallbackReason reason,
+                         UErrorCode* error) {
     if (isLoss(reason) && *error != U_BUFFER_OVERFLOW_ERROR) {
         auto* const listener = static_cast<LossListener*>(const_cast<void*>(context));
         listener->onNotRepresentable(static_cast<char32_t>(codePoint), *error);
@@ -120,7 +121,8 @@ Converter::Converter(Encoding encoding) : encoding_(encoding) {
     UErrorCode error = U_ZERO_ERROR;
     converter_.reset(ucnv_open(encoding.getName().data(), &error));
     // Compound text is left with ICU's own substitution: once another is set, ucnv_close frees what is not its own.
-    if (converter_ == nullptr || isUnicodeForm(encoding) || ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {
+    if (converter_ == nullptr || isUnicodeForm(encoding) ||
+        ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {
         return;
     }
     // Where ICU refuses, its own substitution stays.
@@ -246,8 +248,8 @@ bool Converter::holdsUnits() const {
     return ucnv_fromUCountPending(converter_.get(), &error) != 0;
 }
 
-Progress Converter::toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
-                              bool flush) {
+Progress Converter::toUnicode(const char*& source, const char* sourceEnd, char16_t*& target,
+                              const char16_t* targetEnd, bool flush) {
     UErrorCode error = U_ZERO_ERROR;
     ucnv_toUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, nullptr, flush ? 1 : 0, &error);
     return progressOf(error);
@@ -256,13 +258,15 @@ Progress Converter::toUnicode(const char*& source, const char* sourceEnd, char16
 Progress Converter::fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target,
                                 const char* targetEnd, bool flush) {
     UErrorCode error = U_ZERO_ERROR;
-    ucnv_fromUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, nullptr, flush ? 1 : 0, &error);
+    ucnv_fromUnicode(converter_.get(), &target, targetEnd, &source, sourceEnd, nullptr, flush ? 1 : 0,
+                     &error);
     return progressOf(error);
 }
 
-Progress Converter::convert(Converter& to, Converter& from, char*& target, const char* targetEnd, const char*& source,
-                            const char* sourceEnd, char16_t* pivot, char16_t*& pivotSource, char16_t*& pivotTarget,
-                            const char16_t* pivotEnd, bool reset, bool flush) {
+Progress Converter::convert(Converter& to, Converter& from, char*& target, const char* targetEnd,
+                            const char*& source, const char* sourceEnd, char16_t* pivot,
+                            char16_t*& pivotSource, char16_t*& pivotTarget, const char16_t* pivotEnd,
+                            bool reset, bool flush) {
     for (Converter* const converter : {&to, &from}) {
         if (reset && converter->forgetsToReset()) {
             converter->reset();

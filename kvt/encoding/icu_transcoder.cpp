@@ -34,8 +34,8 @@ Losses takeLosses(TranscoderHelper& from, TranscoderHelper& to) {
 // Converts all of `bytes`, what needs no ICU first, and tells of losses by its result. The text of the two
 // encodings differs.
 template <typename CharOut>
-Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to, std::string_view bytes,
-                  std::basic_string<CharOut>& out) {
+Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
+                  std::string_view bytes, std::basic_string<CharOut>& out) {
     out.clear();
     if (bytes.empty()) {
         return Losses::none;
@@ -111,11 +111,12 @@ ICUTranscoder::Status ICUTranscoder::transcodeStream(kvt::future::basic_string_v
     auto* target = reinterpret_cast<char*>(buffer);
     const auto* const targetEnd = reinterpret_cast<const char*>(buffer + out.size());
 
-    const detail::icu::Progress progress =
-        detail::icu::Converter::convert(to_->converter(), from_->converter(), target, targetEnd, source, sourceEnd,
-                                        pivot_, pivotSource_, pivotTarget_, pivot_ + pivotUnits, reset, flush);
+    const detail::icu::Progress progress = detail::icu::Converter::convert(
+        to_->converter(), from_->converter(), target, targetEnd, source, sourceEnd, pivot_, pivotSource_,
+        pivotTarget_, pivot_ + pivotUnits, reset, flush);
 
-    in.remove_prefix(static_cast<std::size_t>(source - reinterpret_cast<const char*>(in.data())) / sizeof(CharIn));
+    in.remove_prefix(static_cast<std::size_t>(source - reinterpret_cast<const char*>(in.data())) /
+                     sizeof(CharIn));
     out = out.substr(0, static_cast<std::size_t>(target - reinterpret_cast<char*>(buffer)) / sizeof(CharOut));
     switch (progress.end) {
     case detail::icu::Progress::inputTaken:
@@ -151,10 +152,10 @@ void ICUTranscoder::transcode(kvt::future::basic_string_view<CharIn> in, std::ba
                                       std::move(substitution));
 }
 
-#define KVT_TRANSCODE(CharIn, CharOut)                                                                                \
-    template KVT_EXPORT void ICUTranscoder::transcode(kvt::future::basic_string_view<CharIn>,                         \
-                                                      std::basic_string<CharOut>&);                                   \
-    template KVT_EXPORT ICUTranscoder::Status ICUTranscoder::transcodeStream(                                         \
+#define KVT_TRANSCODE(CharIn, CharOut)                                                                       \
+    template KVT_EXPORT void ICUTranscoder::transcode(kvt::future::basic_string_view<CharIn>,                \
+                                                      std::basic_string<CharOut>&);                          \
+    template KVT_EXPORT ICUTranscoder::Status ICUTranscoder::transcodeStream(                                \
         kvt::future::basic_string_view<CharIn>&, kvt::future::basic_string_view<CharOut>&, bool, bool);
 
 KVT_TRANSCODE(char, char)

@@ -71,8 +71,8 @@ public:
     /// transcode() of the same encodings on this thread reports them. See StreamTranscoder for a stream that
     /// reports each loss with its place.
     template <typename CharIn, typename CharOut>
-    Status transcodeStream(kvt::future::basic_string_view<CharIn>& in, kvt::future::basic_string_view<CharOut>& out,
-                           bool flush, bool reset);
+    Status transcodeStream(kvt::future::basic_string_view<CharIn>& in,
+                           kvt::future::basic_string_view<CharOut>& out, bool flush, bool reset);
 
 private:
     static constexpr std::size_t pivotUnits = 1024;

@@ -64,8 +64,8 @@ struct Unit {
 class StreamTranscoder::Impl final : private detail::icu::LossListener {
 public:
     Impl(Encoding from, Encoding to)
-        : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from), toTable_(to),
-          hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
+        : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from),
+          toTable_(to), hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
           isStateless_(from_.isStateless() && to_.isStateless()), substitution_(to_.substitution()) {
         from_.setListener(*this);
         to_.setListener(*this);
@@ -135,8 +135,8 @@ private:
 
     std::uint64_t position_ = 0;
     std::uint64_t characterBegin_ = 0; // where the bytes held by the source's converter begin
-    std::uint64_t settledEnd_ = 0;     // behind the last character that came out, before shifts that followed it
-    std::string recent_;               // the last bytes before position_
+    std::uint64_t settledEnd_ = 0; // behind the last character that came out, before shifts that followed it
+    std::string recent_;           // the last bytes before position_
 
     std::array<char16_t, bufferUnits> buffer_{};
     std::size_t filled_ = 0;
@@ -238,7 +238,8 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
 // From bytes to the buffer of UTF-16.
 Progress StreamTranscoder::Impl::decode(const char*& source, const char* sourceEnd, bool flush) {
     char16_t* target = buffer_.data();
-    const Progress progress = from_.toUnicode(source, sourceEnd, target, buffer_.data() + buffer_.size(), flush);
+    const Progress progress =
+        from_.toUnicode(source, sourceEnd, target, buffer_.data() + buffer_.size(), flush);
     if (exception_) {
         std::rethrow_exception(exception_);
     }
@@ -382,7 +383,8 @@ void StreamTranscoder::Impl::recordNotRepresentable(char32_t codePoint) {
     }
     const auto last = found + static_cast<std::ptrdiff_t>(length) - 1;
     if (!found->isSubstitution) {
-        losses_.push_back({Loss::NotRepresentable, found->begin, bytesOfInput(found->begin, last->end), codePoint});
+        losses_.push_back(
+            {Loss::NotRepresentable, found->begin, bytesOfInput(found->begin, last->end), codePoint});
     }
     units_.erase(units_.begin(), last + 1);
 }

@@ -10,7 +10,8 @@ BasicDllAllocator<DefaultAllocator>::operator=(const BasicDllAllocator&) noexcep
     return *this;
 }
 
-BasicDllAllocator<DefaultAllocator>& BasicDllAllocator<DefaultAllocator>::operator=(BasicDllAllocator&&) noexcept {
+BasicDllAllocator<DefaultAllocator>&
+BasicDllAllocator<DefaultAllocator>::operator=(BasicDllAllocator&&) noexcept {
     return *this;
 }
 

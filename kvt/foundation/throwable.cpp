@@ -115,13 +115,13 @@ void Throwable::addMessageString(const UString<0>& message) {
 }
 
 void Throwable::addNameValue(UString<0> name, UString<0> value) {
-    d().items.push_back(
-        std::make_shared<detail::ExceptionNameValue>(make_string(std::move(name)), make_string(std::move(value))));
+    d().items.push_back(std::make_shared<detail::ExceptionNameValue>(make_string(std::move(name)),
+                                                                     make_string(std::move(value))));
 }
 
 void Throwable::addStackFrame(UString<0> file, UString<0> function, int line) {
-    d().items.push_back(std::make_shared<detail::ExceptionStackFrame>(make_string(std::move(file)),
-                                                                      make_string(std::move(function)), line));
+    d().items.push_back(std::make_shared<detail::ExceptionStackFrame>(
+        make_string(std::move(file)), make_string(std::move(function)), line));
 }
 
 UString<0> Throwable::what() const {
@@ -190,8 +190,8 @@ const std::uint32_t UStringTranscodingException::transcodingError = 910003;
 const std::uint32_t UStringBinaryTranscodingException::binaryTranscoding = 910004;
 const std::uint32_t InvalidEncodingException::badEncoding = 910005;
 
-UStringBadEncodingException::UStringBadEncodingException(const UString<28>& bytes, Encoding from, UString<0> lossy,
-                                                         UString<0> substitution)
+UStringBadEncodingException::UStringBadEncodingException(const UString<28>& bytes, Encoding from,
+                                                         UString<0> lossy, UString<0> substitution)
     : UStringException(badInputEncoding, {escaped(bytes), nameOf(from)}) {
     addLoss(*this, std::move(lossy), std::move(substitution));
 }
@@ -224,13 +224,15 @@ UStringBinaryTranscodingException::UStringBinaryTranscodingException(const UStri
 UStringNotImplementedException::UStringNotImplementedException(const char* function)
     : UStringException(utf8(replacedFirst("The function %func% is not implemented.", "%func%", function))) {}
 
-InvalidEncodingException::InvalidEncodingException(UString<0> name) : Exception(badEncoding, {std::move(name)}) {}
+InvalidEncodingException::InvalidEncodingException(UString<0> name)
+    : Exception(badEncoding, {std::move(name)}) {}
 
 PythonVersionError::PythonVersionError(const UString<0>& required, const UString<0>& configured)
     : FatalError(utf8(replacedFirst(
-          replacedFirst("Workspace requiring Python %0 is requested to run on an ZQT Engine configured to use a "
-                        "Python %1 interpreter. ZQT cannot continue given the Python version mismatch",
-                        "%0", view(required)),
+          replacedFirst(
+              "Workspace requiring Python %0 is requested to run on an ZQT Engine configured to use a "
+              "Python %1 interpreter. ZQT cannot continue given the Python version mismatch",
+              "%0", view(required)),
           "%1", view(configured)))) {}
 
 } // namespace kvt::ex

@@ -108,7 +108,8 @@ public:
 class KVT_EXPORT UStringBadEncodingException : public UStringException {
 public:
     /// `lossy` is the whole text with `substitution` in place of what was bad.
-    UStringBadEncodingException(const UString<28>& bytes, Encoding from, UString<0> lossy, UString<0> substitution);
+    UStringBadEncodingException(const UString<28>& bytes, Encoding from, UString<0> lossy,
+                                UString<0> substitution);
 
     /// The text with substitutions.
     UString<0> getLossyConversion() const;

@@ -29,11 +29,13 @@ namespace kvt::ex {
 
 template <typename T>
 class KVT_EXPORT vector : public TypedAllocator<T> {
-    static_assert(alignof(T) <= __STDCPP_DEFAULT_NEW_ALIGNMENT__, "the library's allocator gives no stricter alignment");
+    static_assert(alignof(T) <= __STDCPP_DEFAULT_NEW_ALIGNMENT__,
+                  "the library's allocator gives no stricter alignment");
 
     template <typename Iterator>
-    using RequireInput = std::enable_if_t<std::is_convertible_v<
-        typename std::iterator_traits<Iterator>::iterator_category, std::input_iterator_tag>>;
+    using RequireInput =
+        std::enable_if_t<std::is_convertible_v<typename std::iterator_traits<Iterator>::iterator_category,
+                                               std::input_iterator_tag>>;
 
 public:
     using value_type = T;
@@ -142,7 +144,8 @@ public:
         } else {
             // The new element is made before the old ones move, since it may be made from one of them.
             Storage larger(grownCapacity(1));
-            larger.element = ::new (static_cast<void*>(larger.data + size_)) T(std::forward<Arguments>(arguments)...);
+            larger.element =
+                ::new (static_cast<void*>(larger.data + size_)) T(std::forward<Arguments>(arguments)...);
             std::uninitialized_move(begin(), end(), larger.data);
             adopt(larger);
             larger.element = nullptr;

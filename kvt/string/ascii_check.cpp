@@ -53,7 +53,8 @@ bool appendSubstituted(std::string_view bytes, std::string& out) {
         const std::string_view trailing = bytes.substr(0, announced);
         bytes.remove_prefix(trailing.size());
         // One SUB for the character, and one for each byte that is none of its own.
-        const auto own = static_cast<std::size_t>(std::count_if(trailing.begin(), trailing.end(), isTrailing));
+        const auto own =
+            static_cast<std::size_t>(std::count_if(trailing.begin(), trailing.end(), isTrailing));
         out.append(1 + trailing.size() - own, substitute);
         wellFormed = wellFormed && announced != 0 && own == announced;
     }
@@ -69,9 +70,11 @@ void utf8ToAscii(std::string_view bytes, std::string& out) {
         return;
     }
     if (appendSubstituted(bytes.substr(out.size()), out)) {
-        throw UStringTranscodingException(utf8(bytes), Encoding::Utf8, Encoding::UsAscii, utf8(out), substitution());
+        throw UStringTranscodingException(utf8(bytes), Encoding::Utf8, Encoding::UsAscii, utf8(out),
+                                          substitution());
     }
-    throw UStringBadEncodingException(UString<28>(UStringView<28>(bytes)), Encoding::Utf8, utf8(out), substitution());
+    throw UStringBadEncodingException(UString<28>(UStringView<28>(bytes)), Encoding::Utf8, utf8(out),
+                                      substitution());
 }
 
 void singleByteToAscii(Encoding from, std::string_view bytes, std::string& out) {
@@ -80,8 +83,10 @@ void singleByteToAscii(Encoding from, std::string_view bytes, std::string& out) 
     if (first == out.end()) {
         return;
     }
-    std::replace_if(first, out.end(), [](char byte) { return !isAscii(byte); }, substitute);
-    throw UStringTranscodingException(lossyUtf8(bytes, from), from, Encoding::UsAscii, utf8(out), substitution());
+    std::replace_if(
+        first, out.end(), [](char byte) { return !isAscii(byte); }, substitute);
+    throw UStringTranscodingException(lossyUtf8(bytes, from), from, Encoding::UsAscii, utf8(out),
+                                      substitution());
 }
 
 } // namespace kvt::ex::detail

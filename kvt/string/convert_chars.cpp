@@ -85,12 +85,12 @@ void convertChars(Encoding from, Encoding to, std::string_view bytes, std::basic
     }
 }
 
-#define KVT_INSTANTIATE(CharOut)                                                                                      \
-    template void copyBytes(std::string_view, std::basic_string<CharOut>&);                                           \
-    template void transcodeBytes(Encoding, Encoding, std::string_view, std::basic_string<CharOut>&);                  \
-    template void fromAscii(Encoding, std::string_view, std::basic_string<CharOut>&);                                 \
-    template void toAsciiChecked(Encoding, std::string_view, std::basic_string<CharOut>&);                            \
-    template void fromUtf16(Encoding, std::u16string_view, std::basic_string<CharOut>&);                              \
+#define KVT_INSTANTIATE(CharOut)                                                                             \
+    template void copyBytes(std::string_view, std::basic_string<CharOut>&);                                  \
+    template void transcodeBytes(Encoding, Encoding, std::string_view, std::basic_string<CharOut>&);         \
+    template void fromAscii(Encoding, std::string_view, std::basic_string<CharOut>&);                        \
+    template void toAsciiChecked(Encoding, std::string_view, std::basic_string<CharOut>&);                   \
+    template void fromUtf16(Encoding, std::u16string_view, std::basic_string<CharOut>&);                     \
     template void convertChars(Encoding, Encoding, std::string_view, std::basic_string<CharOut>&);
 
 KVT_INSTANTIATE(char)

@@ -45,7 +45,8 @@ class UStringStorage {
 public:
     UStringStorage() : adaptor_(storage_) {}
     UStringStorage(const UStringStorage& other) : storage_(other.storage_), adaptor_(storage_) {}
-    UStringStorage(UStringStorage&& other) noexcept : storage_(std::move(other.storage_)), adaptor_(storage_) {
+    UStringStorage(UStringStorage&& other) noexcept
+        : storage_(std::move(other.storage_)), adaptor_(storage_) {
         other.storage_.clear();
     }
     UStringStorage& operator=(const UStringStorage& other) {
@@ -120,7 +121,8 @@ public:
     /// Tags to pass to comparisons and searches. Bytes without a text meaning have no case, so that both tags of
     /// UString<28> select the case-sensitive forms.
     static constexpr detail::case_sensitive_t case_sensitive{};
-    static constexpr std::conditional_t<N == Encoding::Binary, detail::case_sensitive_t, detail::case_insensitive_t>
+    static constexpr std::conditional_t<N == Encoding::Binary, detail::case_sensitive_t,
+                                        detail::case_insensitive_t>
         case_insensitive{};
 
     /// Empty. A UString<30> carries `Unknown`, with which it cannot be converted.
@@ -248,18 +250,24 @@ public:
     bool beginsWith(UStringView<N> needle, detail::case_insensitive_t) const;
     bool endsWith(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept;
     bool endsWith(UStringView<N> needle, detail::case_insensitive_t) const;
-    bool contains(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept { return find(needle) != npos; }
-    bool contains(UStringView<N> needle, detail::case_insensitive_t tag) const { return find(needle, 0, tag) != npos; }
+    bool contains(UStringView<N> needle, detail::case_sensitive_t = {}) const noexcept {
+        return find(needle) != npos;
+    }
+    bool contains(UStringView<N> needle, detail::case_insensitive_t tag) const {
+        return find(needle, 0, tag) != npos;
+    }
 
     /// The first position at or after `pos` where the needle begins, else npos. An empty needle is found at `pos`
     /// itself up to the size.
-    std::uint64_t find(UStringView<N> needle, std::uint64_t pos = 0, detail::case_sensitive_t = {}) const noexcept;
+    std::uint64_t find(UStringView<N> needle, std::uint64_t pos = 0,
+                       detail::case_sensitive_t = {}) const noexcept;
     std::uint64_t find(UStringView<N> needle, std::uint64_t pos, detail::case_insensitive_t) const;
     std::uint64_t find(value_type unit, std::uint64_t pos = 0) const noexcept;
 
     /// The last position at or before `pos` where the needle begins, else npos. An empty needle is found at the
     /// smaller of `pos` and the size.
-    std::uint64_t rfind(UStringView<N> needle, std::uint64_t pos = npos, detail::case_sensitive_t = {}) const noexcept;
+    std::uint64_t rfind(UStringView<N> needle, std::uint64_t pos = npos,
+                        detail::case_sensitive_t = {}) const noexcept;
     std::uint64_t rfind(UStringView<N> needle, std::uint64_t pos, detail::case_insensitive_t) const;
     std::uint64_t rfind(value_type unit, std::uint64_t pos = npos) const noexcept;
 

@@ -59,7 +59,8 @@ UStringArray<N> UStringArray<N>::fromIZQTStringArray(const IZQTStringArray& arra
     result.reserve(entries);
     for (std::uint32_t i = 0; i < entries; ++i) {
         // Handing out an element is not const in the host's interface, since the element can be written to.
-        result.push_back(UString<N>::fromIZQTString(const_cast<IZQTStringArray&>(array).element(i), encoding));
+        result.push_back(
+            UString<N>::fromIZQTString(const_cast<IZQTStringArray&>(array).element(i), encoding));
     }
     return result;
 }

@@ -37,7 +37,8 @@ const UCaseMap* defaultCaseMap() {
 
 // Whether ICU has written the text, or would have with more room.
 bool isUsable(UErrorCode status) {
-    return status == U_ZERO_ERROR || status == U_STRING_NOT_TERMINATED_WARNING || status == U_BUFFER_OVERFLOW_ERROR;
+    return status == U_ZERO_ERROR || status == U_STRING_NOT_TERMINATED_WARNING ||
+           status == U_BUFFER_OVERFLOW_ERROR;
 }
 
 // Maps `source` with `map`, a function of ICU's shape, into a string that is at least as long as the source. The string
@@ -68,8 +69,8 @@ UString<N> icuStringHelper(UStringView<N> source, Map map) {
 
 UString<0> mapUtf8(Mapping mapping, UStringView<0> source) {
     const UCaseMap* const caseMap = source.isEmpty() ? nullptr : defaultCaseMap();
-    return icuStringHelper(source, [&](char* target, std::int32_t capacity, const char* text, std::int32_t length,
-                                       UErrorCode* status) {
+    return icuStringHelper(source, [&](char* target, std::int32_t capacity, const char* text,
+                                       std::int32_t length, UErrorCode* status) {
         switch (mapping) {
         case Mapping::upper:
             return ucasemap_utf8ToUpper(caseMap, target, capacity, text, length, status);
@@ -217,7 +218,8 @@ UString<N> UString<N>::getAsFoldedCase() const {
 template <std::uint32_t N>
 void UString<N>::toUpperCase() {
     if constexpr (N == Encoding::UsAscii) {
-        std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(), mapAscii<Mapping::upper>);
+        std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
+                       mapAscii<Mapping::upper>);
     } else {
         *this = mapInto<Mapping::upper>(*this, "toUpperCase");
     }
@@ -226,7 +228,8 @@ void UString<N>::toUpperCase() {
 template <std::uint32_t N>
 void UString<N>::toLowerCase() {
     if constexpr (N == Encoding::UsAscii) {
-        std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(), mapAscii<Mapping::lower>);
+        std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
+                       mapAscii<Mapping::lower>);
     } else {
         *this = mapInto<Mapping::lower>(*this, "toLowerCase");
     }

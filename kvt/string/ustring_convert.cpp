@@ -45,7 +45,8 @@ constexpr Way grid[8][8] = {
 
 // Converts along one cell. The text comes as the bytes of its units.
 template <typename CharOut>
-void convertAlong(Way way, Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+void convertAlong(Way way, Encoding from, Encoding to, std::string_view bytes,
+                  std::basic_string<CharOut>& out) {
     switch (way) {
     case Way::copy:
     case Way::bytes:
@@ -152,8 +153,8 @@ UString<30> UString<N>::getAsEncoding(Encoding encoding) const {
 
 KVT_FOR_EACH_USTRING(KVT_INSTANTIATE_USTRING)
 
-#define KVT_INSTANTIATE_CONVERSION(N, M)                                                                              \
-    template KVT_EXPORT void UString<N>::init<M>(const UString<M>&);                                                  \
+#define KVT_INSTANTIATE_CONVERSION(N, M)                                                                     \
+    template KVT_EXPORT void UString<N>::init<M>(const UString<M>&);                                         \
     template KVT_EXPORT UString<N>& UString<N>::assign<M>(const UString<M>&);
 #define KVT_INSTANTIATE_CONVERSIONS(N) KVT_FOR_EACH_USTRING_WITH(KVT_INSTANTIATE_CONVERSION, N)
 

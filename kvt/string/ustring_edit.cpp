@@ -30,7 +30,8 @@ void requireRoom(const std::basic_string<Unit>& text, std::size_t removed, std::
 }
 
 template <typename Unit>
-void replaceUnits(std::basic_string<Unit>& text, std::size_t pos, std::size_t count, detail::Units<Unit> with) {
+void replaceUnits(std::basic_string<Unit>& text, std::size_t pos, std::size_t count,
+                  detail::Units<Unit> with) {
     requirePosition(text, pos);
     count = std::min(count, text.size() - pos);
     requireRoom(text, count, with.size());
@@ -40,8 +41,8 @@ void replaceUnits(std::basic_string<Unit>& text, std::size_t pos, std::size_t co
 // `text` with each `from` replaced by `to`, in one pass; the first one stands at `found`. What was put in is not
 // searched. Each replacement has to leave room for the text that follows, as if it were done in place.
 template <typename Unit>
-std::basic_string<Unit> allReplaced(detail::Units<Unit> text, detail::Units<Unit> from, detail::Units<Unit> to,
-                                    std::size_t found) {
+std::basic_string<Unit> allReplaced(detail::Units<Unit> text, detail::Units<Unit> from,
+                                    detail::Units<Unit> to, std::size_t found) {
     std::basic_string<Unit> result;
     result.reserve(text.size());
     std::size_t done = 0;
@@ -187,27 +188,31 @@ template <std::uint32_t N>
 UString<N>& UString<N>::replaceAll(const vector<value_type>& set, value_type to) noexcept {
     const detail::UnitSet<value_type> units(set.data(), set.size());
     std::replace_if(
-        this->storage_.begin(), this->storage_.end(), [&](value_type unit) { return units.contains(unit); }, to);
+        this->storage_.begin(), this->storage_.end(), [&](value_type unit) { return units.contains(unit); },
+        to);
     return *this;
 }
 
 template <std::uint32_t N>
 UString<N>& UString<N>::removeAll(value_type unit) noexcept {
-    this->storage_.erase(std::remove(this->storage_.begin(), this->storage_.end(), unit), this->storage_.end());
+    this->storage_.erase(std::remove(this->storage_.begin(), this->storage_.end(), unit),
+                         this->storage_.end());
     return *this;
 }
 
 template <std::uint32_t N>
 UString<N>& UString<N>::strip(const vector<value_type>& set) noexcept {
     // "Not found" is the largest count: everything goes.
-    this->storage_.erase(0, detail::UnitSet<value_type>(set.data(), set.size()).findFirst(this->storage_, 0, false));
+    this->storage_.erase(
+        0, detail::UnitSet<value_type>(set.data(), set.size()).findFirst(this->storage_, 0, false));
     return *this;
 }
 
 template <std::uint32_t N>
 UString<N>& UString<N>::rstrip(const vector<value_type>& set) noexcept {
     // One behind "not found" is 0: everything goes.
-    this->storage_.erase(detail::UnitSet<value_type>(set.data(), set.size()).findLast(this->storage_, npos, false) + 1);
+    this->storage_.erase(
+        detail::UnitSet<value_type>(set.data(), set.size()).findLast(this->storage_, npos, false) + 1);
     return *this;
 }
 

@@ -57,7 +57,8 @@ bool UString<N>::endsWith(UStringView<N> needle, detail::case_insensitive_t) con
 }
 
 template <std::uint32_t N>
-std::uint64_t UString<N>::find(UStringView<N> needle, std::uint64_t pos, detail::case_sensitive_t) const noexcept {
+std::uint64_t UString<N>::find(UStringView<N> needle, std::uint64_t pos,
+                               detail::case_sensitive_t) const noexcept {
     return detail::findUnits(unitsOf<N>(*this), unitsOf(needle), pos);
 }
 
@@ -68,7 +69,8 @@ std::uint64_t UString<N>::find(UStringView<N> needle, std::uint64_t pos, detail:
 }
 
 template <std::uint32_t N>
-std::uint64_t UString<N>::rfind(UStringView<N> needle, std::uint64_t pos, detail::case_sensitive_t) const noexcept {
+std::uint64_t UString<N>::rfind(UStringView<N> needle, std::uint64_t pos,
+                                detail::case_sensitive_t) const noexcept {
     return detail::rfindUnits(unitsOf<N>(*this), unitsOf(needle), pos);
 }
 

@@ -9,7 +9,8 @@ namespace {
 // what is left when `maxCount` pieces are cut off is one more piece, whatever it holds. The pieces of a UString<30>
 // have no encoding.
 template <std::uint32_t N, typename FindNext>
-UStringArray<N> splitAt(const UString<N>& text, bool keepEmptyParts, std::uint64_t maxCount, FindNext findNext) {
+UStringArray<N> splitAt(const UString<N>& text, bool keepEmptyParts, std::uint64_t maxCount,
+                        FindNext findNext) {
     UStringArray<N> pieces;
     const auto add = [&](std::size_t start, std::size_t end) {
         UString<N>& piece = pieces.emplace_back();
@@ -35,7 +36,8 @@ UStringArray<N> splitAt(const UString<N>& text, bool keepEmptyParts, std::uint64
 } // namespace
 
 template <std::uint32_t N>
-UStringArray<N> UString<N>::split(value_type delimiter, SplitBehaviour behaviour, std::uint64_t maxCount) const {
+UStringArray<N> UString<N>::split(value_type delimiter, SplitBehaviour behaviour,
+                                  std::uint64_t maxCount) const {
     return splitAt(*this, behaviour == KeepEmptyParts, maxCount,
                    [&](std::size_t start) { return find(delimiter, start); });
 }
@@ -48,7 +50,8 @@ UStringArray<N> UString<N>::split(const vector<value_type>& delimiters, SplitBeh
 }
 
 template <std::uint32_t N>
-UStringArray<N> UString<N>::split(UStringView<N> delimiter, SplitBehaviour behaviour, std::uint64_t maxCount) const {
+UStringArray<N> UString<N>::split(UStringView<N> delimiter, SplitBehaviour behaviour,
+                                  std::uint64_t maxCount) const {
     return splitAt(*this, behaviour == KeepEmptyParts, maxCount,
                    [&](std::size_t start) { return find(delimiter, start); });
 }

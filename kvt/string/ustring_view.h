@@ -35,10 +35,12 @@ public:
     constexpr UStringView() noexcept = default;
     constexpr UStringView(const value_type* data, std::size_t size) noexcept : data_(data), size_(size) {}
     /// Up to the terminating zero, which is not part of the view.
-    constexpr UStringView(const value_type* text) : UStringView(kvt::future::basic_string_view<value_type>(text)) {}
+    constexpr UStringView(const value_type* text)
+        : UStringView(kvt::future::basic_string_view<value_type>(text)) {}
     constexpr UStringView(kvt::future::basic_string_view<value_type> view) noexcept
         : data_(view.data()), size_(view.size()) {}
-    UStringView(const std::basic_string<value_type>& string) noexcept : data_(string.data()), size_(string.size()) {}
+    UStringView(const std::basic_string<value_type>& string) noexcept
+        : data_(string.data()), size_(string.size()) {}
     UStringView(const UString<N>& string) noexcept : data_(string.rawData()), size_(string.size()) {}
 
     constexpr operator kvt::future::basic_string_view<value_type>() const noexcept { return {data_, size_}; }

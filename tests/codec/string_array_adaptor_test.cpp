@@ -217,7 +217,8 @@ TYPED_TEST(ArrayAdaptor, Slot12TakesAnElementOfTheArray) {
     // The first of them is overwritten while the others are still compared with it.
     for (const std::uint32_t index : {0u, 2u, 5u}) {
         this->array = arrayOf<TypeParam::value>({"one", "two", "one", "one", "three", "one"});
-        EXPECT_EQ(slotOf<RemoveString>(this->host, 12)(this->host, &this->array[index].getAsIZQTString()), 4u);
+        EXPECT_EQ(slotOf<RemoveString>(this->host, 12)(this->host, &this->array[index].getAsIZQTString()),
+                  4u);
         EXPECT_EQ(shown(this->array), "[two][three]") << index;
     }
     EXPECT_EQ(slotOf<RemoveString>(this->host, 12)(this->host, &this->array[0].getAsIZQTString()), 1u);

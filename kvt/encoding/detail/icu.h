@@ -75,16 +75,17 @@ public:
     bool holdsUnits() const;
 
     /// From bytes to UTF-16. `source` and `target` are moved on.
-    Progress toUnicode(const char*& source, const char* sourceEnd, char16_t*& target, const char16_t* targetEnd,
-                       bool flush);
+    Progress toUnicode(const char*& source, const char* sourceEnd, char16_t*& target,
+                       const char16_t* targetEnd, bool flush);
     /// From UTF-16 to bytes.
-    Progress fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target, const char* targetEnd,
-                         bool flush);
+    Progress fromUnicode(const char16_t*& source, const char16_t* sourceEnd, char*& target,
+                         const char* targetEnd, bool flush);
 
     /// From bytes of `from` to bytes of `to`, by way of a pivot that carries text from call to call.
-    static Progress convert(Converter& to, Converter& from, char*& target, const char* targetEnd, const char*& source,
-                            const char* sourceEnd, char16_t* pivot, char16_t*& pivotSource, char16_t*& pivotTarget,
-                            const char16_t* pivotEnd, bool reset, bool flush);
+    static Progress convert(Converter& to, Converter& from, char*& target, const char* targetEnd,
+                            const char*& source, const char* sourceEnd, char16_t* pivot,
+                            char16_t*& pivotSource, char16_t*& pivotTarget, const char16_t* pivotEnd,
+                            bool reset, bool flush);
 
 private:
     struct Close {

@@ -50,7 +50,8 @@ private:
 
 class ExceptionNameValue final : public IExceptionData {
 public:
-    ExceptionNameValue(UString<0> name, UString<0> value) : name_(std::move(name)), value_(std::move(value)) {}
+    ExceptionNameValue(UString<0> name, UString<0> value)
+        : name_(std::move(name)), value_(std::move(value)) {}
     UString<0> toString() const override;
     const UString<0>& name() const { return name_; }
     const UString<0>& value() const { return value_; }
