@@ -109,7 +109,8 @@ public:
         return unit != SingleByteTable::noUnit ? Character{unit, 1} : noCharacter;
     }
     std::size_t write(char* p, char32_t c) const {
-        return c < 0x10000 ? writeFrom(c / SingleByteTable::pageSize, c % SingleByteTable::pageSize, p) : 0;
+        constexpr auto pageSize = static_cast<char32_t>(SingleByteTable::pageSize);
+        return c < 0x10000 ? writeFrom(c / pageSize, c % pageSize, p) : 0;
     }
     /// The same for the unit at a place in a page, the first six bits of which are left out.
     std::size_t writeFrom(char32_t page, char32_t place, char* p) const {

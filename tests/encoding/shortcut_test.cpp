@@ -154,7 +154,7 @@ TEST_P(ShortcutPair, TakesAllOfALongTextFromAnyAlignmentToAnyLength) {
             continue;
         }
         for (const std::size_t length :
-             {0, 1, 15, 16, 17, 31, 33, 2047, 2048, 4095, 4097, 8191, 8192, 8193, 40000}) {
+             {0u, 1u, 15u, 16u, 17u, 31u, 33u, 2047u, 2048u, 4095u, 4097u, 8191u, 8192u, 8193u, 40000u}) {
             const std::string bytes = encodeWithIcu(from().name, std::u16string(length, filler));
             for (std::size_t shift = 0; shift < 3; ++shift) {
                 const std::string shifted = std::string(shift, ' ') + bytes;
