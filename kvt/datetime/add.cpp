@@ -21,11 +21,12 @@ bool hasDateParts(const IntervalParts& interval) noexcept {
 }
 
 bool hasTimeParts(const IntervalParts& interval) noexcept {
-    return interval.hours() > 0 || interval.minutes() > 0 || interval.seconds() > 0 || interval.nanoseconds() > 0;
+    return interval.hours() > 0 || interval.minutes() > 0 || interval.seconds() > 0 ||
+           interval.nanoseconds() > 0;
 }
 
-// The text of a sum, of the kind of the value that it began with. What is beyond the years of a value is a part out of
-// range as long as it could be written in four digits, and else no text at all.
+// The text of a sum, of the kind of the value that it began with. What is beyond the years of a value is a part out
+// of range as long as it could be written in four digits, and else no text at all.
 Outcome<UString<0>> sumText(const detail::TemporalInstant& sum, TemporalType type) {
     const DateTimeParts parts = detail::partsFromInstant(sum);
     const std::int64_t year = detail::PartsAccess::year(parts);

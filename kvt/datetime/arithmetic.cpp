@@ -61,13 +61,13 @@ Outcome<TemporalInstant> addInterval(const TemporalInstant& instant, const Inter
 namespace {
 
 struct Walk {
-    TemporalInstant at;  ///< how far the steps have come
-    std::int64_t steps;  ///< how many of them, without sign
+    TemporalInstant at; ///< how far the steps have come
+    std::int64_t steps; ///< how many of them, without sign
 };
 
 // Steps of one unit from `start` towards `target`, `count` or, if those pass it, one fewer.
-Outcome<Walk> walkTowards(const TemporalInstant& start, const NanoCount& target, std::int64_t count, bool backwards,
-                          std::uint64_t& (*unit)(IntervalParts&)) {
+Outcome<Walk> walkTowards(const TemporalInstant& start, const NanoCount& target, std::int64_t count,
+                          bool backwards, std::uint64_t& (*unit)(IntervalParts&)) {
     if (count == 0) {
         return Walk{start, 0};
     }
@@ -128,8 +128,8 @@ Outcome<Difference> diffParts(const CanonicalRecord& first, const CanonicalRecor
     const CivilDate targetDate = dateOf(target);
     if (!isTimeKind(second.type)) {
         const std::int64_t yearsApart = targetDate.year - dateOf(cursor.count).year;
-        const Outcome<Walk> byYears =
-            walkTowards(cursor, target, yearsApart < 0 ? -yearsApart : yearsApart, backwards, PartsAccess::years);
+        const Outcome<Walk> byYears = walkTowards(cursor, target, yearsApart < 0 ? -yearsApart : yearsApart,
+                                                  backwards, PartsAccess::years);
         if (!byYears) {
             return byYears.failure();
         }
@@ -141,8 +141,8 @@ Outcome<Difference> diffParts(const CanonicalRecord& first, const CanonicalRecor
         if (targetDate.year != cursorDate.year) {
             monthsApart += targetDate.year > cursorDate.year ? 12 : -12;
         }
-        const Outcome<Walk> byMonths = walkTowards(cursor, target, monthsApart < 0 ? -monthsApart : monthsApart,
-                                                   backwards, PartsAccess::months);
+        const Outcome<Walk> byMonths = walkTowards(
+            cursor, target, monthsApart < 0 ? -monthsApart : monthsApart, backwards, PartsAccess::months);
         if (!byMonths) {
             return byMonths.failure();
         }
@@ -150,7 +150,8 @@ Outcome<Difference> diffParts(const CanonicalRecord& first, const CanonicalRecor
         months = byMonths->steps;
     }
 
-    const NanoCount remainder = backwards ? NanoCount(cursor.count - target) : NanoCount(target - cursor.count);
+    const NanoCount remainder =
+        backwards ? NanoCount(cursor.count - target) : NanoCount(target - cursor.count);
     const CivilDate earlier = backwards ? targetDate : dateOf(cursor.count);
     const auto monthLength = static_cast<double>(lastDayOfMonth(earlier.year, earlier.month));
     difference.months = static_cast<double>(years * 12 + months) +

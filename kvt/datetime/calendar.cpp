@@ -6,8 +6,8 @@ namespace kvt::ex::datetime::detail {
 
 namespace {
 
-// The calendar repeats itself after 400 years. The `date` library holds a year in 16 bits and days in 32, which suffice
-// for all that the library writes but not for every sum; whole cycles are taken out first.
+// The calendar repeats itself after 400 years. The `date` library holds a year in 16 bits and days in 32, which
+// suffice for all that the library writes but not for every sum; whole cycles are taken out first.
 constexpr std::int64_t yearsPerCycle = 400;
 constexpr std::int64_t daysPerCycle = 146'097;
 
@@ -19,14 +19,15 @@ constexpr std::int64_t floorOf(std::int64_t number, std::int64_t divisor) noexce
 
 std::int64_t daysFromCivil(std::int64_t year, unsigned month, unsigned day) noexcept {
     const std::int64_t cycles = floorOf(year, yearsPerCycle);
-    const date::year_month_day date(date::year(static_cast<int>(year - cycles * yearsPerCycle)), date::month(month),
-                                    date::day(day));
+    const date::year_month_day date(date::year(static_cast<int>(year - cycles * yearsPerCycle)),
+                                    date::month(month), date::day(day));
     return date::sys_days(date).time_since_epoch().count() + cycles * daysPerCycle;
 }
 
 CivilDate civilFromDays(std::int64_t days) noexcept {
     const std::int64_t cycles = floorOf(days, daysPerCycle);
-    const date::year_month_day date(date::sys_days(date::days(static_cast<int>(days - cycles * daysPerCycle))));
+    const date::year_month_day date(
+        date::sys_days(date::days(static_cast<int>(days - cycles * daysPerCycle))));
     return {static_cast<int>(date.year()) + cycles * yearsPerCycle, static_cast<unsigned>(date.month()),
             static_cast<unsigned>(date.day())};
 }

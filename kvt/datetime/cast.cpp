@@ -22,7 +22,8 @@ Outcome<TextResult> rendered(Outcome<UString<0>> text, bool repaired) {
     if (!text) {
         return text.failure();
     }
-    return detail::makeDateTimeResult(repaired ? ReturnState::Repaired : ReturnState::Success, std::move(*text));
+    return detail::makeDateTimeResult(repaired ? ReturnState::Repaired : ReturnState::Success,
+                                      std::move(*text));
 }
 
 Outcome<TextResult> castDate(const CanonicalRecord& record, CastToTemporalType target) {

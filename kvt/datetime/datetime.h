@@ -7,9 +7,9 @@
 //     20200102030405.25             both
 //     20200102030405.25+01:00       both, with an offset
 //
-// Years run from 1000 to 9999 in the Gregorian calendar, also before it was in use; a fraction of a second has at most
-// nine digits; there are no leap seconds and no zone names. Blanks around a value do not matter. Offsets are read as
-// "+hh", "+hhmm" and "+hh:mm" and always written as the last of these.
+// Years run from 1000 to 9999 in the Gregorian calendar, also before it was in use; a fraction of a second has at
+// most nine digits; there are no leap seconds and no zone names. Blanks around a value do not matter. Offsets are
+// read as "+hh", "+hhmm" and "+hh:mm" and always written as the last of these.
 //
 // An interval is `[-]P[nY][nM][nD][T[nH][nM][nS]]`, in this order, each at most once; only the seconds may have a
 // fraction. The zero interval is written "PT0S".
@@ -17,11 +17,11 @@
 //     using namespace kvt::ex::datetime;
 //     auto [state, text, message] = add("20200131", "P1M");     // Success, "20200229"
 //
-// No function throws. Each gives a tuple of the state, the value and a message: with `Success` or `Repaired` the value
-// is good and there is no message; else the value is an empty text (or 0.0) and the message, if any, says by number and
-// parameters what was wrong (message_numbers.h). Three answers are common to nearly all functions and not repeated
-// below: a value of no known shape is 933063, a part out of its range (a month of 13) is 933065, and what nobody
-// foresaw, lack of memory included, is the message 933068 without parameters.
+// No function throws. Each gives a tuple of the state, the value and a message: with `Success` or `Repaired` the
+// value is good and there is no message; else the value is an empty text (or 0.0) and the message, if any, says by
+// number and parameters what was wrong (message_numbers.h). Three answers are common to nearly all functions and not
+// repeated below: a value of no known shape is 933063, a part out of its range (a month of 13) is 933065, and what
+// nobody foresaw, lack of memory included, is the message 933068 without parameters.
 //
 // The functions keep no state and may be called from any thread; the zone database behind "local" is loaded once.
 #pragma once
@@ -37,15 +37,16 @@ namespace kvt::ex::datetime {
 
 // ---- Fields and text
 
-/// Reads a value into its fields, rounded: to the minute for a precision of -1, else to so many decimals of the second,
-/// 0 to 9. Rounding carries up to the year where it has to; the type is then that of a datetime. With -1 the minute is
-/// right and the seconds stay as they were. On failure the parts are the default ones.
-/// 933068 for another precision.
+/// Reads a value into its fields, rounded: to the minute for a precision of -1, else to so many decimals of the
+/// second, 0 to 9. Rounding carries up to the year where it has to; the type is then that of a datetime. With -1 the
+/// minute is right and the seconds stay as they were. On failure the parts are the default ones. 933068 for another
+/// precision.
 KVT_EXPORT PartsResult parseZQTDateTime(const UString<0>& value, std::int16_t precision);
 
-/// The datetime of the fields, always with a date and a time and with an offset if there is one; the type of the parts
-/// is not looked at. A part that is out of range is 933065: those that do not fit into two digits are met first, in the
-/// order from year to seconds, then hours, minutes, seconds, year, month and day. What nobody foresaw has no message.
+/// The datetime of the fields, always with a date and a time and with an offset if there is one; the type of the
+/// parts is not looked at. A part that is out of range is 933065: those that do not fit into two digits are met
+/// first, in the order from year to seconds, then hours, minutes, seconds, year, month and day. What nobody foresaw
+/// has no message.
 KVT_EXPORT TextResult create(const DateTimeParts& parts);
 
 /// The interval text of the fields, as they are: 90 minutes stay "PT90M". The zero interval never has a sign.
@@ -61,13 +62,14 @@ KVT_EXPORT TextResult cast(const UString<0>& value, CastToTemporalType target);
 /// The value moved by an interval: years and months first, the day then cut to the length of the month reached, then
 /// days and less as exact lengths of time. A date to which a time is added becomes a datetime; a time wraps at
 /// midnight and takes no years, months or days above zero (933060). The offset takes no part and stays; the state is
-/// `Repaired` if it was not canonical. 933064 for an interval that cannot be read, 933068 if a number in it is too large
-/// or has a fraction where it must not. A result with a year of 0 to 999 is 933065, one further off an empty text.
+/// `Repaired` if it was not canonical. 933064 for an interval that cannot be read, 933068 if a number in it is too
+/// large or has a fraction where it must not. A result with a year of 0 to 999 is 933065, one further off an empty
+/// text.
 KVT_EXPORT TextResult add(const UString<0>& value, const UString<0>& interval);
 
-/// The interval `first` minus `second`: whole years and months counted from `second` towards `first`, then the rest as
-/// days and less. Offsets count. The kinds have to be the same, but a date goes with a datetime without offset, as its
-/// midnight; else 933059. The parts of `second` are checked before those of `first`.
+/// The interval `first` minus `second`: whole years and months counted from `second` towards `first`, then the rest
+/// as days and less. Offsets count. The kinds have to be the same, but a date goes with a datetime without offset, as
+/// its midnight; else 933059. The parts of `second` are checked before those of `first`.
 KVT_EXPORT TextResult diff(const UString<0>& first, const UString<0>& second);
 
 /// The same difference as one number. Years and months are whole months plus the rest as a part of the month in which
@@ -84,8 +86,8 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 
 /// Reads a value that is written in any form, and gives it in canonical form.
 ///
-/// `format` without a "%" is a list of keywords, in any case, with "|" between them; the first that fits is taken, and
-/// an unknown one is passed over. 933075 if none was known, 933097 if none fitted.
+/// `format` without a "%" is a list of keywords, in any case, with "|" between them; the first that fits is taken,
+/// and an unknown one is passed over. 933075 if none was known, 933097 if none fitted.
 ///
 ///     ZQT    the canonical form itself, which is normalised
 ///     ISO    2020-01-02, 03:04:05, 2020-01-02T03:04:05, the last two also with an offset, "Z" included
@@ -115,14 +117,14 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 ///     $            the end of the value, as the last character of the format; without it, the rest is not looked at
 ///
 /// A format without any of %T %H %I %p %M %S %s %Es gives a date, so that %k and %l alone are read and dropped; one
-/// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A year that is not asked for
-/// is 1970, a month or day that is not asked for is 1, a minute or second that is not asked for is 0.
+/// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A year that is not asked
+/// for is 1970, a month or day that is not asked for is 1, a minute or second that is not asked for is 0.
 ///
 /// With `lenient`, what exceeds a bound in brackets runs over into the next larger part: 30 February is 1 or 2 March.
 ///
-/// An empty value fails without a message, an empty format is 933074. A pattern fails by 933067 at the element that did
-/// not match, by 933079 for an unknown flag, 933083 for %s and %z together, 933093 for seconds since 1970 out of range,
-/// and by 933081, 933082 and 933085 to 933091 if the parts do not make up a value.
+/// An empty value fails without a message, an empty format is 933074. A pattern fails by 933067 at the element that
+/// did not match, by 933079 for an unknown flag, 933083 for %s and %z together, 933093 for seconds since 1970 out of
+/// range, and by 933081, 933082 and 933085 to 933091 if the parts do not make up a value.
 KVT_EXPORT TextResult parse(const UString<0>& value, const UString<0>& format, bool lenient);
 
 /// Writes a canonical value in another form.
@@ -151,14 +153,14 @@ KVT_EXPORT TextResult parse(const UString<0>& value, const UString<0>& format, b
 ///     %%           a percent sign
 ///
 /// On a date the time reads as midnight, but there is no offset to ask for; on a time no part of a date can be asked
-/// for. Such a flag is 933078, an unknown one 933079, a "%" at the end 933076, %s beside %z 933083. An empty value fails
-/// without a message, an empty format is 933074. What nobody foresaw is 933084.
+/// for. Such a flag is 933078, an unknown one 933079, a "%" at the end 933076, %s beside %z 933083. An empty value
+/// fails without a message, an empty format is 933074. What nobody foresaw is 933084.
 KVT_EXPORT TextResult format(const UString<0>& value, const UString<0>& format);
 
 // ---- Offsets and the zone of the machine
 
-/// The present moment. `Error` with 933050 and the cause where the zone of the machine cannot be found; `Error` without
-/// a message for a mode that is none. `Utc` needs no zone database.
+/// The present moment. `Error` with 933050 and the cause where the zone of the machine cannot be found; `Error`
+/// without a message for a mode that is none. `Utc` needs no zone database.
 KVT_EXPORT TextResult now(ZoneMode mode);
 
 /// The offset of a value, as text or as a signed number. 933071 for all that has none, unreadable values included;

@@ -2,6 +2,7 @@
 #include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/text.h>
 
+#include <array>
 #include <optional>
 
 namespace kvt::ex::datetime {
@@ -74,10 +75,17 @@ UString<0> DateTimeParts::toDatetimeString(const FormatType& format, bool withOf
     return text.toString();
 }
 
-IntervalParts::IntervalParts(std::uint64_t years, std::uint64_t months, std::uint64_t days, std::uint64_t hours,
-                             std::uint64_t minutes, double seconds, bool negative) noexcept
+IntervalParts::IntervalParts(std::uint64_t years, std::uint64_t months, std::uint64_t days,
+                             std::uint64_t hours, std::uint64_t minutes, double seconds,
+                             bool negative) noexcept
     : years_(years), months_(months), days_(days), hours_(hours), minutes_(minutes),
-      seconds_(detail::splitSeconds(seconds).seconds), nanoseconds_(detail::splitSeconds(seconds).nanoseconds),
-      negative_(negative) {}
+      seconds_(detail::splitSeconds(seconds).seconds),
+      nanoseconds_(detail::splitSeconds(seconds).nanoseconds), negative_(negative) {}
+
+UString<0> secondsFractionalToString(double seconds) {
+    std::array<char, detail::longestFixedDouble> text;
+    const char* const end = detail::writeFixed(text.data(), text.data() + text.size(), seconds);
+    return UString<0>(UStringView<0>(text.data(), static_cast<std::size_t>(end - text.data())));
+}
 
 } // namespace kvt::ex::datetime

@@ -43,7 +43,15 @@ enum class ReturnState : std::uint32_t {
 };
 
 /// The unit of diffAsNumber().
-enum class UnitType : std::uint32_t { Years = 0, Months = 1, Weeks = 2, Days = 3, Hours = 4, Minutes = 5, Seconds = 6 };
+enum class UnitType : std::uint32_t {
+    Years = 0,
+    Months = 1,
+    Weeks = 2,
+    Days = 3,
+    Hours = 4,
+    Minutes = 5,
+    Seconds = 6
+};
 
 /// What now() gives.
 enum class ZoneMode : std::uint32_t {
@@ -76,8 +84,8 @@ public:
     /// Whole seconds and nanoseconds are cut from `seconds`; a negative number and a NaN give zero for both. The
     /// fraction is rounded without a carry, so that 59.9999999999 is 59 seconds and 1,000,000,000 nanoseconds. The
     /// offset is taken as by setOffset(), and the type is `DatetimeWithOffset` if one is stored, else `Datetime`.
-    DateTimeParts(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours, std::uint64_t minutes,
-                  double seconds, const UString<0>& offset);
+    DateTimeParts(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours,
+                  std::uint64_t minutes, double seconds, const UString<0>& offset);
 
     /// The low 32 bits of these three.
     int year() const noexcept { return static_cast<int>(year_); }
@@ -91,7 +99,9 @@ public:
     TemporalType type() const noexcept { return type_; }
 
     /// True for all types but `Time` and `TimeWithOffset`, so also for `Unsupported`.
-    bool hasDate() const noexcept { return type_ != TemporalType::Time && type_ != TemporalType::TimeWithOffset; }
+    bool hasDate() const noexcept {
+        return type_ != TemporalType::Time && type_ != TemporalType::TimeWithOffset;
+    }
     /// True for all types but `Date`.
     bool hasTime() const noexcept { return type_ != TemporalType::Date; }
     /// Whether there is an offset text, whatever the type says.
@@ -121,8 +131,9 @@ public:
 private:
     friend struct detail::PartsAccess;
 
-    DateTimeParts(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours, std::uint64_t minutes,
-                  std::uint64_t seconds, std::uint64_t nanoseconds, const UString<0>& offset);
+    DateTimeParts(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours,
+                  std::uint64_t minutes, std::uint64_t seconds, std::uint64_t nanoseconds,
+                  const UString<0>& offset);
 
     std::int64_t year_ = 1970;
     std::uint64_t month_ = 1;

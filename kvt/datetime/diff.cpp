@@ -105,7 +105,8 @@ Outcome<double> difference(const CanonicalRecord& first, const CanonicalRecord& 
 TextResult diff(const UString<0>& first, const UString<0>& second) {
     return detail::guarded<UString<0>>([&] {
         return withPair<UString<0>>(
-            first, second, [](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<TextResult> {
+            first, second,
+            [](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<TextResult> {
                 const auto parts = detail::diffParts(left, right);
                 if (!parts) {
                     return parts.failure();
@@ -118,7 +119,8 @@ TextResult diff(const UString<0>& first, const UString<0>& second) {
 NumberResult diffAsNumber(const UString<0>& first, const UString<0>& second, UnitType unit) {
     return detail::guarded<double>([&] {
         return withPair<double>(
-            first, second, [&](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<NumberResult> {
+            first, second,
+            [&](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<NumberResult> {
                 const Outcome<double> number = difference(left, right, unit);
                 if (!number) {
                     return number.failure();

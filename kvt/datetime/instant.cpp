@@ -38,7 +38,8 @@ Outcome<NanoCount> checkTimeOfDay(std::int64_t hours, std::int64_t minutes, std:
     return nanosOf(hours * secondsPerHour + minutes * secondsPerMinute + seconds, nanoseconds);
 }
 
-Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day, bool lenient) {
+Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day,
+                                        bool lenient) {
     if (year < lowestYear || year > highestYear) {
         return outOfRange(year, "year", "1000", "9999");
     }
@@ -80,8 +81,8 @@ DateTimeFields fieldsFromCount(const NanoCount& count) {
 
 Outcome<TemporalInstant> instantFromParts(const DateTimeParts& parts, bool lenient) {
     const Outcome<NanoCount> count =
-        countFromFields({PartsAccess::year(parts), PartsAccess::month(parts), PartsAccess::day(parts), parts.hours(),
-                         parts.minutes(), parts.seconds(), parts.nanoseconds()},
+        countFromFields({PartsAccess::year(parts), PartsAccess::month(parts), PartsAccess::day(parts),
+                         parts.hours(), parts.minutes(), parts.seconds(), parts.nanoseconds()},
                         lenient);
     if (!count) {
         return count.failure();
@@ -97,10 +98,10 @@ DateTimeParts partsFromInstant(const TemporalInstant& instant) {
     if (instant.offsetMinutes) {
         writeOffset(offset, *instant.offsetMinutes);
     }
-    return PartsAccess::dateTime(fields.year, fields.month, fields.day, static_cast<std::uint64_t>(fields.hours),
-                                 static_cast<std::uint64_t>(fields.minutes),
-                                 static_cast<std::uint64_t>(fields.seconds),
-                                 static_cast<std::uint64_t>(fields.nanoseconds), offset.toString());
+    return PartsAccess::dateTime(
+        fields.year, fields.month, fields.day, static_cast<std::uint64_t>(fields.hours),
+        static_cast<std::uint64_t>(fields.minutes), static_cast<std::uint64_t>(fields.seconds),
+        static_cast<std::uint64_t>(fields.nanoseconds), offset.toString());
 }
 
 UString<0> instantText(const TemporalInstant& instant, bool withOffset) {

@@ -1,4 +1,5 @@
-// The text of an interval. A reader in one pass: designators have ranks, and each one closes itself and all before it.
+// The text of an interval. A reader in one pass: designators have ranks, and each one closes itself and all before
+// it.
 
 #include <kvt/datetime/detail/interval.h>
 #include <kvt/datetime/detail/parts_access.h>
@@ -112,7 +113,8 @@ Outcome<std::optional<IntervalParts>> parseInterval(std::string_view text) {
         }
         const std::string_view digits = takeNumber(text);
         const bool fractional = digits.find('.') != std::string_view::npos;
-        const std::optional<std::uint64_t> whole = fractional ? std::optional<std::uint64_t>() : wholeNumber(digits);
+        const std::optional<std::uint64_t> whole =
+            fractional ? std::optional<std::uint64_t>() : wholeNumber(digits);
         const double value = fractional ? decimalValue(digits) : 0.0;
         if (fractional ? std::isinf(value) : !whole) {
             return Unexpected{};
@@ -160,7 +162,8 @@ UString<0> intervalText(const IntervalParts& parts) {
     put(parts.hours(), 'H');
     put(parts.minutes(), 'M');
     if (seconds) {
-        text.putSeconds(static_cast<std::uint64_t>(parts.seconds()), static_cast<std::uint64_t>(parts.nanoseconds()));
+        text.putSeconds(static_cast<std::uint64_t>(parts.seconds()),
+                        static_cast<std::uint64_t>(parts.nanoseconds()));
         text.put('S');
         any = true;
     }

@@ -1,5 +1,5 @@
-// The offset of an instant by its text, the two keywords included. Apart from instant.cpp, because only here an offset
-// may depend on the zone of the machine.
+// The offset of an instant by its text, the two keywords included. Apart from instant.cpp, because only here an
+// offset may depend on the zone of the machine.
 
 #include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/local_zone.h>
@@ -18,7 +18,8 @@ bool isKeyword(std::string_view text, std::string_view keyword) noexcept {
         return false;
     }
     for (std::size_t i = 0; i < text.size(); ++i) {
-        const char lower = text[i] >= 'A' && text[i] <= 'Z' ? static_cast<char>(text[i] - 'A' + 'a') : text[i];
+        const char lower =
+            text[i] >= 'A' && text[i] <= 'Z' ? static_cast<char>(text[i] - 'A' + 'a') : text[i];
         if (lower != keyword[i]) {
             return false;
         }

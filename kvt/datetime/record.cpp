@@ -177,7 +177,8 @@ Outcome<UString<0>> textOf(const CanonicalRecord& record, Wanted wanted) {
     }
     if (wanted.time) {
         writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
-                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds), false);
+                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
+                  false);
     }
     if (wanted.offset) {
         text.put(viewOf(record.offsetText));

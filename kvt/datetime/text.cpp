@@ -67,7 +67,8 @@ std::uint64_t digitsValue(std::string_view digits) noexcept {
 
 double decimalValue(std::string_view digits) noexcept {
     double value = 0.0;
-    const auto read = std::from_chars(digits.data(), digits.data() + digits.size(), value, std::chars_format::fixed);
+    const auto read =
+        std::from_chars(digits.data(), digits.data() + digits.size(), value, std::chars_format::fixed);
     if (read.ec == std::errc::result_out_of_range) {
         // Too large, or so small that nothing but zero is near.
         const std::string_view whole = digits.substr(0, digits.find('.'));
@@ -99,10 +100,6 @@ SplitSeconds splitSeconds(double seconds) noexcept {
 
 // ---- Writing
 
-namespace {
-
-// The text of a double in fixed notation with nine decimals at most; `first` has room for the longest.
-constexpr std::size_t longestFixedDouble = 1 + 309 + 1 + 9;
 char* writeFixed(char* first, char* last, double value) noexcept {
     char* end = std::to_chars(first, last, value, std::chars_format::fixed, 9).ptr;
     while (end != first && end[-1] == '0') {
@@ -113,8 +110,6 @@ char* writeFixed(char* first, char* last, double value) noexcept {
     }
     return end;
 }
-
-} // namespace
 
 void TextBuffer::put(std::string_view text) noexcept {
     std::memcpy(data_.data() + size_, text.data(), text.size());
@@ -171,7 +166,8 @@ void TextBuffer::putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds) no
     size_ = static_cast<std::size_t>(writeFixed(first, data_.data() + data_.size(), value) - data_.data());
 }
 
-void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day, bool extended) noexcept {
+void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day,
+               bool extended) noexcept {
     text.putSigned(year, 4);
     if (extended) {
         text.put('-');
@@ -208,13 +204,3 @@ void writeOffset(TextBuffer& text, std::int32_t minutes) noexcept {
 }
 
 } // namespace kvt::ex::datetime::detail
-
-namespace kvt::ex::datetime {
-
-UString<0> secondsFractionalToString(double seconds) {
-    std::array<char, detail::longestFixedDouble> text;
-    const char* const end = detail::writeFixed(text.data(), text.data() + text.size(), seconds);
-    return UString<0>(UStringView<0>(text.data(), static_cast<std::size_t>(end - text.data())));
-}
-
-} // namespace kvt::ex::datetime

@@ -47,7 +47,8 @@ Outcome<UString<0>> withoutOffset(const UString<0>& value, const CanonicalRecord
     if (!hasOffset(record.type)) {
         return UString<0>(value);
     }
-    return detail::isTimeKind(record.type) ? detail::timeText(record, false) : detail::datetimeText(record, false);
+    return detail::isTimeKind(record.type) ? detail::timeText(record, false)
+                                           : detail::datetimeText(record, false);
 }
 
 Outcome<TextResult> offsetOf(const UString<0>& value, UTCOffsetType type) {
@@ -142,8 +143,9 @@ Outcome<TextResult> localNow(TemporalInstant instant, bool withOffset) {
     try {
         instant.offsetMinutes = detail::localOffsetMinutes(instant);
     } catch (const std::runtime_error& failure) {
-        return detail::makeDateTimeResult(ReturnState::Error, UString<0>(),
-                                          detail::message(message_number::zoneLookupFailed, {failure.what()}));
+        return detail::makeDateTimeResult(
+            ReturnState::Error, UString<0>(),
+            detail::message(message_number::zoneLookupFailed, {failure.what()}));
     }
     instant.count += detail::NanoCount(*instant.offsetMinutes * detail::nanosPerMinute);
     return succeeded(detail::instantText(instant, withOffset));
@@ -153,7 +155,8 @@ Outcome<TextResult> localNow(TemporalInstant instant, bool withOffset) {
 
 TextResult now(ZoneMode mode) {
     return detail::guarded<UString<0>>([&]() -> Outcome<TextResult> {
-        const TemporalInstant instant = {detail::NanoCount(platform::clockTicks()) * platform::nanosecondsPerTick, 0};
+        const TemporalInstant instant = {
+            detail::NanoCount(platform::clockTicks()) * platform::nanosecondsPerTick, 0};
         switch (mode) {
         case ZoneMode::LocalWithOffset:
             return localNow(instant, true);
@@ -171,8 +174,9 @@ TextResult timezoneGet(const UString<0>& value, UTCOffsetType type) {
 }
 
 TextResult timezoneSet(const UString<0>& value, const UString<0>& zone, const SetZoneMode& mode) {
-    return detail::guarded<UString<0>>([&] { return zoned(value, detail::trimmed(detail::viewOf(zone)), mode); },
-                                       detail::LastResort::Silence);
+    return detail::guarded<UString<0>>(
+        [&] { return zoned(value, detail::trimmed(detail::viewOf(zone)), mode); },
+        detail::LastResort::Silence);
 }
 
 TextResult timezoneRemove(const UString<0>& value) {

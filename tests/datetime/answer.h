@@ -26,8 +26,8 @@ struct Answer {
     friend bool operator==(const Answer&, const Answer&) = default;
     friend std::ostream& operator<<(std::ostream& stream, const Answer& answer) {
         static const char* const names[] = {"Error", "Failure", "Repaired", "Success"};
-        stream << names[static_cast<unsigned>(answer.state)] << " [" << answer.text << "] " << answer.number << " "
-               << answer.message;
+        stream << names[static_cast<unsigned>(answer.state)] << " [" << answer.text << "] " << answer.number
+               << " " << answer.message;
         for (const std::string& parameter : answer.parameters) {
             stream << " {" << parameter << "}";
         }

@@ -144,29 +144,47 @@ TEST(Add, ChecksTheValueThenTheInterval) {
 // ---- The text of an interval
 
 TEST(IntervalText, IsReadInOrderEachDesignatorOnce) {
-    for (const char* text :
-         {"P1Y2M3DT4H5M6.5S", "-P1D", "PT0S", "-PT", "P1Y", "P1M", "P1D", "PT1H", "PT1M", "PT1S", "P1YT", "P1Y1D", "P1YT1M",
-          "P1MT1M", "PT1H1S", "P00000000000000001Y", "PT1.S", "PT1.5S", "P2147483647Y", "PT2147483647S", " P1D\f",
-          "PT2147483648.0S"}) {
+    for (const char* text : {"P1Y2M3DT4H5M6.5S",
+                             "-P1D",
+                             "PT0S",
+                             "-PT",
+                             "P1Y",
+                             "P1M",
+                             "P1D",
+                             "PT1H",
+                             "PT1M",
+                             "PT1S",
+                             "P1YT",
+                             "P1Y1D",
+                             "P1YT1M",
+                             "P1MT1M",
+                             "PT1H1S",
+                             "P00000000000000001Y",
+                             "PT1.S",
+                             "PT1.5S",
+                             "P2147483647Y",
+                             "PT2147483647S",
+                             " P1D\f",
+                             "PT2147483648.0S"}) {
         EXPECT_EQ(answerOf(intervalNegate(text)).state, ReturnState::Success) << text;
     }
 }
 
 TEST(IntervalText, RefusesOtherShapes) {
     for (const char* text :
-         {"",       "P",     "-P",     "PT",      "1D",     "P1",    "PT1",    "P1D1Y",   "P1D1M",  "P1M1Y",  "PT1H1H",
-          "P1H",    "P1S",   "PT1Y",   "PT1D",    "P1Y1Y",  "P1M1M", "P1D1D",  "PT1M1M",  "PT1S1S", "PT1S1M", "PT1M1H",
-          "PTT1H",  "PT1HT", "P1X",    "PT1X",    "p1D",    "P1d",   "+P1D",   "--P1D",   "P-1D",   "P 1D",   "P1 D",
-          "PT.5S",  "PT1,5S", "PT1.2.3S", "P1.5",  "P1.5H", "P1.5X", "20200101", "PDT",   "P1DT1",  "P1D ."}) {
+         {"",       "P",      "-P",     "PT",       "1D",    "P1",    "PT1",   "P1D1Y",  "P1D1M",
+          "P1M1Y",  "PT1H1H", "P1H",    "P1S",      "PT1Y",  "PT1D",  "P1Y1Y", "P1M1M",  "P1D1D",
+          "PT1M1M", "PT1S1S", "PT1S1M", "PT1M1H",   "PTT1H", "PT1HT", "P1X",   "PT1X",   "p1D",
+          "P1d",    "+P1D",   "--P1D",  "P-1D",     "P 1D",  "P1 D",  "PT.5S", "PT1,5S", "PT1.2.3S",
+          "P1.5",   "P1.5H",  "P1.5X",  "20200101", "PDT",   "P1DT1", "P1D ."}) {
         EXPECT_EQ(answerOf(intervalNegate(text)), failure(933064, {text})) << text;
         EXPECT_EQ(answerOf(add("20200101", text)), failure(933064, {text})) << text;
     }
 }
 
 TEST(IntervalText, NumbersThatCannotBeStoredAreAnotherFailure) {
-    for (const char* text :
-         {"P1.5D", "P1.5Y", "P1.0M", "PT1.5H", "PT1.5M", "P1.D", "P2147483648Y", "PT2147483648S", "PT99999999999999999999S",
-          "P99999999999"}) {
+    for (const char* text : {"P1.5D", "P1.5Y", "P1.0M", "PT1.5H", "PT1.5M", "P1.D", "P2147483648Y",
+                             "PT2147483648S", "PT99999999999999999999S", "P99999999999"}) {
         EXPECT_EQ(answerOf(intervalNegate(text)), genericFailure()) << text;
         EXPECT_EQ(answerOf(add("20200101", text)), genericFailure()) << text;
     }
@@ -181,9 +199,8 @@ TEST(IntervalNegate, TurnsTheSignAndLeavesTheRest) {
         const char* text;
         const char* negated;
     } rows[] = {
-        {"P1D", "-P1D"},         {"-P1D", "P1D"},         {"PT0S", "-PT0S"}, {"-PT0S", "PT0S"},
-        {"P001Y", "-P001Y"},     {"-PT", "PT"},           {"PT1.50S", "-PT1.50S"},
-        {"P1D ", "-P1D "},       {" P1D", "- P1D"}, // the text as given
+        {"P1D", "-P1D"},   {"-P1D", "P1D"},         {"PT0S", "-PT0S"}, {"-PT0S", "PT0S"}, {"P001Y", "-P001Y"},
+        {"-PT", "PT"},     {"PT1.50S", "-PT1.50S"}, {"P1D ", "-P1D "}, {" P1D", "- P1D"}, // the text as given
         {" -P1D", "-P1D"},
     };
     for (const auto& row : rows) {
@@ -196,8 +213,10 @@ TEST(IntervalNegate, TurnsTheSignAndLeavesTheRest) {
 TEST(Add, ExactPartsAgreeWithACount) {
     std::mt19937_64 random(66);
     for (int i = 0; i < 50'000; ++i) {
-        NaiveDateTime at{3000 + static_cast<std::int64_t>(random() % 4000), 1 + static_cast<int>(random() % 12), 1};
-        at.day = 1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
+        NaiveDateTime at{3000 + static_cast<std::int64_t>(random() % 4000),
+                         1 + static_cast<int>(random() % 12), 1};
+        at.day =
+            1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
         at.hours = static_cast<int>(random() % 24);
         at.minutes = static_cast<int>(random() % 60);
         at.seconds = static_cast<int>(random() % 60);
@@ -212,7 +231,8 @@ TEST(Add, ExactPartsAgreeWithACount) {
                                      std::to_string(hours) + "H" + std::to_string(minutes) + "M" +
                                      std::to_string(seconds) + kvt::test::naiveFraction(nanoseconds) + "S";
         const std::int64_t wholeSeconds = days * 86400 + hours * 3600 + minutes * 60 + seconds;
-        const kvt::test::Int128 length = static_cast<kvt::test::Int128>(wholeSeconds) * 1000000000 + nanoseconds;
+        const kvt::test::Int128 length =
+            static_cast<kvt::test::Int128>(wholeSeconds) * 1000000000 + nanoseconds;
         const NaiveDateTime sum =
             kvt::test::naiveDateTime(kvt::test::naiveNanoseconds(at) + (negative ? -length : length));
         ASSERT_EQ(answerOf(add(ustring(kvt::test::naiveText(at)), ustring(interval))),
@@ -224,8 +244,10 @@ TEST(Add, ExactPartsAgreeWithACount) {
 TEST(Add, MonthsAgreeWithStepsOfOne) {
     std::mt19937_64 random(67);
     for (int i = 0; i < 20'000; ++i) {
-        NaiveDateTime at{2000 + static_cast<std::int64_t>(random() % 400), 1 + static_cast<int>(random() % 12), 1};
-        at.day = 1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
+        NaiveDateTime at{2000 + static_cast<std::int64_t>(random() % 400),
+                         1 + static_cast<int>(random() % 12), 1};
+        at.day =
+            1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
         const int years = static_cast<int>(random() % 20);
         const int months = static_cast<int>(random() % 60);
         const bool negative = random() % 2 == 0;
@@ -238,8 +260,8 @@ TEST(Add, MonthsAgreeWithStepsOfOne) {
             }
         }
         sum.day = std::min(at.day, kvt::test::daysInMonth(sum.year, sum.month));
-        const std::string interval = std::string(negative ? "-P" : "P") + std::to_string(years) + "Y" +
-                                     std::to_string(months) + "M";
+        const std::string interval =
+            std::string(negative ? "-P" : "P") + std::to_string(years) + "Y" + std::to_string(months) + "M";
         ASSERT_EQ(answerOf(add(ustring(kvt::test::naiveDateText(at)), ustring(interval))),
                   success(kvt::test::naiveDateText(sum)))
             << kvt::test::naiveDateText(at) << " plus " << interval;

@@ -13,7 +13,8 @@ TEST(Calendar, AgreesWithCountingDayByDay) {
     for (std::int64_t year = 1000; year <= 9999; ++year) {
         for (int month = 1; month <= 12; ++month) {
             const int last = kvt::test::daysInMonth(year, month);
-            ASSERT_EQ(lastDayOfMonth(year, static_cast<unsigned>(month)), static_cast<unsigned>(last)) << year << "-" << month;
+            ASSERT_EQ(lastDayOfMonth(year, static_cast<unsigned>(month)), static_cast<unsigned>(last))
+                << year << "-" << month;
             for (int day = 1; day <= last; ++day, ++days) {
                 ASSERT_EQ(daysFromCivil(year, static_cast<unsigned>(month), static_cast<unsigned>(day)), days)
                     << year << "-" << month << "-" << day;
@@ -34,7 +35,8 @@ TEST(Calendar, EpochIsDayZero) {
 }
 
 TEST(Calendar, HasNoBounds) {
-    for (const std::int64_t year : {-5'000'000'000LL, -70'000LL, -32'769LL, -1LL, 0LL, 32'768LL, 70'000LL, 5'000'000'000LL}) {
+    for (const std::int64_t year :
+         {-5'000'000'000LL, -70'000LL, -32'769LL, -1LL, 0LL, 32'768LL, 70'000LL, 5'000'000'000LL}) {
         const std::int64_t days = daysFromCivil(year, 3, 1);
         const CivilDate date = civilFromDays(days);
         EXPECT_EQ(date.year, year);

@@ -28,7 +28,8 @@ struct Row {
 
 void expectRows(const std::vector<Row>& rows) {
     for (const Row& row : rows) {
-        EXPECT_EQ(answerOf(cast(row.value, row.target)), row.answer) << "line " << row.line << ": " << row.value;
+        EXPECT_EQ(answerOf(cast(row.value, row.target)), row.answer)
+            << "line " << row.line << ": " << row.value;
     }
 }
 

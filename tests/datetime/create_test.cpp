@@ -40,7 +40,8 @@ TEST(Create, WritesFractionAndOffset) {
     EXPECT_EQ(answerOf(create(made)), success("20200102030405.5+00:00"));
     made.setOffset("nothing");
     EXPECT_EQ(answerOf(create(made)), success("20200102030405.5"));
-    EXPECT_EQ(answerOf(create(parts(9999, 12, 31, 23, 59, 59, 999'999'999))), success("99991231235959.999999999"));
+    EXPECT_EQ(answerOf(create(parts(9999, 12, 31, 23, 59, 59, 999'999'999))),
+              success("99991231235959.999999999"));
     EXPECT_EQ(answerOf(create(parts(1000, 1, 1))), success("10000101000000"));
 }
 
@@ -55,10 +56,12 @@ TEST(Create, FirstTurnsAwayWhatTwoDigitsDoNotHold) {
         {__LINE__, parts(999, 100, 100, 100, 100, 100), year},
         {__LINE__, parts(10000, 1, 1), outOfRange("10000", "year", "1000", "9999")},
         {__LINE__, parts(-5, 1, 1), outOfRange("-5", "year", "1000", "9999")},
-        {__LINE__, parts((std::int64_t{1} << 32) + 2020, 1, 1), outOfRange("4294969316", "year", "1000", "9999")},
+        {__LINE__, parts((std::int64_t{1} << 32) + 2020, 1, 1),
+         outOfRange("4294969316", "year", "1000", "9999")},
         {__LINE__, parts(2020, 0, 0), outOfRange("0", "month", "1", "12")},
         {__LINE__, parts(2020, 100, 100, 100), outOfRange("100", "month", "1", "12")},
-        {__LINE__, parts(2020, (std::uint64_t{1} << 32) + 1, 1), outOfRange("4294967297", "month", "1", "12")},
+        {__LINE__, parts(2020, (std::uint64_t{1} << 32) + 1, 1),
+         outOfRange("4294967297", "month", "1", "12")},
         {__LINE__, parts(2020, 2, 0, 100), outOfRange("0", "day", "1", "29")},
         {__LINE__, parts(2021, 2, 100, 100), outOfRange("100", "day", "1", "28")},
         {__LINE__, parts(2021, 4, 100), outOfRange("100", "day", "1", "30")},
@@ -67,8 +70,10 @@ TEST(Create, FirstTurnsAwayWhatTwoDigitsDoNotHold) {
         {__LINE__, parts(2020, 13, 1, minusOne), outOfRange("-1", "hours", "0", "23")},
         {__LINE__, parts(2020, 13, 1, 24, 100, 100), outOfRange("100", "minutes", "0", "59")},
         {__LINE__, parts(2020, 13, 1, 24, 60, 100), outOfRange("100", "seconds", "0", "59.999999999")},
-        {__LINE__, parts(2020, 13, 1, 24, 60, 100, 500'000'000), outOfRange("100.5", "seconds", "0", "59.999999999")},
-        {__LINE__, parts(2020, 1, 1, 24, 60, 59, 1'000'000'000), outOfRange("60", "seconds", "0", "59.999999999")},
+        {__LINE__, parts(2020, 13, 1, 24, 60, 100, 500'000'000),
+         outOfRange("100.5", "seconds", "0", "59.999999999")},
+        {__LINE__, parts(2020, 1, 1, 24, 60, 59, 1'000'000'000),
+         outOfRange("60", "seconds", "0", "59.999999999")},
     };
     for (const auto& row : rows) {
         EXPECT_EQ(answerOf(create(row.parts)), row.answer) << "line " << row.line;

@@ -34,9 +34,9 @@ TEST(Diff, CountsWholeYearsAndMonthsFromTheSecondValue) {
         {__LINE__, "20200102", "20200101", "P1D"},
         {__LINE__, "20200101", "20200102", "-P1D"},
         {__LINE__, "20200101", "20200101", "PT0S"},
-        {__LINE__, "20200301", "20200131", "P1M1D"},   // 31 January and a month is 29 February
-        {__LINE__, "20200131", "20200301", "-P1M1D"},  // 1 March less a month is 1 February
-        {__LINE__, "20210228", "20200229", "P1Y"},     // cut to the end of February
+        {__LINE__, "20200301", "20200131", "P1M1D"},    // 31 January and a month is 29 February
+        {__LINE__, "20200131", "20200301", "-P1M1D"},   // 1 March less a month is 1 February
+        {__LINE__, "20210228", "20200229", "P1Y"},      // cut to the end of February
         {__LINE__, "20200229", "20210228", "-P11M28D"}, // 28 February less a year is a day too far
         {__LINE__, "20210331", "20200229", "P1Y1M3D"},
         {__LINE__, "20201231", "20200101", "P11M30D"},
@@ -105,8 +105,10 @@ TEST(Diff, AnOffsetMayMoveAValueOutOfTheYears) {
     // In UTC the second value lies in 999, from where no calendar step is made.
     const Answer answer = outOfRange("999", "year", "1000", "9999");
     EXPECT_EQ(answerOf(diff("10010101000000+00:00", "10000101000000+01:00")), answer);
-    EXPECT_EQ(answerOf(diffAsNumber("10010101000000+00:00", "10000101000000+01:00", UnitType::Years)), answer);
-    EXPECT_EQ(answerOf(diffAsNumber("10000101010000+00:00", "10000101000000+01:00", UnitType::Hours)), success(2.0));
+    EXPECT_EQ(answerOf(diffAsNumber("10010101000000+00:00", "10000101000000+01:00", UnitType::Years)),
+              answer);
+    EXPECT_EQ(answerOf(diffAsNumber("10000101010000+00:00", "10000101000000+01:00", UnitType::Hours)),
+              success(2.0));
     EXPECT_EQ(compare("10000101010000+00:00", "10000101000000+01:00"), 1);
 }
 
@@ -124,7 +126,7 @@ TEST(DiffAsNumber, HasAnAnswerInEachUnit) {
         {__LINE__, "20200116", "20200101", UnitType::Months, 15.0 / 31.0},
         {__LINE__, "20200101", "20200116", UnitType::Months, -(15.0 / 31.0)},
         {__LINE__, "20200216", "20200201", UnitType::Months, 15.0 / 29.0},
-        {__LINE__, "20200301", "20200131", UnitType::Months, 1.0 + 1.0 / 29.0}, // the day is in February
+        {__LINE__, "20200301", "20200131", UnitType::Months, 1.0 + 1.0 / 29.0},    // the day is in February
         {__LINE__, "20200131", "20200301", UnitType::Months, -(1.0 + 1.0 / 31.0)}, // here in January
         {__LINE__, "060000", "000000", UnitType::Months, 0.25 / 31.0},
         {__LINE__, "20200101", "20200101", UnitType::Years, 0.0},
@@ -139,13 +141,15 @@ TEST(DiffAsNumber, HasAnAnswerInEachUnit) {
         {__LINE__, "99991231235959", "10000101000000", UnitType::Seconds, 284012524799.0},
     };
     for (const auto& row : rows) {
-        EXPECT_EQ(answerOf(diffAsNumber(row.first, row.second, row.unit)), success(row.number)) << "line " << row.line;
+        EXPECT_EQ(answerOf(diffAsNumber(row.first, row.second, row.unit)), success(row.number))
+            << "line " << row.line;
     }
 }
 
 TEST(DiffAsNumber, RefusesOtherUnits) {
     for (const std::uint32_t unit : {7U, 8U, 0xFFFFFFFFU}) {
-        EXPECT_EQ(answerOf(diffAsNumber("20200101", "20200101", static_cast<UnitType>(unit))), genericFailure());
+        EXPECT_EQ(answerOf(diffAsNumber("20200101", "20200101", static_cast<UnitType>(unit))),
+                  genericFailure());
     }
 }
 
@@ -182,7 +186,8 @@ public:
     explicit Values(unsigned seed) : random_(seed) {}
 
     NaiveDateTime dateTime(int highestDay = 31) {
-        NaiveDateTime at{1000 + static_cast<std::int64_t>(random_() % 9000), 1 + static_cast<int>(random_() % 12), 1};
+        NaiveDateTime at{1000 + static_cast<std::int64_t>(random_() % 9000),
+                         1 + static_cast<int>(random_() % 12), 1};
         const int days = std::min(highestDay, kvt::test::daysInMonth(at.year, at.month));
         at.day = random_() % 4 == 0 ? days : 1 + static_cast<int>(random_() % static_cast<unsigned>(days));
         if (random_() % 4 != 0) {
@@ -259,7 +264,8 @@ std::string naiveIntervalText(const NaiveDifference& difference, bool negative) 
     const auto put = [](std::int64_t number, const char* designator) {
         return number == 0 ? std::string() : std::to_string(number) + designator;
     };
-    const std::string date = put(difference.years, "Y") + put(difference.months, "M") + put(seconds / 86400, "D");
+    const std::string date =
+        put(difference.years, "Y") + put(difference.months, "M") + put(seconds / 86400, "D");
     std::string time = put(seconds / 3600 % 24, "H") + put(seconds / 60 % 60, "M");
     if (seconds % 60 != 0 || nanoseconds != 0) {
         time += std::to_string(seconds % 60) + kvt::test::naiveFraction(nanoseconds) + "S";
@@ -278,12 +284,14 @@ TEST(DiffAsNumber, IsRightToTheLastBit) {
         const std::string firstText = kvt::test::naiveText(first);
         const std::string secondText = kvt::test::naiveText(second);
         const double seconds =
-            static_cast<double>(kvt::test::naiveNanoseconds(first) - kvt::test::naiveNanoseconds(second)) / 1e9;
+            static_cast<double>(kvt::test::naiveNanoseconds(first) - kvt::test::naiveNanoseconds(second)) /
+            1e9;
         const double minutes = seconds / 60.0;
         const double hours = minutes / 60.0;
         const double days = hours / 24.0;
         const double months = naiveDifference(first, second).inMonths;
-        const std::array<double, 7> expected = {months / 12.0, months, days / 7.0, days, hours, minutes, seconds};
+        const std::array<double, 7> expected = {months / 12.0, months,  days / 7.0, days,
+                                                hours,         minutes, seconds};
         for (const UnitType unit : units) {
             ASSERT_EQ(std::get<1>(diffAsNumber(ustring(firstText), ustring(secondText), unit)),
                       expected[static_cast<std::size_t>(unit)])
@@ -315,7 +323,8 @@ TEST(Diff, ThenAddComesBack) {
         const std::string first = kvt::test::naiveText(values.near(second));
         const std::string start = kvt::test::naiveText(second);
         const std::string interval = kvt::test::textOf(diff(ustring(first), ustring(start)));
-        ASSERT_EQ(answerOf(add(ustring(start), ustring(interval))), success(first)) << start << " plus " << interval;
+        ASSERT_EQ(answerOf(add(ustring(start), ustring(interval))), success(first))
+            << start << " plus " << interval;
     }
 }
 
@@ -326,7 +335,8 @@ TEST(Diff, OfDatesThenAddComesBackToADate) {
         const std::string first = kvt::test::naiveDateText(values.near(second));
         const std::string start = kvt::test::naiveDateText(second);
         const std::string interval = kvt::test::textOf(diff(ustring(first), ustring(start)));
-        ASSERT_EQ(answerOf(add(ustring(start), ustring(interval))), success(first)) << start << " plus " << interval;
+        ASSERT_EQ(answerOf(add(ustring(start), ustring(interval))), success(first))
+            << start << " plus " << interval;
     }
 }
 
@@ -336,7 +346,8 @@ TEST(Diff, OfTimesThenAddComesBack) {
         const std::string first = kvt::test::naiveTimeText(values.dateTime());
         const std::string second = kvt::test::naiveTimeText(values.dateTime());
         const std::string interval = kvt::test::textOf(diff(ustring(first), ustring(second)));
-        ASSERT_EQ(answerOf(add(ustring(second), ustring(interval))), success(first)) << second << " plus " << interval;
+        ASSERT_EQ(answerOf(add(ustring(second), ustring(interval))), success(first))
+            << second << " plus " << interval;
     }
 }
 

@@ -82,7 +82,8 @@ TEST(InstantFromParts, AndBackIsTheSame) {
     for (int i = 0; i < 50'000; ++i) {
         kvt::test::NaiveDateTime at{1000 + static_cast<std::int64_t>(random() % 9000),
                                     1 + static_cast<int>(random() % 12), 1};
-        at.day = 1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
+        at.day =
+            1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
         at.hours = static_cast<int>(random() % 24);
         at.minutes = static_cast<int>(random() % 60);
         at.seconds = static_cast<int>(random() % 60);
@@ -97,7 +98,8 @@ TEST(InstantFromParts, AndBackIsTheSame) {
         ASSERT_EQ(instant->count,
                   nanosOf(days * 86'400 + at.hours * 3600 + at.minutes * 60 + at.seconds, at.nanoseconds));
         const DateTimeParts back = partsFromInstant(*instant);
-        ASSERT_EQ(back.toDatetimeString(FormatType::Extended, true), parts.toDatetimeString(FormatType::Extended, true));
+        ASSERT_EQ(back.toDatetimeString(FormatType::Extended, true),
+                  parts.toDatetimeString(FormatType::Extended, true));
         ASSERT_EQ(back.type(), i % 2 == 0 ? TemporalType::DatetimeWithOffset : TemporalType::Datetime);
         ASSERT_EQ(instantText(*instant, true), parts.toDatetimeString(FormatType::Compact, true));
         ASSERT_EQ(instantText(*instant, false), parts.toDatetimeString(FormatType::Compact, false));

@@ -53,5 +53,6 @@ extern "C" char* realpath(const char* __restrict path, char* __restrict resolved
         errno = ENOENT;
         return nullptr;
     }
-    return resolved != nullptr ? std::strcpy(resolved, kvt::test::linkTarget) : ::strdup(kvt::test::linkTarget);
+    return resolved != nullptr ? std::strcpy(resolved, kvt::test::linkTarget)
+                               : ::strdup(kvt::test::linkTarget);
 }

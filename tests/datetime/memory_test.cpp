@@ -1,8 +1,7 @@
 // Lack of memory is a failure like any other: no function throws, and what it answers is good or says so.
 
 #include "answer.h"
-
-#include <foundation/counting_new.h>
+#include "failing_new.h"
 
 #include <kvt/datetime/datetime.h>
 
@@ -12,13 +11,8 @@ namespace {
 
 using namespace kvt::ex::datetime;
 using kvt::ex::UString;
-using kvt::test::Answer;
 using kvt::test::answerOf;
-
-struct Call {
-    const char* name;
-    std::function<Answer(const UString<0>&)> run;
-};
+using kvt::test::FailingAllocations;
 
 // `run` gets a fresh buffer for its outcome, since turning a result into an Answer needs memory, too.
 template <typename Result>
@@ -28,7 +22,7 @@ void expectNoThrow(const char* name, const std::function<Result()>& run) {
         std::optional<Result> result;
         bool thrown = false;
         {
-            const kvt_test::FailingAllocations failing(succeeding);
+            const FailingAllocations failing(succeeding);
             try {
                 // Made in place: moving a message needs memory.
                 struct InPlace {
@@ -41,10 +35,12 @@ void expectNoThrow(const char* name, const std::function<Result()>& run) {
             }
         }
         ASSERT_FALSE(thrown) << name << " with " << succeeding << " allocations";
-        if (std::get<0>(*result) == std::get<0>(whole) && std::get<2>(*result).has_value() == std::get<2>(whole).has_value()) {
+        if (std::get<0>(*result) == std::get<0>(whole) &&
+            std::get<2>(*result).has_value() == std::get<2>(whole).has_value()) {
             continue;
         }
-        EXPECT_EQ(std::get<0>(*result), ReturnState::Failure) << name << " with " << succeeding << " allocations";
+        EXPECT_EQ(std::get<0>(*result), ReturnState::Failure)
+            << name << " with " << succeeding << " allocations";
     }
 }
 
@@ -71,22 +67,40 @@ TEST(LackOfMemory, IsNeverThrownAtTheHost) {
     expectNoThrow("intervalNegate", Text([&] { return intervalNegate(interval); }));
     expectNoThrow("create", Text([&] { return create(DateTimeParts(2020, 1, 2, 3, 4, 5.5, "+01")); }));
     expectNoThrow("create bad", Text([&] { return create(DateTimeParts(2020, 1, 2, 3, 4, 1e18, "+01")); }));
-    expectNoThrow("intervalCreate", Text([&] { return intervalCreate(IntervalParts(1, 2, 3, 4, 5, 6.123456789, true)); }));
+    expectNoThrow("intervalCreate",
+                  Text([&] { return intervalCreate(IntervalParts(1, 2, 3, 4, 5, 6.123456789, true)); }));
 }
 
-TEST(LackOfMemory, MakesTheAnswerOfCreateSilent) {
+// Where only the result finds no memory, the last resorts differ: create() alone has no message.
+TEST(LackOfMemory, ForTheResultAloneGetsTheFunctionsLastResort) {
     const DateTimeParts parts(2020, 1, 2, 3, 4, 5.5, "+01"); // a result of 24 chars
+    const IntervalParts interval(1, 2, 3, 4, 5, 6.123456789, true);
+    const UString<0> value("20200102120000.5+0100");
+    const UString<0> later("20211231235959.123456789");
+    const UString<0> date("20200101");
+    const UString<0> text("P1Y2M3DT4H5M6.5S");
     std::optional<TextResult> result;
-    {
-        const kvt_test::FailingAllocations failing(0);
-        result.emplace(create(parts));
-    }
+    const auto withOneFailure = [&](const auto& call) {
+        const FailingAllocations failing(0, 1);
+        result.emplace(call());
+    };
+    withOneFailure([&] { return create(parts); });
     EXPECT_EQ(answerOf(*result), kvt::test::silentFailure());
+    withOneFailure([&] { return cast(value, CastToTemporalType::Datetime); });
+    EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
+    withOneFailure([&] { return add(value, text); });
+    EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
+    withOneFailure([&] { return intervalCreate(interval); });
+    EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
+    withOneFailure([&] { return intervalNegate(text); });
+    EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
+    withOneFailure([&] { return diff(later, date); });
+    EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
 }
 
 TEST(LackOfMemory, ComparesNothing) {
     const UString<0> longFraction("20200102120000.12345678901234567890");
-    const kvt_test::FailingAllocations failing(0);
+    const FailingAllocations failing(0);
     EXPECT_EQ(compare(longFraction, longFraction), -3);
 }
 
@@ -100,7 +114,7 @@ TEST(Allocation, IsMadeForTheResultOnly) {
     std::optional<PartsResult> parts;
     int order = 9;
     {
-        const kvt_test::FailingAllocations failing(0);
+        const FailingAllocations failing(0);
         text.emplace(add(date, month));
         number.emplace(diffAsNumber(value, value, UnitType::Years));
         parts.emplace(parseZQTDateTime(value, 3));
@@ -111,7 +125,7 @@ TEST(Allocation, IsMadeForTheResultOnly) {
     EXPECT_EQ(std::get<0>(*parts), ReturnState::Success);
     EXPECT_EQ(order, 0);
     {
-        const kvt_test::FailingAllocations failing(1);
+        const FailingAllocations failing(1);
         text.emplace(cast(value, CastToTemporalType::Datetime));
     }
     EXPECT_EQ(answerOf(*text), kvt::test::success("20200102120000.5+01:00"));

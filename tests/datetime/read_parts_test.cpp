@@ -68,10 +68,27 @@ TEST(ParseZQTDateTime, RefusesOtherPrecisions) {
 }
 
 TEST(ParseZQTDateTime, RefusesWhatIsNoValue) {
-    for (const char* value :
-         {"", "  ", "abc", "2020-01-02", "2020 0101", "20200101+01:00", "20200101.5", "20200101.", "+12", "1200", "12000",
-          "1200000", "2020010112000", "202001011200000", "120000+1", "120000.5.5", "120000.a", "12a000", "120000+01:00x",
-          "-120000", "120000Z"}) {
+    for (const char* value : {"",
+                              "  ",
+                              "abc",
+                              "2020-01-02",
+                              "2020 0101",
+                              "20200101+01:00",
+                              "20200101.5",
+                              "20200101.",
+                              "+12",
+                              "1200",
+                              "12000",
+                              "1200000",
+                              "2020010112000",
+                              "202001011200000",
+                              "120000+1",
+                              "120000.5.5",
+                              "120000.a",
+                              "12a000",
+                              "120000+01:00x",
+                              "-120000",
+                              "120000Z"}) {
         expectFailure(value, 9, kvt::test::failure(933063, {value}));
     }
 }
@@ -165,8 +182,10 @@ kvt::test::Int128 naivelyRounded(const NaiveDateTime& at, int precision) {
 TEST(ParseZQTDateTime, AgreesWithRoundingByText) {
     std::mt19937_64 random(6);
     for (int i = 0; i < 100'000; ++i) {
-        NaiveDateTime at{1000 + static_cast<std::int64_t>(random() % 9000), 1 + static_cast<int>(random() % 12), 1};
-        at.day = 1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
+        NaiveDateTime at{1000 + static_cast<std::int64_t>(random() % 9000),
+                         1 + static_cast<int>(random() % 12), 1};
+        at.day =
+            1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
         at.hours = static_cast<int>(random() % 24);
         at.minutes = random() % 3 == 0 ? 59 : static_cast<int>(random() % 60);
         at.seconds = random() % 3 == 0 ? 59 : static_cast<int>(random() % 60);
@@ -184,7 +203,8 @@ TEST(ParseZQTDateTime, AgreesWithRoundingByText) {
         const std::string value = kvt::test::naiveText(at);
         const PartsResult result = parseZQTDateTime(ustring(value), static_cast<std::int16_t>(precision));
         ASSERT_EQ(std::get<0>(result), ReturnState::Success) << value;
-        ASSERT_EQ(std::get<1>(result).toDatetimeString(FormatType::Compact, true), ustring(kvt::test::naiveText(expected)))
+        ASSERT_EQ(std::get<1>(result).toDatetimeString(FormatType::Compact, true),
+                  ustring(kvt::test::naiveText(expected)))
             << value << " at " << precision;
     }
 }

@@ -17,8 +17,9 @@ TEST(Trimmed, TakesSixCharactersFromBothEnds) {
         const char* text;
         const char* trimmed;
     } rows[] = {
-        {"", ""}, {" \t\r\n\f\v", ""}, {" \t\r\n\f\va b\v\f\n\r\t ", "a b"}, {"a", "a"}, {"\xC2\xA0", "\xC2\xA0"},
-        {"\x08x\x0E", "\x08x\x0E"}, {"\x1Fx", "\x1Fx"},
+        {"", ""},           {" \t\r\n\f\v", ""},      {" \t\r\n\f\va b\v\f\n\r\t ", "a b"},
+        {"a", "a"},         {"\xC2\xA0", "\xC2\xA0"}, {"\x08x\x0E", "\x08x\x0E"},
+        {"\x1Fx", "\x1Fx"},
     };
     for (const auto& row : rows) {
         EXPECT_EQ(trimmed(row.text), row.trimmed);
@@ -38,21 +39,25 @@ TEST(FractionNanoseconds, IsThatOfTheNearestDouble) {
     }
 }
 
-// Half way between two doubles and just beside it: what decides may stand far behind.
+// Half way between two doubles of which only one is another nanosecond, and just above: the digit that decides may
+// stand far behind.
 TEST(FractionNanoseconds, LooksAtAllDigits) {
-    // 0.5 + 2^-54, in full, lies between 0.5 and the next double; neither is another nanosecond, so the pair that
-    // is looked for is one whose doubles fall on both sides of half a nanosecond.
     std::mt19937_64 random(16);
     for (int i = 0; i < 20'000; ++i) {
         const auto nanoseconds = static_cast<double>(random() % 1'000'000'000);
         const double near = (nanoseconds + 0.5) / 1e9;
         for (double value : {std::nextafter(near, 0.0), near, std::nextafter(near, 1.0)}) {
+            // A long double holds the middle itself, and 90 digits all of it.
+            const long double middleValue =
+                (static_cast<long double>(value) + std::nextafter(value, 1.0)) / 2;
             char text[128];
-            std::snprintf(text, sizeof text, "%.90f", (value + std::nextafter(value, 1.0)) / 2.0);
+            std::snprintf(text, sizeof text, "%.90Lf", middleValue);
             const std::string middle = std::string(text).substr(2);
-            for (const std::string& digits : {middle, middle + std::string(50, '0') + "1", middle.substr(0, 60)}) {
+            for (const std::string& digits :
+                 {middle, middle + std::string(50, '0') + "1", middle.substr(0, 60)}) {
                 const double read = std::strtod(("0." + digits).c_str(), nullptr);
-                ASSERT_EQ(fractionNanoseconds(digits), static_cast<std::uint64_t>(read * 1e9 + 0.5)) << digits;
+                ASSERT_EQ(fractionNanoseconds(digits), static_cast<std::uint64_t>(read * 1e9 + 0.5))
+                    << digits;
             }
         }
     }
@@ -108,7 +113,8 @@ TEST(WriteOffset, HasASignAndTwoPairs) {
     const struct {
         std::int32_t minutes;
         const char* text;
-    } rows[] = {{0, "+00:00"}, {60, "+01:00"}, {-1, "-00:01"}, {-210, "-03:30"}, {5999, "+99:59"}, {675, "+11:15"}};
+    } rows[] = {{0, "+00:00"},    {60, "+01:00"},   {-1, "-00:01"},
+                {-210, "-03:30"}, {5999, "+99:59"}, {675, "+11:15"}};
     for (const auto& row : rows) {
         TextBuffer text;
         writeOffset(text, row.minutes);

@@ -11,6 +11,7 @@
 #include <filesystem>
 #include <optional>
 #include <system_error>
+#include <vector>
 
 namespace host {
 
@@ -26,7 +27,8 @@ constexpr const char* windowsZonesFiles[] = {"/usr/share/unicode/cldr/common/sup
 constexpr const char* examples = R"(kvt tzdata --output tzdata
 kvt tzdata --output tzdata --from ./tzdata.zi)";
 
-constexpr const char* notes = R"(A program names the folder to the library once, by setInstallPathWrapper. Without
+constexpr const char* notes =
+    R"(A program names the folder to the library once, by setInstallPathWrapper. Without
 that, the library looks for a folder "tzdata" in the user's folder "Downloads".
 
 The leap seconds come from leapseconds or leap-seconds.list beside FILE, else beside
@@ -56,7 +58,7 @@ std::optional<std::string> firstThatExists(const std::vector<fs::path>& paths) {
     return std::nullopt;
 }
 
-// All files appear as they are committed, and nothing is left half written where one of them fails.
+// Each file appears whole or not at all.
 void writeFile(const fs::path& path, std::string_view text) {
     const std::unique_ptr<Output> output = openOutput(path.string());
     output->write(text);
@@ -69,14 +71,16 @@ public:
         app.add_option("-o,--output", folder_, "The folder, which is made if it is not there")
             ->type_name("DIR")
             ->required();
-        app.add_option("--from", from_, std::string("Rules as the zone compiler reads them; ") + systemFile +
-                                            " without this option")
+        app.add_option("--from", from_,
+                       std::string("Rules as the zone compiler reads them; ") + systemFile +
+                           " without this option")
             ->type_name("FILE");
     }
 
     int run(Diagnostics&) override {
         const ZoneDatabase database = read();
-        const auto windowsZones = firstThatExists({std::begin(windowsZonesFiles), std::end(windowsZonesFiles)});
+        const auto windowsZones =
+            firstThatExists({std::begin(windowsZonesFiles), std::end(windowsZonesFiles)});
         makeFolder();
         for (const auto& [name, text] : database.files) {
             writeFile(fs::path(folder_) / name, text);

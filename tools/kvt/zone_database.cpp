@@ -23,13 +23,19 @@ constexpr std::array<std::string_view, 7> weekdayNames = {"Sunday",   "Monday", 
 constexpr std::size_t nameLength = 3; // of months and weekdays, in what is written
 
 // What the library's reader opens. Where the first part of a zone's name is none of these, `etcetera` takes it.
-constexpr std::array<std::string_view, 12> fileNames = {"africa",       "antarctica",   "asia",    "australasia",
-                                                        "backward",     "etcetera",     "europe",  "leapseconds",
-                                                        "northamerica", "southamerica", "systemv", "pacificnew"};
+constexpr std::array<std::string_view, 12> fileNames = {
+    "africa", "antarctica",  "asia",         "australasia",  "backward", "etcetera",
+    "europe", "leapseconds", "northamerica", "southamerica", "systemv",  "pacificnew"};
 constexpr std::pair<std::string_view, std::string_view> folders[] = {
-    {"Africa/", "africa"},  {"America/", "northamerica"},  {"Antarctica/", "antarctica"},
-    {"Arctic/", "europe"},  {"Asia/", "asia"},             {"Atlantic/", "europe"},
-    {"Europe/", "europe"},  {"Australia/", "australasia"}, {"Indian/", "asia"},
+    {"Africa/", "africa"},
+    {"America/", "northamerica"},
+    {"Antarctica/", "antarctica"},
+    {"Arctic/", "europe"},
+    {"Asia/", "asia"},
+    {"Atlantic/", "europe"},
+    {"Europe/", "europe"},
+    {"Australia/", "australasia"},
+    {"Indian/", "asia"},
     {"Pacific/", "australasia"},
 };
 
@@ -153,9 +159,16 @@ private:
         if (words.size() != 10) {
             fail("a rule has ten fields");
         }
-        const std::array<std::string, 10> fields = {
-            "Rule",         std::string(words[1]), year(words[2]),       year(words[3]),       "-",
-            month(words[5]), day(words[6]),        timeOfDay(words[7]),  amount(words[8]), std::string(words[9])};
+        const std::array<std::string, 10> fields = {"Rule",
+                                                    std::string(words[1]),
+                                                    year(words[2]),
+                                                    year(words[3]),
+                                                    "-",
+                                                    month(words[5]),
+                                                    day(words[6]),
+                                                    timeOfDay(words[7]),
+                                                    amount(words[8]),
+                                                    std::string(words[9])};
         rules_[std::string(words[1])] += joined(fields) + "\n";
         ++database_.rules;
     }
@@ -222,9 +235,13 @@ private:
             if (words.size() != 7) {
                 fail("a leap second has seven fields");
             }
-            const std::array<std::string, 7> fields = {
-                "Leap",   std::string(words[1]), month(words[2]), std::string(words[3]), std::string(words[4]),
-                std::string(words[5]), std::string(words[6].substr(0, 1))};
+            const std::array<std::string, 7> fields = {"Leap",
+                                                       std::string(words[1]),
+                                                       month(words[2]),
+                                                       std::string(words[3]),
+                                                       std::string(words[4]),
+                                                       std::string(words[5]),
+                                                       std::string(words[6].substr(0, 1))};
             addLeapSecond(joined(fields));
         } else if (words[0].find_first_not_of("0123456789") == std::string_view::npos && words.size() >= 2) {
             takeAtomicDifference(number(words[0]), number(words[1]));
@@ -280,7 +297,9 @@ private:
         return std::to_string(number(word));
     }
 
-    static std::string shortMonth(std::size_t index) { return std::string(monthNames[index].substr(0, nameLength)); }
+    static std::string shortMonth(std::size_t index) {
+        return std::string(monthNames[index].substr(0, nameLength));
+    }
 
     std::string month(std::string_view word) const { return shortName(monthNames, word, "month"); }
 
@@ -347,7 +366,7 @@ private:
     ZoneDatabase database_;
     std::map<std::string, std::string> rules_;       ///< lines by name
     std::map<std::string, std::string> fileOfRules_; ///< the file of the first zone that follows them
-    std::string file_;                          ///< of the zone in hand
+    std::string file_;                               ///< of the zone in hand
     bool zoneContinues_ = false;
     std::string source_;
     std::size_t line_ = 0;

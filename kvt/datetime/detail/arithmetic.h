@@ -7,9 +7,9 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// Years and months by the calendar, with the day cut to the length of the month once, then the rest as exact lengths.
-/// The offset stays as it is. The sum of the years is kept in 16 bits, as the calendar of the `date` library keeps it.
-/// A failure if the year of the instant is out of range; that of the result may be any.
+/// Years and months by the calendar, with the day cut to the length of the month once, then the rest as exact
+/// lengths. The offset stays as it is. The sum of the years is kept in 16 bits, as the calendar of the `date` library
+/// keeps it. A failure if the year of the instant is out of range; that of the result may be any.
 Outcome<TemporalInstant> addInterval(const TemporalInstant& instant, const IntervalParts& interval);
 
 struct Difference {

@@ -16,9 +16,9 @@ struct CivilDate {
     unsigned day;   ///< 1 to 31
 };
 
-/// Days since 1970-01-01. Month and day, up to 255 each, may be beyond their bounds and run through the formula as they
-/// are: surplus days count on, month 13 is January and 14 February of the next year, but from 15 on the formula's
-/// months, which count from March in spans of 30.6 days, drift from the calendar's.
+/// Days since 1970-01-01. Month and day, up to 255 each, may be beyond their bounds and run through the formula as
+/// they are: surplus days count on, month 13 is January and 14 February of the next year, but from 15 on the
+/// formula's months, which count from March in spans of 30.6 days, drift from the calendar's.
 std::int64_t daysFromCivil(std::int64_t year, unsigned month, unsigned day) noexcept;
 
 /// The date so many days after 1970-01-01.

@@ -1,6 +1,7 @@
-// How a failure travels inside: as a value. A step that can fail returns an Outcome, which holds what was asked for or a
-// Failure, and each caller passes the failure on until a public function words it (result.h). No exception is thrown on
-// the way of a value; what does get thrown comes from outside: lack of memory, conversions, the zone database.
+// How a failure travels inside: as a value. A step that can fail returns an Outcome, which holds what was asked for
+// or a Failure, and each caller passes the failure on until a public function words it (result.h). No exception is
+// thrown on the way of a value; what does get thrown comes from outside: lack of memory, conversions, the zone
+// database.
 //
 //     Outcome<TemporalInstant> instant = instantFromParts(parts, false);
 //     if (!instant) {

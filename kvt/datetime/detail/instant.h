@@ -30,7 +30,8 @@ Outcome<NanoCount> checkTimeOfDay(std::int64_t hours, std::int64_t minutes, std:
 
 /// The days since 1970-01-01. Year 1000 to 9999, month and day from 1; without `lenient` up to the 12th month and the
 /// last day of the month, with it up to what daysFromCivil() takes.
-Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day, bool lenient);
+Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day,
+                                        bool lenient);
 
 /// The numbers of a value alone, with the defaults of DateTimeParts.
 struct DateTimeFields {
@@ -55,9 +56,9 @@ Outcome<TemporalInstant> instantFromParts(const DateTimeParts& parts, bool lenie
 /// The fields of an instant, of type `Datetime` or `DatetimeWithOffset`. Its year may be any.
 DateTimeParts partsFromInstant(const TemporalInstant& instant);
 
-/// Changes the offset of an instant. `Replace` keeps the count, `Convert` the moment. "local" and "utc" are read in any
-/// case; the empty text, and a text that is no offset, take the offset away. Lets the exceptions of the zone database
-/// through, for "local" only.
+/// Changes the offset of an instant. `Replace` keeps the count, `Convert` the moment. "local" and "utc" are read in
+/// any case; the empty text, and a text that is no offset, take the offset away. Lets the exceptions of the zone
+/// database through, for "local" only.
 void applyOffsetText(TemporalInstant& instant, std::string_view text, SetZoneMode mode);
 
 /// The compact datetime text of an instant.

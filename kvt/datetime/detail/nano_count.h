@@ -9,9 +9,8 @@ namespace kvt::ex::datetime::detail {
 
 /// Nanoseconds since 1970-01-01T00:00:00, or a length of time in nanoseconds. Overflow is not noticed; with what the
 /// library puts into it (seconds of 64 bits at most) there is none.
-using NanoCount = boost::multiprecision::number<
-    boost::multiprecision::cpp_int_backend<128, 128, boost::multiprecision::signed_magnitude,
-                                           boost::multiprecision::unchecked, void>>;
+using NanoCount = boost::multiprecision::number<boost::multiprecision::cpp_int_backend<
+    128, 128, boost::multiprecision::signed_magnitude, boost::multiprecision::unchecked, void>>;
 
 inline constexpr std::int64_t nanosPerSecond = 1'000'000'000;
 inline constexpr std::int64_t secondsPerMinute = 60;

@@ -8,9 +8,9 @@
 namespace kvt::ex::datetime::detail {
 
 struct PartsAccess {
-    static DateTimeParts dateTime(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours,
-                                  std::uint64_t minutes, std::uint64_t seconds, std::uint64_t nanoseconds,
-                                  const UString<0>& offset) {
+    static DateTimeParts dateTime(std::int64_t year, std::uint64_t month, std::uint64_t day,
+                                  std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
+                                  std::uint64_t nanoseconds, const UString<0>& offset) {
         return DateTimeParts(year, month, day, hours, minutes, seconds, nanoseconds, offset);
     }
     static std::int64_t year(const DateTimeParts& parts) noexcept { return parts.year_; }

@@ -11,10 +11,10 @@ namespace kvt::ex::datetime::detail {
 
 struct CanonicalRecord {
     TemporalType type = TemporalType::Unsupported;
-    UString<0> dateText;     ///< eight digits, or empty
-    UString<0> timeText;     ///< six digits, or empty
-    UString<0> fractionText; ///< digits behind the ".", without zeros at the end
-    UString<0> offsetText;   ///< canonical, or empty
+    UString<0> dateText;         ///< eight digits, or empty
+    UString<0> timeText;         ///< six digits, or empty
+    UString<0> fractionText;     ///< digits behind the ".", without zeros at the end
+    UString<0> offsetText;       ///< canonical, or empty
     bool offsetRepaired = false; ///< the offset was not canonical in the text
     bool lenient = false;
 };
@@ -31,9 +31,9 @@ Outcome<DateTimeParts> partsFromRecord(const CanonicalRecord& record, bool withO
 /// Not for `Unsupported`, which has none.
 Outcome<TemporalInstant> instantFromRecord(const CanonicalRecord& record, bool withOffset);
 
-/// The record as canonical text, with what `lenient` let through carried over. The offset is the record's own text, not
-/// made from its minutes: "+10:75" stays. The date text is empty for the kinds without a date, the time text of a date
-/// is midnight, and the datetime text of a time is the time alone. Not for `Unsupported`.
+/// The record as canonical text, with what `lenient` let through carried over. The offset is the record's own text,
+/// not made from its minutes: "+10:75" stays. The date text is empty for the kinds without a date, the time text of a
+/// date is midnight, and the datetime text of a time is the time alone. Not for `Unsupported`.
 Outcome<UString<0>> dateText(const CanonicalRecord& record);
 Outcome<UString<0>> timeText(const CanonicalRecord& record, bool withOffset);
 Outcome<UString<0>> datetimeText(const CanonicalRecord& record, bool withOffset);

@@ -1,7 +1,7 @@
 // The border between the work and the host: how results are made and how failures become messages.
 //
-// Every public function hands its work to `guarded`. The work returns an Outcome of the whole result: what it knows to
-// answer itself, good or bad, or a Failure, which the function's `words` turn into a message. Whatever is left, an
+// Every public function hands its work to `guarded`. The work returns an Outcome of the whole result: what it knows
+// to answer itself, good or bad, or a Failure, which the function's `words` turn into a message. Whatever is left, an
 // exception from outside included, gets the function's last resort. So nothing is thrown at the host.
 //
 //     TextResult cast(const UString<0>& value, CastToTemporalType target) {
@@ -66,7 +66,8 @@ enum class LastResort {
 /// Puts the message of a last resort into `info`: none for `Silence`, and none where memory does not suffice for it.
 void setLastMessage(kvt::future::optional<LogMessageInfo>& info, LastResort resort) noexcept;
 
-/// The answer of a last resort. A function of one return, since moving the finished result could fail for lack of memory.
+/// The answer of a last resort. A function of one return, since moving the finished result could fail for lack of
+/// memory.
 template <typename Value>
 Result<Value> lastAnswer(LastResort resort) noexcept {
     Result<Value> result(ReturnState::Failure, Value(), std::nullopt);

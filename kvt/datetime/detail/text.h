@@ -1,5 +1,5 @@
-// Bytes and digits: reading runs of digits from text and writing numbers into a buffer. The compact and extended forms
-// of a date and a time are written here and nowhere else.
+// Bytes and digits: reading runs of digits from text and writing numbers into a buffer. The compact and extended
+// forms of a date and a time are written here and nowhere else.
 #pragma once
 
 #include <kvt/string/ustring.h>
@@ -34,13 +34,20 @@ double decimalValue(std::string_view digits) noexcept;
 /// "." and the digits read as a double, in nanoseconds, rounded half up: 1,000,000,000 for "9999999999".
 std::uint64_t fractionNanoseconds(std::string_view digits) noexcept;
 
-/// The two fields of a number of seconds. Negative numbers and NaN give zeros; from 2^64 on, which no field holds, the
-/// seconds are the largest signed number. The nanoseconds are rounded and may be 1,000,000,000.
+/// The two fields of a number of seconds. Negative numbers and NaN give zeros; from 2^64 on, which no field holds,
+/// the seconds are the largest signed number. The nanoseconds are rounded and may be 1,000,000,000.
 struct SplitSeconds {
     std::uint64_t seconds;
     std::uint64_t nanoseconds;
 };
 SplitSeconds splitSeconds(double seconds) noexcept;
+
+/// The chars of the longest double in fixed notation with nine decimals.
+inline constexpr std::size_t longestFixedDouble = 1 + 309 + 1 + 9;
+
+/// Writes a double in fixed notation with at most nine decimals and without zeros at the end, and returns where it
+/// ends.
+char* writeFixed(char* first, char* last, double value) noexcept;
 
 /// Text in the making, in place. The capacity suffices for each field of a value or an interval with 20 digits, and
 /// the caller writes no more than that.
@@ -66,7 +73,8 @@ private:
 };
 
 /// Writes "20200102", or "2020-01-02" in extended form.
-void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day, bool extended) noexcept;
+void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day,
+               bool extended) noexcept;
 
 /// Writes "030405.25", or "03:04:05.25" in extended form.
 void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
