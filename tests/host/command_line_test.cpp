@@ -35,7 +35,7 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
 }
 
 TEST_F(KvtCommandLine, HelpFitsATerminal) {
-    for (const std::string command : {"convert", "encodings", "explain"}) {
+    for (const std::string command : {"convert", "encodings", "text", "number", "explain"}) {
         std::istringstream lines(kvt({command, "--help"}).out);
         for (std::string line; std::getline(lines, line) && !line.empty();) {
             // Examples are command lines and stay whole.
@@ -48,7 +48,7 @@ TEST_F(KvtCommandLine, HelpFitsATerminal) {
 
 TEST_F(KvtCommandLine, HelpOfTheProgramListsTheCommands) {
     const std::string help = kvt({"--help"}).out;
-    for (const char* command : {"convert", "encodings", "wwjd", "explain"}) {
+    for (const char* command : {"convert", "encodings", "text", "number", "wwjd", "explain"}) {
         EXPECT_TRUE(contains(help, std::string("\n  ") + command + " ")) << help;
     }
 }

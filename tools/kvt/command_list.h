@@ -3,6 +3,8 @@
 
 KVT_COMMAND(convert)
 KVT_COMMAND(encodings)
+KVT_COMMAND(text)
+KVT_COMMAND(number)
 KVT_COMMAND(wwjd)
 KVT_COMMAND(explain)
 KVT_COMMAND(tzdata)

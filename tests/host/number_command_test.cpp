@@ -1,0 +1,125 @@
+// `kvt number`: the shortest text of numbers, and what is none.
+
+#include "host_test.h"
+
+namespace kvt::test {
+
+namespace {
+
+using Strings = std::vector<std::string>;
+
+} // namespace
+
+class KvtNumber : public HostTest {
+protected:
+    ChildResult number(Strings arguments, const std::string& input = {}) {
+        arguments.insert(arguments.begin(), "number");
+        return kvt(std::move(arguments), input);
+    }
+};
+
+TEST_F(KvtNumber, PrintsTheFewestDigits) {
+    struct Row {
+        std::string number;
+        std::string plain;
+        std::string xml;
+        std::string single;
+        std::string singleXml;
+    };
+    for (const Row& row : {
+             Row{"0", "0", "0", "0", "0"},
+             Row{"-0.000", "-0", "-0", "-0", "-0"},
+             Row{"0e999", "0", "0", "0", "0"},
+             Row{"1.500", "1.5", "1.5", "1.5", "1.5"},
+             Row{"+.5", "0.5", "0.5", "0.5", "0.5"},
+             Row{"5.", "5", "5", "5", "5"},
+             Row{" \t7 ", "7", "7", "7", "7"},
+             Row{"0.1000000000000000055511151231257827", "0.1", "0.1", "0.1", "0.1"},
+             Row{"0.30000000000000004", "0.30000000000000004", "0.30000000000000004", "0.3", "0.3"},
+             Row{"16777217", "16777217", "16777217", "16777216", "16777216"},
+             Row{"1e9", "1000000000", "1000000000", "1e+9", "1e+9"},
+             Row{"1E17", "1e+17", "1e+17", "1e+17", "1e+17"},
+             Row{"0.00001", "1e-5", "1e-5", "1e-5", "1e-5"},
+             Row{"1e-45", "1e-45", "1e-45", "1e-45", "1e-45"},
+             Row{"inf", "inf", "INF", "inf", "INF"},
+             Row{"-Infinity", "-inf", "-INF", "-inf", "-INF"},
+             Row{"NaN", "nan", "NaN", "nan", "NaN"},
+             Row{"-nan", "-nan", "NaN", "-nan", "NaN"},
+         }) {
+        EXPECT_EQ(number({}, row.number + "\n").out, row.plain + "\n") << row.number;
+        EXPECT_EQ(number({"--xml"}, row.number + "\n").out, row.xml + "\n") << row.number;
+        EXPECT_EQ(number({"--single"}, row.number + "\n").out, row.single + "\n") << row.number;
+        EXPECT_EQ(number({"--single", "--xml"}, row.number + "\n").out, row.singleXml + "\n") << row.number;
+        const ChildResult result = number({"--", row.number});
+        EXPECT_EQ(result.out, row.plain + "\n") << row.number;
+        EXPECT_EQ(result.err, "");
+        EXPECT_EQ(result.status, 0);
+    }
+}
+
+TEST_F(KvtNumber, ASingleNumberIsRoundedOnce) {
+    // Just above the middle of two neighbours, where a detour by double precision would land in the middle and then
+    // go to the even one below.
+    EXPECT_EQ(number({"--single", "1.00000005960464477540"}).out, "1.0000001\n");
+}
+
+TEST_F(KvtNumber, ExtremesAreNumbersAndWhatLiesBeyondIsNot) {
+    EXPECT_EQ(number({"1.7976931348623157e308", "4.9406564584124654e-324", "2.5e-324"}).out,
+              "1.7976931348623157e+308\n5e-324\n5e-324\n");
+    EXPECT_EQ(number({"--single", "3.4028235e38", "1.4e-45"}).out, "3.4028235e+38\n1e-45\n");
+    for (const std::string far : {"1.8e308", "-1e400", "1e-400", "2e-324", "0.0000001e-330"}) {
+        const ChildResult result = number({"--", far});
+        EXPECT_EQ(result.status, 2) << far;
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.err,
+                  "kvt: argument 1: \"" + far + "\" is outside the range of double-precision numbers\n");
+    }
+    for (const std::string far : {"3.5e38", "1e-46"}) {
+        EXPECT_EQ(number({"--single", far}).err,
+                  "kvt: argument 1: \"" + far + "\" is outside the range of single-precision numbers\n");
+    }
+}
+
+TEST_F(KvtNumber, WhatIsNoNumberEndsItWithItsLine) {
+    for (const std::string bad : {"", " ", "abc", "1x", "1 2", "1,5", "0x10", "+-1", "-+1", "--1", "++1",
+                                  "1e", "e5", ".", "+", "nan(1)", "infinit", "1_000"}) {
+        const ChildResult result = number({"-o", "out"}, "1\r\n2.0\n" + bad + "\n4\n");
+        EXPECT_EQ(result.status, 2) << bad;
+        EXPECT_EQ(result.err, "kvt: standard input: line 3: \"" + bad + "\" is not a number\n");
+        EXPECT_TRUE(names().empty());
+    }
+    // To standard output goes what stands before it.
+    EXPECT_EQ(number({}, "1\r\n2.0\nbad\n4\n").out, "1\n2\n");
+    const ChildResult result = number({"1", "2.0", "bad", "4"});
+    EXPECT_EQ(result.out, "1\n2\n");
+    EXPECT_EQ(result.err, "kvt: argument 3: \"bad\" is not a number\n");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(number({}, "1\n\xff\n").err,
+              "kvt: standard input: line 2, column 1, byte 2: The bytes \"\\xFF\" are not valid UTF-8.\n");
+}
+
+TEST_F(KvtNumber, LinesAreReadToTheLastOne) {
+    EXPECT_EQ(number({}, "").out, "");
+    EXPECT_EQ(number({}, "1").out, "1\n");
+    EXPECT_EQ(number({}, "1\n2\r3\r\n").out, "1\n2\n3\n");
+    std::string input;
+    std::string output;
+    for (int value = 0; value < 60000; ++value) {
+        input += std::to_string(value) + ".0\n";
+        output += std::to_string(value) + "\n";
+    }
+    EXPECT_TRUE(number({}, input).out == output);
+}
+
+TEST_F(KvtNumber, FailuresOfTheOutputAreAsElsewhere) {
+    EXPECT_EQ(number({"1", "-o", "/dev/full"}).status, 2);
+    EXPECT_EQ(number({"1.0", "-o", "out"}).out, "");
+    EXPECT_EQ(read("out"), "1\n");
+    ChildSetup made = setup({"number", "1"});
+    made.readNothing = true;
+    const ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "");
+}
+
+} // namespace kvt::test
