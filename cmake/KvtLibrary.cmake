@@ -11,7 +11,8 @@
 add_library(kvt_objects OBJECT)
 target_compile_features(kvt_objects PUBLIC cxx_std_20)
 target_include_directories(kvt_objects PUBLIC "${PROJECT_SOURCE_DIR}")
-target_link_libraries(kvt_objects PRIVATE ICU::uc Boost::headers double-conversion::double-conversion Threads::Threads)
+target_link_libraries(kvt_objects PRIVATE
+    ICU::uc Boost::headers double-conversion::double-conversion kvt_date_headers Threads::Threads)
 set_target_properties(kvt_objects PROPERTIES
     POSITION_INDEPENDENT_CODE ON
     CXX_VISIBILITY_PRESET hidden
@@ -59,7 +60,7 @@ endfunction()
 # Makes both libraries from the objects; called once, after all folders have named their sources.
 function(kvt_finish_library)
     foreach(library IN ITEMS kvt kvt_static)
-        target_sources(${library} PRIVATE $<TARGET_OBJECTS:kvt_objects>)
+        target_sources(${library} PRIVATE $<TARGET_OBJECTS:kvt_objects> $<TARGET_OBJECTS:kvt_date>)
         target_link_libraries(${library} PRIVATE
             ICU::uc double-conversion::double-conversion Threads::Threads)
         set_target_properties(${library} PROPERTIES LINKER_LANGUAGE CXX)

@@ -4,6 +4,10 @@
 #include <kvt/codec/float_text.h>
 #include <kvt/codec/string_adaptors.h>
 #include <kvt/codec/wwjd.h>
+#include <kvt/datetime/datetime.h>
+#include <kvt/datetime/datetime_parts.h>
+#include <kvt/datetime/message_numbers.h>
+#include <kvt/datetime/utc_offset.h>
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/icu_transcoder.h>
 #include <kvt/encoding/stream_transcoder.h>

@@ -1,0 +1,51 @@
+// Counts of nanoseconds. The nine thousand years of the library span about 2.9e20 of them, which 64 bits do not hold.
+#pragma once
+
+#include <boost/multiprecision/cpp_int.hpp>
+
+#include <cstdint>
+
+namespace kvt::ex::datetime::detail {
+
+/// Nanoseconds since 1970-01-01T00:00:00, or a length of time in nanoseconds. Overflow is not noticed; with what the
+/// library puts into it (seconds of 64 bits at most) there is none.
+using NanoCount = boost::multiprecision::number<
+    boost::multiprecision::cpp_int_backend<128, 128, boost::multiprecision::signed_magnitude,
+                                           boost::multiprecision::unchecked, void>>;
+
+inline constexpr std::int64_t nanosPerSecond = 1'000'000'000;
+inline constexpr std::int64_t secondsPerMinute = 60;
+inline constexpr std::int64_t secondsPerHour = 3'600;
+inline constexpr std::int64_t secondsPerDay = 86'400;
+inline constexpr std::int64_t nanosPerMinute = secondsPerMinute * nanosPerSecond;
+inline constexpr std::int64_t nanosPerDay = secondsPerDay * nanosPerSecond;
+
+/// The count of whole seconds and nanoseconds together.
+inline NanoCount nanosOf(std::int64_t seconds, std::int64_t nanoseconds) {
+    return NanoCount(seconds) * nanosPerSecond + nanoseconds;
+}
+
+struct FloorQuotient {
+    std::int64_t quotient;
+    std::int64_t remainder; ///< 0 and above, below the divisor
+};
+
+/// Division towards minus infinity. The divisor is positive and the quotient fits 64 bits.
+inline FloorQuotient floorDivide(const NanoCount& count, std::int64_t divisor) {
+    NanoCount quotient;
+    NanoCount remainder;
+    divide_qr(count, NanoCount(divisor), quotient, remainder);
+    FloorQuotient result = {static_cast<std::int64_t>(quotient), static_cast<std::int64_t>(remainder)};
+    if (result.remainder < 0) {
+        result.remainder += divisor;
+        --result.quotient;
+    }
+    return result;
+}
+
+/// The nearest double.
+inline double toDouble(const NanoCount& count) {
+    return count.convert_to<double>();
+}
+
+} // namespace kvt::ex::datetime::detail

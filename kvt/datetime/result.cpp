@@ -1,0 +1,55 @@
+#include <kvt/datetime/detail/result.h>
+#include <kvt/datetime/detail/text.h>
+#include <kvt/datetime/message_numbers.h>
+
+namespace kvt::ex::datetime::detail {
+
+LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters) {
+    LogMessageInfo info;
+    info.messageNumber = number;
+    info.parameters.reserve(parameters.size());
+    for (const std::string_view parameter : parameters) {
+        info.parameters.emplace_back(UStringView<0>(parameter));
+    }
+    return info;
+}
+
+LogMessageInfo genericMessage() {
+    return message(message_number::generic);
+}
+
+std::optional<LogMessageInfo> messageOf(const Failure& failure) {
+    if (const auto* range = std::get_if<DatePartRange>(&failure)) {
+        return message(message_number::partOutOfRange,
+                       {viewOf(range->value), range->part, range->lowest, range->highest});
+    }
+    if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
+        return message(message_number::formatMismatch, {mismatch->matched, mismatch->rest});
+    }
+    if (const auto* epoch = std::get_if<ParseEpochTimeRange>(&failure)) {
+        return message(message_number::epochTimeOutOfRange, {epoch->seconds});
+    }
+    if (const auto* flags = std::get_if<FormatStringBadCombo>(&failure)) {
+        return message(message_number::flagsExcludeEachOther, {flags->first, flags->second});
+    }
+    return std::nullopt;
+}
+
+void setLastMessage(kvt::future::optional<LogMessageInfo>& info, LastResort resort) noexcept {
+    try {
+        switch (resort) {
+        case LastResort::Generic:
+            info.emplace(genericMessage());
+            break;
+        case LastResort::UnexpectedFormat:
+            info.emplace(message(message_number::formatFailedUnexpectedly));
+            break;
+        case LastResort::Silence:
+            break;
+        }
+    } catch (...) {
+        info.reset(); // not even memory for the message: the state says enough
+    }
+}
+
+} // namespace kvt::ex::datetime::detail

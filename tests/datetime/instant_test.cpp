@@ -1,0 +1,158 @@
+#include "naive_calendar.h"
+
+#include <kvt/datetime/detail/arithmetic.h>
+#include <kvt/datetime/detail/instant.h>
+#include <kvt/datetime/detail/parts_access.h>
+
+#include <gtest/gtest.h>
+
+#include <random>
+#include <string>
+
+namespace {
+
+using namespace kvt::ex::datetime;
+using namespace kvt::ex::datetime::detail;
+
+template <typename Value>
+std::string rangeOf(const Outcome<Value>& outcome) {
+    if (outcome) {
+        return "no failure";
+    }
+    const auto& range = std::get<DatePartRange>(outcome.failure());
+    return range.value.toStdString() + "," + std::string(range.part) + "," + std::string(range.lowest) + "," +
+           std::string(range.highest);
+}
+
+TEST(CheckTimeOfDay, HasBoundsAndLenientOnlyTheLowerOnes) {
+    const struct {
+        std::int64_t hours;
+        std::int64_t minutes;
+        std::int64_t seconds;
+        const char* strict;
+        const char* lenient;
+    } rows[] = {
+        {23, 59, 59, "no failure", "no failure"},
+        {24, 60, 60, "24,hours,0,23", "no failure"},
+        {23, 60, 60, "60,minutes,0,59", "no failure"},
+        {23, 59, 60, "60,seconds,0,59.999999999", "no failure"},
+        {-1, -1, -1, "-1,hours,0,23", "-1,hours,0,23"},
+        {0, -7, -1, "-7,minutes,0,59", "-7,minutes,0,59"},
+        {0, 0, -1, "-1,seconds,0,59.999999999", "-1,seconds,0,59.999999999"},
+    };
+    for (const auto& row : rows) {
+        EXPECT_EQ(rangeOf(checkTimeOfDay(row.hours, row.minutes, row.seconds, 0, false)), row.strict);
+        EXPECT_EQ(rangeOf(checkTimeOfDay(row.hours, row.minutes, row.seconds, 0, true)), row.lenient);
+    }
+    EXPECT_EQ(*checkTimeOfDay(1, 2, 3, 4, false), nanosOf(3723, 4));
+    EXPECT_EQ(*checkTimeOfDay(25, 61, 61, 2'000'000'000, true), nanosOf(25 * 3600 + 61 * 60 + 63, 0));
+}
+
+TEST(CheckCalendarDate, HasBoundsAndLenientOnlySomeOfThem) {
+    const struct {
+        std::int64_t year;
+        std::uint64_t month;
+        std::uint64_t day;
+        const char* strict;
+        const char* lenient;
+    } rows[] = {
+        {1000, 1, 1, "no failure", "no failure"},
+        {9999, 12, 31, "no failure", "no failure"},
+        {999, 0, 0, "999,year,1000,9999", "999,year,1000,9999"},
+        {10000, 1, 1, "10000,year,1000,9999", "10000,year,1000,9999"},
+        {-1, 1, 1, "-1,year,1000,9999", "-1,year,1000,9999"},
+        {2020, 0, 0, "0,month,1,12", "0,month,1,12"},
+        {2020, 13, 0, "13,month,1,12", "0,day,1,29"},
+        {2020, 13, 99, "13,month,1,12", "no failure"},
+        {2020, 2, 0, "0,day,1,29", "0,day,1,29"},
+        {2020, 2, 30, "30,day,1,29", "no failure"},
+        {2000, 2, 30, "30,day,1,29", "no failure"},
+        {2100, 2, 29, "29,day,1,28", "no failure"},
+        {2020, 4, 31, "31,day,1,30", "no failure"},
+        {2020, 1, 32, "32,day,1,31", "no failure"},
+    };
+    for (const auto& row : rows) {
+        EXPECT_EQ(rangeOf(checkCalendarDate(row.year, row.month, row.day, false)), row.strict);
+        EXPECT_EQ(rangeOf(checkCalendarDate(row.year, row.month, row.day, true)), row.lenient);
+    }
+}
+
+TEST(InstantFromParts, AndBackIsTheSame) {
+    std::mt19937_64 random(62);
+    for (int i = 0; i < 50'000; ++i) {
+        kvt::test::NaiveDateTime at{1000 + static_cast<std::int64_t>(random() % 9000),
+                                    1 + static_cast<int>(random() % 12), 1};
+        at.day = 1 + static_cast<int>(random() % static_cast<unsigned>(kvt::test::daysInMonth(at.year, at.month)));
+        at.hours = static_cast<int>(random() % 24);
+        at.minutes = static_cast<int>(random() % 60);
+        at.seconds = static_cast<int>(random() % 60);
+        at.nanoseconds = static_cast<int>(random() % 1'000'000'000);
+        const auto u = [](int number) { return static_cast<std::uint64_t>(number); };
+        const DateTimeParts parts =
+            PartsAccess::dateTime(at.year, u(at.month), u(at.day), u(at.hours), u(at.minutes), u(at.seconds),
+                                  u(at.nanoseconds), i % 2 == 0 ? "-03:30" : "");
+        const auto instant = instantFromParts(parts, i % 3 == 0);
+        ASSERT_TRUE(static_cast<bool>(instant));
+        const auto days = kvt::test::naiveDays(at.year, at.month, at.day);
+        ASSERT_EQ(instant->count,
+                  nanosOf(days * 86'400 + at.hours * 3600 + at.minutes * 60 + at.seconds, at.nanoseconds));
+        const DateTimeParts back = partsFromInstant(*instant);
+        ASSERT_EQ(back.toDatetimeString(FormatType::Extended, true), parts.toDatetimeString(FormatType::Extended, true));
+        ASSERT_EQ(back.type(), i % 2 == 0 ? TemporalType::DatetimeWithOffset : TemporalType::Datetime);
+        ASSERT_EQ(instantText(*instant, true), parts.toDatetimeString(FormatType::Compact, true));
+        ASSERT_EQ(instantText(*instant, false), parts.toDatetimeString(FormatType::Compact, false));
+    }
+}
+
+TEST(ApplyOffsetText, ReplacesOrConverts) {
+    const std::optional<std::int32_t> none;
+    const std::int64_t noon = 12 * 3600;
+    const struct {
+        int line;
+        std::optional<std::int32_t> before;
+        const char* text;
+        SetZoneMode mode;
+        std::int64_t seconds;
+        std::optional<std::int32_t> after;
+    } rows[] = {
+        {__LINE__, none, "+02:00", SetZoneMode::Replace, noon, 120},
+        {__LINE__, 0, "+02:00", SetZoneMode::Convert, noon + 7200, 120},
+        {__LINE__, 60, "+02:00", SetZoneMode::Convert, noon + 3600, 120},
+        {__LINE__, 60, "+02:00", SetZoneMode::Replace, noon, 120},
+        {__LINE__, 60, "+02:00", SetZoneMode::Automatic, noon + 3600, 120},
+        {__LINE__, none, "+02:00", SetZoneMode::Automatic, noon, 120},
+        {__LINE__, 60, "-0330", SetZoneMode::Convert, noon - 3600 - 12600, -210},
+        {__LINE__, 60, "utc", SetZoneMode::Convert, noon - 3600, 0},
+        {__LINE__, 60, "uTC", SetZoneMode::Replace, noon, 0},
+        {__LINE__, none, "UTC", SetZoneMode::Automatic, noon, 0},
+        {__LINE__, 60, "", SetZoneMode::Replace, noon, none},
+        {__LINE__, 60, "", SetZoneMode::Convert, noon - 3600, none}, // UTC by then
+        {__LINE__, 60, "", SetZoneMode::Automatic, noon - 3600, none},
+        {__LINE__, 60, "nothing", SetZoneMode::Replace, noon, none},
+        {__LINE__, 60, "utcs", SetZoneMode::Convert, noon - 3600, none},
+        {__LINE__, none, "+1", SetZoneMode::Automatic, noon, none},
+        {__LINE__, none, "+02:00", SetZoneMode::Convert, noon + 7200, 120}, // as if it had been UTC
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.line);
+        TemporalInstant instant{nanosOf(noon, 0), row.before};
+        applyOffsetText(instant, row.text, row.mode);
+        EXPECT_EQ(instant.count, nanosOf(row.seconds, 0));
+        EXPECT_EQ(instant.offsetMinutes, row.after);
+    }
+}
+
+TEST(AddInterval, KeepsTheOffset) {
+    const TemporalInstant instant{nanosOf(0, 0), 60};
+    const auto sum = addInterval(instant, IntervalParts(0, 0, 0, 1, 0, 0.0, false));
+    ASSERT_TRUE(static_cast<bool>(sum));
+    EXPECT_EQ(sum->count, nanosOf(3600, 0));
+    EXPECT_EQ(sum->offsetMinutes, 60);
+}
+
+TEST(AddInterval, ChecksTheYearItStartsFrom) {
+    const TemporalInstant instant{nanosOf(-40'000'000'000, 0), std::nullopt};
+    EXPECT_EQ(rangeOf(addInterval(instant, IntervalParts())), "702,year,1000,9999");
+}
+
+} // namespace
