@@ -4,4 +4,6 @@
 KVT_COMMAND(convert)
 KVT_COMMAND(encodings)
 KVT_COMMAND(wwjd)
+KVT_COMMAND(date)
+KVT_COMMAND(doctor)
 KVT_COMMAND(explain)
