@@ -15,6 +15,23 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
                                                     {"wwjd"},
                                                     {"wwjd", "encode"},
                                                     {"wwjd", "decode"},
+                                                    {"date"},
+                                                    {"date", "parse"},
+                                                    {"date", "format"},
+                                                    {"date", "cast"},
+                                                    {"date", "add"},
+                                                    {"date", "diff"},
+                                                    {"date", "compare"},
+                                                    {"date", "interval"},
+                                                    {"date", "interval", "create"},
+                                                    {"date", "interval", "negate"},
+                                                    {"date", "zone"},
+                                                    {"date", "zone", "get"},
+                                                    {"date", "zone", "set"},
+                                                    {"date", "zone", "remove"},
+                                                    {"date", "now"},
+                                                    {"date", "why"},
+                                                    {"doctor"},
                                                     {"explain"}}) {
         for (const char* option : {"--help", "-h"}) {
             std::vector<std::string> arguments = command;
@@ -35,7 +52,8 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
 }
 
 TEST_F(KvtCommandLine, HelpFitsATerminal) {
-    for (const std::string command : {"convert", "encodings", "text", "number", "explain"}) {
+    for (const std::string command :
+         {"convert", "encodings", "text", "number", "explain", "date", "doctor", "tzdata"}) {
         std::istringstream lines(kvt({command, "--help"}).out);
         for (std::string line; std::getline(lines, line) && !line.empty();) {
             // Examples are command lines and stay whole.
@@ -48,7 +66,8 @@ TEST_F(KvtCommandLine, HelpFitsATerminal) {
 
 TEST_F(KvtCommandLine, HelpOfTheProgramListsTheCommands) {
     const std::string help = kvt({"--help"}).out;
-    for (const char* command : {"convert", "encodings", "text", "number", "wwjd", "explain"}) {
+    for (const char* command :
+         {"convert", "encodings", "text", "number", "wwjd", "date", "doctor", "explain", "tzdata"}) {
         EXPECT_TRUE(contains(help, std::string("\n  ") + command + " ")) << help;
     }
 }
@@ -99,6 +118,9 @@ TEST_F(KvtCommandLine, UnknownWordsSuggestTheNearest) {
         {{"wwjd", "encdoe"},
          "kvt: unknown command 'encdoe'. Did you mean 'encode'?\nTry 'kvt wwjd --help'.\n"},
         {{"wwjd"}, "kvt: which command? There are 'encode', 'decode'.\nTry 'kvt wwjd --help'.\n"},
+        {{"date", "prase"}, "kvt: unknown command 'prase'. Did you mean 'parse'?\nTry 'kvt date --help'.\n"},
+        {{"date", "parse", "2020", "%Y", "--leninet"},
+         "kvt: unknown option '--leninet'. Did you mean '--lenient'?\nTry 'kvt date parse --help'.\n"},
         {{"wwjd", "encode", "--ouptut", "x"},
          "kvt: unknown option '--ouptut'. Did you mean '--output'?\nTry 'kvt wwjd encode --help'.\n"},
     };

@@ -23,6 +23,57 @@ TEST_F(KvtExplain, EveryMessageOfTheLibraryHasAText) {
     }
 }
 
+// The numbers as the library declares them, ordered.
+std::vector<std::string> dateNumbers() {
+    std::ifstream header(KVT_SOURCE_DIR "/kvt/datetime/message_numbers.h");
+    std::vector<std::string> numbers;
+    for (std::string line; std::getline(header, line);) {
+        const std::size_t number = line.find("= 933");
+        if (number != std::string::npos) {
+            numbers.push_back(line.substr(number + 2, 6));
+        }
+    }
+    std::sort(numbers.begin(), numbers.end());
+    return numbers;
+}
+
+TEST_F(KvtExplain, EveryNumberOfTheDateFunctionsHasAText) {
+    const std::vector<std::string> numbers = dateNumbers();
+    ASSERT_EQ(numbers.size(), 33u);
+    for (const std::string& number : numbers) {
+        const ChildResult result = kvt({"explain", number});
+        EXPECT_EQ(result.status, 0) << number;
+        EXPECT_GT(result.out.size(), 10u) << number;
+    }
+}
+
+TEST_F(KvtExplain, TextsOfTheDateFunctionsTakeAsManyParametersAsThereAre) {
+    struct Row {
+        std::string number;
+        std::size_t parameters;
+    };
+    for (const Row& row :
+         {Row{"933050", 1}, Row{"933052", 2}, Row{"933059", 2}, Row{"933060", 2}, Row{"933063", 1},
+          Row{"933064", 1}, Row{"933065", 4}, Row{"933067", 2}, Row{"933068", 0}, Row{"933071", 1},
+          Row{"933073", 1}, Row{"933074", 0}, Row{"933075", 1}, Row{"933076", 0}, Row{"933078", 2},
+          Row{"933079", 2}, Row{"933081", 1}, Row{"933082", 1}, Row{"933083", 2}, Row{"933084", 0},
+          Row{"933085", 1}, Row{"933086", 1}, Row{"933087", 1}, Row{"933088", 1}, Row{"933089", 1},
+          Row{"933090", 1}, Row{"933091", 1}, Row{"933092", 0}, Row{"933093", 1}, Row{"933094", 1},
+          Row{"933095", 1}, Row{"933096", 1}, Row{"933097", 1}}) {
+        std::vector<std::string> arguments = {"explain", row.number};
+        for (std::size_t i = 0; i < row.parameters; ++i) {
+            arguments.push_back("<" + std::to_string(i) + ">");
+        }
+        const ChildResult result = kvt(arguments);
+        EXPECT_EQ(result.status, 0) << row.number << result.err;
+        for (std::size_t i = 0; i < row.parameters; ++i) {
+            EXPECT_TRUE(contains(result.out, arguments[i + 2])) << result.out;
+        }
+        arguments.push_back("more");
+        EXPECT_EQ(kvt(arguments).status, 2) << row.number;
+    }
+}
+
 TEST_F(KvtExplain, ParametersTakeTheirPlaces) {
     EXPECT_EQ(kvt({"explain", "910003", "Caf\u00e9", "UTF-8", "US-ASCII"}).out,
               "The text \"Caf\u00e9\", read as UTF-8, holds something that does not exist in US-ASCII.\n");
@@ -36,12 +87,16 @@ TEST_F(KvtExplain, ParametersAreNotLookedAtAgain) {
 }
 
 TEST_F(KvtExplain, UnknownNumbersAreRefusedWithTheKnownOnes) {
-    for (const std::string number : {"1", "910006", "91000", "910002x", "", "99999999999999999999"}) {
+    std::string numbers = "910002, 910003, 910004, 910005";
+    for (const std::string& known : dateNumbers()) {
+        numbers += ", " + known;
+    }
+    for (const std::string number :
+         {"1", "910006", "933051", "933098", "91000", "910002x", "", "99999999999999999999"}) {
         const ChildResult result = kvt({"explain", number});
         EXPECT_EQ(result.status, 2) << number;
         EXPECT_EQ(result.out, "");
-        EXPECT_EQ(result.err,
-                  "kvt: there is no message " + number + "; there are 910002, 910003, 910004, 910005\n");
+        EXPECT_EQ(result.err, "kvt: there is no message " + number + "; there are " + numbers + "\n");
     }
 }
 

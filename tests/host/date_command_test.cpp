@@ -1,0 +1,237 @@
+// `kvt date`: values from the command line and from standard input, failures, and JSON.
+
+#include "host_test.h"
+
+#include <nlohmann/json.hpp>
+
+namespace kvt::test {
+
+class KvtDate : public HostTest {
+protected:
+    ChildResult date(std::vector<std::string> arguments, std::string input = {}) {
+        arguments.insert(arguments.begin(), "date");
+        return kvt(std::move(arguments), std::move(input));
+    }
+
+    // A zone database in which the zone of this machine is one hour ahead of UTC.
+    std::string zoneDatabase() {
+        std::string zone;
+        for (const auto& finding : nlohmann::json::parse(kvt({"doctor", "--json"}).out)) {
+            if (finding["subject"] == "zone of the machine") {
+                zone = finding["value"];
+            }
+        }
+        std::filesystem::create_directory(path("zones"));
+        for (const char* name : {"africa", "antarctica", "asia", "australasia", "backward", "europe",
+                                 "pacificnew", "northamerica", "southamerica", "systemv"}) {
+            write(std::string("zones/") + name, "");
+        }
+        write("zones/etcetera", "Zone " + zone + " 1:00 - HERE\n");
+        write("zones/leapseconds", "Leap 1972 Jun 30 23:59:60 + S\n");
+        write("zones/version", "2020a\n");
+        return path("zones");
+    }
+};
+
+TEST_F(KvtDate, EachFunctionGivesItsResult) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string result;
+    };
+    const std::vector<Row> rows = {
+        {{"parse", "31 Jan 2020", "%d %b %Y"}, "20200131"},
+        {{"parse", "2020-01-31T12:30:00Z", "ISO"}, "20200131123000+00:00"},
+        {{"parse", "2020-02-30", "%Y-%m-%d", "--lenient"}, "20200301"},
+        {{"parse", "-1.5", "%s"}, "19691231235958.5+00:00"},
+        {{"format", "20200131", "%A, %e %B %Y"}, "Friday, 31 January 2020"},
+        {{"format", "20200131", "ISO"}, "2020-01-31"},
+        {{"cast", "20200131123000", "date"}, "20200131"},
+        {{"cast", "20200131123000", "time"}, "123000"},
+        {{"cast", "20200131", "datetime"}, "20200131000000"},
+        {{"add", "20200131", "P1M"}, "20200229"},
+        {{"add", "20200131120000", "-PT90M"}, "20200131103000"},
+        {{"add", "20200131120000+0100", "PT1S"}, "20200131120001+01:00"},
+        {{"diff", "20200301", "20200130"}, "P1M1D"},
+        {{"diff", "20200301", "20200130", "--unit", "days"}, "31"},
+        {{"diff", "20200101120000", "20200101", "--unit", "days"}, "0.5"},
+        {{"compare", "20200131120000+01:00", "20200131110000+00:00"}, "0"},
+        {{"compare", "20200130", "20200131"}, "-1"},
+        {{"compare", "20200131", "20200130"}, "1"},
+        {{"interval", "negate", "P1M"}, "-P1M"},
+        {{"interval", "negate", "-P1M"}, "P1M"},
+        {{"interval", "create", "--days", "3", "--minutes", "90", "--seconds", "1.5"}, "P3DT90M1.5S"},
+        {{"interval", "create", "--years", "1", "--negative"}, "-P1Y"},
+        {{"interval", "create"}, "PT0S"},
+        {{"zone", "get", "120000-03:30"}, "-03:30"},
+        {{"zone", "get", "120000-03:30", "--as", "minutes"}, "-210"},
+        {{"zone", "get", "120000-03:30", "--as", "seconds"}, "-12600"},
+        {{"zone", "set", "20200131120000+01:00", "utc"}, "20200131110000+00:00"},
+        {{"zone", "set", "20200131120000+01:00", "-05:00", "--mode", "replace"}, "20200131120000-05:00"},
+        {{"zone", "set", "120000", "+02:00"}, "120000+02:00"},
+        {{"zone", "remove", "20200131120000+01:00"}, "20200131120000"},
+    };
+    for (const Row& row : rows) {
+        const ChildResult result = date(row.arguments);
+        EXPECT_EQ(result.out, row.result + "\n") << row.arguments[0] << " " << row.arguments[1];
+        EXPECT_EQ(result.err, "");
+        EXPECT_EQ(result.status, 0);
+    }
+}
+
+TEST_F(KvtDate, AFailureSaysWhyWithItsNumber) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string error;
+    };
+    const std::vector<Row> rows = {
+        {{"add", "x", "P1D"}, "\"x\" is no date, time or datetime in canonical form. (933063)"},
+        {{"add", "20201301", "P1D"}, "13 is out of range for the month, which goes from 1 to 12. (933065)"},
+        {{"add", "120000", "P1D"},
+         "\"120000\" is a time of day, and \"P1D\" has years, months or days, which cannot be added to it. "
+         "(933060)"},
+        {{"compare", "20200101", "120000"},
+         "\"20200101\" and \"120000\" are not of kinds that can be compared. (933059)"},
+        {{"cast", "120000", "date"}, "A value of the kind time cannot become one of the kind date. (933052)"},
+        {{"parse", "5", "%q"}, "\"%q\" is no flag that @DateTimeParse() knows. (933079)"},
+        {{"parse", " ", "%Y"}, "The value is empty."},
+        {{"zone", "set", "120000", "local"},
+         "\"120000\" has no date, and without one the offset of this machine's zone is not known. (933096)"},
+        {{"interval", "negate", "1"}, "\"1\" is no interval. (933064)"},
+    };
+    for (const Row& row : rows) {
+        const ChildResult result = date(row.arguments);
+        EXPECT_EQ(result.err, "kvt: " + row.error + "\n");
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.status, 2);
+    }
+}
+
+TEST_F(KvtDate, AMismatchMarksTheElementThatFailed) {
+    struct Row {
+        std::string value;
+        std::string format;
+        std::string mark;
+    };
+    for (const Row& row : {Row{"2020-13-01", "%Y-%m-%d", "   ^"}, Row{"x", "%Y", "^"},
+                           Row{"12:3x:00", "%T", "^"}, Row{"\u00e9 1", "\u00e9 %B", "  ^"},
+                           Row{"\u00e9", "\u00e8%H", "^"}, Row{"2020-01-01x", "%Y-%m-%d$", "        ^"}}) {
+        const ChildResult result = date({"parse", row.value, row.format});
+        EXPECT_TRUE(contains(result.err, "(933067)\n     " + row.format + "\n     " + row.mark + "\n"))
+            << result.err;
+        EXPECT_EQ(result.status, 2);
+    }
+}
+
+TEST_F(KvtDate, LinesOfStandardInputKeepTheirNumbers) {
+    const ChildResult good = date({"add", "P1D"}, "20200131\r\n20200229\n20201231");
+    EXPECT_EQ(good.out, "20200201\n20200301\n20210101\n");
+    EXPECT_EQ(good.status, 0);
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"add", "P1D"}, {"add", "-", "P1D"}}) {
+        const ChildResult some = date(arguments, "20200131\nx\n20200229\n");
+        EXPECT_EQ(some.out, "20200201\n\n20200301\n");
+        EXPECT_EQ(
+            some.err,
+            "kvt: standard input: line 2: \"x\" is no date, time or datetime in canonical form. (933063)\n");
+        EXPECT_EQ(some.status, 1);
+    }
+    EXPECT_EQ(date({"add", "P1D"}, "").out, "");
+    EXPECT_EQ(date({"interval", "negate"}, "P1D\n-P1D\n").out, "-P1D\nP1D\n");
+    // The mark stands under the format for a line, too.
+    EXPECT_TRUE(contains(date({"parse", "%H:%M"}, "12-30\n").err, "\n     %H:%M\n       ^\n"));
+}
+
+TEST_F(KvtDate, LinesComeOutAsTheyGoIn) {
+    std::size_t sent = 0;
+    std::size_t results = 0;
+    ChildSetup made = setup({"date", "add", "P1D"});
+    made.oneByOne = true;
+    made.makeInput = [&]() -> std::string_view { return sent++ == 200 ? std::string_view() : "20200131\n"; };
+    made.takeOutput = [&](std::string_view out) {
+        results += static_cast<std::size_t>(std::count(out.begin(), out.end(), '\n'));
+    };
+    EXPECT_EQ(runChild(made).status, 0);
+    EXPECT_EQ(results, 200u);
+}
+
+TEST_F(KvtDate, LinesThatAreNoValueDoNotEndTheRest) {
+    std::string input = "20200131\n\xff\n" + std::string(1000000, '1') + "\n20200229\n";
+    const ChildResult result = date({"add", "P1D"}, input);
+    EXPECT_EQ(result.out, "20200201\n\n\n20200301\n");
+    EXPECT_TRUE(contains(result.err, "standard input: line 2: ")) << result.err;
+    EXPECT_TRUE(contains(result.err, "standard input: line 3: The line is too long for a value.\n"))
+        << result.err;
+    EXPECT_EQ(result.status, 1);
+}
+
+TEST_F(KvtDate, JsonHasTheResultOrTheMessage) {
+    EXPECT_EQ(date({"add", "20200131", "P1M", "--json"}).out,
+              "{\"value\":\"20200131\",\"state\":\"Success\",\"result\":\"20200229\"}\n");
+    EXPECT_EQ(
+        date({"add", "20200131120000+0100", "PT1S", "--json"}).out,
+        "{\"value\":\"20200131120000+0100\",\"state\":\"Repaired\",\"result\":\"20200131120001+01:00\"}\n");
+    EXPECT_EQ(date({"compare", "20200131", "20200130", "--json"}).out,
+              "{\"value\":\"20200131\",\"state\":\"Success\",\"result\":1}\n");
+    const ChildResult lines = date({"parse", "%Y-%m-%d", "--json"}, "2020-01-02\n2020\n\n");
+    EXPECT_EQ(
+        lines.out,
+        "{\"line\":1,\"value\":\"2020-01-02\",\"state\":\"Success\",\"result\":\"20200102\"}\n"
+        "{\"line\":2,\"value\":\"2020\",\"state\":\"Failure\",\"result\":null,\"message\":{\"number\":933067,"
+        "\"text\":\"The value fits the format up to \\\"%Y\\\" but not where the format goes on with "
+        "\\\"-%m-%d\\\".\",\"parameters\":[\"%Y\",\"-%m-%d\"]}}\n"
+        "{\"line\":3,\"value\":\"\",\"state\":\"Failure\",\"result\":null,\"message\":{\"number\":null,"
+        "\"text\":\"The value is empty.\",\"parameters\":[]}}\n");
+    EXPECT_EQ(lines.err, "");
+    EXPECT_EQ(lines.status, 1);
+    EXPECT_EQ(date({"add", "x", "P1M", "--json"}).status, 2);
+}
+
+TEST_F(KvtDate, TheZoneOfTheMachineComesFromTheDatabase) {
+    const std::string zones = zoneDatabase();
+    const ChildResult set = date({"zone", "set", "20200131120000", "local", "--zone-database", zones});
+    EXPECT_EQ(set.out, "20200131120000+01:00\n") << set.err;
+    const ChildResult converted =
+        date({"zone", "set", "20200131120000+00:00", "LOCAL", "--zone-database", zones});
+    EXPECT_EQ(converted.out, "20200131130000+01:00\n") << converted.err;
+    const ChildResult now = date({"now", "--zone-database", zones});
+    EXPECT_TRUE(now.out.ends_with("+01:00\n")) << now.out << now.err;
+    const ChildResult bare = date({"now", "--no-offset", "--zone-database", zones});
+    EXPECT_FALSE(contains(bare.out, "+")) << bare.out;
+    EXPECT_EQ(bare.status, 0) << bare.err;
+}
+
+TEST_F(KvtDate, AMissingDatabaseIsNamed) {
+    const ChildResult now = date({"now", "--zone-database", path("none")});
+    EXPECT_EQ(now.status, 2);
+    EXPECT_TRUE(contains(now.err, path("none"))) << now.err;
+    EXPECT_TRUE(contains(now.err, "(933050)")) << now.err;
+    const ChildResult set = date({"zone", "set", "20200131", "local", "--zone-database", path("none")});
+    EXPECT_EQ(set.status, 2);
+    EXPECT_TRUE(contains(set.err, "kvt doctor")) << set.err;
+    // UTC needs none.
+    EXPECT_TRUE(date({"now", "--utc", "--zone-database", path("none")}).out.ends_with("+00:00\n"));
+}
+
+TEST_F(KvtDate, WrongCommandLinesAreRefused) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string part;
+    };
+    for (const Row& row :
+         {Row{{"cast", "20200131", "dtae"}, "Did you mean 'date'?"},
+          Row{{"diff", "20200131", "20200130", "--unit", "day"}, "Did you mean 'days'?"},
+          Row{{"zone", "get", "120000+01:00", "--as", "hours"}, "text, minutes, seconds"},
+          Row{{"zone", "set", "120000", "utc", "--mode", "keep"}, "automatic, replace, convert"},
+          Row{{"add"}, "INTERVAL is required"}, Row{{"add", "20200131", "P1D", "P2D"}, "P2D"},
+          Row{{"add", "20200131", "P1D", "-P2D"}, "-P2D"},
+          Row{{"now", "--utc", "--no-offset"}, "do not go together"},
+          Row{{"interval", "create", "--seconds=-1"}, "--negative"}, Row{{"zone"}, "'get', 'set', 'remove'"},
+          Row{{}, "'parse', 'format'"}}) {
+        const ChildResult result = date(row.arguments, "20200131\n");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.out, "");
+        EXPECT_TRUE(contains(result.err, row.part)) << result.err;
+    }
+}
+
+} // namespace kvt::test

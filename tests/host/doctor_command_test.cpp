@@ -1,0 +1,110 @@
+// `kvt doctor`: what it finds in surroundings that a test can make.
+
+#include "host_test.h"
+
+#include <nlohmann/json.hpp>
+
+namespace kvt::test {
+
+class KvtDoctor : public HostTest {
+protected:
+    nlohmann::json finding(const std::string& subject,
+                           std::vector<std::pair<std::string, std::string>> environment,
+                           std::vector<std::string> more = {}) {
+        more.insert(more.begin(), {"doctor", "--json"});
+        ChildSetup made = setup(std::move(more));
+        made.environment = std::move(environment);
+        const ChildResult result = runChild(made);
+        EXPECT_EQ(result.err, "");
+        bool anyWarning = false;
+        nlohmann::json found;
+        for (const auto& entry : nlohmann::json::parse(result.out)) {
+            anyWarning = anyWarning || !entry["warning"].is_null();
+            if (entry["subject"].get<std::string>().starts_with(subject)) {
+                found = entry;
+                break;
+            }
+        }
+        EXPECT_TRUE(result.status == 1 || (result.status == 0 && !anyWarning)) << result.status;
+        return found;
+    }
+};
+
+TEST_F(KvtDoctor, TheEncodingComesFromTheFirstVariableThatIsSet) {
+    struct Row {
+        std::vector<std::pair<std::string, std::string>> environment;
+        std::string source;
+    };
+    for (const Row& row :
+         {Row{{{"LC_ALL", "C.UTF-8"}, {"LC_CTYPE", "C"}, {"LANG", "C"}}, "LC_ALL=C.UTF-8"},
+          Row{{{"LC_ALL", ""}, {"LC_CTYPE", "C.UTF-8"}, {"LANG", "C"}}, "LC_CTYPE=C.UTF-8"},
+          Row{{{"LC_ALL", ""}, {"LC_CTYPE", ""}, {"LANG", "C"}}, "LANG=C, which counts as UTF-8"},
+          Row{{{"LC_ALL", ""}, {"LC_CTYPE", ""}, {"LANG", ""}},
+              "none of LC_ALL, LC_CTYPE and LANG is set, which counts as UTF-8"}}) {
+        const nlohmann::json found = finding("system encoding", row.environment);
+        EXPECT_EQ(found["source"], row.source);
+        EXPECT_EQ(found["value"], "UTF-8") << row.source;
+        EXPECT_TRUE(found["warning"].is_null()) << row.source;
+    }
+    const nlohmann::json unknown = finding("system encoding", {{"LC_ALL", "xx_YY.zz"}});
+    EXPECT_TRUE(contains(unknown["warning"].get<std::string>(), "xx_YY.zz"));
+}
+
+TEST_F(KvtDoctor, TheZoneIsThatOfTheMachineAndNotOfTheVariable) {
+    const nlohmann::json zone = finding("zone of the machine", {{"TZ", "Asia/Tokyo"}});
+    std::error_code error;
+    const std::string link = std::filesystem::read_symlink("/etc/localtime", error).string();
+    if (!error) {
+        EXPECT_EQ(zone["source"], "the link /etc/localtime to " + link);
+        const std::string target = std::filesystem::canonical("/etc/localtime").string();
+        EXPECT_TRUE(target.ends_with("/" + zone["value"].get<std::string>())) << zone;
+    }
+    const nlohmann::json variable = finding("variable TZ", {{"TZ", "Asia/Tokyo"}});
+    EXPECT_EQ(variable["value"], "\"Asia/Tokyo\"");
+    EXPECT_FALSE(variable["warning"].is_null());
+}
+
+TEST_F(KvtDoctor, TheDatabaseIsLookedForAndItsVersionCompared) {
+    const nlohmann::json byItself = finding("zone database", {{"HOME", folder_.string()}});
+    EXPECT_EQ(byItself["value"], path("Downloads/tzdata"));
+    EXPECT_EQ(byItself["source"], "where the library looks by itself");
+    EXPECT_FALSE(byItself["warning"].is_null());
+
+    std::filesystem::create_directory(path("zones"));
+    const nlohmann::json given = finding("zone database", {}, {"--zone-database", path("zones")});
+    EXPECT_EQ(given["source"], "--zone-database");
+    EXPECT_TRUE(given["warning"].is_null());
+    EXPECT_EQ(finding("its version", {}, {"--zone-database", path("zones")})["value"], "not known");
+    write("zones/version", "1999z\n");
+    const nlohmann::json old = finding("its version", {}, {"--zone-database", path("zones")});
+    EXPECT_EQ(old["value"], "1999z");
+
+    std::ifstream distribution("/usr/share/zoneinfo/tzdata.zi");
+    std::string head;
+    if (std::getline(distribution, head) && head.starts_with("# version ")) {
+        EXPECT_EQ(old["source"], "the distribution has " + head.substr(10));
+        EXPECT_FALSE(old["warning"].is_null());
+        write("zones/version", head.substr(10) + "\n");
+        EXPECT_TRUE(finding("its version", {}, {"--zone-database", path("zones")})["warning"].is_null());
+    }
+}
+
+TEST_F(KvtDoctor, TheSpaceIsThatOfTheTemporaryFolderAndOfThisOne) {
+    const nlohmann::json space = finding("space in " + folder_.string(), {{"TMPDIR", folder_.string()}});
+    EXPECT_EQ(space["source"], "for temporary files, by TMPDIR");
+    EXPECT_TRUE(space["value"].get<std::string>().ends_with(" GiB free")) << space;
+    const nlohmann::json missing = finding("space in " + path("none"), {{"TMPDIR", path("none")}});
+    EXPECT_EQ(missing["value"], "not known");
+    EXPECT_TRUE(contains(missing["warning"].get<std::string>(), "No such file or directory"));
+    EXPECT_EQ(finding("space in .", {})["source"], "for files in this folder");
+}
+
+TEST_F(KvtDoctor, WarningsStandBelowTheTable) {
+    const ChildResult result = kvt({"doctor", "--zone-database", path("none")});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(contains(result.out, "\n!  zone database ")) << result.out;
+    EXPECT_TRUE(contains(result.out, "\n! zone database: There is no such folder")) << result.out;
+    EXPECT_TRUE(contains(result.out, "(933050)")) << result.out;
+}
+
+} // namespace kvt::test
