@@ -28,9 +28,9 @@ std::vector<std::string> dateNumbers() {
     std::ifstream header(KVT_SOURCE_DIR "/kvt/datetime/message_numbers.h");
     std::vector<std::string> numbers;
     for (std::string line; std::getline(header, line);) {
-        const std::size_t number = line.find("= 933");
-        if (number != std::string::npos) {
-            numbers.push_back(line.substr(number + 2, 6));
+        const std::size_t number = line.find(" 933");
+        if (number != std::string::npos && line.substr(number + 7, 1) == ";") {
+            numbers.push_back(line.substr(number + 1, 6));
         }
     }
     std::sort(numbers.begin(), numbers.end());

@@ -31,13 +31,13 @@ constexpr const char* notes =
     R"(A program names the folder to the library once, by setInstallPathWrapper. Without
 that, the library looks for a folder "tzdata" in the user's folder "Downloads".
 
-The leap seconds come from leapseconds or leap-seconds.list beside FILE, else beside
-the system's file. Where the package unicode-cldr-core is installed, its
+The leap seconds come from leapseconds or leap-seconds.list beside FILE, else
+beside the system's file. Where the package unicode-cldr-core is installed, its
 windowsZones.xml, which maps names of zones on Windows, goes into the folder too.
 
 Exit status:
   0  done
-  2  not done: FILE cannot be read or is no such file, or DIR cannot be written to)";
+  2  not done: FILE cannot be read or is no zone data, or DIR cannot be written)";
 
 std::string contentsOf(const std::string& path) {
     Input input(path);
