@@ -12,6 +12,7 @@
 #include <array>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace kvt::ex::datetime::detail {
 
@@ -102,7 +103,7 @@ public:
             if (failure_) {
                 return std::move(*failure_);
             }
-            return ParseMismatch{std::string(format_.substr(0, element_)), std::string(format_.substr(element_))};
+            return ParseMismatch{matchedFormat(), std::string(format_.substr(element_))};
         }
         return combine();
     }
@@ -157,6 +158,15 @@ private:
         return modified == 's' ? readEpochSeconds("%Es") : readOffset();
     }
 
+    // The format up to the present element, with what each "%T" that was read stands for.
+    std::string matchedFormat() const {
+        std::string matched(format_.substr(0, element_));
+        for (auto time = times_.rbegin(); time != times_.rend(); ++time) {
+            matched.replace(*time, 2, expansionOfT);
+        }
+        return matched;
+    }
+
     // A failure within the expansion is one of the element "%T".
     bool readTime() {
         for (std::size_t i = 0; i < expansionOfT.size(); ++i) {
@@ -171,6 +181,7 @@ private:
                 }
             }
         }
+        times_.push_back(element_);
         return true;
     }
 
@@ -447,6 +458,7 @@ private:
     bool lenient_;
     std::size_t at_ = 0;
     std::size_t element_ = 0;
+    std::vector<std::size_t> times_; // where each "%T" that was read stands in the format
     bool afterNumber_ = false;
     std::optional<Failure> failure_;
 

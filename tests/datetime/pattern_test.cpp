@@ -98,6 +98,7 @@ TEST(Parse, SaysWhichElementDidNotMatch) {
         {"02/xyz/2020", "%d/%b/%Y", false, fails(933082, {"%d/%b/%Y"})},
         {"02/xyz/2020", "%d/%B/%Y", false, fails(933067, {"%d/", "%B/%Y"})},
         {"2020-01-02T12:99:00", "%Y-%m-%dT%T", false, fails(933067, {"%Y-%m-%dT", "%T"})},
+        {"12:00:00x", "%T%H", false, fails(933067, {"%H:%M:%S", "%H"})}, // what was read stands as it was read
         {"2020-01-02T00:00:00+01:", "%Y-%m-%dT%H:%M:%S%Ez", false, fails(933067, {"%Y-%m-%dT%H:%M:%S", "%Ez"})},
         {"2020", "%Y$x", false, fails(933067, {"%Y", "$x"})},
         {"x", "?%Y", false, fails(933067, {"?", "%Y"})},
