@@ -101,7 +101,8 @@ Outcome<TextResult> success(Outcome<UString<0>> text) {
     return makeDateTimeResult(ReturnState::Success, std::move(*text));
 }
 
-Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalRecord& record, std::string_view pattern) {
+Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalRecord& record,
+                                    std::string_view pattern) {
     if (record.type == TemporalType::Unsupported) {
         return unsupported(value);
     }
@@ -120,7 +121,8 @@ Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalReco
     }
     const SystemBytes patternBytes(pattern);
     PatternText text;
-    if (std::optional<Failure> failure = renderFields(text, patternBytes.view(), instant->count, offsetMinutes)) {
+    if (std::optional<Failure> failure =
+            renderFields(text, patternBytes.view(), instant->count, offsetMinutes)) {
         return std::move(*failure);
     }
     return success(textOfSystemBytes(text.view()));
@@ -150,8 +152,9 @@ std::optional<LogMessageInfo> wordsOf(const Failure& failure, const UString<0>& 
     }
     constexpr std::array<std::string_view, 4> flags = {"%s", "%Es", "%z", "%Z"};
     const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), false);
-    return message(message_number::flagNotForKind, {flags[static_cast<std::size_t>(*flag)],
-                                                    kindWord(record ? record->type : TemporalType::Unsupported)});
+    return message(message_number::flagNotForKind,
+                   {flags[static_cast<std::size_t>(*flag)],
+                    kindWord(record ? record->type : TemporalType::Unsupported)});
 }
 
 } // namespace

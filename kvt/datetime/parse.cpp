@@ -50,7 +50,8 @@ Wanted wantedBy(std::string_view format) {
     bool isSecondOfPair = false;
     for (std::size_t at = format.find('%'); at != std::string_view::npos; at = format.find('%', at + 1)) {
         std::string_view behind = format.substr(at + 1);
-        const bool isModified = behind.size() > 1 && behind[0] == 'E' && (behind[1] == 's' || behind[1] == 'z');
+        const bool isModified =
+            behind.size() > 1 && behind[0] == 'E' && (behind[1] == 's' || behind[1] == 'z');
         behind.remove_prefix(isModified ? 1 : 0);
         const char flag = behind.empty() ? '\0' : behind.front();
         wanted.offset |= holds(offsetFlags, flag) && !(isModified && flag == 's');
@@ -72,7 +73,8 @@ UString<0> resultText(const PatternReading& reading, const Wanted& wanted) {
     }
     if (wanted.time) {
         writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
-                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds), false);
+                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
+                  false);
         TextBuffer offset;
         writeOffset(offset, reading.offsetMinutes);
         // Offsets of 100 hours and more can be read but not written; there is none then.
@@ -104,9 +106,9 @@ std::optional<LogMessageInfo> wordsOf(const Failure& failure, std::string_view f
                                         viewOf(readableSystemBytes(mismatch->rest))});
     }
     if (const auto* validation = std::get_if<ParseValidation>(&failure)) {
-        constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete,     offsetWithoutTime,
-                                        timeIncomplete,     nothingGiven,       hourNotForMeridiem,
-                                        ordinalPastYearEnd, noSuchDate,         resultYearOutOfRange};
+        constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete, offsetWithoutTime,
+                                        timeIncomplete,     nothingGiven,   hourNotForMeridiem,
+                                        ordinalPastYearEnd, noSuchDate,     resultYearOutOfRange};
         const auto index = static_cast<std::size_t>(*validation);
         return index < numbers.size() ? std::optional(message(numbers[index], {format})) : std::nullopt;
     }
@@ -118,8 +120,8 @@ TextResult success(UString<0> text) {
 }
 
 // The first keyword that fits the value.
-Outcome<TextResult> parseByKeywords(const UString<0>& value, const UString<0>& format, std::string_view keywords,
-                                    bool lenient) {
+Outcome<TextResult> parseByKeywords(const UString<0>& value, const UString<0>& format,
+                                    std::string_view keywords, bool lenient) {
     std::optional<Outcome<UString<0>>> found;
     const auto readAsIso = [&] {
         const std::string_view plain = trimmed(viewOf(value));

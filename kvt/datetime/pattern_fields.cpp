@@ -55,7 +55,7 @@ std::int64_t yearOf(const NanoCount& count) {
 Outcome<NanoCount> countOnOrdinal(const PatternFields& fields, std::int64_t year, bool lenient) {
     const NanoCount count = countOn(fields, daysFromCivil(year, 1, 1) + *fields.ordinal - 1);
     if (!lenient && yearOf(count) != year) {
-        return ParseValidation::OrdinalPastYearEnd;
+        return Failure(ParseValidation::OrdinalPastYearEnd);
     }
     return count;
 }
@@ -65,7 +65,7 @@ Outcome<NanoCount> countOnDate(const PatternFields& fields, std::int64_t year, b
     const auto day = static_cast<unsigned>(fields.day.value_or(1));
     if (month > monthsPerYear || day > lastDayOfMonth(year, static_cast<unsigned>(month))) {
         if (!lenient) {
-            return ParseValidation::NoSuchDate;
+            return Failure(ParseValidation::NoSuchDate);
         }
         year += (month - 1) / monthsPerYear;
         month = (month - 1) % monthsPerYear + 1;

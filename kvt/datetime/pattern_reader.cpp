@@ -19,9 +19,9 @@ namespace {
 
 constexpr std::string_view expansionOfT = "%H:%M:%S";
 
-constexpr std::array<std::string_view, 12> monthNames = {"january", "february", "march",     "april",
-                                                         "may",     "june",     "july",      "august",
-                                                         "september", "october", "november", "december"};
+constexpr std::array<std::string_view, 12> monthNames = {"january",   "february", "march",    "april",
+                                                         "may",       "june",     "july",     "august",
+                                                         "september", "october",  "november", "december"};
 constexpr std::size_t shortNameLength = 3;
 
 // 1000-01-01 and 10000-01-01, in seconds since 1970.
@@ -143,6 +143,9 @@ std::string_view elementOf(std::string_view format) {
 
 // A part of a format that has been read, as it reads with every "%T" replaced.
 std::string expanded(std::string_view format) {
+    if (format.find("%T") == std::string_view::npos) {
+        return std::string(format);
+    }
     std::string text;
     while (!format.empty()) {
         const std::string_view element = elementOf(format);
@@ -214,9 +217,7 @@ private:
     }
 
     // A failure within the expansion is one of the element "%T".
-    bool readTime() {
-        return readFlag('H') && readColon() && readFlag('M') && readColon() && readFlag('S');
-    }
+    bool readTime() { return readFlag('H') && readColon() && readFlag('M') && readColon() && readFlag('S'); }
 
     bool readColon() {
         afterNumber_ = false;
@@ -293,8 +294,8 @@ private:
     }
 
     // Directly behind another number a field takes its whole width, as in "%Y%m%d".
-    bool readNumber(std::optional<std::int64_t>& field, std::size_t width, std::int64_t lowest, std::int64_t highest,
-                    bool isUnbounded) {
+    bool readNumber(std::optional<std::int64_t>& field, std::size_t width, std::int64_t lowest,
+                    std::int64_t highest, bool isUnbounded) {
         field = readDigits(width, afterNumber_);
         afterNumber_ = true;
         return field && *field >= lowest && (isUnbounded || *field <= highest);
@@ -336,7 +337,8 @@ private:
     bool readMeridiem() {
         afterNumber_ = false;
         const std::string_view text = input_.takeBytes(2);
-        if (text.size() < 2 || lowered(text[1]) != 'm' || (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
+        if (text.size() < 2 || lowered(text[1]) != 'm' ||
+            (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
             return false;
         }
         fields_.meridiem = lowered(text[0]);
@@ -353,7 +355,10 @@ private:
         const bool hasPoint = input_.take('.');
         const std::string_view fraction = hasPoint ? input_.takeWhile(isDigit) : std::string_view();
         const auto text = [&] {
-            return std::string(isNegative ? "-" : "").append(whole).append(hasPoint ? "." : "").append(fraction);
+            return std::string(isNegative ? "-" : "")
+                .append(whole)
+                .append(hasPoint ? "." : "")
+                .append(fraction);
         };
         if (whole.empty()) {
             return false;
@@ -417,7 +422,8 @@ private:
 
 } // namespace
 
-Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset, bool lenient) {
+Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset,
+                                   bool lenient) {
     return PatternReader(value, format, wantsOffset, lenient).run();
 }
 

@@ -13,9 +13,9 @@ namespace kvt::ex::datetime::detail {
 
 namespace {
 
-constexpr std::array<std::string_view, 12> monthNames = {"January", "February", "March",     "April",
-                                                         "May",     "June",     "July",      "August",
-                                                         "September", "October", "November", "December"};
+constexpr std::array<std::string_view, 12> monthNames = {"January",   "February", "March",    "April",
+                                                         "May",       "June",     "July",     "August",
+                                                         "September", "October",  "November", "December"};
 constexpr std::array<std::string_view, 7> weekdayNames = {"Sunday",   "Monday", "Tuesday", "Wednesday",
                                                           "Thursday", "Friday", "Saturday"};
 constexpr std::size_t shortNameLength = 3;
@@ -37,8 +37,8 @@ struct Fields {
     }
 
     CivilDate date{};
-    std::int64_t yearDay;  ///< from 0
-    std::int64_t weekday;  ///< 0 is Sunday
+    std::int64_t yearDay; ///< from 0
+    std::int64_t weekday; ///< 0 is Sunday
     unsigned hour;
     unsigned minute;
     unsigned second;
@@ -106,7 +106,8 @@ private:
         case 'U':
             return number((fields_.yearDay + daysPerWeek - fields_.weekday) / daysPerWeek, 2);
         case 'W':
-            return number((fields_.yearDay + daysPerWeek - (fields_.weekday + 6) % daysPerWeek) / daysPerWeek, 2);
+            return number((fields_.yearDay + daysPerWeek - (fields_.weekday + 6) % daysPerWeek) / daysPerWeek,
+                          2);
         default:
             return writeTimeFlag(flag, isModified);
         }
@@ -147,7 +148,9 @@ private:
 
     void text(std::string_view characters) { out_.put(characters); }
 
-    void number(std::int64_t value, unsigned width) { out_.putNumber(static_cast<std::uint64_t>(value), width); }
+    void number(std::int64_t value, unsigned width) {
+        out_.putNumber(static_cast<std::uint64_t>(value), width);
+    }
 
     void secondsWithFraction() {
         out_.putNumber(fields_.second, 2);

@@ -1,5 +1,5 @@
-// The way into the system's encoding and back. Nearly all patterns and values are plain ASCII, and for that there is
-// nothing to do in nearly all encodings.
+// The way into the system's encoding and back. On most systems that encoding is UTF-8, and nearly all patterns and
+// values are plain ASCII: there is nothing to do then.
 #include <kvt/datetime/detail/system_bytes.h>
 
 #include <kvt/foundation/throwable.h>
@@ -16,8 +16,10 @@ namespace {
 
 bool isSameInBoth(std::string_view text) {
     // The system's encoding does not change while the program runs.
-    static const bool systemHoldsAscii = Encoding(Encoding::System).supports7BitASCII();
-    return systemHoldsAscii && isAscii(text);
+    static const Encoding system(Encoding::System);
+    static const bool isUtf8 = system.evaluate() == Encoding::Utf8;
+    static const bool holdsAscii = system.supports7BitASCII();
+    return isUtf8 || (holdsAscii && isAscii(text));
 }
 
 } // namespace
@@ -30,7 +32,8 @@ SystemBytes::SystemBytes(std::string_view text) : view_(text) {
 }
 
 UString<0> textOfSystemBytes(std::string_view bytes) {
-    return isSameInBoth(bytes) ? UString<0>(UStringView<0>(bytes)) : UString<0>(UString<27>(UStringView<27>(bytes)));
+    return isSameInBoth(bytes) ? UString<0>(UStringView<0>(bytes))
+                               : UString<0>(UString<27>(UStringView<27>(bytes)));
 }
 
 UString<0> readableSystemBytes(std::string_view bytes) {

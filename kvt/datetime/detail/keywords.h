@@ -1,9 +1,7 @@
 // Formats that are lists of keywords, "ZQT|ISO" in any case, and not patterns.
 #pragma once
 
-#include <kvt/datetime/detail/system_bytes.h>
 #include <kvt/datetime/detail/text.h>
-#include <kvt/string/ustring.h>
 
 #include <algorithm>
 #include <optional>
@@ -21,31 +19,19 @@ inline bool isKeywordList(std::string_view format) noexcept {
     return format.find('%') == std::string_view::npos;
 }
 
-/// The keyword that an upper-case text is, if any.
-inline std::optional<Keyword> keywordOfUpperCase(std::string_view text) noexcept {
-    return text == "ZQT"   ? std::optional(Keyword::Zqt)
-           : text == "ISO" ? std::optional(Keyword::Iso)
-                           : std::nullopt;
-}
-
-/// The keyword that an item of a list names, in any case, if any.
-inline std::optional<Keyword> keywordOf(std::string_view item) {
-    constexpr std::size_t length = 3;
-    constexpr std::size_t longest = 8; // bytes; a letter beyond ASCII may stand for an ASCII one in upper case
+/// The keyword that an item of a list names, in any case, if any. Letters beyond ASCII have no part in it: those whose
+/// upper case is ASCII are longer, and a UString keeps its length when it is brought into upper case.
+inline std::optional<Keyword> keywordOf(std::string_view item) noexcept {
+    const auto isText = [](std::string_view text, std::string_view upperCase) {
+        return std::equal(text.begin(), text.end(), upperCase.begin(), upperCase.end(),
+                          [](char c, char upper) {
+                              return (c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c) == upper;
+                          });
+    };
     item = trimmed(item);
-    if (item.size() < length || item.size() > longest) {
-        return std::nullopt;
-    }
-    if (!isAscii(item)) {
-        return keywordOfUpperCase(viewOf(UString<0>::getAsUpperCase(UStringView<0>(item))));
-    }
-    if (item.size() != length) {
-        return std::nullopt;
-    }
-    char upper[length];
-    std::transform(item.begin(), item.end(), upper,
-                   [](char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; });
-    return keywordOfUpperCase({upper, length});
+    return isText(item, "ZQT")   ? std::optional(Keyword::Zqt)
+           : isText(item, "ISO") ? std::optional(Keyword::Iso)
+                                 : std::nullopt;
 }
 
 /// Calls `use` with each known keyword of a list, in order, until it answers true; whether any was known.

@@ -11,6 +11,7 @@ namespace kvt::ex::datetime::detail {
 /// Reads `value`, as far as the format asks for it. `wantsOffset` says that the result is to have an offset; it needs
 /// a time then. Fails by ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, FormatStringBadCombo and
 /// ParseValidation.
-Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset, bool lenient);
+Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset,
+                                   bool lenient);
 
 } // namespace kvt::ex::datetime::detail

@@ -10,9 +10,9 @@ namespace kvt::ex::datetime::detail {
 /// Whether there are only seven-bit bytes in it.
 bool isAscii(std::string_view text) noexcept;
 
-/// UTF-8 text as bytes of the system's encoding. Plain ASCII is only referred to where the system's encoding holds it
-/// as it is. The constructor throws what the conversion throws, when the text is not well formed or has a character
-/// that the system's encoding has not.
+/// UTF-8 text as bytes of the system's encoding. Where these are the same bytes, the text is only referred to, and not
+/// looked at. Otherwise the constructor throws what the conversion throws, when the text is not well formed or has a
+/// character that the system's encoding has not.
 class SystemBytes {
 public:
     explicit SystemBytes(std::string_view text);
