@@ -32,7 +32,9 @@ void measure(const char* name, Function function) {
 
 // The strings of a row live as long as the program, so that only the function is measured.
 void measureParse(const char* name, const char* value, const char* pattern) {
-    measure(name, [value = UString<0>(value), pattern = UString<0>(pattern)] { return parse(value, pattern, false); });
+    measure(name, [value = UString<0>(value), pattern = UString<0>(pattern)] {
+        return parse(value, pattern, false);
+    });
 }
 
 void measureFormat(const char* name, const UString<0>& value, const char* pattern) {

@@ -2,12 +2,12 @@
 #include <kvt/datetime/datetime.h>
 
 #include <kvt/datetime/detail/keywords.h>
+#include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/pattern_writer.h>
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/system_bytes.h>
 #include <kvt/datetime/message_numbers.h>
-#include <kvt/datetime/utc_offset.h>
 
 #include <array>
 #include <string>
@@ -19,33 +19,42 @@ namespace {
 
 using namespace detail;
 
-/// What is particular to a kind of value: the flags that ask for what it does not have, each with a blank on both
-/// sides, and its form in ISO 8601.
+/// What is particular to a kind of value: the flags that ask for what it does not have, without and with the
+/// modifier E, and its form in ISO 8601.
 struct KindRules {
     std::string_view forbidden;
+    std::string_view forbiddenModified;
     std::string_view isoPattern;
 };
 
 constexpr std::array<KindRules, 5> rulesByKind = {{
-    {" s z Ez ", "%Y-%m-%d"},
-    {" s Es Y y m N b B u U w W d e j a A z Ez ", "%H:%M:%S"},
-    {" s Es Y y m N b B u U w W d e j a A ", "%H:%M:%S%Ez"},
-    {" s z Ez ", "%Y-%m-%dT%H:%M:%S"},
-    {" Es ", "%Y-%m-%dT%H:%M:%S%Ez"},
+    {"sz", "z", "%Y-%m-%d"},
+    {"sYymNbBuUwWdejaAz", "sz", "%H:%M:%S"},
+    {"sYymNbBuUwWdejaA", "s", "%H:%M:%S%Ez"},
+    {"sz", "z", "%Y-%m-%dT%H:%M:%S"},
+    {"", "s", "%Y-%m-%dT%H:%M:%S%Ez"},
 }};
 
 constexpr std::string_view knownFlags = "ABHIMNSTUWYabdejklmpsuwyz";
+constexpr std::string_view knownModified = "sz";
 
 const KindRules& rulesOf(TemporalType kind) {
     return rulesByKind[static_cast<std::size_t>(kind)];
 }
 
-bool isForbidden(std::string_view flag, TemporalType kind) {
-    return rulesOf(kind).forbidden.find(std::string(" ").append(flag).append(" ")) != std::string_view::npos;
+bool holds(std::string_view flags, char flag) {
+    return flags.find(flag) != std::string_view::npos;
+}
+
+// A flag is a character, or "E" and one more if there is one.
+bool isForbidden(std::string_view flag, const KindRules& rules) {
+    return flag.size() == 2 && flag[0] == 'E' ? holds(rules.forbiddenModified, flag[1])
+                                              : flag.size() == 1 && holds(rules.forbidden, flag[0]);
 }
 
 bool isKnown(std::string_view flag) {
-    return flag.front() == 'E' ? flag == "Es" || flag == "Ez" : knownFlags.find(flag.front()) != std::string_view::npos;
+    return flag.size() == 2 && flag[0] == 'E' ? holds(knownModified, flag[1])
+                                              : flag.size() == 1 && holds(knownFlags, flag[0]);
 }
 
 std::string_view wholeCharacter(std::string_view text) {
@@ -71,7 +80,7 @@ std::optional<LogMessageInfo> complaintAbout(std::string_view pattern, TemporalT
         const std::size_t length = behind.front() == 'E' ? 1 + wholeCharacter(behind.substr(1)).size()
                                                          : wholeCharacter(behind).size();
         const std::string_view flag = behind.substr(0, length);
-        if (isForbidden(flag, kind)) {
+        if (isForbidden(flag, rulesOf(kind))) {
             return message(message_number::flagNotForKind, {std::string("%").append(flag), kindWord(kind)});
         }
         if (!isKnown(flag)) {
@@ -92,7 +101,8 @@ Outcome<TextResult> success(Outcome<UString<0>> text) {
     return makeDateTimeResult(ReturnState::Success, std::move(*text));
 }
 
-Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalRecord& record, std::string_view pattern) {
+Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalRecord& record,
+                                    std::string_view pattern) {
     if (record.type == TemporalType::Unsupported) {
         return unsupported(value);
     }
@@ -105,16 +115,17 @@ Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalReco
     }
     std::optional<std::int32_t> offsetMinutes;
     if (!record.offsetText.isEmpty()) {
-        if (const auto offset = ZQTDateTimeUTCOffset::repairOffset(record.offsetText)) {
-            offsetMinutes = offset->offsetMinutes();
+        if (const std::optional<OffsetForm> offset = readOffset(viewOf(record.offsetText))) {
+            offsetMinutes = offset->minutes;
         }
     }
     const SystemBytes patternBytes(pattern);
-    Outcome<std::string> text = renderFields(patternBytes.view(), instant->count, offsetMinutes);
-    if (!text) {
-        return std::move(text.failure());
+    PatternText text;
+    if (std::optional<Failure> failure =
+            renderFields(text, patternBytes.view(), instant->count, offsetMinutes)) {
+        return std::move(*failure);
     }
-    return success(textOfSystemBytes(*text));
+    return success(textOfSystemBytes(text.view()));
 }
 
 Outcome<TextResult> formatByKeywords(const UString<0>& value, const CanonicalRecord& record,
@@ -141,8 +152,9 @@ std::optional<LogMessageInfo> wordsOf(const Failure& failure, const UString<0>& 
     }
     constexpr std::array<std::string_view, 4> flags = {"%s", "%Es", "%z", "%Z"};
     const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), false);
-    return message(message_number::flagNotForKind, {flags[static_cast<std::size_t>(*flag)],
-                                                    kindWord(record ? record->type : TemporalType::Unsupported)});
+    return message(message_number::flagNotForKind,
+                   {flags[static_cast<std::size_t>(*flag)],
+                    kindWord(record ? record->type : TemporalType::Unsupported)});
 }
 
 } // namespace

@@ -13,16 +13,14 @@ inline constexpr std::uint32_t dateIntervalOnTime = 933060; ///< the value, the 
 inline constexpr std::uint32_t valueUnsupported = 933063;   ///< the value
 inline constexpr std::uint32_t intervalUnreadable = 933064; ///< the interval
 inline constexpr std::uint32_t partOutOfRange = 933065;     ///< the part's value, its name, lowest, highest
-inline constexpr std::uint32_t formatMismatch =
-    933067;                                      ///< the format up to what failed, the format from there
-inline constexpr std::uint32_t generic = 933068; ///< none
-inline constexpr std::uint32_t valueHasNoOffset = 933071;     ///< the value; timezoneGet
+inline constexpr std::uint32_t formatMismatch = 933067;     ///< the format up to what failed, and from there
+inline constexpr std::uint32_t generic = 933068;            ///< none
+inline constexpr std::uint32_t valueHasNoOffset = 933071;   ///< the value; timezoneGet
 inline constexpr std::uint32_t nothingToConvertFrom = 933073; ///< the value; timezoneSet
 inline constexpr std::uint32_t formatEmpty = 933074;          ///< none
 inline constexpr std::uint32_t noKnownKeyword = 933075;       ///< the format
 inline constexpr std::uint32_t formatEndsInPercent = 933076;  ///< none
-inline constexpr std::uint32_t flagNotForKind =
-    933078;                                          ///< the flag with its "%", the word of the value's kind
+inline constexpr std::uint32_t flagNotForKind = 933078;       ///< the flag with its "%", word of the kind
 inline constexpr std::uint32_t unknownFlag = 933079; ///< the flag, "@DateTimeParse()" or "@DateTimeFormat()"
 
 // What parse() finds wrong in the fields as a whole; the parameter is the format.

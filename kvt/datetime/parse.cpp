@@ -1,7 +1,9 @@
 // parse(): keywords and patterns, and which kind of value a pattern gives.
 #include <kvt/datetime/datetime.h>
 
+#include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/keywords.h>
+#include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/pattern_reader.h>
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
@@ -24,80 +26,89 @@ constexpr std::array<std::string_view, 5> isoPatterns = {
 };
 
 // The flags that make a format ask for a time and for a date. %k and %l are not among the first, so that a format
-// whose only time is one of them gives a date.
-constexpr std::array<std::string_view, 8> timeFlags = {"%T", "%H", "%I", "%p", "%M", "%S", "%s", "%Es"};
-constexpr std::array<std::string_view, 10> dateFlags = {"%Y", "%m", "%N", "%b", "%B", "%d", "%e", "%j", "%s", "%Es"};
-// Those that give the result an offset.
-constexpr std::array<std::string_view, 3> offsetFlags = {"%z", "%Ez", "%s"};
+// whose only time is one of them gives a date. %s and %Es ask for both.
+constexpr std::string_view timeFlags = "THIpMSs";
+constexpr std::string_view dateFlags = "YmNbBdejs";
+// Those that give the result an offset: %z, %Ez and %s, but not %Es.
+constexpr std::string_view offsetFlags = "zs";
 
-constexpr std::size_t dateLength = 8;
-
-template <typename Flags>
-bool holdsAny(std::string_view format, const Flags& flags) {
-    return std::any_of(flags.begin(), flags.end(),
-                       [&](std::string_view flag) { return format.find(flag) != std::string_view::npos; });
+constexpr bool holds(std::string_view flags, char flag) {
+    return flags.find(flag) != std::string_view::npos;
 }
 
-std::string withoutPercentPairs(std::string_view format) {
-    std::string rest;
-    for (std::size_t i = 0; i < format.size(); ++i) {
-        if (format.substr(i, 2) == "%%") {
-            ++i;
-        } else {
-            rest += format[i];
+/// What a format asks for.
+struct Wanted {
+    bool date = false;
+    bool time = false;
+    bool offset = false;
+};
+
+// The format is looked at as a text: what stands in it behind a fuzzy word counts as well. In the search for offsets
+// even the second character of "%%" counts as the beginning of a flag, so that "%%z" asks for one.
+Wanted wantedBy(std::string_view format) {
+    Wanted wanted;
+    bool isSecondOfPair = false;
+    for (std::size_t at = format.find('%'); at != std::string_view::npos; at = format.find('%', at + 1)) {
+        std::string_view behind = format.substr(at + 1);
+        const bool isModified =
+            behind.size() > 1 && behind[0] == 'E' && (behind[1] == 's' || behind[1] == 'z');
+        behind.remove_prefix(isModified ? 1 : 0);
+        const char flag = behind.empty() ? '\0' : behind.front();
+        wanted.offset |= holds(offsetFlags, flag) && !(isModified && flag == 's');
+        if (!isSecondOfPair) {
+            wanted.date |= holds(dateFlags, flag);
+            wanted.time |= holds(timeFlags, flag);
         }
+        isSecondOfPair = !isSecondOfPair && flag == '%';
     }
-    return rest;
+    return wanted;
 }
 
 // What a pattern that is known to fit gives: a date, a time or both, as it asks for them.
-UString<0> resultText(const PatternReading& reading, std::string_view format, bool withOffset) {
-    TemporalInstant instant{reading.count, std::nullopt};
-    if (withOffset) {
+UString<0> resultText(const PatternReading& reading, const Wanted& wanted) {
+    const DateTimeFields fields = fieldsFromCount(reading.count);
+    TextBuffer text;
+    if (wanted.date || !wanted.time) {
+        writeDate(text, fields.year, fields.month, fields.day, false);
+    }
+    if (wanted.time) {
+        writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
+                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
+                  false);
         TextBuffer offset;
         writeOffset(offset, reading.offsetMinutes);
-        applyOffsetText(instant, offset.view(), SetZoneMode::Replace);
+        // Offsets of 100 hours and more can be read but not written; there is none then.
+        if (wanted.offset && readOffset(offset.view())) {
+            text.put(offset.view());
+        }
     }
-    const UString<0> whole = instantText(instant, withOffset);
-    std::string shortened;
-    std::string_view plain = format;
-    if (format.find("%%") != std::string_view::npos) {
-        shortened = withoutPercentPairs(format);
-        plain = shortened;
-    }
-    if (!holdsAny(plain, timeFlags)) {
-        return UString<0>(whole.substr(0, dateLength));
-    }
-    if (!holdsAny(plain, dateFlags)) {
-        return UString<0>(whole.substr(dateLength));
-    }
-    return whole;
+    return text.toString();
 }
 
 // `value` and `format` are bytes in the system's encoding.
 Outcome<UString<0>> readPattern(std::string_view value, std::string_view format, bool lenient) {
-    const bool withOffset = holdsAny(format, offsetFlags);
-    Outcome<PatternReading> reading = readFields(value, format, withOffset, lenient);
+    const Wanted wanted = wantedBy(format);
+    Outcome<PatternReading> reading = readFields(value, format, wanted.offset, lenient);
     if (!reading) {
         return std::move(reading.failure());
     }
-    return resultText(*reading, format, withOffset);
+    return resultText(*reading, wanted);
 }
 
 // The messages of patterns. A format's bytes come back as text.
 std::optional<LogMessageInfo> wordsOf(const Failure& failure, std::string_view format) {
     using namespace message_number;
     if (const auto* unknown = std::get_if<ParseUnknownFlag>(&failure)) {
-        return message(unknownFlag, {viewOf(textOfSystemBytes(unknown->flag)), "@DateTimeParse()"});
+        return message(unknownFlag, {viewOf(readableSystemBytes(unknown->flag)), "@DateTimeParse()"});
     }
     if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
-        return message(formatMismatch, {viewOf(textOfSystemBytes(mismatch->matched)),
-                                        viewOf(textOfSystemBytes(mismatch->rest))});
+        return message(formatMismatch, {viewOf(readableSystemBytes(mismatch->matched)),
+                                        viewOf(readableSystemBytes(mismatch->rest))});
     }
     if (const auto* validation = std::get_if<ParseValidation>(&failure)) {
-        constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete,     offsetWithoutTime,
-                                        timeIncomplete,     nothingGiven,       hourNotForMeridiem,
-                                        ordinalPastYearEnd, noSuchDate,         resultYearOutOfRange};
+        constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete, offsetWithoutTime,
+                                        timeIncomplete,     nothingGiven,   hourNotForMeridiem,
+                                        ordinalPastYearEnd, noSuchDate,     resultYearOutOfRange};
         const auto index = static_cast<std::size_t>(*validation);
         return index < numbers.size() ? std::optional(message(numbers[index], {format})) : std::nullopt;
     }
@@ -109,11 +120,15 @@ TextResult success(UString<0> text) {
 }
 
 // The first keyword that fits the value.
-Outcome<TextResult> parseByKeywords(const UString<0>& value, const UString<0>& format, std::string_view keywords,
-                                    bool lenient) {
+Outcome<TextResult> parseByKeywords(const UString<0>& value, const UString<0>& format,
+                                    std::string_view keywords, bool lenient) {
     std::optional<Outcome<UString<0>>> found;
     const auto readAsIso = [&] {
-        const SystemBytes bytes(trimmed(viewOf(value)));
+        const std::string_view plain = trimmed(viewOf(value));
+        if (!isAscii(plain)) {
+            return false; // all of the value has to match, and the patterns are ASCII
+        }
+        const SystemBytes bytes(plain);
         return std::any_of(isoPatterns.begin(), isoPatterns.end(), [&](std::string_view pattern) {
             Outcome<UString<0>> text = readPattern(bytes.view(), pattern, lenient);
             if (text) {

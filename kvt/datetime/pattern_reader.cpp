@@ -1,5 +1,5 @@
-// The pattern reader: one pass over the format, each of whose elements takes something from the value, and then the
-// fields that were given are put together.
+// The pattern reader: the elements of the format one by one, each of which takes something from the value; then the
+// fields that were given are put together (pattern_fields.h).
 //
 // A step answers by a bool whether the value fits. What is wrong with the format or the numbers as such, and not just
 // a mismatch, is kept in `failure_`, which outranks it.
@@ -12,7 +12,6 @@
 #include <array>
 #include <optional>
 #include <string>
-#include <vector>
 
 namespace kvt::ex::datetime::detail {
 
@@ -20,9 +19,9 @@ namespace {
 
 constexpr std::string_view expansionOfT = "%H:%M:%S";
 
-constexpr std::array<std::string_view, 12> monthNames = {"january", "february", "march",     "april",
-                                                         "may",     "june",     "july",      "august",
-                                                         "september", "october", "november", "december"};
+constexpr std::array<std::string_view, 12> monthNames = {"january",   "february", "march",    "april",
+                                                         "may",       "june",     "july",     "august",
+                                                         "september", "october",  "november", "december"};
 constexpr std::size_t shortNameLength = 3;
 
 // 1000-01-01 and 10000-01-01, in seconds since 1970.
@@ -31,7 +30,13 @@ constexpr std::int64_t endSecond = 253'402'300'800;
 // Digits and sign of seconds since 1970 that can be in that range.
 constexpr std::size_t longestSeconds = 12;
 
-constexpr std::int64_t monthsPerYear = 12;
+// The nanoseconds are up to one second, and of the sign of the seconds.
+constexpr bool isInRange(std::int64_t seconds, std::int64_t nanoseconds) {
+    if (seconds < 0) {
+        return seconds > firstSecond || (seconds == firstSecond && nanoseconds == 0);
+    }
+    return seconds + nanoseconds / nanosPerSecond < endSecond;
+}
 
 constexpr bool isSpace(char c) {
     return c == ' ' || (c >= '\t' && c <= '\r');
@@ -47,6 +52,10 @@ constexpr bool isLetter(char c) {
 
 bool endsWith(std::string_view text, std::string_view tail) {
     return text.size() >= tail.size() && text.substr(text.size() - tail.size()) == tail;
+}
+
+std::int64_t nanosecondsOf(std::string_view fraction) {
+    return static_cast<std::int64_t>(fractionNanoseconds(fraction));
 }
 
 /// The bytes of the value that are still to be read.
@@ -93,45 +102,100 @@ std::optional<std::int64_t> monthOf(std::string_view name, std::size_t significa
     return std::nullopt;
 }
 
+// ---- The elements of a format
+
+// What a word of unknown length has to end in: the format behind the "*", up to white space or "$".
+std::string_view tailOf(std::string_view behind) {
+    std::size_t length = 0;
+    while (length < behind.size() && !isSpace(behind[length]) && behind[length] != '$') {
+        ++length;
+    }
+    return behind.substr(0, length);
+}
+
+bool isFlag(std::string_view tail) {
+    return !tail.empty() && tail.front() == '%';
+}
+
+bool isLiteralFlag(std::string_view tail) {
+    return isFlag(tail) && tail.size() > 1 && std::string_view("%*?").find(tail[1]) != std::string_view::npos;
+}
+
+// How much of the tail is done with when the word has been read.
+std::size_t coveredLength(std::string_view tail) {
+    if (isFlag(tail)) {
+        return isLiteralFlag(tail) ? 2 : 0;
+    }
+    return tail.size();
+}
+
+// The first element of a format, which is not empty.
+std::string_view elementOf(std::string_view format) {
+    switch (format.front()) {
+    case '%':
+        return format.substr(0, format.size() > 1 && format[1] == 'E' ? 3 : 2);
+    case '*':
+        return format.substr(0, 1 + coveredLength(tailOf(format.substr(1))));
+    default:
+        return format.substr(0, 1);
+    }
+}
+
+// A part of a format that has been read, as it reads with every "%T" replaced.
+std::string expanded(std::string_view format) {
+    if (format.find("%T") == std::string_view::npos) {
+        return std::string(format);
+    }
+    std::string text;
+    while (!format.empty()) {
+        const std::string_view element = elementOf(format);
+        text += element == "%T" ? expansionOfT : element;
+        format.remove_prefix(element.size());
+    }
+    return text;
+}
+
 class PatternReader {
 public:
     PatternReader(std::string_view value, std::string_view format, bool wantsOffset, bool lenient)
         : input_(value), format_(format), wantsOffset_(wantsOffset), lenient_(lenient) {}
 
     Outcome<PatternReading> run() {
-        if (!readFormat()) {
-            if (failure_) {
-                return std::move(*failure_);
+        while (at_ < format_.size()) {
+            const std::string_view element = elementOf(format_.substr(at_));
+            if (!readElement(element)) {
+                return failure();
             }
-            return ParseMismatch{matchedFormat(), std::string(format_.substr(element_))};
+            at_ += element.size();
         }
-        return combine();
+        return instantOfFields(fields_, wantsOffset_, lenient_);
     }
 
 private:
-    // ---- The pass over the format. `at_` is the next character, `element_` where the present element begins.
+    // ---- The pass over the format. `at_` is where the present element begins.
 
-    bool readFormat() {
-        while (at_ < format_.size()) {
-            element_ = at_;
-            if (!readElement()) {
-                return false;
-            }
+    Failure failure() {
+        if (failure_) {
+            return std::move(*failure_);
         }
-        return true;
+        // Where two flags exclude each other it is the format that is wrong, whatever the value.
+        if (!fields_.epochFlag.empty() && fields_.hasOffset) {
+            return FormatStringBadCombo{std::string(fields_.epochFlag), "%z"};
+        }
+        return ParseMismatch{expanded(format_.substr(0, at_)), std::string(format_.substr(at_))};
     }
 
-    bool readElement() {
-        const char c = format_[at_++];
+    bool readElement(std::string_view element) {
+        const char c = element.front();
         if (c == '%') {
-            return readFlag();
+            return readFlag(element);
         }
         afterNumber_ = false;
         switch (c) {
         case '$':
-            return input_.atEnd() && at_ == format_.size();
+            return input_.atEnd() && at_ + 1 == format_.size();
         case '*':
-            return readFuzzyWord();
+            return readFuzzyWord(tailOf(format_.substr(at_ + 1)));
         case '?':
             return !input_.takeBytes(1).empty();
         default:
@@ -139,51 +203,42 @@ private:
         }
     }
 
-    bool readFlag() {
-        if (at_ == format_.size()) {
-            return fail(ParseUnknownFlag{"%"});
-        }
-        const char flag = format_[at_++];
-        if (flag == 'T') {
+    bool readFlag(std::string_view element) {
+        if (element == "%T") {
             return readTime();
         }
-        if (flag != 'E') {
-            return readFlag(flag);
+        if (element.size() == 2 && element[1] != 'E') {
+            return readFlag(element[1]);
         }
-        const char modified = at_ < format_.size() ? format_[at_] : '\0';
-        if (modified != 's' && modified != 'z') {
-            return fail(ParseUnknownFlag{"%E" + std::string(format_.substr(at_, 1))});
+        if (element == "%Es") {
+            return readEpochSeconds(element);
         }
-        ++at_;
-        return modified == 's' ? readEpochSeconds("%Es") : readOffset();
-    }
-
-    // The format up to the present element, with what each "%T" that was read stands for.
-    std::string matchedFormat() const {
-        std::string matched(format_.substr(0, element_));
-        for (auto time = times_.rbegin(); time != times_.rend(); ++time) {
-            matched.replace(*time, 2, expansionOfT);
-        }
-        return matched;
+        return element == "%Ez" ? readOffset() : fail(ParseUnknownFlag{std::string(element)});
     }
 
     // A failure within the expansion is one of the element "%T".
-    bool readTime() {
-        for (std::size_t i = 0; i < expansionOfT.size(); ++i) {
-            if (expansionOfT[i] == '%') {
-                if (!readFlag(expansionOfT[++i])) {
-                    return false;
-                }
-            } else {
-                afterNumber_ = false;
-                if (!input_.take(expansionOfT[i])) {
-                    return false;
-                }
-            }
-        }
-        times_.push_back(element_);
-        return true;
+    bool readTime() { return readFlag('H') && readColon() && readFlag('M') && readColon() && readFlag('S'); }
+
+    bool readColon() {
+        afterNumber_ = false;
+        return input_.take(':');
     }
+
+    // One word of the input, which has to end in what the format says comes next; a flag that is not a character
+    // reads what stands behind the word. Two words of unknown length cannot be told apart.
+    bool readFuzzyWord(std::string_view tail) {
+        const std::string_view word = input_.takeWhile([](char c) { return !isSpace(c); });
+        if (word.empty()) {
+            return false;
+        }
+        if (isFlag(tail)) {
+            return !isLiteralFlag(tail) || endsWith(word, tail.substr(1));
+        }
+        const bool isFuzzy = !tail.empty() && (tail.front() == '*' || tail.front() == '?');
+        return !isFuzzy && endsWith(word, tail);
+    }
+
+    // ---- The flags
 
     bool readFlag(char flag) {
         switch (flag) {
@@ -194,24 +249,24 @@ private:
             afterNumber_ = false;
             return input_.take(flag);
         case 'Y':
-            return readNumber(year_, 4, lowestYear, highestYear, false);
+            return readNumber(fields_.year, 4, lowestYear, highestYear, false);
         case 'm':
         case 'N':
-            return readNumber(month_, 2, 1, 12, lenient_);
+            return readNumber(fields_.month, 2, 1, 12, lenient_);
         case 'd':
         case 'e':
-            return readNumber(day_, 2, 1, 31, lenient_);
+            return readNumber(fields_.day, 2, 1, 31, lenient_);
         case 'j':
             afterNumber_ = false; // It takes what digits there are also right behind another number.
-            return readNumber(ordinal_, 3, 1, 366, lenient_);
+            return readNumber(fields_.ordinal, 3, 1, 366, lenient_);
         case 'H':
         case 'k':
-            return readNumber(hours_, 2, 0, 23, lenient_);
+            return readNumber(fields_.hours, 2, 0, 23, lenient_);
         case 'I':
         case 'l':
-            return readNumber(hours_, 2, 1, 12, false);
+            return readNumber(fields_.hours, 2, 1, 12, false);
         case 'M':
-            return readNumber(minutes_, 2, 0, 59, lenient_);
+            return readNumber(fields_.minutes, 2, 0, 59, lenient_);
         case 'S':
             return readSeconds();
         case 'b':
@@ -229,34 +284,6 @@ private:
         }
     }
 
-    // One word of the input, which has to end in what the format says comes next.
-    bool readFuzzyWord() {
-        const std::string_view word = input_.takeWhile([](char c) { return !isSpace(c); });
-        if (word.empty()) {
-            return false;
-        }
-        if (at_ == format_.size()) {
-            return true;
-        }
-        const auto isEnd = [](char c) { return isSpace(c) || c == '$'; };
-        const std::string_view behind = format_.substr(at_);
-        const auto* const end = std::find_if(behind.begin(), behind.end(), isEnd);
-        const std::string_view tail = behind.substr(0, static_cast<std::size_t>(end - behind.begin()));
-        if (tail.empty() || tail.front() != '%') {
-            // Two words of unknown length cannot be told apart.
-            const bool isFuzzy = !tail.empty() && (tail.front() == '*' || tail.front() == '?');
-            at_ += tail.size();
-            return !isFuzzy && endsWith(word, tail);
-        }
-        if (tail.size() > 1 && std::string_view("%*?$").find(tail[1]) != std::string_view::npos) {
-            at_ += 2;
-            return endsWith(word, tail.substr(1));
-        }
-        return true; // The flag reads what stands behind the word.
-    }
-
-    // ---- The flags
-
     // Up to `width` digits, or exactly that many; none where there are too few.
     std::optional<std::int64_t> readDigits(std::size_t width, bool exactWidth) {
         const std::string_view digits = input_.takeWhile(isDigit, width);
@@ -267,8 +294,8 @@ private:
     }
 
     // Directly behind another number a field takes its whole width, as in "%Y%m%d".
-    bool readNumber(std::optional<std::int64_t>& field, std::size_t width, std::int64_t lowest, std::int64_t highest,
-                    bool isUnbounded) {
+    bool readNumber(std::optional<std::int64_t>& field, std::size_t width, std::int64_t lowest,
+                    std::int64_t highest, bool isUnbounded) {
         field = readDigits(width, afterNumber_);
         afterNumber_ = true;
         return field && *field >= lowest && (isUnbounded || *field <= highest);
@@ -280,10 +307,11 @@ private:
             return false;
         }
         const std::string_view fraction = input_.take('.') ? input_.takeWhile(isDigit) : std::string_view();
-        if (epochFlag_.empty()) {
-            count_ = nanosOf(*whole, static_cast<std::int64_t>(fractionNanoseconds(fraction)));
+        if (fields_.epochFlag.empty()) {
+            fields_.seconds = *whole;
+            fields_.nanoseconds = nanosecondsOf(fraction);
         }
-        hasSeconds_ = true;
+        fields_.hasSeconds = true;
         return true;
     }
 
@@ -295,38 +323,42 @@ private:
             return false;
         }
         if (const auto month = monthOf(name, shortNameLength)) {
-            month_ = month;
+            fields_.month = month;
         }
         return true;
     }
 
     bool readFullMonth() {
         afterNumber_ = false;
-        month_ = monthOf(input_.takeWhile(isLetter), std::string_view::npos);
-        return month_.has_value();
+        fields_.month = monthOf(input_.takeWhile(isLetter), std::string_view::npos);
+        return fields_.month.has_value();
     }
 
     bool readMeridiem() {
         afterNumber_ = false;
         const std::string_view text = input_.takeBytes(2);
-        if (text.size() < 2 || lowered(text[1]) != 'm' || (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
+        if (text.size() < 2 || lowered(text[1]) != 'm' ||
+            (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
             return false;
         }
-        meridiem_ = lowered(text[0]);
+        fields_.meridiem = lowered(text[0]);
         return true;
     }
 
     // Seconds since 1970: an optional "-", digits, and a fraction. They make the fields of the value superfluous.
     bool readEpochSeconds(std::string_view flag) {
-        epochFlag_ = flag;
-        hasSeconds_ = true;
+        fields_.epochFlag = flag;
+        fields_.hasSeconds = true;
         afterNumber_ = true;
         const bool isNegative = input_.take('-');
         const std::string_view whole = input_.takeWhile(isDigit);
         const bool hasPoint = input_.take('.');
         const std::string_view fraction = hasPoint ? input_.takeWhile(isDigit) : std::string_view();
         const auto text = [&] {
-            return std::string(isNegative ? "-" : "").append(whole).append(hasPoint ? "." : "").append(fraction);
+            return std::string(isNegative ? "-" : "")
+                .append(whole)
+                .append(hasPoint ? "." : "")
+                .append(fraction);
         };
         if (whole.empty()) {
             return false;
@@ -336,19 +368,20 @@ private:
         }
         // The fraction has the sign of the whole seconds, which "-0" does not have.
         const std::int64_t seconds = static_cast<std::int64_t>(digitsValue(whole)) * (isNegative ? -1 : 1);
-        const auto nanoseconds = static_cast<std::int64_t>(fractionNanoseconds(fraction));
-        count_ = nanosOf(seconds, seconds < 0 ? -nanoseconds : nanoseconds);
-        if (count_ < nanosOf(firstSecond, 0) || count_ >= nanosOf(endSecond, 0)) {
+        const std::int64_t nanoseconds = seconds < 0 ? -nanosecondsOf(fraction) : nanosecondsOf(fraction);
+        if (!isInRange(seconds, nanoseconds)) {
             return fail(ParseEpochTimeRange{text()});
         }
+        fields_.seconds = seconds;
+        fields_.nanoseconds = nanoseconds;
         return true;
     }
 
     bool readOffset() {
-        hasOffset_ = true;
+        fields_.hasOffset = true;
         afterNumber_ = true;
         if (input_.take('Z')) {
-            offsetMinutes_ = 0;
+            fields_.offsetMinutes = 0;
             return true;
         }
         const bool isNegative = input_.nextIs('-');
@@ -368,83 +401,8 @@ private:
         if (!minutes) {
             return false;
         }
-        offsetMinutes_ = static_cast<std::int32_t>((*hours * 60 + *minutes) * (isNegative ? -1 : 1));
+        fields_.offsetMinutes = static_cast<std::int32_t>((*hours * 60 + *minutes) * (isNegative ? -1 : 1));
         return true;
-    }
-
-    // ---- Putting the fields together. The order of the checks decides which message comes.
-
-    Outcome<PatternReading> combine() {
-        if (!epochFlag_.empty() && hasOffset_) {
-            return FormatStringBadCombo{std::string(epochFlag_), "%z"};
-        }
-        if (const auto problem = epochFlag_.empty() ? incompleteness() : std::nullopt) {
-            return *problem;
-        }
-        if (meridiem_ != '\0') {
-            const std::int64_t hours = hours_.value_or(0);
-            if (hours < 1 || hours > 12) {
-                return ParseValidation::HourNotForMeridiem;
-            }
-            hours_ = hours % 12 + (meridiem_ == 'p' ? 12 : 0);
-        }
-        if (epochFlag_.empty()) {
-            const std::int64_t year = year_.value_or(1970);
-            if (const auto problem = ordinal_ ? placeOrdinal(year) : placeDate(year)) {
-                return *problem;
-            }
-        }
-        const std::int64_t year = civilFromDays(floorDivide(count_, nanosPerDay).quotient).year;
-        if (year < lowestYear || year > highestYear) {
-            return ParseValidation::ResultYearOutOfRange;
-        }
-        return PatternReading{count_, offsetMinutes_};
-    }
-
-    std::optional<ParseValidation> incompleteness() const {
-        if (ordinal_ && !year_) {
-            return ParseValidation::OrdinalWithoutYear;
-        }
-        const bool anyOfDate = year_ || month_ || day_;
-        if (!ordinal_ && anyOfDate && !(year_ && month_ && day_)) {
-            return ParseValidation::DateIncomplete;
-        }
-        if (hours_ ? hasSeconds_ && !minutes_ : minutes_ || hasSeconds_) {
-            return ParseValidation::TimeIncomplete;
-        }
-        if (!hours_ && wantsOffset_) {
-            return ParseValidation::OffsetWithoutTime;
-        }
-        if (!anyOfDate && !ordinal_ && !hours_) {
-            return ParseValidation::NothingGiven;
-        }
-        return std::nullopt;
-    }
-
-    // The count so far is that of the seconds; hours, minutes and the day are added to it.
-    void addDays(std::int64_t days) {
-        const std::int64_t minutes = hours_.value_or(0) * 60 + minutes_.value_or(0);
-        count_ += nanosOf(days * secondsPerDay + minutes * secondsPerMinute, 0);
-    }
-
-    std::optional<ParseValidation> placeOrdinal(std::int64_t year) {
-        addDays(daysFromCivil(year, 1, 1) + *ordinal_ - 1);
-        const std::int64_t reached = civilFromDays(floorDivide(count_, nanosPerDay).quotient).year;
-        return lenient_ || reached == year ? std::nullopt : std::optional(ParseValidation::OrdinalPastYearEnd);
-    }
-
-    std::optional<ParseValidation> placeDate(std::int64_t year) {
-        std::int64_t month = month_.value_or(1);
-        const auto day = static_cast<unsigned>(day_.value_or(1));
-        if (month > monthsPerYear || day > lastDayOfMonth(year, static_cast<unsigned>(month))) {
-            if (!lenient_) {
-                return ParseValidation::NoSuchDate;
-            }
-            year += (month - 1) / monthsPerYear;
-            month = (month - 1) % monthsPerYear + 1;
-        }
-        addDays(daysFromCivil(year, static_cast<unsigned>(month), day));
-        return std::nullopt;
     }
 
     bool fail(Failure failure) {
@@ -457,28 +415,15 @@ private:
     bool wantsOffset_;
     bool lenient_;
     std::size_t at_ = 0;
-    std::size_t element_ = 0;
-    std::vector<std::size_t> times_; // where each "%T" that was read stands in the format
     bool afterNumber_ = false;
+    PatternFields fields_;
     std::optional<Failure> failure_;
-
-    std::optional<std::int64_t> year_;
-    std::optional<std::int64_t> month_;
-    std::optional<std::int64_t> day_;
-    std::optional<std::int64_t> ordinal_;
-    std::optional<std::int64_t> hours_;
-    std::optional<std::int64_t> minutes_;
-    bool hasSeconds_ = false;
-    NanoCount count_ = 0; // Seconds and fraction; with an epoch flag, the whole instant.
-    char meridiem_ = '\0';
-    std::string_view epochFlag_; // "%s" or "%Es" when one was read
-    bool hasOffset_ = false;
-    std::int32_t offsetMinutes_ = 0;
 };
 
 } // namespace
 
-Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset, bool lenient) {
+Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset,
+                                   bool lenient) {
     return PatternReader(value, format, wantsOffset, lenient).run();
 }
 

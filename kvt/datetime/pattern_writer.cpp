@@ -5,16 +5,17 @@
 #include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/text.h>
 
+#include <algorithm>
 #include <array>
-#include <cstdlib>
+#include <cstring>
 
 namespace kvt::ex::datetime::detail {
 
 namespace {
 
-constexpr std::array<std::string_view, 12> monthNames = {"January", "February", "March",     "April",
-                                                         "May",     "June",     "July",      "August",
-                                                         "September", "October", "November", "December"};
+constexpr std::array<std::string_view, 12> monthNames = {"January",   "February", "March",    "April",
+                                                         "May",       "June",     "July",     "August",
+                                                         "September", "October",  "November", "December"};
 constexpr std::array<std::string_view, 7> weekdayNames = {"Sunday",   "Monday", "Tuesday", "Wednesday",
                                                           "Thursday", "Friday", "Saturday"};
 constexpr std::size_t shortNameLength = 3;
@@ -36,8 +37,8 @@ struct Fields {
     }
 
     CivilDate date{};
-    std::int64_t yearDay;  ///< from 0
-    std::int64_t weekday;  ///< 0 is Sunday
+    std::int64_t yearDay; ///< from 0
+    std::int64_t weekday; ///< 0 is Sunday
     unsigned hour;
     unsigned minute;
     unsigned second;
@@ -46,27 +47,29 @@ struct Fields {
 
 class PatternWriter {
 public:
-    PatternWriter(std::string_view format, const NanoCount& count, std::optional<std::int32_t> offsetMinutes)
-        : format_(format), count_(count), offsetMinutes_(offsetMinutes), fields_(count) {}
+    PatternWriter(PatternText& out, const NanoCount& count, std::optional<std::int32_t> offsetMinutes)
+        : out_(out), count_(count), offsetMinutes_(offsetMinutes), fields_(count) {}
 
-    Outcome<std::string> run() {
-        out_.reserve(format_.size() + 32);
-        for (std::size_t i = 0; i < format_.size(); ++i) {
-            if (format_[i] != '%' || i + 1 == format_.size()) {
-                out_ += format_[i];
-                continue;
+    std::optional<Failure> run(std::string_view format) {
+        while (!format.empty()) {
+            const std::size_t literal = std::min(format.find('%'), format.size());
+            out_.put(format.substr(0, literal));
+            format.remove_prefix(literal);
+            if (format.size() < 2) {
+                out_.put(format);
+                break;
             }
-            const bool isModified = format_[++i] == 'E' && i + 1 < format_.size();
-            i += isModified ? 1 : 0;
-            write(format_[i], isModified);
+            const bool isModified = format[1] == 'E' && format.size() > 2;
+            write(format[isModified ? 2 : 1], isModified);
             if (failure_) {
                 return *failure_;
             }
+            format.remove_prefix(isModified ? 3 : 2);
         }
         if (hasEpoch_ && hasOffset_) {
             return FormatStringBadCombo{"%s", "%z"};
         }
-        return std::move(out_);
+        return std::nullopt;
     }
 
 private:
@@ -103,7 +106,8 @@ private:
         case 'U':
             return number((fields_.yearDay + daysPerWeek - fields_.weekday) / daysPerWeek, 2);
         case 'W':
-            return number((fields_.yearDay + daysPerWeek - (fields_.weekday + 6) % daysPerWeek) / daysPerWeek, 2);
+            return number((fields_.yearDay + daysPerWeek - (fields_.weekday + 6) % daysPerWeek) / daysPerWeek,
+                          2);
         default:
             return writeTimeFlag(flag, isModified);
         }
@@ -136,25 +140,25 @@ private:
         case 'z':
             return offset(isModified);
         default:
-            out_ += flag; // "%%"
+            out_.put(flag); // "%%"
         }
     }
 
     unsigned hourOfHalfDay() const { return fields_.hour % 12 == 0 ? 12 : fields_.hour % 12; }
 
-    void text(std::string_view characters) { out_ += characters; }
+    void text(std::string_view characters) { out_.put(characters); }
 
     void number(std::int64_t value, unsigned width) {
-        TextBuffer digits;
-        digits.putNumber(static_cast<std::uint64_t>(value), width);
-        out_ += digits.view();
+        out_.putNumber(static_cast<std::uint64_t>(value), width);
     }
 
     void secondsWithFraction() {
-        TextBuffer digits;
-        digits.putNumber(fields_.second, 2);
-        digits.putFraction(fields_.nanosecond);
-        out_ += digits.view();
+        out_.putNumber(fields_.second, 2);
+        if (fields_.nanosecond != 0) {
+            TextBuffer digits;
+            digits.putFraction(fields_.nanosecond);
+            out_.put(digits.view());
+        }
     }
 
     // From UTC, or with `isLocal` from the wall clock as it stands.
@@ -173,7 +177,7 @@ private:
         const FloorQuotient seconds = floorDivide(count, nanosPerSecond);
         digits.putNumber(static_cast<std::uint64_t>(seconds.quotient));
         digits.putFraction(static_cast<std::uint64_t>(seconds.remainder));
-        out_ += digits.view();
+        out_.put(digits.view());
     }
 
     void offset(bool zeroIsZ) {
@@ -183,19 +187,18 @@ private:
         }
         hasOffset_ = true;
         if (zeroIsZ && *offsetMinutes_ == 0) {
-            out_ += 'Z';
+            out_.put('Z');
             return;
         }
         TextBuffer digits;
         writeOffset(digits, *offsetMinutes_);
-        out_ += digits.view();
+        out_.put(digits.view());
     }
 
-    std::string_view format_;
+    PatternText& out_;
     NanoCount count_;
     std::optional<std::int32_t> offsetMinutes_;
     Fields fields_;
-    std::string out_;
     std::optional<FormatFlag> failure_;
     bool hasEpoch_ = false;
     bool hasOffset_ = false;
@@ -203,9 +206,34 @@ private:
 
 } // namespace
 
-Outcome<std::string> renderFields(std::string_view format, const NanoCount& count,
-                                  std::optional<std::int32_t> offsetMinutes) {
-    return PatternWriter(format, count, offsetMinutes).run();
+void PatternText::put(std::string_view text) {
+    if (long_.empty() && size_ + text.size() <= short_.size()) {
+        std::memcpy(short_.data() + size_, text.data(), text.size());
+        size_ += text.size();
+        return;
+    }
+    if (long_.empty()) {
+        long_.assign(short_.data(), size_);
+    }
+    long_ += text;
+}
+
+void PatternText::putNumber(std::uint64_t number, unsigned width) {
+    std::array<char, 20> digits;
+    std::size_t first = digits.size();
+    do {
+        digits[--first] = static_cast<char>('0' + number % 10);
+        number /= 10;
+    } while (number != 0);
+    while (digits.size() - first < width) {
+        digits[--first] = '0';
+    }
+    put({digits.data() + first, digits.size() - first});
+}
+
+std::optional<Failure> renderFields(PatternText& out, std::string_view format, const NanoCount& count,
+                                    std::optional<std::int32_t> offsetMinutes) {
+    return PatternWriter(out, count, offsetMinutes).run(format);
 }
 
 } // namespace kvt::ex::datetime::detail

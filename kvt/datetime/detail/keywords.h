@@ -2,7 +2,6 @@
 #pragma once
 
 #include <kvt/datetime/detail/text.h>
-#include <kvt/string/ustring.h>
 
 #include <algorithm>
 #include <optional>
@@ -20,18 +19,19 @@ inline bool isKeywordList(std::string_view format) noexcept {
     return format.find('%') == std::string_view::npos;
 }
 
-/// The keyword that an item of a list names, if any.
-inline std::optional<Keyword> keywordOf(std::string_view item) {
-    constexpr std::size_t longest = 8; // bytes; a letter beyond ASCII may stand for an ASCII one in upper case
+/// The keyword that an item of a list names, in any case, if any. Letters beyond ASCII have no part in it: those whose
+/// upper case is ASCII are longer, and a UString keeps its length when it is brought into upper case.
+inline std::optional<Keyword> keywordOf(std::string_view item) noexcept {
+    const auto isText = [](std::string_view text, std::string_view upperCase) {
+        return std::equal(text.begin(), text.end(), upperCase.begin(), upperCase.end(),
+                          [](char c, char upper) {
+                              return (c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c) == upper;
+                          });
+    };
     item = trimmed(item);
-    if (item.empty() || item.size() > longest) {
-        return std::nullopt;
-    }
-    const UString<0> upper = UString<0>::getAsUpperCase(UStringView<0>(item));
-    const std::string_view name = viewOf(upper);
-    return name == "ZQT"   ? std::optional(Keyword::Zqt)
-           : name == "ISO" ? std::optional(Keyword::Iso)
-                           : std::nullopt;
+    return isText(item, "ZQT")   ? std::optional(Keyword::Zqt)
+           : isText(item, "ISO") ? std::optional(Keyword::Iso)
+                                 : std::nullopt;
 }
 
 /// Calls `use` with each known keyword of a list, in order, until it answers true; whether any was known.

@@ -2,22 +2,16 @@
 #pragma once
 
 #include <kvt/datetime/detail/failure.h>
-#include <kvt/datetime/detail/nano_count.h>
+#include <kvt/datetime/detail/pattern_fields.h>
 
-#include <cstdint>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
 
-/// What a pattern has read, with everything that it did not ask for filled in.
-struct PatternReading {
-    NanoCount count;                ///< of the wall clock, or of UTC where seconds since 1970 were read
-    std::int32_t offsetMinutes = 0; ///< as `%z` or `%Ez` read it
-};
-
 /// Reads `value`, as far as the format asks for it. `wantsOffset` says that the result is to have an offset; it needs
 /// a time then. Fails by ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, FormatStringBadCombo and
 /// ParseValidation.
-Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset, bool lenient);
+Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset,
+                                   bool lenient);
 
 } // namespace kvt::ex::datetime::detail

@@ -7,8 +7,12 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// UTF-8 text as bytes of the system's encoding. Where the two are the same, the text is only referred to.
-/// The constructor fails as the conversion does when a character has no form in the system's encoding.
+/// Whether there are only seven-bit bytes in it.
+bool isAscii(std::string_view text) noexcept;
+
+/// UTF-8 text as bytes of the system's encoding. Where these are the same bytes, the text is only referred to, and not
+/// looked at. Otherwise the constructor throws what the conversion throws, when the text is not well formed or has a
+/// character that the system's encoding has not.
 class SystemBytes {
 public:
     explicit SystemBytes(std::string_view text);
@@ -22,7 +26,10 @@ private:
     std::string_view view_;
 };
 
-/// Bytes of the system's encoding as UTF-8; what a cut through a character has left of it is substituted.
+/// Bytes of the system's encoding as UTF-8. Throws what the conversion throws.
 UString<0> textOfSystemBytes(std::string_view bytes);
+
+/// The same for messages: what a cut through a character has left of it is substituted.
+UString<0> readableSystemBytes(std::string_view bytes);
 
 } // namespace kvt::ex::datetime::detail
