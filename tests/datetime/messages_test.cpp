@@ -9,8 +9,8 @@
 
 #include <functional>
 #include <optional>
-#include <regex>
 #include <set>
+#include <string_view>
 
 namespace {
 
@@ -99,10 +99,10 @@ std::vector<Row> rows() {
 
 std::set<std::uint32_t> numbersOfTheHeader() {
     const std::string header = kvt::test::contentsOf(KVT_SOURCE_DIR "/kvt/datetime/message_numbers.h");
-    const std::regex number(R"(=\s*(\d+);)");
     std::set<std::uint32_t> numbers;
-    for (std::sregex_iterator at(header.begin(), header.end(), number), end; at != end; ++at) {
-        numbers.insert(static_cast<std::uint32_t>(std::stoul((*at)[1])));
+    constexpr std::string_view type = "inline constexpr std::uint32_t ";
+    for (std::size_t at = header.find(type); at != std::string::npos; at = header.find(type, at + 1)) {
+        numbers.insert(static_cast<std::uint32_t>(std::stoul(header.substr(header.find('=', at) + 1))));
     }
     return numbers;
 }

@@ -54,7 +54,7 @@ TEST(RepairOffset, RefusesAllElse) {
 
 TEST(RepairOffset, HasOneBoundOnFourDigitsAsANumber) {
     for (int number = 0; number <= 9999; ++number) {
-        char digits[8];
+        char digits[12];
         std::snprintf(digits, sizeof digits, "%04d", number);
         const std::string hours(digits, 2);
         const std::string minutes(digits + 2, 2);

@@ -75,18 +75,21 @@ public:
                        std::string("Rules as the zone compiler reads them; ") + systemFile +
                            " without this option")
             ->type_name("FILE");
+        app.add_option("--windows-zones", windowsZones_,
+                       "A windowsZones.xml to put into the folder; without this option, that of the package "
+                       "unicode-cldr-core where it is installed")
+            ->type_name("FILE");
     }
 
     int run(Diagnostics&) override {
         const ZoneDatabase database = read();
-        const auto windowsZones =
-            firstThatExists({std::begin(windowsZonesFiles), std::end(windowsZonesFiles)});
+        const std::optional<std::string> windowsZones = readWindowsZones();
         makeFolder();
         for (const auto& [name, text] : database.files) {
             writeFile(fs::path(folder_) / name, text);
         }
         if (windowsZones) {
-            writeFile(fs::path(folder_) / "windowsZones.xml", contentsOf(*windowsZones));
+            writeFile(fs::path(folder_) / "windowsZones.xml", *windowsZones);
         }
         print("version " + database.version + ": " + counted(database.zones, "zone", "zones") + ", " +
               counted(database.links, "link", "links") + ", " +
@@ -110,6 +113,13 @@ private:
         }
     }
 
+    std::optional<std::string> readWindowsZones() const {
+        const auto file = windowsZones_.empty()
+                              ? firstThatExists({std::begin(windowsZonesFiles), std::end(windowsZonesFiles)})
+                              : windowsZones_;
+        return file ? std::optional(contentsOf(*file)) : std::nullopt;
+    }
+
     void makeFolder() const {
         std::error_code error;
         fs::create_directories(folder_, error);
@@ -120,6 +130,7 @@ private:
 
     std::string folder_;
     std::string from_ = systemFile;
+    std::string windowsZones_;
 };
 
 } // namespace

@@ -1,0 +1,87 @@
+// `kvt tzdata`: the folder it writes, what it says, and that nothing is written when something cannot be read. What
+// becomes of the rules is tested with the writer itself (tests/datetime/zone_database_test.cpp).
+
+#include "host_test.h"
+
+namespace kvt::test {
+
+namespace {
+
+constexpr const char* rules = "# version 2031x\n"
+                              "R E 1990 o - Mar lastSu 1u 1 S\n"
+                              "R E 1990 o - O lastSu 1u 0 -\n"
+                              "Z Europe/Here 1 E CE%sT\n"
+                              "L Europe/Here There\n";
+
+} // namespace
+
+class KvtTzdata : public HostTest {
+protected:
+    // Whether the package is on this machine must not matter.
+    ChildResult tzdata(std::vector<std::string> more) {
+        more.insert(more.begin(),
+                    {"tzdata", "--output", "zones", "--windows-zones", write("names.xml", "<a/>\n")});
+        return kvt(std::move(more));
+    }
+};
+
+TEST_F(KvtTzdata, WritesWhatTheDateFunctionsRead) {
+    const ChildResult written = tzdata({});
+    EXPECT_EQ(written.status, 0) << written.err;
+    EXPECT_EQ(written.err, "");
+    EXPECT_TRUE(written.out.starts_with("version 2"));
+    EXPECT_TRUE(written.out.ends_with(", with windowsZones.xml\n")) << written.out;
+    EXPECT_EQ(read("zones/windowsZones.xml"), "<a/>\n");
+    EXPECT_EQ("version " + read("zones/version").substr(0, 5), written.out.substr(0, 13));
+
+    const ChildResult used = kvt({"date", "now", "--zone-database", "zones"});
+    EXPECT_EQ(used.err, "");
+    EXPECT_EQ(used.status, 0);
+}
+
+TEST_F(KvtTzdata, TakesAnyFileOfTheZoneCompilersLanguage) {
+    write("mine.zi", rules);
+    write("leapseconds", "Leap 1972 Jun 30 23:59:60 + S\n");
+    const ChildResult written = tzdata({"--from", "mine.zi"});
+    EXPECT_EQ(written.err, "");
+    EXPECT_EQ(written.out, "version 2031x: 1 zone, 1 link, 1 leap second, with windowsZones.xml\n");
+    EXPECT_EQ(written.status, 0);
+    EXPECT_EQ(read("zones/version"), "2031x\n");
+    EXPECT_TRUE(contains(read("zones/europe"), "Zone\tEurope/Here"));
+    EXPECT_TRUE(contains(read("zones/europe"), "Rule\tE\t1990\tonly\t-\tMar\tlastSun"));
+}
+
+TEST_F(KvtTzdata, WritesAnewIntoAFolderThatIsThere) {
+    std::filesystem::create_directory(path("zones"));
+    write("zones/version", "old");
+    write("zones/mine", "kept");
+    EXPECT_EQ(tzdata({"--from", write("mine.zi", rules)}).status, 0);
+    EXPECT_EQ(read("zones/version"), "2031x\n");
+    EXPECT_EQ(read("zones/mine"), "kept");
+}
+
+TEST_F(KvtTzdata, WritesNothingWhenSomethingCannotBeRead) {
+    const ChildResult bad = tzdata({"--from", write("bad.zi", "# version 2031x\nQ nonsense\n")});
+    EXPECT_EQ(bad.status, 2);
+    EXPECT_TRUE(bad.err.starts_with("kvt: " + path("bad.zi") + ": ")) << bad.err;
+    EXPECT_TRUE(contains(bad.err, "line 2")) << bad.err;
+
+    const ChildResult missing = tzdata({"--from", "missing.zi"});
+    EXPECT_EQ(missing.status, 2);
+    EXPECT_EQ(missing.err, "kvt: cannot read missing.zi: No such file or directory\n");
+
+    const ChildResult noNames = kvt({"tzdata", "-o", "zones", "--windows-zones", "missing.xml"});
+    EXPECT_EQ(noNames.status, 2);
+    EXPECT_EQ(noNames.err, "kvt: cannot read missing.xml: No such file or directory\n");
+    EXPECT_FALSE(exists("zones"));
+}
+
+TEST_F(KvtTzdata, SaysWhereItCannotWrite) {
+    write("zones", "a file");
+    const ChildResult result = tzdata({});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_TRUE(result.err.starts_with("kvt: cannot create zones: ")) << result.err;
+    EXPECT_EQ(read("zones"), "a file");
+}
+
+} // namespace kvt::test
