@@ -12,6 +12,7 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
     for (const std::vector<std::string>& command : {std::vector<std::string>{},
                                                     {"convert"},
                                                     {"encodings"},
+                                                    {"match"},
                                                     {"wwjd"},
                                                     {"wwjd", "encode"},
                                                     {"wwjd", "decode"},
@@ -53,7 +54,7 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
 
 TEST_F(KvtCommandLine, HelpFitsATerminal) {
     for (const std::string command :
-         {"convert", "encodings", "text", "number", "explain", "date", "doctor", "tzdata"}) {
+         {"convert", "encodings", "text", "match", "number", "explain", "date", "doctor", "tzdata"}) {
         std::istringstream lines(kvt({command, "--help"}).out);
         for (std::string line; std::getline(lines, line) && !line.empty();) {
             // Examples are command lines and stay whole.
@@ -67,7 +68,7 @@ TEST_F(KvtCommandLine, HelpFitsATerminal) {
 TEST_F(KvtCommandLine, HelpOfTheProgramListsTheCommands) {
     const std::string help = kvt({"--help"}).out;
     for (const char* command :
-         {"convert", "encodings", "text", "number", "wwjd", "date", "doctor", "explain", "tzdata"}) {
+         {"convert", "encodings", "text", "match", "number", "wwjd", "date", "doctor", "explain", "tzdata"}) {
         EXPECT_TRUE(contains(help, std::string("\n  ") + command + " ")) << help;
     }
 }
@@ -139,7 +140,8 @@ TEST_F(KvtCommandLine, MissingOptionsAreNamed) {
     };
     for (const Row& row :
          {Row{{"convert", "--to", "UTF-8"}, "--from"}, Row{{"convert", "--from", "UTF-8"}, "--to"},
-          Row{{"convert", "--from", "UTF-8", "--to"}, "--to"}, Row{{"explain"}, "NUMBER"}}) {
+          Row{{"convert", "--from", "UTF-8", "--to"}, "--to"}, Row{{"explain"}, "NUMBER"},
+          Row{{"match"}, "REGEX"}}) {
         const ChildResult result = kvt(row.arguments);
         EXPECT_EQ(result.status, 2);
         EXPECT_EQ(result.out, "");

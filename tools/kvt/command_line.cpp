@@ -26,8 +26,8 @@ kvt COMMAND --help)";
 
 constexpr const char* notes =
     R"(Data goes to standard output, everything else to standard error, both of which
-are UTF-8 but for the text that 'convert' and 'text' write. A set NO_COLOR keeps
-colours away.
+are UTF-8 but for the text that 'convert', 'text' and 'match' write. A set
+NO_COLOR keeps colours away.
 
 Exit status, of every command:
   0  done

@@ -4,6 +4,7 @@
 KVT_COMMAND(convert)
 KVT_COMMAND(encodings)
 KVT_COMMAND(text)
+KVT_COMMAND(match)
 KVT_COMMAND(number)
 KVT_COMMAND(wwjd)
 KVT_COMMAND(date)

@@ -1,5 +1,6 @@
 // `kvt convert`: its options, and what goes together with what.
 
+#include "choices.h"
 #include "command.h"
 #include "conversion.h"
 #include "convert_options.h"
@@ -7,7 +8,6 @@
 #include "encoding_catalogue.h"
 #include "failure.h"
 #include "input.h"
-#include "suggest.h"
 
 #include <array>
 #include <utility>
@@ -43,27 +43,10 @@ Exit status:
   1  done, but something was lost; with --dry-run: every encoding would lose
   2  not done; an output file was left as it was)";
 
-template <typename Value>
-using Choices = std::vector<std::pair<std::string, Value>>;
-
 const Choices<OnError> errorChoices = {
     {"stop", OnError::Stop}, {"replace", OnError::Replace}, {"report", OnError::Report}};
 const Choices<MarkPolicy> markChoices = {
     {"keep", MarkPolicy::Keep}, {"strip", MarkPolicy::Strip}, {"add", MarkPolicy::Add}};
-
-template <typename Value>
-Value choose(const std::string& option, const std::string& typed, const Choices<Value>& choices) {
-    std::vector<std::string> names;
-    std::string list;
-    for (const auto& [name, value] : choices) {
-        if (name == typed) {
-            return value;
-        }
-        names.push_back(name);
-        list += (list.empty() ? "" : ", ") + name;
-    }
-    throw Failure(option + " takes one of " + list + ", not '" + typed + "'." + didYouMean(typed, names));
-}
 
 class ConvertCommand : public Command {
 public:

@@ -6,16 +6,12 @@
 #include "failure.h"
 #include "input.h"
 #include "line_reader.h"
-#include "messages.h"
 #include "output.h"
 #include "progress.h"
-#include "text.h"
 #include "text_operation.h"
-
-#include <kvt/encoding/stream_transcoder.h>
+#include "text_writer.h"
 
 #include <functional>
-#include <optional>
 #include <unistd.h>
 #include <utility>
 
@@ -47,56 +43,6 @@ text, or to change its encoding, use 'kvt convert'.
 Exit status:
   0  done, also when nothing was found
   2  not done)";
-
-// Results on their way out, in the encoding of the text.
-class TextWriter {
-public:
-    TextWriter(Output& output, kvt::ex::Encoding encoding, bool encoded)
-        : output_(output), encodingName_(encoding.getName()) {
-        // What the operations make of valid UTF-8 is valid UTF-8.
-        if (encoded && encoding != kvt::ex::Encoding(kvt::ex::Encoding::Utf8)) {
-            encoder_.emplace(kvt::ex::Encoding::Utf8, encoding);
-        }
-    }
-
-    /// Where operations append to, as UTF-8.
-    std::string& buffer() { return encoder_ ? pending_ : ready_; }
-
-    /// What is in the buffer became of `line`, which is to blame for what cannot be written.
-    void endLine(const TextLine& line) {
-        if (!encoder_) {
-            return;
-        }
-        encoder_->convert(pending_, ready_, [&](const kvt::ex::Loss& loss) {
-            const std::string lost = printable(std::u32string_view(&loss.codePoint, 1));
-            throw Failure(std::string(line.file) + ": line " + std::to_string(line.number) +
-                          ": the result cannot be written. " +
-                          describe(910003, {lost, "UTF-8", encodingName_}));
-        });
-        pending_.clear();
-    }
-
-    void flush() {
-        output_.write(ready_);
-        ready_.clear();
-    }
-
-    /// An encoding with shifts returns to its initial state.
-    void finish() {
-        if (encoder_) {
-            encoder_->finish(ready_, {});
-        }
-        flush();
-        output_.commit();
-    }
-
-private:
-    Output& output_;
-    std::string encodingName_;
-    std::optional<kvt::ex::StreamTranscoder> encoder_;
-    std::string pending_;
-    std::string ready_;
-};
 
 class TextCommand : public Command {
 public:

@@ -65,6 +65,10 @@ bool abbreviates(std::string_view word, std::string_view name) {
     return true;
 }
 
+std::string quoted(std::string_view text) {
+    return std::string("\"").append(text).append("\"");
+}
+
 std::string joined(std::span<const std::string> fields) {
     std::string line;
     for (const std::string& field : fields) {
@@ -150,7 +154,7 @@ private:
         } else if (abbreviates(words[0], "Link")) {
             takeLink(words);
         } else {
-            fail("\"" + std::string(words[0]) + "\" is neither Rule, Zone nor Link");
+            fail(quoted(words[0]) + " is neither Rule, Zone nor Link");
         }
     }
 
@@ -246,7 +250,7 @@ private:
         } else if (words[0].find_first_not_of("0123456789") == std::string_view::npos && words.size() >= 2) {
             takeAtomicDifference(number(words[0]), number(words[1]));
         } else if (!abbreviates(words[0], "Expires")) {
-            fail("\"" + std::string(words[0]) + "\" is no leap second");
+            fail(quoted(words[0]) + " is no leap second");
         }
     }
 
@@ -282,7 +286,7 @@ private:
         const char* end = digits.data() + digits.size();
         const auto [stop, error] = std::from_chars(digits.data(), end, value);
         if (error != std::errc() || stop != end) {
-            fail("\"" + std::string(digits) + "\" is no number");
+            fail(quoted(digits) + " is no number");
         }
         return value;
     }
@@ -310,13 +314,13 @@ private:
         for (const std::string_view name : names) {
             if (abbreviates(word, name)) {
                 if (!found.empty()) {
-                    fail("\"" + std::string(word) + "\" may be more than one " + kind);
+                    fail(quoted(word) + " may be more than one " + kind);
                 }
                 found = name.substr(0, nameLength);
             }
         }
         if (found.empty()) {
-            fail("\"" + std::string(word) + "\" is no " + kind);
+            fail(quoted(word) + " is no " + kind);
         }
         return found;
     }
@@ -333,7 +337,7 @@ private:
         }
         const std::string_view sign = word.substr(relation, 2);
         if (sign != ">=" && sign != "<=") {
-            fail("\"" + std::string(word) + "\" is no day");
+            fail(quoted(word) + " is no day");
         }
         return shortName(weekdayNames, word.substr(0, relation), "weekday") + std::string(sign) +
                std::to_string(number(word.substr(relation + 2)));

@@ -1,0 +1,245 @@
+// The library beside the engine used directly: thousands of generated patterns, right and wrong ones, on generated
+// subjects, from every start. Success, groups, positions and failures have to be the same.
+//
+// Patterns are put together from a small grammar, so that most of them mean something; then some are damaged, so that
+// there is a wide choice of failures.
+#include "regex_support.h"
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <optional>
+#include <random>
+
+namespace kvt::test {
+namespace {
+
+class Generator {
+public:
+    explicit Generator(std::uint64_t seed) : random_(seed) {}
+
+    std::size_t below(std::size_t count) { return random_() % count; }
+
+    std::string pattern() {
+        std::string text = alternatives(2);
+        for (std::size_t damage = below(5) == 0 ? 1 + below(2) : 0; damage > 0; --damage) {
+            const std::size_t at = below(text.size() + 1);
+            if (below(2) == 0) {
+                text.insert(at, 1, "()[]{}*+?|\\^$-:<=!9\0\xff"[below(21)]);
+            } else {
+                text.erase(at, 1 + below(2));
+            }
+        }
+        return text;
+    }
+
+    std::string legacyPattern() {
+        std::string text;
+        for (std::size_t i = below(8); i > 0; --i) {
+            text += pick({"a", "b", "(", ")", "{", "}", "|", "$", "\\", ".", "*", "?", "[ab]", "^", "\\d",
+                          "1", "[", "\\\\"});
+        }
+        return text;
+    }
+
+    std::string subject() {
+        std::string text;
+        for (std::size_t i = below(10); i > 0; --i) {
+            text += pick(
+                {"a", "a", "b", "b", "c", " ", "\n", "1", "ab", "\u00e9", "\xc3", "(", "|", "$", "{", "\\"});
+        }
+        if (below(20) == 0) {
+            text += '\0';
+        }
+        return text;
+    }
+
+private:
+    std::string pick(std::initializer_list<const char*> choices) {
+        return choices.begin()[below(choices.size())];
+    }
+
+    std::string alternatives(int depth) {
+        std::string text = sequence(depth);
+        while (below(4) == 0) {
+            text += "|" + sequence(depth);
+        }
+        return text;
+    }
+
+    std::string sequence(int depth) {
+        std::string text;
+        for (std::size_t i = below(4); i > 0; --i) {
+            text += atom(depth) + repeat();
+        }
+        return text;
+    }
+
+    std::string atom(int depth) {
+        if (depth > 0 && below(3) == 0) {
+            return pick({"(", "(", "(", "(?:", "(?=", "(?!", "(?>", "(?i:", "(?<n>"}) +
+                   alternatives(depth - 1) + ")";
+        }
+        return pick(
+            {"a",     "a",    "b",      "b",        "c",          "1",           "\u00e9",       ".",
+             "^",     "$",    "\\b",    "\\B",      "\\w",        "\\W",         "\\d",          "\\s",
+             "[ab]",  "[^a]", "[a-c1]", "[\u00e9]", "\\1",        "\\2",         "\\A",          "\\z",
+             "\\x61", "\\n",  "(?<=a)", "(?<!b)",   "\\K",        "[[:alpha:]]", "\\Qa.\\E",     "\\N",
+             "\\h",   "\\R",  "\\<",    "(?#x)",    "\\p{digit}", "(?1)",        "[[:space:]b]", "\\$"});
+    }
+
+    std::string repeat() {
+        return below(2) == 0
+                   ? ""
+                   : pick({"*", "+", "?", "*?", "+?", "??", "{2}", "{1,2}", "{0,}", "{1,3}?", "*+", "?+"});
+    }
+
+    std::mt19937_64 random_;
+};
+
+// What came out, so that it shows whether there was something to compare.
+struct Tally {
+    std::size_t compiled = 0;
+    std::size_t refused = 0;
+    std::size_t matches = 0;
+    std::size_t misses = 0;
+    std::size_t withUnusedGroup = 0;
+    std::map<int, std::size_t> errors;
+
+    void add(const Found& found) {
+        ++(found.groups.empty() ? misses : matches);
+        for (const Span& group : found.groups) {
+            if (group.second == 0 && group.first + 1 <= 1) {
+                ++withUnusedGroup;
+                break;
+            }
+        }
+    }
+};
+
+template <std::uint32_t N>
+void compare(const std::string& pattern, const std::vector<std::string>& subjects, Tally& tally) {
+    ex::URegex<N> regex;
+    boost::regex engine;
+    const EngineError error = errorOf([&] { engine = boost::regex(pattern); });
+    ASSERT_EQ(errorOf([&] { regex = ex::URegex<N>(units<N>(pattern)); }), error);
+    if (error.code != -1) {
+        ++tally.refused;
+        ++tally.errors[error.code];
+        return;
+    }
+    ++tally.compiled;
+    for (const std::string& subject : subjects) {
+        SCOPED_TRACE("subject " + testing::PrintToString(subject));
+        const Found whole = matchedByEngine(engine, subject);
+        ASSERT_EQ(matchedBy(regex, subject), whole);
+        tally.add(whole);
+        for (std::size_t start = 0; start <= subject.size(); ++start) {
+            const Found found = searchedByEngine(engine, subject, start);
+            ASSERT_EQ(searchedBy(regex, subject, start), found) << "from " << start;
+            tally.add(found);
+        }
+    }
+}
+
+TEST(RegexDifferential, URegexDoesWhatTheEngineDoes) {
+    Generator generate(5101);
+    Tally tally;
+    for (int round = 0; round < 6000; ++round) {
+        const std::string pattern = generate.pattern();
+        std::vector<std::string> subjects;
+        for (int i = 0; i < 5; ++i) {
+            subjects.push_back(generate.subject());
+        }
+        SCOPED_TRACE("round " + std::to_string(round) + ", pattern " + testing::PrintToString(pattern));
+        switch (round % 3) {
+        case 0:
+            compare<0>(pattern, subjects, tally);
+            break;
+        case 1:
+            compare<1>(pattern, subjects, tally);
+            break;
+        default:
+            compare<28>(pattern, subjects, tally);
+            break;
+        }
+        if (HasFatalFailure()) {
+            return;
+        }
+    }
+    EXPECT_GT(tally.compiled, 3000u);
+    EXPECT_GT(tally.refused, 500u);
+    EXPECT_GE(tally.errors.size(), 6u);
+    EXPECT_GT(tally.matches, 20000u);
+    EXPECT_GT(tally.misses, 20000u);
+    EXPECT_GT(tally.withUnusedGroup, 500u);
+}
+
+// Position and length, or the failure, as the engine gives them for the pattern translated by hand.
+std::pair<Span, EngineError> indexedByEngine(const boost::regex& engine, std::string_view text,
+                                             std::uint64_t start) {
+    if (start >= text.size()) {
+        return {{none, 0}, {}};
+    }
+    const Found found = searchedByEngine(engine, text, start);
+    return {found.groups.empty() ? Span{none, 0} : found.groups[0], found.error};
+}
+
+void compareLegacy(const std::string& pattern, const std::vector<std::string>& texts, Tally& tally) {
+    boost::regex engine;
+    std::optional<ObsoleteRegexp> regexp;
+    const EngineError error = errorOf([&] { engine = boost::regex(perlByHand(pattern)); });
+    ASSERT_EQ(errorOf([&] { regexp.emplace(pattern.data(), pattern.size()); }), error);
+    if (error.code != -1) {
+        ++tally.refused;
+        ++tally.errors[error.code];
+        return;
+    }
+    ++tally.compiled;
+    for (const std::string& text : texts) {
+        for (std::size_t start = 0; start <= text.size() + 1; ++start) {
+            const auto [expected, failure] = indexedByEngine(engine, text, start);
+            Span found{none, 0};
+            ASSERT_EQ(errorOf([&] { found = indexedBy(*regexp, text, start); }), failure);
+            ASSERT_EQ(found, expected) << "text " << testing::PrintToString(text) << " from " << start;
+            ++(expected.first == none ? tally.misses : tally.matches);
+        }
+    }
+}
+
+TEST(RegexDifferential, ObsoleteRegexpDoesWhatTheEngineDoesWithTheTranslation) {
+    Generator generate(5201);
+    Tally tally;
+    for (int round = 0; round < 6000; ++round) {
+        const std::string pattern = generate.legacyPattern();
+        SCOPED_TRACE("round " + std::to_string(round) + ", pattern " + testing::PrintToString(pattern));
+        compareLegacy(pattern, {generate.subject(), generate.subject(), generate.subject()}, tally);
+        if (HasFatalFailure()) {
+            return;
+        }
+    }
+    EXPECT_GT(tally.compiled, 3000u);
+    EXPECT_GT(tally.refused, 500u);
+    EXPECT_GE(tally.errors.size(), 3u);
+    EXPECT_GT(tally.matches, 5000u);
+    EXPECT_GT(tally.misses, 5000u);
+}
+
+TEST(RegexDifferential, AllShortLegacyPatternsMeanTheirTranslation) {
+    const std::vector<std::string> texts = {"a",    "{}()|$\\", "a\\",  "$a$",   "(a)", "\\|a", "a|$",
+                                            "{a}{", "))",       "\\\\", "$$a\n", "|a|", "a{a}"};
+    Tally tally;
+    forEachShortText("{}()|$\\a*[]", 3, [&](const std::string& pattern) {
+        if (!testing::Test::HasFatalFailure()) {
+            SCOPED_TRACE("pattern " + pattern);
+            compareLegacy(pattern, texts, tally);
+        }
+    });
+    EXPECT_EQ(tally.compiled + tally.refused, 1464u);
+    EXPECT_GT(tally.compiled, 700u);
+    EXPECT_GT(tally.matches, 2000u);
+    EXPECT_GT(tally.misses, 2000u);
+}
+
+} // namespace
+} // namespace kvt::test

@@ -1,0 +1,170 @@
+// What the tests of regular expressions share: the outcome of a search in one comparable value, by the library and by
+// the engine used directly, and a reader's own translation of the old dialect.
+#pragma once
+
+#include <kvt/regex/obsolete_regexp.h>
+#include <kvt/regex/uregex.h>
+
+#include <boost/regex.hpp>
+
+#include <cstdint>
+#include <ostream>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace kvt::test {
+
+using Span = std::pair<std::uint64_t, std::uint64_t>;
+using Spans = std::vector<Span>;
+
+inline constexpr std::uint64_t none = ~std::uint64_t{0};
+
+/// A failure of the engine; code -1 when there was none.
+struct EngineError {
+    int code = -1;
+    std::ptrdiff_t position = 0;
+    std::string text;
+
+    bool operator==(const EngineError&) const = default;
+};
+
+inline std::ostream& operator<<(std::ostream& out, const EngineError& error) {
+    return out << "error " << error.code << " at " << error.position << ": " << error.text;
+}
+
+/// Runs `operation` and gives what the engine threw.
+template <typename Operation>
+EngineError errorOf(Operation operation) {
+    try {
+        operation();
+        return {};
+    } catch (const boost::regex_error& error) {
+        return {static_cast<int>(error.code()), error.position(), error.what()};
+    }
+}
+
+/// Groups, empty when nothing matched, or the failure.
+struct Found {
+    Spans groups;
+    EngineError error;
+
+    bool operator==(const Found&) const = default;
+};
+
+inline std::ostream& operator<<(std::ostream& out, const Found& found) {
+    for (const auto& [position, length] : found.groups) {
+        out << "(" << static_cast<std::int64_t>(position) << ", " << length << ") ";
+    }
+    return out << found.error;
+}
+
+template <std::uint32_t N>
+ex::UString<N> units(std::string_view bytes) {
+    return ex::UString<N>(ex::UStringView<N>(bytes));
+}
+
+template <std::uint32_t N>
+Spans groupsOf(const ex::URegexMatch<N>& match) {
+    return {match.groups().begin(), match.groups().end()};
+}
+
+template <std::uint32_t N>
+Found matchedBy(const ex::URegex<N>& regex, std::string_view subject) {
+    Found found;
+    found.error = errorOf([&] { found.groups = groupsOf(regex.match(units<N>(subject))); });
+    return found;
+}
+
+template <std::uint32_t N>
+Found searchedBy(const ex::URegex<N>& regex, std::string_view subject, std::uint64_t start) {
+    Found found;
+    found.error = errorOf([&] { found.groups = groupsOf(regex.search(units<N>(subject), start)); });
+    return found;
+}
+
+/// The same by the engine. Offsets are taken from the iterators, not from the engine's own arithmetic.
+inline Spans engineGroups(const boost::match_results<std::string_view::const_iterator>& result,
+                          std::string_view subject, std::uint64_t start) {
+    Spans groups;
+    for (const auto& group : result) {
+        if (group.matched) {
+            groups.emplace_back(group.first - subject.begin(), group.second - group.first);
+        } else {
+            groups.emplace_back(start - 1, 0);
+        }
+    }
+    return groups;
+}
+
+inline Found matchedByEngine(const boost::regex& regex, std::string_view subject) {
+    Found found;
+    boost::match_results<std::string_view::const_iterator> result;
+    found.error = errorOf([&] {
+        if (boost::regex_match(subject.begin(), subject.end(), result, regex)) {
+            found.groups = engineGroups(result, subject, 0);
+        }
+    });
+    return found;
+}
+
+inline Found searchedByEngine(const boost::regex& regex, std::string_view subject, std::uint64_t start) {
+    Found found;
+    boost::match_results<std::string_view::const_iterator> result;
+    found.error = errorOf([&] {
+        if (boost::regex_search(subject.begin() + static_cast<std::ptrdiff_t>(start), subject.end(), result,
+                                regex)) {
+            found.groups = engineGroups(result, subject, start);
+        }
+    });
+    return found;
+}
+
+/// Position and length as ObsoleteRegexp gives them.
+inline Span indexedBy(const ObsoleteRegexp& regexp, std::string_view text, std::uint64_t start) {
+    std::uint64_t length = 12345;
+    const std::uint64_t position = regexp.index(text.data(), text.size(), &length, start);
+    return {position, length};
+}
+
+/// The old dialect in Perl syntax: looks for one character after the other in the text that grows as it goes, and
+/// escapes it in place.
+inline std::string perlByHand(std::string pattern) {
+    std::size_t pos = 0;
+    for (;;) {
+        const std::size_t i = pattern.find_first_of("{}()|$", pos);
+        if (i == std::string::npos) {
+            return pattern;
+        }
+        if (pattern[i] == '$' && i == pattern.size() - 1) {
+            return pattern;
+        }
+        if (i > 0 && pattern[i - 1] == '\\') {
+            pos = i + 1;
+        } else {
+            pattern.insert(i, "\\");
+            pos = i + 2;
+        }
+    }
+}
+
+/// Calls `use` for each text of at most `longest` characters of the alphabet, the empty one first.
+template <typename Use>
+void forEachShortText(std::string_view alphabet, std::size_t longest, Use use) {
+    std::vector<std::string> round = {""};
+    for (std::size_t length = 0; length <= longest; ++length) {
+        std::vector<std::string> longer;
+        for (const std::string& text : round) {
+            use(text);
+            if (length < longest) {
+                for (const char unit : alphabet) {
+                    longer.push_back(text + unit);
+                }
+            }
+        }
+        round.swap(longer);
+    }
+}
+
+} // namespace kvt::test
