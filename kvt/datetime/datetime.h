@@ -117,9 +117,9 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 ///     $            the end of the value, as the last character of the format; without it, the rest is not looked at
 ///
 /// A format without any of %T %H %I %p %M %S %s %Es gives a date, so that %k and %l alone are read and dropped; one
-/// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A
-/// date is asked for as a whole, by year, month and day or by year and %j; a time from the hour on, where the seconds, or
-/// the minutes and the seconds, may be left out and are 0. Anything else is one of the failures below.
+/// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A date is
+/// asked for as a whole, by year, month and day or by year and %j; a time from the hour on, where the seconds, or the
+/// minutes and the seconds, may be left out and are 0. Anything else is one of the failures below.
 ///
 /// With `lenient`, what exceeds a bound in brackets runs over into the next larger part: 30 February is 1 or 2 March.
 ///
