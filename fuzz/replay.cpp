@@ -70,8 +70,8 @@ std::string damaged(std::string input, const std::vector<std::string>& others, s
             break;
         default:
             if (at < input.size()) {
-                input[at] = static_cast<char>(random() % 2 == 0 ? random()
-                                                                : "\x00\x7F\x80\xC3\xFF<>\x1B"[random() % 8]);
+                input[at] = random() % 2 == 0 ? static_cast<char>(random())
+                                              : "\x00\x7F\x80\xC3\xFF<>\x1B"[random() % 8];
             }
             break;
         }

@@ -19,6 +19,8 @@
 #include <kvt/foundation/throwable.h>
 #include <kvt/foundation/translation_scoped.h>
 #include <kvt/foundation/vector.h>
+#include <kvt/legacy/obsolete_date.h>
+#include <kvt/legacy/obsolete_time.h>
 #include <kvt/regex/obsolete_regexp.h>
 #include <kvt/regex/uregex.h>
 #include <kvt/string/ustring.h>

@@ -143,7 +143,7 @@ INSTANTIATE_TEST_SUITE_P(Shard, IcuDifferential, testing::Range(std::size_t{0}, 
 
 TEST_P(IcuDifferential, ValidTextOfTheConverterItself) {
     forEachConverter([](const std::string& name, const std::string& next, std::size_t seed) {
-        for (const std::size_t length : {1, 2, 3, 7, 60, 300}) {
+        for (const std::size_t length : {1U, 2U, 3U, 7U, 60U, 300U}) {
             const std::u16string text = ownText(name, length, seed * 100 + length);
             const std::string bytes = encodeWithIcu(name, text);
             for (const std::string& to :

@@ -295,15 +295,15 @@ std::basic_string<CharOut> stream(Encoding from, Encoding to, View in, std::size
 TEST(IcuTranscoderStream, GivesTheSameWhateverThePieces) {
     const std::string text = "Grün 漢字 \U0001F600 end";
     const std::u16string expected = u"Grün 漢字 \U0001F600 end";
-    for (const std::size_t step : {1, 2, 3, 5, 100}) {
-        for (const std::size_t room : {1, 2, 3, 7, 100}) {
+    for (const std::size_t step : {1U, 2U, 3U, 5U, 100U}) {
+        for (const std::size_t room : {1U, 2U, 3U, 7U, 100U}) {
             EXPECT_EQ(stream<char16_t>(Encoding::Utf8, Encoding::Utf16LE, text, step, room), expected)
                 << step << ' ' << room;
         }
     }
     std::string jis;
     ICUTranscoder(Encoding::Utf8, Encoding("ISO-2022-JP")).transcode(View("a漢b字"), jis);
-    for (const std::size_t step : {1, 2, 3, 100}) {
+    for (const std::size_t step : {1U, 2U, 3U, 100U}) {
         EXPECT_EQ(stream(Encoding("ISO-2022-JP"), Encoding::Utf8, jis, step, 2), "a漢b字") << step;
         EXPECT_EQ(stream(Encoding::Utf8, Encoding("ISO-2022-JP"), "a漢b字", step, 1), jis) << step;
     }

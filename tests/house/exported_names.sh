@@ -11,7 +11,7 @@ set -euo pipefail
 export LC_ALL=C
 
 # The classes that stand in the global namespace, as they are mangled.
-global_classes='(10IZQTString|15IZQTStringArray|14ObsoleteRegexp)'
+global_classes='(10IZQTString|15IZQTStringArray|14ObsoleteRegexp|12ObsoleteDate|12ObsoleteTime)'
 
 mangled() {
     nm -D --defined-only "$1" | sed -E 's/^[0-9a-f]* +[A-Za-z] //' | sort -u

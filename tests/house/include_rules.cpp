@@ -293,6 +293,9 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
             offences.push_back(
                 offence(include, "ICU is used in kvt/encoding/icu.cpp and its private header"));
         }
+        if (include.target.starts_with("boost/date_time/") && folderOf(include.file) != "legacy") {
+            offences.push_back(offence(include, "Boost.DateTime is used in kvt/legacy"));
+        }
         if (beginsWithOneOf(include.target, system) && folderOf(include.file) != "platform") {
             offences.push_back(offence(include, "the operating system is called in kvt/platform"));
         }
