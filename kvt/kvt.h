@@ -1,4 +1,4 @@
-// Every public header of the library that needs nothing but the standard library.
+// Every public header of the library that needs nothing but the standard library and, under mmap/, Boost's headers.
 #pragma once
 
 #include <kvt/codec/float_text.h>
@@ -19,6 +19,10 @@
 #include <kvt/foundation/throwable.h>
 #include <kvt/foundation/translation_scoped.h>
 #include <kvt/foundation/vector.h>
+#include <kvt/mmap/managed_object.h>
+#include <kvt/mmap/mapped_region_segment.h>
+#include <kvt/mmap/memory_manager.h>
+#include <kvt/mmap/memory_registrar.h>
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
 #include <kvt/string/ustring_format.h>
