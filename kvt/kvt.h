@@ -1,4 +1,4 @@
-// Every public header of the library that needs nothing but the standard library.
+// Every public header of the library that needs nothing but the standard library and, under mmap/, Boost's headers.
 #pragma once
 
 #include <kvt/codec/float_text.h>
@@ -21,6 +21,10 @@
 #include <kvt/foundation/vector.h>
 #include <kvt/legacy/obsolete_date.h>
 #include <kvt/legacy/obsolete_time.h>
+#include <kvt/mmap/managed_object.h>
+#include <kvt/mmap/mapped_region_segment.h>
+#include <kvt/mmap/memory_manager.h>
+#include <kvt/mmap/memory_registrar.h>
 #include <kvt/regex/obsolete_regexp.h>
 #include <kvt/regex/uregex.h>
 #include <kvt/string/ustring.h>

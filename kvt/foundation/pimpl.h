@@ -43,7 +43,7 @@ struct SharedDataT {
     explicit SharedDataT(Impl&& value) : impl(std::move(value)) {}
 
     Impl impl{};
-    Mutex mutex;
+    mutable Mutex mutex;
     std::atomic<std::uint64_t> handles{1};
 };
 

@@ -1,8 +1,10 @@
-// What an outside program does first: include everything, convert, and catch what the library throws by the class
-// that its own copy of the headers declares.
+// What an outside program does first: include everything, convert, keep data in a file, and catch what the
+// library throws by the class that its own copy of the headers declares.
 
 #include <kvt/kvt.h>
 
+#include <cstdint>
+#include <cstdio>
 #include <iostream>
 #include <stdexcept>
 #include <string>
@@ -39,12 +41,39 @@ void failsByClass() {
     }
 }
 
+void keepsDataInAFile() {
+    const std::string path = "consumer.kvt";
+    {
+        kvt::ex::mmap::memory_manager manager(path, {65536, true});
+        kvt::ex::mmap::mapped_region_segment segment = manager.create_segment(1);
+        segment.load(false);
+        segment.segment_manager()->construct<int>("number")(42);
+        manager.save({segment.index()});
+        try {
+            segment.segment_manager()->allocate(std::size_t(1) << 40);
+            throw std::runtime_error("a full heap went unnoticed");
+        } catch (const boost::interprocess::bad_alloc&) {
+        }
+    }
+    try {
+        const kvt::ex::mmap::memory_manager manager(path, {std::uint64_t(1) << 30, true});
+        throw std::runtime_error("a file that is too short went unnoticed");
+    } catch (const boost::interprocess::interprocess_exception& failure) {
+        expect(failure.get_error_code() == boost::interprocess::size_error, "the code of a short file");
+    }
+    kvt::ex::mmap::memory_manager manager(path, {65536, true});
+    const kvt::ex::mmap::mapped_region_segment segment = manager.open_segment(manager.restore().front());
+    expect(*segment.segment_manager()->find<int>("number").first == 42, "an object in a file");
+    std::remove(path.c_str());
+}
+
 } // namespace
 
 int main() {
     try {
         converts();
         failsByClass();
+        keepsDataInAFile();
     } catch (const std::runtime_error& failure) {
         std::cerr << "consumer: " << failure.what() << "\n";
         return 1;

@@ -25,11 +25,6 @@ std::string escaped(std::string_view bytes) {
     return text;
 }
 
-bool isSamePlace(const std::string& left, const std::string& right) {
-    std::error_code error;
-    return std::filesystem::weakly_canonical(left, error) == std::filesystem::weakly_canonical(right, error);
-}
-
 // A report that replaces an input or is replaced by the output would be lost work.
 std::unique_ptr<Output> openReport(const ConvertOptions& options) {
     if (options.report.empty()) {

@@ -14,7 +14,8 @@ namespace host {
 
 namespace {
 
-constexpr std::array endingSignals = {SIGINT, SIGTERM, SIGHUP, SIGQUIT};
+// SIGBUS comes when the disk under a mapped file fails.
+constexpr std::array endingSignals = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGBUS};
 
 // Read by the signal handler: paths of files to remove, null where a slot is free.
 std::array<std::atomic<const char*>, 4> removals{};

@@ -1,7 +1,6 @@
 #include "line_reader.h"
 
 #include "byte_order_mark.h"
-#include "failure.h"
 #include "messages.h"
 
 #include <kvt/string/ustring.h>
@@ -25,14 +24,19 @@ std::string shownBytes(const std::string& bytes) {
 
 } // namespace
 
+Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineCounter& places,
+                       const std::string& encodingName) {
+    const LineCounter::Position position = places.at(loss.offset);
+    const Place place{file, loss.offset, position.line, position.column};
+    return Failure(describe(place) + ": " + describe(910002, {shownBytes(loss.bytes), encodingName}));
+}
+
 LineReader::LineReader(const std::string& path, Encoding encoding)
     : input_(path), encodingName_(encoding.getName()), decoder_(encoding, Encoding::Utf8),
       onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }), places_(encoding) {}
 
 void LineReader::refuse(const kvt::ex::Loss& loss) {
-    const LineCounter::Position position = places_.at(loss.offset);
-    const Place place{input_.name(), loss.offset, position.line, position.column};
-    throw Failure(describe(place) + ": " + describe(910002, {shownBytes(loss.bytes), encodingName_}));
+    throw badTextFailure(input_.name(), loss, places_, encodingName_);
 }
 
 bool LineReader::readBlock() {

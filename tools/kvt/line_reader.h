@@ -6,6 +6,7 @@
 // its place. One block and the line that runs over its end are held, no more.
 #pragma once
 
+#include "failure.h"
 #include "input.h"
 #include "line_counter.h"
 
@@ -26,6 +27,10 @@ struct TextLine {
     std::string_view text; ///< without the end
     std::string_view end;  ///< "\n", "\r", "\r\n", or nothing behind the last line
 };
+
+/// The failure of a loss in `file` when bytes that are no text are not to be replaced: the place, and which bytes.
+Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineCounter& places,
+                       const std::string& encodingName);
 
 class LineReader {
 public:

@@ -209,6 +209,15 @@ bool isStandardOutput(const std::string& path) {
     return path.empty() || path == "-";
 }
 
+bool isSamePlace(const std::string& left, const std::string& right) {
+    std::error_code error;
+    // Without the first step, a name alone of what is not there stays as it is.
+    const auto place = [&](const std::string& path) {
+        return fs::weakly_canonical(fs::absolute(path, error), error);
+    };
+    return place(left) == place(right);
+}
+
 std::unique_ptr<Output> openOutput(const std::string& path) {
     if (isStandardOutput(path)) {
         return std::make_unique<StandardOutput>();

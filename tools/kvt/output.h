@@ -25,6 +25,9 @@ public:
 /// "" and "-" are standard output.
 bool isStandardOutput(const std::string& path);
 
+/// Whether two paths lead to the same place, whether or not there is anything.
+bool isSamePlace(const std::string& left, const std::string& right);
+
 std::unique_ptr<Output> openOutput(const std::string& path);
 
 /// Writes `text` to standard output.

@@ -4,23 +4,31 @@
 
 #include <algorithm>
 #include <string>
+#include <utility>
 
 namespace host {
 
 namespace {
 
-constexpr auto interval = std::chrono::milliseconds(100);
+constexpr auto barInterval = std::chrono::milliseconds(100);
+constexpr auto lineInterval = std::chrono::seconds(2);
 constexpr std::size_t barWidth = 40;
 
-std::string mebibytes(std::uint64_t bytes) {
-    return std::to_string(bytes / (1024 * 1024)) + " MiB";
+std::string amount(std::uint64_t bytes) {
+    return bytes < 1024 * 1024 ? std::to_string(bytes) + " bytes"
+                               : std::to_string(bytes / (1024 * 1024)) + " MiB";
 }
 
 } // namespace
 
 Progress::Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, bool allowed)
-    : diagnostics_(diagnostics), total_(total),
-      active_(allowed && diagnostics.canDraw() && (!total || *total >= longInput)) {}
+    : Progress(diagnostics, total, allowed ? Show::LongOnTerminal : Show::Never, {}) {}
+
+Progress::Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, Show show, std::string what)
+    : diagnostics_(diagnostics), total_(total), what_(std::move(what)),
+      active_(show == Show::Always ||
+              (show != Show::Never && diagnostics.canDraw() && (!total || *total >= longInput))),
+      always_(show == Show::Always) {}
 
 Progress::~Progress() {
     diagnostics_.clearStatus();
@@ -28,29 +36,39 @@ Progress::~Progress() {
 
 void Progress::advance(std::uint64_t bytes) {
     done_ += bytes;
-    if (!active_ || (!total_ && done_ < longInput)) {
+    if (!active_ || (!always_ && !total_ && done_ < longInput)) {
         return;
     }
     const auto now = std::chrono::steady_clock::now();
     if (now >= next_) {
-        next_ = now + interval;
+        next_ = now + (diagnostics_.canDraw() ? barInterval : std::chrono::milliseconds(lineInterval));
         draw();
     }
 }
 
 void Progress::draw() {
-    if (!total_) {
-        diagnostics_.drawStatus(mebibytes(done_));
-        return;
+    std::string text = what_;
+    if (!text.empty()) {
+        text.push_back(' ');
     }
     // A file may grow while it is read.
-    const std::uint64_t done = std::min(done_, *total_);
-    const std::size_t filled = static_cast<std::size_t>(done / (*total_ / barWidth + 1));
-    const std::uint64_t percent = done * 100 / *total_;
-    std::string bar = "[";
-    bar.append(filled, '#').append(barWidth - filled, '.').append("] ");
-    bar.append(std::to_string(percent)).append("% of ").append(mebibytes(*total_));
-    diagnostics_.drawStatus(bar);
+    const std::uint64_t done = total_ ? std::min(done_, *total_) : done_;
+    if (total_) {
+        if (diagnostics_.canDraw()) {
+            const std::size_t filled = static_cast<std::size_t>(done / (*total_ / barWidth + 1));
+            text.append("[").append(filled, '#').append(barWidth - filled, '.').append("] ");
+        }
+        const std::uint64_t percent = *total_ == 0 ? 100 : done * 100 / *total_;
+        text.append(std::to_string(percent)).append("% of ").append(amount(*total_));
+    } else {
+        text.append(amount(done));
+    }
+    if (diagnostics_.canDraw()) {
+        diagnostics_.drawStatus(text);
+    } else {
+        diagnostics_.say(text);
+        diagnostics_.flush();
+    }
 }
 
 } // namespace host

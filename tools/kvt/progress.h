@@ -1,9 +1,10 @@
-// A bar on standard error while a long input is read, when that is a terminal.
+// A bar on standard error while a long input is read, when that is a terminal; on demand, lines when it is none.
 #pragma once
 
 #include <chrono>
 #include <cstdint>
 #include <optional>
+#include <string>
 
 namespace host {
 
@@ -11,8 +12,16 @@ class Diagnostics;
 
 class Progress {
 public:
+    enum class Show {
+        Never,
+        LongOnTerminal, ///< a bar, if it is a terminal and the input is long
+        Always,         ///< a bar on a terminal, else a line now and then
+    };
+
     /// `total` is the number of bytes to come, if that is known. Nothing is drawn when `allowed` is false.
     Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, bool allowed);
+    /// `what` is said before the bar.
+    Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, Show show, std::string what);
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;
     /// Takes the bar away.
@@ -29,7 +38,9 @@ private:
 
     Diagnostics& diagnostics_;
     std::optional<std::uint64_t> total_;
+    std::string what_;
     bool active_;
+    bool always_;
     std::uint64_t done_ = 0;
     std::chrono::steady_clock::time_point next_;
 };

@@ -281,4 +281,8 @@ std::unique_ptr<TextOperation> hashText(CaseRule rule) {
     return std::make_unique<Hash>(rule);
 }
 
+void appendFolded(std::string_view text, std::string& out) {
+    append(out, mapped(CaseChange::Fold, text));
+}
+
 } // namespace host

@@ -35,4 +35,8 @@ std::unique_ptr<TextOperation> splitText(const std::string& delimiter, CaseRule 
 std::unique_ptr<TextOperation> stripText(const std::string& set, Side side);
 std::unique_ptr<TextOperation> hashText(CaseRule rule);
 
+/// Appends the form that texts share which differ in case only, by full Unicode case folding. Each character folds
+/// for itself, so that a text may be folded in pieces.
+void appendFolded(std::string_view text, std::string& out);
+
 } // namespace host
