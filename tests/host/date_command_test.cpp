@@ -141,6 +141,68 @@ TEST_F(KvtDate, LinesOfStandardInputKeepTheirNumbers) {
     EXPECT_TRUE(contains(date({"parse", "%H:%M"}, "12-30\n").err, "\n     %H:%M\n       ^\n"));
 }
 
+TEST_F(KvtDate, ParseTakesTheFirstOfSeveralFormatsThatFits) {
+    struct Row {
+        std::vector<std::string> formats;
+        std::string value;
+        std::string result;
+    };
+    for (const Row& row : {Row{{"%d.%m.%Y$", "%Y-%m-%d$", "ISO"}, "31.01.2024", "20240131"},
+                           Row{{"%d.%m.%Y$", "%Y-%m-%d$", "ISO"}, "2024-01-31", "20240131"},
+                           Row{{"%d.%m.%Y$", "%Y-%m-%d$", "ISO"}, "12:30:00", "123000"},
+                           // Both fit, and the order counts.
+                           Row{{"%d/%m/%Y", "%m/%d/%Y"}, "02/01/2024", "20240102"},
+                           Row{{"%m/%d/%Y", "%d/%m/%Y"}, "02/01/2024", "20240201"},
+                           Row{{"%m/%d/%Y", "%d/%m/%Y"}, "31/01/2024", "20240131"},
+                           // A day that there is not does not end the search.
+                           Row{{"%Y/%m/%d", "%Y/%m/3%e"}, "2024/02/31", "20240201"},
+                           Row{{"%m.%d.%Y", "%d.%m.%Y"}, "2.30.2024", ""}}) {
+        std::vector<std::string> arguments = {"parse", row.value, row.formats.front()};
+        std::vector<std::string> fromInput = {"parse", row.formats.front()};
+        for (std::size_t i = 1; i < row.formats.size(); ++i) {
+            for (std::vector<std::string>* line : {&arguments, &fromInput}) {
+                line->insert(line->end(), {"--or", row.formats[i]});
+            }
+        }
+        EXPECT_EQ(date(arguments).out, row.result.empty() ? "" : row.result + "\n") << row.value;
+        EXPECT_EQ(date(fromInput, row.value + "\n").out, row.result + "\n") << row.value;
+    }
+    // Before the format or behind it.
+    EXPECT_EQ(date({"parse", "--or", "%Y", "--or", "%H:%M", "x", "%d"}).status, 2);
+    EXPECT_EQ(date({"parse", "--or", "%Y", "--or", "%H:%M", "12:30", "%d.%m."}).out, "123000\n");
+    EXPECT_EQ(date({"parse", "2024-02-30", "%d.%m.%Y", "--or", "%Y-%m-%d", "--lenient"}).out, "20240301\n");
+}
+
+TEST_F(KvtDate, AValueThatNoFormatFitsIsReportedByTheOneThatItFitsBest) {
+    struct Row {
+        std::string value;
+        std::string error;
+    };
+    const std::string longest =
+        "The value fits the format up to \"%Y-%m\" but not where the format goes on with "
+        "\"-%d\". (933067)\n     %Y-%m-%d\n          ^\n";
+    for (const Row& row :
+         {// Further into its pattern than into another.
+          Row{"2024-01/31", longest},
+          // All of a pattern, but a day that there is not.
+          Row{"2024-02-30",
+              "By the format \"%Y-%m-%d\", the value is a day that the calendar does not have. (933090)\n"},
+          // Into none: the first speaks.
+          Row{"x", "The value fits the format up to \"\" but not where the format goes on with \"%d.%m.%Y\". "
+                   "(933067)\n     %d.%m.%Y\n     ^\n"},
+          Row{" ", "The value is empty.\n"}}) {
+        EXPECT_EQ(
+            date({"parse", row.value, "%d.%m.%Y", "--or", "ISO", "--or", "%Y-%m-%d", "--or", "%d/%m"}).err,
+            "kvt: " + row.error);
+    }
+    // A format that is wrong in itself is said where nothing else fits.
+    EXPECT_TRUE(contains(date({"parse", "x", "%H", "--or", "%q"}).err, "(933079)"));
+    EXPECT_EQ(date({"parse", "12", "%H", "--or", "%q"}).out, "120000\n");
+    // As JSON, too.
+    EXPECT_TRUE(contains(date({"parse", "30.02.2024", "ISO", "--or", "%d.%m.%Y", "--json"}).out,
+                         "\"number\":933090"));
+}
+
 TEST_F(KvtDate, LinesComeOutAsTheyGoIn) {
     std::size_t sent = 0;
     std::size_t results = 0;

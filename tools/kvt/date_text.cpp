@@ -3,6 +3,9 @@
 #include "date_function.h"
 
 #include <kvt/datetime/datetime.h>
+#include <kvt/datetime/message_numbers.h>
+
+#include <limits>
 
 namespace host {
 
@@ -13,29 +16,63 @@ using kvt::ex::UString;
 
 constexpr const char* emptyValue = "The value is empty.";
 
+// How well a value fits a format that it failed by, for the choice among several: by how much of a pattern it fits, and
+// best where the pattern is not what it failed by, as on 30 February.
+std::size_t howWellItFits(const DateOutcome& failure) {
+    namespace message_number = datetime::message_number;
+    if (!failure.message || failure.message->number == message_number::noKeywordMatched) {
+        return 0;
+    }
+    return failure.message->number == message_number::formatMismatch
+               ? failure.message->parameters.at(0).size()
+               : std::numeric_limits<std::size_t>::max();
+}
+
 class ParseFunction : public ValueFunction {
 public:
     ParseFunction()
         : ValueFunction({"parse", "Read a value in any form", R"(kvt date parse '31 Jan 2020' '%d %b %Y'
 kvt date parse 2020-01-31T12:30:00Z ISO
-cut -f 3 log.tsv | kvt date parse 'ZQT|ISO')",
+cut -f 3 log.tsv | kvt date parse 'ZQT|ISO' --or '%d.%m.%Y$' --or '%d %b %Y$')",
                          "VALUE", "FORMAT",
                          "A pattern such as '%Y-%m-%d', or the keywords ZQT and ISO, '|' between "
                          "them"}) {}
 
 private:
     void declareOptions(CLI::App& app) override {
+        app.add_option(
+               "--or", others_,
+               "Another FORMAT for values that FORMAT does not fit; may be given several times, and the "
+               "first that fits is taken. A value that fits none is reported by the one that it fits best")
+            ->type_name("FORMAT")
+            ->allow_extra_args(false); // one FORMAT for each --or, however many stand behind it
         app.add_flag("--lenient", lenient_,
                      "Let parts run over into the next larger one: 30 February is in March");
     }
-    void prepare(const std::string& operand) override { format_ = toUString(operand); }
+    void prepare(const std::string& operand) override {
+        formats_ = {toUString(operand)};
+        for (const std::string& other : others_) {
+            formats_.push_back(toUString(other));
+        }
+    }
     DateOutcome apply(const UString<0>& value) override {
-        DateOutcome outcome = outcomeOf(datetime::parse(value, format_, lenient_));
+        DateOutcome best = read(value, formats_.front());
+        for (auto format = formats_.begin() + 1; format != formats_.end() && !best.isGood(); ++format) {
+            DateOutcome outcome = read(value, *format);
+            if (outcome.isGood() || howWellItFits(outcome) > howWellItFits(best)) {
+                best = std::move(outcome);
+            }
+        }
+        return best;
+    }
+    DateOutcome read(const UString<0>& value, const UString<0>& format) const {
+        DateOutcome outcome = outcomeOf(datetime::parse(value, format, lenient_));
         outcome.withoutMessage = emptyValue;
         return outcome;
     }
 
-    UString<0> format_;
+    std::vector<std::string> others_;
+    std::vector<UString<0>> formats_;
     bool lenient_ = false;
 };
 
