@@ -168,7 +168,7 @@ void saveAndRestore(benchmark::State& state) {
     const std::string path = scratchFile();
     {
         memory_manager manager(path, {segmentSize, true});
-        const kvt::ex::vector<std::uint64_t> root(static_cast<std::uint64_t>(state.range(0)), 7);
+        const kvt::ex::vector<unsigned long long> root(static_cast<std::uint64_t>(state.range(0)), 7);
         for (auto _ : state) {
             manager.save(root);
             benchmark::DoNotOptimize(manager.restore().size());

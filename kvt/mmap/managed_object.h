@@ -7,7 +7,6 @@
 #include <kvt/mmap/mapped_region_segment.h>
 #include <kvt/mmap/memory_registrar.h>
 
-#include <cstdint>
 #include <memory>
 #include <mutex>
 #include <utility>
@@ -47,7 +46,7 @@ public:
     }
 
     /// Flushes and unmaps the segment. Gives its size in bytes, 0 when it was not mapped.
-    std::uint64_t release_memory() { return impl_->release_memory(); }
+    unsigned long long release_memory() { return impl_->release_memory(); }
 
 private:
     struct impl final : object_mgr {
@@ -62,15 +61,15 @@ private:
             return *object;
         }
 
-        std::uint64_t release_memory() override {
+        unsigned long long release_memory() override {
             object = nullptr;
             return segment.release();
         }
 
         mapped_region_segment segment;
-        std::mutex mutex;           // for a host that shares the object; the library does not take it
-        T* object = nullptr;        // null until it is found
-        std::uint64_t reserved = 0; // without a meaning yet
+        std::mutex mutex;                // for a host that shares the object; the library does not take it
+        T* object = nullptr;             // null until it is found
+        unsigned long long reserved = 0; // without a meaning yet
     };
 
     std::unique_ptr<impl> impl_;

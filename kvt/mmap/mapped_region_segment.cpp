@@ -21,15 +21,15 @@ int descriptorOf(const ipc::file_mapping& mapping) {
     return mapping.get_mapping_handle().handle;
 }
 
-void requireWithinFile(const ipc::file_mapping& mapping, std::int64_t offset, std::uint64_t size) {
-    const std::int64_t end = platform::fileSize(descriptorOf(mapping));
-    if (offset < 0 || size == 0 || end < offset || static_cast<std::uint64_t>(end - offset) < size) {
+void requireWithinFile(const ipc::file_mapping& mapping, long long offset, unsigned long long size) {
+    const long long end = platform::fileSize(descriptorOf(mapping));
+    if (offset < 0 || size == 0 || end < offset || static_cast<unsigned long long>(end - offset) < size) {
         throw ipc::interprocess_exception(ipc::error_info(ipc::size_error));
     }
 }
 
 // A new heap writes to the first page, and to the last one, which got its room when the file grew.
-void takeRoomForHeap(const ipc::file_mapping& mapping, std::int64_t offset) {
+void takeRoomForHeap(const ipc::file_mapping& mapping, long long offset) {
     const int error = platform::writeZero(descriptorOf(mapping), offset);
     if (error != 0) {
         throw ipc::interprocess_exception(ipc::error_info(error));
@@ -39,9 +39,9 @@ void takeRoomForHeap(const ipc::file_mapping& mapping, std::int64_t offset) {
 } // namespace
 
 struct mapped_region_segment::segment_state {
-    std::int64_t offset = -1;
-    std::uint64_t size = 0;
-    std::uint64_t index = k_no_index;
+    long long offset = -1;
+    unsigned long long size = 0;
+    unsigned long long index = k_no_index;
     bool initialised = false; // the stretch holds a heap; never taken back
     std::unique_ptr<ipc::mapped_region> region;
     const ipc::file_mapping* mapping = nullptr;
@@ -49,8 +49,8 @@ struct mapped_region_segment::segment_state {
 
 mapped_region_segment::mapped_region_segment() : state_(std::make_unique<segment_state>()) {}
 
-mapped_region_segment::mapped_region_segment(const ipc::file_mapping* mapping, std::int64_t offset,
-                                             std::uint64_t size, std::uint64_t index)
+mapped_region_segment::mapped_region_segment(const ipc::file_mapping* mapping, long long offset,
+                                             unsigned long long size, unsigned long long index)
     : mapped_region_segment() {
     state_->offset = offset;
     state_->size = size;
@@ -89,7 +89,7 @@ void mapped_region_segment::load(bool initialised) {
     }
 }
 
-std::uint64_t mapped_region_segment::release() {
+unsigned long long mapped_region_segment::release() {
     if (buffer_ == nullptr) {
         return 0;
     }
@@ -102,16 +102,19 @@ std::uint64_t mapped_region_segment::release() {
     return state_->size;
 }
 
-std::int64_t mapped_region_segment::offset() const noexcept {
+long long mapped_region_segment::offset() const noexcept {
     return state_ != nullptr ? state_->offset : -1;
 }
 
-std::uint64_t mapped_region_segment::size() const noexcept {
+unsigned long long mapped_region_segment::size() const noexcept {
     return state_ != nullptr ? state_->size : 0xFFFFFFFF;
 }
 
-std::uint64_t mapped_region_segment::index() const noexcept {
-    return state_ != nullptr ? state_->index : k_no_index;
+unsigned long long mapped_region_segment::index() const noexcept {
+    if (state_ == nullptr) {
+        return k_no_index;
+    }
+    return state_->index;
 }
 
 segment_heap::segment_manager* mapped_region_segment::segment_manager() const noexcept {

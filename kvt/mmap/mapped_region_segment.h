@@ -21,7 +21,6 @@
 #include <boost/interprocess/offset_ptr.hpp>
 #include <boost/interprocess/sync/mutex_family.hpp>
 
-#include <cstdint>
 #include <memory>
 
 namespace boost::interprocess {
@@ -35,7 +34,7 @@ using segment_heap = boost::interprocess::basic_managed_external_buffer<
     char,
     boost::interprocess::rbtree_best_fit<
         boost::interprocess::null_mutex_family,
-        boost::interprocess::offset_ptr<void, std::int64_t, std::uint64_t,
+        boost::interprocess::offset_ptr<void, long long, unsigned long long,
                                         boost::interprocess::offset_type_alignment>>,
     boost::interprocess::iset_index>;
 
@@ -50,7 +49,7 @@ static_assert(
     "so files would not be readable across versions");
 
 /// The index of a segment that stands in no table.
-inline constexpr std::uint64_t k_no_index = 0xFFFFFFFF;
+inline constexpr unsigned long long k_no_index = 0xFFFFFFFF;
 
 /// Nothing here takes a lock: a segment and what is in it are used by one thread at a time.
 ///
@@ -64,8 +63,8 @@ public:
     mapped_region_segment();
     /// `size` bytes of the file of `mapping` at `offset`, a multiple of the page size. It is not mapped yet, and
     /// counts as holding no heap. `mapping` is not owned; it must exist whenever the segment is loaded.
-    mapped_region_segment(const boost::interprocess::file_mapping* mapping, std::int64_t offset,
-                          std::uint64_t size, std::uint64_t index);
+    mapped_region_segment(const boost::interprocess::file_mapping* mapping, long long offset,
+                          unsigned long long size, unsigned long long index);
     /// A moved-from segment may be destroyed or assigned to, and asked for its offset (-1), size (0xFFFFFFFF) and index
     /// (k_no_index).
     mapped_region_segment(mapped_region_segment&& other) noexcept;
@@ -90,14 +89,14 @@ public:
     /// Unmaps the stretch; all pointers into it become invalid. If anything is allocated in the heap, waits until all
     /// that was written is on the disk; a failure of that is not reported. This is the one way to see to it that a
     /// segment is there after a loss of power. Gives the segment's size in bytes, or 0 when it was not loaded.
-    std::uint64_t release();
+    unsigned long long release();
 
     /// Where the stretch begins, in bytes from the beginning of the file.
-    std::int64_t offset() const noexcept;
+    long long offset() const noexcept;
     /// How long it is, in bytes.
-    std::uint64_t size() const noexcept;
+    unsigned long long size() const noexcept;
     /// Its index for memory_manager::open_segment, or k_no_index.
-    std::uint64_t index() const noexcept;
+    unsigned long long index() const noexcept;
     /// The heap, null while the segment is not loaded. It stands at the beginning of the mapped memory.
     segment_heap::segment_manager* segment_manager() const noexcept;
 

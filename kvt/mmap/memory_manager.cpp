@@ -14,7 +14,7 @@ namespace {
 using Lock = std::lock_guard<std::mutex>;
 }
 
-const std::uint64_t manager_options::k_default_segment_size;
+const unsigned long long manager_options::k_default_segment_size;
 
 memory_manager::memory_manager(const std::string& path, const manager_options& options)
     : PimplShared(memory_manager_impl(path, options)) {}
@@ -29,18 +29,18 @@ bool memory_manager::persistent() const {
     return d().impl.options().persistent;
 }
 
-void memory_manager::save(const ex::vector<std::uint64_t>& words) {
+void memory_manager::save(const ex::vector<unsigned long long>& words) {
     const Lock lock(d().mutex);
     d().impl.save(words);
 }
 
-ex::vector<std::uint64_t> memory_manager::restore() {
+ex::vector<unsigned long long> memory_manager::restore() {
     const Lock lock(d().mutex);
     return d().impl.restore();
 }
 
-mapped_region_segment memory_manager::load_segment(std::uint64_t index,
-                                                   future::optional<std::uint64_t> size) {
+mapped_region_segment memory_manager::load_segment(unsigned long long index,
+                                                   future::optional<unsigned long long> size) {
     const Lock lock(d().mutex);
     return d().impl.load_segment(index, size);
 }

@@ -15,7 +15,6 @@
 #include <kvt/foundation/vector.h>
 #include <kvt/mmap/mapped_region_segment.h>
 
-#include <cstdint>
 #include <mutex>
 #include <string>
 
@@ -26,11 +25,11 @@ namespace mmap {
 class memory_manager_impl;
 
 struct KVT_EXPORT manager_options {
-    static const std::uint64_t k_default_segment_size = 16777216;
+    static const unsigned long long k_default_segment_size = 16777216;
 
     /// Bytes of a segment that is created without a size of its own, and of the header segment. Rounded up to whole
     /// pages by the manager; 0 stays 0.
-    std::uint64_t segment_size = k_default_segment_size;
+    unsigned long long segment_size = k_default_segment_size;
     /// The file outlives the manager and holds a header.
     bool persistent = false;
 };
@@ -99,18 +98,18 @@ public:
     ///
     /// Throws boost::interprocess::bad_alloc, whose text is "boost::interprocess::bad_alloc", when the header's heap is
     /// full, which never grows: the queue may then have got a last vector with only some of the words, or none.
-    void save(const ex::vector<std::uint64_t>& words);
+    void save(const ex::vector<unsigned long long>& words);
 
     /// Takes the oldest vector out of the queue and gives it; an empty one when there is none, and on a temporary
     /// manager. Each vector comes out once, in whatever run; an empty result may also be an empty vector saved.
-    ex::vector<std::uint64_t> restore();
+    ex::vector<unsigned long long> restore();
 
     /// The segment with an index: on a persistent manager the one that the table has, loaded. On a temporary manager,
     /// and for k_no_index, a new segment as by create_segment().
     ///
     /// Throws std::out_of_range "memory_manager: segment index out of range" when the table is shorter, and as
     /// mapped_region_segment::load() does.
-    mapped_region_segment open_segment(std::uint64_t index) { return load_segment(index, {}); }
+    mapped_region_segment open_segment(unsigned long long index) { return load_segment(index, {}); }
 
     /// A new segment at the end of the file, of `size` bytes rounded up to whole pages, by default
     /// options().segment_size. It is not mapped; load(false) maps it and makes its heap. On a persistent manager it
@@ -119,12 +118,12 @@ public:
     /// When the file cannot be made longer, the segment has the offset -1, and so has its row in the table: loading it
     /// throws. Throws boost::interprocess::bad_alloc when the header has no room for the row; the file has then
     /// grown for nothing.
-    mapped_region_segment create_segment(future::optional<std::uint64_t> size = {}) {
+    mapped_region_segment create_segment(future::optional<unsigned long long> size = {}) {
         return load_segment(k_no_index, size);
     }
 
 private:
-    mapped_region_segment load_segment(std::uint64_t index, future::optional<std::uint64_t> size);
+    mapped_region_segment load_segment(unsigned long long index, future::optional<unsigned long long> size);
 };
 
 } // namespace mmap

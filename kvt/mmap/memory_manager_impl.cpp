@@ -15,8 +15,8 @@ namespace ipc = boost::interprocess;
 namespace {
 
 // Unsigned arithmetic: 0 stays 0 with any page size that is a power of two.
-std::uint64_t roundedToPages(std::uint64_t bytes) {
-    const std::uint64_t page = platform::pageSize();
+unsigned long long roundedToPages(unsigned long long bytes) {
+    const unsigned long long page = platform::pageSize();
     return ((bytes - 1) / page + 1) * page;
 }
 
@@ -86,9 +86,9 @@ mapped_region_segment memory_manager_impl::headerOfNewFile(bool hasItsLength) {
 mapped_region_segment memory_manager_impl::headerOfOldFile() {
     const int file = descriptorOf(*mapping_);
     mapped_region_segment segment = segmentAt({0, options_.segment_size}, 0);
-    const std::int64_t length = platform::fileSize(file);
+    const long long length = platform::fileSize(file);
     const bool isWhole =
-        segment.size() > 0 && length >= 0 && static_cast<std::uint64_t>(length) >= segment.size();
+        segment.size() > 0 && length >= 0 && static_cast<unsigned long long>(length) >= segment.size();
     if (!isWhole || !platform::holdsZerosOnly(file, 0, segment.size())) {
         segment.load(true);
     }
@@ -96,16 +96,16 @@ mapped_region_segment memory_manager_impl::headerOfOldFile() {
 }
 
 mapped_region_segment memory_manager_impl::segmentAt(const segment_record& record,
-                                                     std::uint64_t index) const {
+                                                     unsigned long long index) const {
     return mapped_region_segment(mapping_.get(), record.offset, record.size, index);
 }
 
 // The end of the file, and not the table, says where the segment goes.
-mapped_region_segment memory_manager_impl::createSegment(const future::optional<std::uint64_t>& size) {
+mapped_region_segment memory_manager_impl::createSegment(const future::optional<unsigned long long>& size) {
     segment_record record{};
     record.size = size ? roundedToPages(*size) : options_.segment_size;
     record.offset = platform::growFile(path_.c_str(), record.size);
-    std::uint64_t index = k_no_index;
+    unsigned long long index = k_no_index;
     if (header_ != nullptr) {
         auto& table = header_->access()->segment_table;
         index = table.size();
@@ -114,8 +114,8 @@ mapped_region_segment memory_manager_impl::createSegment(const future::optional<
     return segmentAt(record, index);
 }
 
-mapped_region_segment memory_manager_impl::load_segment(std::uint64_t index,
-                                                        const future::optional<std::uint64_t>& size) {
+mapped_region_segment memory_manager_impl::load_segment(unsigned long long index,
+                                                        const future::optional<unsigned long long>& size) {
     if (header_ != nullptr) {
         const auto& table = header_->access()->segment_table;
         if (index < table.size()) {
@@ -130,7 +130,7 @@ mapped_region_segment memory_manager_impl::load_segment(std::uint64_t index,
     return createSegment(size);
 }
 
-void memory_manager_impl::save(const ex::vector<std::uint64_t>& words) {
+void memory_manager_impl::save(const ex::vector<unsigned long long>& words) {
     if (header_ == nullptr) {
         return;
     }
@@ -139,7 +139,7 @@ void memory_manager_impl::save(const ex::vector<std::uint64_t>& words) {
     queue.back().assign(words.begin(), words.end());
 }
 
-ex::vector<std::uint64_t> memory_manager_impl::restore() {
+ex::vector<unsigned long long> memory_manager_impl::restore() {
     if (header_ == nullptr) {
         return {};
     }
@@ -147,7 +147,7 @@ ex::vector<std::uint64_t> memory_manager_impl::restore() {
     if (queue.empty()) {
         return {};
     }
-    ex::vector<std::uint64_t> words(queue.front().begin(), queue.front().end());
+    ex::vector<unsigned long long> words(queue.front().begin(), queue.front().end());
     queue.pop_front();
     return words;
 }

@@ -16,13 +16,13 @@ void MemoryRegistrar::registerManager(mmap::object_mgr*) {}
 
 void MemoryRegistrar::deregisterManager(mmap::object_mgr*) {}
 
-std::uint64_t MemoryRegistrar::freeMemory(std::uint64_t) {
+unsigned long long MemoryRegistrar::freeMemory(unsigned long long) {
     return 0;
 }
 
-const std::int64_t FileManager::npos;
-const std::uint64_t FileManager::alignment;
-const std::int64_t FileManager::growth_size;
-const std::int64_t FileManager::max_file_size;
+const long long FileManager::npos;
+const unsigned long long FileManager::alignment;
+const long long FileManager::growth_size;
+const long long FileManager::max_file_size;
 
 } // namespace kvt::ex

@@ -6,8 +6,6 @@
 
 #include <kvt/foundation/export.h>
 
-#include <cstdint>
-
 namespace kvt::ex {
 
 namespace mmap {
@@ -20,7 +18,7 @@ public:
     object_mgr& operator=(const object_mgr&) = default;
     virtual ~object_mgr();
     /// Gives the object's memory back and says how many bytes that were, 0 when there was nothing to give.
-    virtual std::uint64_t release_memory() = 0;
+    virtual unsigned long long release_memory() = 0;
 };
 
 } // namespace mmap
@@ -41,21 +39,21 @@ public:
     /// Does nothing.
     static void deregisterManager(mmap::object_mgr* manager);
     /// Frees nothing, whatever is asked for: 0.
-    static std::uint64_t freeMemory(std::uint64_t bytes);
+    static unsigned long long freeMemory(unsigned long long bytes);
 };
 
 /// Constants of backing files. No code of the library reads them.
 class KVT_EXPORT FileManager {
 public:
     /// No position.
-    static const std::int64_t npos = -1;
+    static const long long npos = -1;
     /// Bytes to which a stretch of a file is aligned.
-    static const std::uint64_t alignment = 16;
+    static const unsigned long long alignment = 16;
 
 private:
-    static const std::int64_t growth_size = 16777216;
+    static const long long growth_size = 16777216;
     // The largest multiple of growth_size below 2 to the 63rd.
-    static const std::int64_t max_file_size = 0x7FFFFFFFFF000000;
+    static const long long max_file_size = 0x7FFFFFFFFF000000;
 };
 
 } // namespace kvt::ex

@@ -17,8 +17,8 @@ using ex::mmap::manager_options;
 using ex::mmap::mapped_region_segment;
 using ex::mmap::memory_manager;
 
-ex::vector<std::uint64_t> words(std::uint64_t count) {
-    ex::vector<std::uint64_t> made;
+ex::vector<unsigned long long> words(std::uint64_t count) {
+    ex::vector<unsigned long long> made;
     for (std::uint64_t word = 0; word < count; ++word) {
         made.push_back(word);
     }

@@ -130,7 +130,7 @@ TEST_F(Flushing, NothingElseFlushes) {
     } // taken down with something in its header
     EXPECT_TRUE(flushes.empty());
     memory_manager other(scratch.file("other"), {65536, true});
-    EXPECT_EQ(other.restore(), ex::vector<std::uint64_t>({4}));
+    EXPECT_EQ(other.restore(), ex::vector<unsigned long long>({4}));
 }
 
 } // namespace

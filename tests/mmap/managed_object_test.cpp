@@ -155,7 +155,7 @@ TEST_F(ManagedObject, FailuresOfTheSegmentComeThrough) {
 
 class Hoarder : public object_mgr {
 public:
-    std::uint64_t release_memory() override {
+    unsigned long long release_memory() override {
         ++asked;
         return 1000;
     }
@@ -207,8 +207,8 @@ TEST(MemoryRegistrar, AssignmentGivesTheObject) {
 }
 
 TEST(FileManager, HasItsConstants) {
-    static_assert(std::is_same_v<decltype(FileManager::npos), const std::int64_t>);
-    static_assert(std::is_same_v<decltype(FileManager::alignment), const std::uint64_t>);
+    static_assert(std::is_same_v<decltype(FileManager::npos), const long long>);
+    static_assert(std::is_same_v<decltype(FileManager::alignment), const unsigned long long>);
     const auto read = [](const auto& constant) { return constant; }; // by address, from the library
     EXPECT_EQ(read(FileManager::npos), -1);
     EXPECT_EQ(read(FileManager::alignment), 16u);

@@ -26,7 +26,7 @@ namespace fs = std::filesystem;
 namespace ipc = boost::interprocess;
 using ex::mmap::mapped_region_segment;
 using ex::mmap::memory_manager;
-using Words = ex::vector<std::uint64_t>;
+using Words = ex::vector<unsigned long long>;
 using MemoryManagerFailure = MemoryManager;
 
 // Files of this process cannot grow beyond a length, for as long as this lives.

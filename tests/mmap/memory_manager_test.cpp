@@ -41,10 +41,10 @@ using ex::mmap::k_no_index;
 using ex::mmap::manager_options;
 using ex::mmap::mapped_region_segment;
 using ex::mmap::memory_manager;
-using Words = ex::vector<std::uint64_t>;
+using Words = ex::vector<unsigned long long>;
 
 mapped_region_segment loadSegment(memory_manager& manager, std::uint64_t index,
-                                  future::optional<std::uint64_t> size = {}) {
+                                  future::optional<unsigned long long> size = {}) {
     return (manager.*memberOf(LoadSegment()))(index, size);
 }
 
@@ -63,7 +63,7 @@ const std::string indexOutOfRange = "memory_manager: segment index out of range"
 
 TEST(ManagerOptions, AreAnAggregateWithDefaults) {
     static_assert(std::is_aggregate_v<manager_options>);
-    static_assert(std::is_same_v<decltype(manager_options::segment_size), std::uint64_t>);
+    static_assert(std::is_same_v<decltype(manager_options::segment_size), unsigned long long>);
     static_assert(std::is_same_v<decltype(manager_options::persistent), bool>);
     static_assert(manager_options::k_default_segment_size == 16777216);
     const manager_options defaults;

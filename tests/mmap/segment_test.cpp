@@ -73,7 +73,7 @@ TEST(MappedRegionSegmentType, IsMovedWithoutFailureAndNeverCopied) {
     static_assert(std::is_nothrow_move_assignable_v<mapped_region_segment>);
     static_assert(sizeof(mapped_region_segment) == 2 * sizeof(void*));
     static_assert(sizeof(segment_heap) == sizeof(void*));
-    static_assert(std::is_same_v<decltype(k_no_index), const std::uint64_t>);
+    static_assert(std::is_same_v<decltype(k_no_index), const unsigned long long>);
     EXPECT_EQ(k_no_index, 0xFFFFFFFFu);
 }
 

@@ -69,11 +69,11 @@ inline Words wordsOf(Word tag, std::size_t count) {
     return words;
 }
 
-inline ex::vector<Word> toSave(const Words& words) {
+inline ex::vector<unsigned long long> toSave(const Words& words) {
     return {words.begin(), words.end()};
 }
 
-inline Words taken(const ex::vector<Word>& words) {
+inline Words taken(const ex::vector<unsigned long long>& words) {
     return {words.begin(), words.end()};
 }
 

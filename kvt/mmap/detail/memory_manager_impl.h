@@ -10,7 +10,6 @@
 #include <boost/container/deque.hpp>
 #include <boost/interprocess/file_mapping.hpp>
 
-#include <cstdint>
 #include <memory>
 #include <string>
 
@@ -20,12 +19,12 @@ class memory_manager_impl {
 public:
     template <typename T>
     using segment_deque = boost::container::deque<T, segment_allocator<T>>;
-    using saved_words = segment_deque<std::uint64_t>;
+    using saved_words = segment_deque<unsigned long long>;
 
     // A row of the table of segments, as it stands in the file.
     struct segment_record {
-        std::int64_t offset; // from the beginning of the file; -1: the file could not grow for it
-        std::uint64_t size;
+        long long offset; // from the beginning of the file; -1: the file could not grow for it
+        unsigned long long size;
     };
 
     // The one named object of a persistent file, as it stands in the file.
@@ -44,16 +43,17 @@ public:
     ~memory_manager_impl();
 
     const manager_options& options() const noexcept { return options_; }
-    void save(const ex::vector<std::uint64_t>& words);
-    ex::vector<std::uint64_t> restore();
-    mapped_region_segment load_segment(std::uint64_t index, const future::optional<std::uint64_t>& size);
+    void save(const ex::vector<unsigned long long>& words);
+    ex::vector<unsigned long long> restore();
+    mapped_region_segment load_segment(unsigned long long index,
+                                       const future::optional<unsigned long long>& size);
 
 private:
     void openMapping(bool removeOnFailure);
     mapped_region_segment headerOfNewFile(bool hasItsLength);
     mapped_region_segment headerOfOldFile();
-    mapped_region_segment segmentAt(const segment_record& record, std::uint64_t index) const;
-    mapped_region_segment createSegment(const future::optional<std::uint64_t>& size);
+    mapped_region_segment segmentAt(const segment_record& record, unsigned long long index) const;
+    mapped_region_segment createSegment(const future::optional<unsigned long long>& size);
 
     std::string path_;
     std::unique_ptr<boost::interprocess::file_mapping> mapping_; // segments hold its address
