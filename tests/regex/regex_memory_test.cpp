@@ -21,14 +21,18 @@ const UString<0> pattern("(a|b)+[c-e]{2,3}(?=f)");
 class RegexMemory : public ::testing::Test {
 protected:
     RegexMemory() {
+        runOnce();
+        before_ = livingBlocks();
+    }
+    ~RegexMemory() override { EXPECT_EQ(livingBlocks(), before_) << "something was not released"; }
+
+    static void runOnce() {
         const URegex<0> regex(pattern);
         regex.search("abccf");
         regex.match("abccf");
         errorOf([] { URegex<0> bad("(a"); });
         errorOf([] { ObsoleteRegexp bad("[a"); });
-        before_ = livingBlocks();
     }
-    ~RegexMemory() override { EXPECT_EQ(livingBlocks(), before_) << "something was not released"; }
 
     static std::ptrdiff_t blocksOf(const std::function<void()>& operation) {
         const std::ptrdiff_t before = livingBlocks();
