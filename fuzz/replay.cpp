@@ -38,6 +38,7 @@ std::vector<std::string> readAll(const std::vector<fs::path>& paths) {
     }
     std::sort(files.begin(), files.end());
     std::vector<std::string> inputs;
+    inputs.reserve(files.size());
     for (const fs::path& file : files) {
         inputs.push_back(contents(file));
     }
