@@ -7,6 +7,7 @@ namespace kvt::test {
 
 namespace {
 
+using namespace std::string_literals;
 using Strings = std::vector<std::string>;
 
 } // namespace
@@ -39,6 +40,9 @@ TEST_F(KvtMatch, PrintsTheLinesOrTheGroups) {
         {__LINE__, {"b"}, "ab", "ab\n"},
         {__LINE__, {"b"}, "b\r\nc\rb\rb\n\rb", "b\r\nb\rb\nb\n"},
         {__LINE__, {"--", "-a"}, "x-a\n", "x-a\n"},
+        {__LINE__, {"^a.b$"}, "b\na\0b\r\n\0\n"s, "a\0b\r\n"s},
+        {__LINE__, {"--groups", "\\x00(b)"}, "a\0b\n"s, "1:0:1:2:\0b\n1:1:2:1:b\n"s},
+        {__LINE__, {"--dialect", "legacy", "b$"}, "b\0\na\0b"s, "a\0b\n"s},
         {__LINE__,
          {"--groups", "a(b)?c"},
          "x\nxac abc\nabc\n",

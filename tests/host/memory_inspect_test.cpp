@@ -216,6 +216,8 @@ TEST_F(KvtMemoryInspect, FilesOfAnotherKindAreRefused) {
     write("text", std::string(100000, 'x'));
     EXPECT_EQ(failureOf("text"),
               "kvt: text: it does not begin with a heap; it is no persistent file of segments\n");
+    EXPECT_EQ(failureOf(KVT_PROGRAM),
+              "kvt: " KVT_PROGRAM ": it does not begin with a heap; it is no persistent file of segments\n");
     {
         memory_manager temporary(path("temporary"), {});
         mapped_region_segment segment = temporary.create_segment(4096);
@@ -233,6 +235,29 @@ TEST_F(KvtMemoryInspect, ACutHeaderIsRefused) {
     std::filesystem::resize_file(path("file"), 40000);
     EXPECT_EQ(failureOf("file"),
               "kvt: file: it has 40000 bytes, less than its header segment of 65536 bytes\n");
+}
+
+TEST_F(KvtMemoryInspect, AFileMayBeCutAnywhere) {
+    writeFile();
+    const std::string whole = read("file");
+    ASSERT_EQ(whole.size(), 139264u);
+    for (const std::size_t length : {1u, 127u, 128u, 200u, 4096u, 65535u}) {
+        write("file", whole.substr(0, length));
+        const std::string failure = failureOf("file");
+        const std::string text = length < 128
+                                     ? "kvt: file: it is too short for a persistent file of segments: "
+                                     : "kvt: file: it has " + std::to_string(length) +
+                                           " bytes, less than its header segment of 65536 bytes\n";
+        EXPECT_TRUE(failure.starts_with(text)) << failure;
+    }
+    for (const std::size_t length : {65536u, 65537u, 131071u, 131072u, 139263u}) {
+        write("file", whole.substr(0, length));
+        const nlohmann::json report = inspect({"file"}, 1);
+        EXPECT_EQ(report["segments"][0]["state"], length < 131072 ? "cut off" : "heap") << length;
+        EXPECT_EQ(report["segments"][1]["state"], "cut off") << length;
+        EXPECT_EQ(report["unaccounted"], 0) << length;
+        EXPECT_EQ(report["savedVectors"], 2) << length;
+    }
 }
 
 // Every word of the head, the object and its lists, one after the other, is set to what is likely to lead astray.

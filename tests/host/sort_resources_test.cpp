@@ -36,10 +36,10 @@ protected:
         std::uint64_t state = 1;
         std::uint64_t sumIn = 0;
         std::string piece;
-        std::size_t made_ = 0;
+        std::size_t sent = 0;
         made.makeInput = [&]() -> std::string_view {
             piece.clear();
-            for (; made_ < lines && piece.size() < 60000; ++made_) {
+            for (; sent < lines && piece.size() < 60000; ++sent) {
                 state = state * 6364136223846793005u + 1442695040888963407u;
                 const std::uint64_t value = state >> 24;
                 sumIn += value;
@@ -76,7 +76,7 @@ protected:
         return result;
     }
 
-    // Waits until the file has as many bytes, of whatever name it is.
+    // Waits until there is a file with something in it, of whatever name.
     void waitForWorkspace() {
         for (int tries = 0; tries < 2000; ++tries) {
             for (const auto& entry : std::filesystem::directory_iterator(scratch())) {
@@ -183,7 +183,7 @@ TEST_F(KvtSortResources, AHugeLinePassesInBoundedMemory) {
 TEST_F(KvtSortResources, AnInterruptedSortLeavesNothingBehind) {
     for (const char* command : {"sort", "unique"}) {
         for (const bool named : {false, true}) {
-            for (const int number : {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGBUS}) {
+            for (const int number : {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGXCPU, SIGBUS}) {
                 std::vector<std::string> arguments = {command, "--memory", "64K", "-o", "out"};
                 if (named) {
                     arguments.insert(arguments.end(), {"--workspace", "scratch/work"});
@@ -267,6 +267,19 @@ TEST_F(KvtSortResources, AWorkspaceThatCannotBeMadeIsAFailureBeforeAnythingIsRea
     }
 }
 
+TEST_F(KvtSortResources, AFolderOfTemporaryFilesThatIsNotThereIsAFailureWhenItIsNeeded) {
+    for (const char* command : {"sort", "unique"}) {
+        ChildSetup made = setup({command, "--memory", "64K", "-o", "out"});
+        made.environment = {{"TMPDIR", "/nowhere"}};
+        made.input = randomLines(lineShapes().front(), 300000, 6);
+        const ChildResult result = runChild(made);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_TRUE(result.err.starts_with("kvt: cannot create the workspace /nowhere/.kvt-")) << result.err;
+        EXPECT_TRUE(result.err.ends_with(": No such file or directory\n")) << result.err;
+        EXPECT_TRUE(names().empty());
+    }
+}
+
 TEST_F(KvtSortResources, ANamedWorkspaceIsGoneAtTheEnd) {
     const std::string text = randomLines(lineShapes().front(), 300000, 6);
     const ChildResult result = kvt({"sort", "--workspace", "work", "--memory", "64K"}, text);
@@ -283,7 +296,11 @@ TEST_F(KvtSortResources, AWorkspaceThatMayNotGrowIsAFailure) {
         const ChildResult result = runChild(made);
         EXPECT_EQ(result.status, 2);
         EXPECT_EQ(result.out, "");
-        EXPECT_TRUE(contains(result.err, " the workspace " + scratch().string() + "/.kvt-")) << result.err;
+        EXPECT_TRUE(
+            result.err.starts_with("kvt: cannot enlarge the workspace " + scratch().string() + "/.kvt-"))
+            << result.err;
+        EXPECT_TRUE(result.err.ends_with(".work: the disk is full, or files may not be so long\n"))
+            << result.err;
         EXPECT_TRUE(scratchIsEmpty());
     }
 }

@@ -165,9 +165,7 @@ TEST_F(KvtSort, InputAndOutputMayBeOneFile) {
 
 TEST_F(KvtSort, SizesAreNumbersWithAUnit) {
     for (const char* good : {"65536", "64K", "64k", "1M", "1g", "1T", "18014398509481983K"}) {
-        if (std::string_view(good).size() < 5) {
-            EXPECT_EQ(sorted("b\na\n", {"--memory", good}), "a\nb\n") << good;
-        }
+        EXPECT_EQ(sorted("b\na\n", {"--memory", good}), "a\nb\n") << good;
     }
     for (const char* bad :
          {"", "M", "12Q", "1KB", "1 K", "-1", "+1", "1.5M", "0x10", "17179869184G", "99999999999999999999"}) {

@@ -77,7 +77,7 @@ public:
     Worker(const std::string& path, const Model& model, unsigned seed, int in, int out)
         : manager_(path, persistentOptions(headerSize)), model_(model), random_(seed), in_(in), out_(out) {}
 
-    /// The header of a new manager is not in memory before it has been reached, which saving depends on.
+    /// Reaches the header, which makes its heap in a new file: not a moment to be killed at.
     void begin() {
         ask();
         took(taken(manager_.restore()));

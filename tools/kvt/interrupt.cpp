@@ -14,8 +14,8 @@ namespace host {
 
 namespace {
 
-// SIGBUS comes when the disk under a mapped file fails.
-constexpr std::array endingSignals = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGBUS};
+// SIGXCPU comes when a limit on the processor's time is reached, SIGBUS when the disk under a mapped file fails.
+constexpr std::array endingSignals = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGXCPU, SIGBUS};
 
 // Read by the signal handler: paths of files to remove, null where a slot is free.
 std::array<std::atomic<const char*>, 4> removals{};

@@ -9,6 +9,7 @@
 #include "text.h"
 #include "workspace.h"
 
+#include <algorithm>
 #include <charconv>
 #include <limits>
 #include <unistd.h>
@@ -18,6 +19,8 @@ namespace host {
 namespace {
 
 constexpr std::uint64_t leastMemory = 64 * 1024;
+// More than this is no more use to anybody, and at some point cannot be mapped.
+constexpr std::uint64_t mostMemory = std::uint64_t{1} << 40;
 
 // Lines on their way out.
 class LineOutput : public RecordSink {
@@ -131,7 +134,7 @@ int LineCommand::process(LineOrder order, OutputOrder outputOrder, bool showCoun
     }
     const std::unique_ptr<Output> output = openOutput(output_);
     // The workspace is gone when the output appears.
-    sendThrough(*output, memory, order, outputOrder, showCounts, diagnostics);
+    sendThrough(*output, std::min(memory, mostMemory), order, outputOrder, showCounts, diagnostics);
     output->commit();
     return Done;
 }

@@ -99,8 +99,8 @@ void LineSorter::addRun(LineRun run) {
     runs_.push_back(std::move(run));
     for (;;) {
         const int level = runs_.back().level;
-        const auto isLower = [&](const LineRun& other) { return other.level > level; };
-        const auto first = std::find_if(runs_.rbegin(), runs_.rend(), isLower).base();
+        const auto isMergedMore = [&](const LineRun& other) { return other.level > level; };
+        const auto first = std::find_if(runs_.rbegin(), runs_.rend(), isMergedMore).base();
         const auto count = static_cast<std::size_t>(runs_.end() - first);
         if (count < fanIn()) {
             return;

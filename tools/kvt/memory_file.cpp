@@ -44,6 +44,8 @@ constexpr std::uint64_t savedInBlock = 5;
 constexpr std::uint64_t wordSize = 8;
 constexpr std::uint64_t wordsInBlock = 64;
 
+constexpr const char* noHeap = "it does not begin with a heap; it is no persistent file of segments";
+
 std::string bytesText(std::uint64_t count) {
     return std::to_string(count) + " bytes";
 }
@@ -219,9 +221,13 @@ SegmentReport inspectHeader(const ByteSource& bytes, std::optional<std::uint64_t
         return header;
     }
     if (!hasHeapMarks(bytes, 0, bytes.size())) {
-        throw Failure("it does not begin with a heap; it is no persistent file of segments");
+        throw Failure(noHeap);
     }
     header.size = wordAt(bytes, heapSizeAt);
+    // Executable files have the mark as well, and look like a file that was cut; but for what a count would be.
+    if (header.size > bytes.size() && wordAt(bytes, namedCountAt) > 1) {
+        throw Failure(noHeap);
+    }
     if (segmentSize && *segmentSize != header.size) {
         throw Failure("its header segment has " + bytesText(header.size) + ", not " +
                       bytesText(*segmentSize));

@@ -95,7 +95,10 @@ std::unique_ptr<Stretch> Workspace::allocate(std::uint64_t bytes) {
     try {
         return std::unique_ptr<Stretch>(new Stretch(*this, bytes));
     } catch (const boost::interprocess::interprocess_exception& failure) {
-        throw Failure("cannot enlarge the workspace " + printable(path_) + ": " + failure.what());
+        // A segment for which the file could not grow lies nowhere in it.
+        const bool hasNoRoom = failure.get_error_code() == boost::interprocess::size_error;
+        throw Failure("cannot enlarge the workspace " + printable(path_) + ": " +
+                      (hasNoRoom ? "the disk is full, or files may not be so long" : failure.what()));
     }
 }
 
