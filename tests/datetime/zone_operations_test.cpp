@@ -155,6 +155,9 @@ TEST(TimezoneSet, AttachesOrConverts) {
         {__LINE__, "20200101120000+01:00", "+1", replace, "20200101120000"},
         {__LINE__, "20200101120000+01:00", "+1", convert, "20200101110000"},
         {__LINE__, "120000+01:00", "u t c", automatic, "110000"},
+        // Nothing holds the result against the years of a value.
+        {__LINE__, "99991231233000+00:00", "+01:00", convert, "100000101003000+01:00"},
+        {__LINE__, "10000101000000+00:00", "-01:00", automatic, "09991231230000-01:00"},
         // A mode that is none goes to UTC and not on from there.
         {__LINE__, "20200101120000+01:00", "+02:00", static_cast<SetZoneMode>(3), "20200101110000+02:00"},
         {__LINE__, "20200101120000", "+02:00", static_cast<SetZoneMode>(3), "20200101120000+02:00"},

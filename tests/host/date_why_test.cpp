@@ -82,6 +82,18 @@ TEST_F(KvtDateWhy, EachElementTellsWhatItTook) {
         {"abc 5", "*%", "*=abc %! 5"},
         // Both are read, and only then found to exclude each other.
         {"5 Z", "%s %z", "%s=5  =  %z=Z"},
+        {"-0.5", "%s%z", "%s=-0.5 %z!"},
+        {"5 Z x", "%s %z x", "%s=5  =  %z=Z  x= x"},
+        {"Z 5 x", "%z %s x", "%z=Z  =  %s=5  x= x"},
+        {"5 Zx", "%s %z$", "%s=5  =  %z=Z $!x"},
+        {"5 Z", "%s %z$x", "%s=5  =  %z=Z $! x."},
+        // Behind a "%T", which the message tells as what it stands for.
+        {"12:30:05x", "%T$", "%T=12:30:05 $!x"},
+        {"12:30:05 1:2", "%T %T", "%T=12:30:05  =  %T!1:2"},
+        {"%T 1:2:3 x", "%%T %T y", "%%=% T =T  %T=1:2:3  =  y!x"},
+        {"*T 1:2:3 x", "*T %T %H", "*T=*T  =  %T=1:2:3  =  %H!x"},
+        // "$" ends what a word has to end in, also that of "%$".
+        {"x", "%H*%$", "%H!x *. %$."},
     };
     for (const Row& row : rows) {
         EXPECT_EQ(steps(row.value, row.format), row.steps) << row.value << " | " << row.format;

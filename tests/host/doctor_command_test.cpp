@@ -75,6 +75,11 @@ TEST_F(KvtDoctor, TheDatabaseIsLookedForAndItsVersionCompared) {
     EXPECT_EQ(given["source"], "--zone-database");
     EXPECT_TRUE(given["warning"].is_null());
     EXPECT_EQ(finding("its version", {}, {"--zone-database", path("zones")})["value"], "not known");
+    // The version that counts is the one that the library finds.
+    write("zones/+VERSION", "1998a\n");
+    EXPECT_EQ(finding("its version", {}, {"--zone-database", path("zones")})["value"], "not known");
+    write("zones/NEWS", "News for the zones\n\nRelease 1999b - 1999-02-03\n\nRelease 1999a - 1999-01-02\n");
+    EXPECT_EQ(finding("its version", {}, {"--zone-database", path("zones")})["value"], "1999b");
     write("zones/version", "1999z\n");
     const nlohmann::json old = finding("its version", {}, {"--zone-database", path("zones")});
     EXPECT_EQ(old["value"], "1999z");

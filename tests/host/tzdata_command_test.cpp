@@ -51,6 +51,25 @@ TEST_F(KvtTzdata, TakesAnyFileOfTheZoneCompilersLanguage) {
     EXPECT_TRUE(contains(read("zones/europe"), "Rule\tE\t1990\tonly\t-\tMar\tlastSun"));
 }
 
+TEST_F(KvtTzdata, TakesTheLeapSecondsOfTheSystemWhereNoneStandBesideTheFile) {
+    const ChildResult written = tzdata({"--from", write("mine.zi", rules)});
+    EXPECT_EQ(written.status, 0) << written.err;
+    const std::string leapSeconds = read("zones/leapseconds");
+    EXPECT_TRUE(leapSeconds.starts_with("Leap\t1972\tJun\t30\t23:59:60\t+\tS\n")) << leapSeconds;
+    EXPECT_GE(std::count(leapSeconds.begin(), leapSeconds.end(), '\n'), 27) << leapSeconds;
+}
+
+TEST_F(KvtTzdata, TakesTheNamesOfWindowsFromThePackageIfItIsThere) {
+    const std::filesystem::path package = "/usr/share/unicode/cldr";
+    const bool isThere = std::filesystem::exists(package / "common/supplemental/windowsZones.xml") ||
+                         std::filesystem::exists(package / "supplemental/windowsZones.xml");
+    const ChildResult written = kvt({"tzdata", "-o", "zones", "--from", write("mine.zi", rules)});
+    EXPECT_EQ(written.status, 0) << written.err;
+    EXPECT_TRUE(written.out.ends_with(isThere ? ", with windowsZones.xml\n" : ", without windowsZones.xml\n"))
+        << written.out;
+    EXPECT_EQ(exists("zones/windowsZones.xml"), isThere);
+}
+
 TEST_F(KvtTzdata, WritesAnewIntoAFolderThatIsThere) {
     std::filesystem::create_directory(path("zones"));
     write("zones/version", "old");

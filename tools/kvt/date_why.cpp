@@ -77,10 +77,13 @@ const NumberFlag* numberFlagOf(std::string_view element) {
     return found == std::end(numberFlags) ? nullptr : found;
 }
 
+bool isEpochOrOffset(std::string_view element) {
+    return element == "%s" || element == "%Es" || element == "%z" || element == "%Ez";
+}
+
 // Whether a number right behind this element has to take its whole width.
 bool endsInNumber(std::string_view element) {
-    return numberFlagOf(element) != nullptr || element == "%T" || element == "%s" || element == "%Es" ||
-           element == "%z" || element == "%Ez";
+    return numberFlagOf(element) != nullptr || element == "%T" || isEpochOrOffset(element);
 }
 
 std::string meaningOf(std::string_view element, bool afterNumber, bool lenient) {
@@ -128,7 +131,7 @@ std::size_t elementLength(std::string_view format) {
         // What the word has to end in belongs to the "*".
         if (format.substr(1, 1) == "%") {
             const bool isLiteral =
-                format.size() > 2 && std::string_view("%*?$").find(format[2]) != std::string_view::npos;
+                format.size() > 2 && std::string_view("%*?").find(format[2]) != std::string_view::npos;
             return isLiteral ? 3 : 1;
         }
         return upTo(format.find_first_of(std::string(blanks) + "$", 1));
@@ -155,6 +158,16 @@ std::vector<Element> elementsOf(std::string_view format, std::size_t cut) {
         begin = end;
     }
     return elements;
+}
+
+// A part of a format as a message tells it once it has matched: with what stands behind each "%T".
+std::string expanded(std::string_view format) {
+    std::string text;
+    for (const Element& element : elementsOf(format, 0)) {
+        const std::string_view one = format.substr(element.begin, element.end - element.begin);
+        text += one == "%T" ? std::string_view("%H:%M:%S") : one;
+    }
+    return text;
 }
 
 // ---- Questions
@@ -252,7 +265,11 @@ private:
             return std::nullopt;
         }
         // Where the format did not survive the system's encoding, there is no place in it either.
-        return parts[0] + parts[1] == reading_.format ? std::optional(parts[0].size()) : std::nullopt;
+        if (!reading_.format.ends_with(parts[1])) {
+            return std::nullopt;
+        }
+        const std::size_t place = reading_.format.size() - parts[1].size();
+        return parts[0] == expanded(reading_.format.substr(0, place)) ? std::optional(place) : std::nullopt;
     }
 
     void walk(const Element& element, WhyStep& step, std::optional<std::size_t> failing) {
@@ -262,6 +279,8 @@ private:
             isCertain_ = false;
         } else if (element.begin == *failing || isBad(element)) {
             stop(step);
+        } else if (step.element == "$" && !isEndAt(element)) {
+            stop(step); // which goes unsaid, as flags that exclude each other are told first
         } else if (step.element == "$") {
             step.state = StepState::Read;
             step.at = position_ = reading_.value.size();
@@ -269,6 +288,21 @@ private:
         } else {
             findEnd(element, step);
         }
+    }
+
+    // Whether a "$" may be the end of both, as far as that is known.
+    bool isEndAt(const Element& element) const {
+        return element.end == reading_.format.size() && (!isCertain_ || position_ == reading_.value.size());
+    }
+
+    bool flagsExcludeEachOther() const {
+        return reading_.outcome.message &&
+               reading_.outcome.message->number == message_number::flagsExcludeEachOther;
+    }
+
+    bool isAsciiFrom(std::size_t place) const {
+        return std::all_of(reading_.value.begin() + static_cast<std::ptrdiff_t>(place), reading_.value.end(),
+                           [](char c) { return static_cast<unsigned char>(c) < 0x80; });
     }
 
     void stop(WhyStep& step) {
@@ -288,12 +322,17 @@ private:
             const bool isWhole = end == reading_.value.size() || !isInsideCharacter(reading_.value[end]);
             if (isWhole && ask(element, end) == Answer::Fits) {
                 take(step, end);
-                if (isWord) {
+                // Two flags that exclude each other would hide whether all else fits.
+                if (isWord || isEpochOrOffset(step.element)) {
                     askFromFormat_ = element.end;
                     askFromValue_ = end;
                 }
                 return;
             }
+        }
+        if (isCertain_ && flagsExcludeEachOther() && isAsciiFrom(position_)) {
+            stop(step); // which goes unsaid, as the flags are told first
+            return;
         }
         // The element was read, but not up to a whole character.
         step.at = knownPosition();
@@ -340,7 +379,7 @@ private:
     bool isCertain_ = true;    ///< whether it is
     bool canAsk_ = true;       ///< whether anything can be found out about further elements
     bool hasStopped_ = false;
-    std::size_t askFromValue_ = 0; ///< where questions begin: at the start, or behind the last "*"
+    std::size_t askFromValue_ = 0; ///< where questions begin: at the start, or behind a later element
     std::size_t askFromFormat_ = 0;
 };
 

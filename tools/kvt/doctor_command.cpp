@@ -14,6 +14,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <locale.h>
 #include <pwd.h>
 #include <sys/statvfs.h>
@@ -142,13 +143,25 @@ std::string distributionVersion() {
     return head.starts_with(lead) ? head.substr(lead.size()) : std::string();
 }
 
-Finding databaseVersion(const std::string& folder) {
-    std::string version;
-    for (const char* name : {"+VERSION", "version"}) {
-        if (version.empty()) {
-            version = firstLine(folder + "/" + name);
+// As the library finds it: the first word of "version" or, where that file is not, the newest release in "NEWS".
+std::string versionOf(const std::string& folder) {
+    std::string word;
+    if (std::ifstream file(folder + "/version"); file.is_open()) {
+        file >> word;
+        return word;
+    }
+    std::ifstream news(folder + "/NEWS");
+    while (news >> word) {
+        if (word == "Release") {
+            news >> word;
+            return word;
         }
     }
+    return {};
+}
+
+Finding databaseVersion(const std::string& folder) {
+    const std::string version = versionOf(folder);
     const std::string distribution = distributionVersion();
     Finding finding{"its version", version.empty() ? "not known" : printable(version),
                     distribution.empty() ? std::string("no ") + distributionFile + " to compare it with"
