@@ -27,6 +27,7 @@ namespace ipc = boost::interprocess;
 using kvt::ex::mmap::mapped_region_segment;
 using kvt::ex::mmap::memory_manager;
 using kvt::ex::mmap::segment_allocator;
+using kvt::ex::mmap::segment_heap;
 
 constexpr std::uint64_t segmentSize = 16777216;
 
@@ -55,7 +56,9 @@ struct MappedFile {
     void deallocate(void* block) { file.deallocate(block); }
 
     std::string path = scratchFile();
-    ipc::managed_mapped_file file{ipc::create_only, path.c_str(), segmentSize};
+    // With the algorithm of segments, so that the files are compared and not the locks of the heaps.
+    ipc::basic_managed_mapped_file<char, segment_heap::memory_algorithm, ipc::iset_index> file{
+        ipc::create_only, path.c_str(), segmentSize};
 };
 
 // Blocks of 16 to 512 bytes come and go in a random order, some thousand at a time.
