@@ -57,8 +57,8 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
 }
 
 TEST_F(KvtCommandLine, HelpFitsATerminal) {
-    for (const std::string command : {"convert", "encodings", "text", "match", "number", "explain", "date", "sort",
-                                      "unique", "memory", "doctor", "tzdata"}) {
+    for (const std::string command : {"convert", "encodings", "text", "match", "number", "explain", "date",
+                                      "sort", "unique", "memory", "doctor", "tzdata"}) {
         std::istringstream lines(kvt({command, "--help"}).out);
         for (std::string line; std::getline(lines, line) && !line.empty();) {
             // Examples are command lines and stay whole.
@@ -71,8 +71,8 @@ TEST_F(KvtCommandLine, HelpFitsATerminal) {
 
 TEST_F(KvtCommandLine, HelpOfTheProgramListsTheCommands) {
     const std::string help = kvt({"--help"}).out;
-    for (const char* command : {"convert", "encodings", "text", "match", "number", "wwjd", "date", "sort", "unique",
-                                "memory", "doctor", "explain", "tzdata"}) {
+    for (const char* command : {"convert", "encodings", "text", "match", "number", "wwjd", "date", "sort",
+                                "unique", "memory", "doctor", "explain", "tzdata"}) {
         EXPECT_TRUE(contains(help, std::string("\n  ") + command + " ")) << help;
     }
 }
