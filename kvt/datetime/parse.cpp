@@ -102,8 +102,11 @@ std::optional<LogMessageInfo> wordsOf(const Failure& failure, std::string_view f
         return message(unknownFlag, {viewOf(readableSystemBytes(unknown->flag)), "@DateTimeParse()"});
     }
     if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
-        return message(formatMismatch, {viewOf(readableSystemBytes(mismatch->matched)),
-                                        viewOf(readableSystemBytes(mismatch->rest))});
+        std::string matched = mismatch->matched;
+        std::string rest = mismatch->rest;
+        cutBetweenCharacters(matched, rest);
+        return message(formatMismatch,
+                       {viewOf(readableSystemBytes(matched)), viewOf(readableSystemBytes(rest))});
     }
     if (const auto* validation = std::get_if<ParseValidation>(&failure)) {
         constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete, offsetWithoutTime,

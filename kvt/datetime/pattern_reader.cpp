@@ -6,6 +6,7 @@
 #include <kvt/datetime/detail/pattern_reader.h>
 
 #include <kvt/datetime/detail/calendar.h>
+#include <kvt/datetime/detail/system_bytes.h>
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
@@ -213,7 +214,7 @@ private:
         if (element == "%Es") {
             return readEpochSeconds(element);
         }
-        return element == "%Ez" ? readOffset() : fail(ParseUnknownFlag{std::string(element)});
+        return element == "%Ez" ? readOffset() : failByUnknownFlag(element.size());
     }
 
     // A failure within the expansion is one of the element "%T".
@@ -280,8 +281,12 @@ private:
         case 'z':
             return readOffset();
         default:
-            return fail(ParseUnknownFlag{std::string{'%', flag}});
+            return failByUnknownFlag(2);
         }
+    }
+
+    bool failByUnknownFlag(std::size_t length) {
+        return fail(ParseUnknownFlag{std::string(wholeCharacters(format_.substr(at_), length))});
     }
 
     // Up to `width` digits, or exactly that many; none where there are too few.

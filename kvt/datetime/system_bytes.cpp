@@ -14,12 +14,20 @@ bool isAscii(std::string_view text) noexcept {
 
 namespace {
 
+// The system's encoding does not change while the program runs.
+bool isSystemUtf8() {
+    static const bool isUtf8 = Encoding(Encoding::System).evaluate() == Encoding::Utf8;
+    return isUtf8;
+}
+
 bool isSameInBoth(std::string_view text) {
-    // The system's encoding does not change while the program runs.
-    static const Encoding system(Encoding::System);
-    static const bool isUtf8 = system.evaluate() == Encoding::Utf8;
-    static const bool holdsAscii = system.supports7BitASCII();
-    return isUtf8 || (holdsAscii && isAscii(text));
+    static const bool holdsAscii = Encoding(Encoding::System).supports7BitASCII();
+    return isSystemUtf8() || (holdsAscii && isAscii(text));
+}
+
+// Of UTF-8: a byte within a character, behind its first.
+bool isContinuation(char c) {
+    return (static_cast<unsigned char>(c) & 0xC0) == 0x80;
 }
 
 } // namespace
@@ -41,6 +49,26 @@ UString<0> readableSystemBytes(std::string_view bytes) {
         return textOfSystemBytes(bytes);
     } catch (const UStringBadEncodingException& failure) {
         return failure.getLossyConversion();
+    }
+}
+
+std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
+    if (isSystemUtf8() && length <= bytes.size() && !isAscii(bytes.substr(length - 1, 1))) {
+        while (length < bytes.size() && isContinuation(bytes[length])) {
+            ++length;
+        }
+    }
+    return bytes.substr(0, length);
+}
+
+void cutBetweenCharacters(std::string& front, std::string& back) {
+    if (!isSystemUtf8()) {
+        return;
+    }
+    while (!front.empty() && !back.empty() && isContinuation(back.front()) &&
+           !isAscii(front.substr(front.size() - 1))) {
+        back.insert(back.begin(), front.back());
+        front.pop_back();
     }
 }
 

@@ -247,8 +247,8 @@ Offences publicHeadersStandAlone(const Tree& tree) {
             offences.push_back(offence(include, "only an optional header needs headers of that library"));
         } else if (tree.optionalHeaders.contains(include.target)) {
             offences.push_back(offence(include, "an optional header is included by users only"));
-        } else if (include.target.starts_with("boost/") && folder != "mmap" && folder != "datetime") {
-            offences.push_back(offence(include, "Boost shows in public headers of mmap and datetime only"));
+        } else if (include.target.starts_with("boost/") && folder != "mmap") {
+            offences.push_back(offence(include, "Boost shows in public headers of mmap only"));
         }
     }
     return offences;
@@ -279,25 +279,41 @@ Offences everyHeaderIsPublicOrPrivate(const Tree& tree) {
 }
 
 Offences outsideIsBehindItsDoor(const Tree& tree) {
-    static const std::set<std::string> icuDoors = {"kvt/encoding/icu.cpp", "kvt/encoding/detail/icu.h",
-                                                   "kvt/string/ustring_case.cpp"};
-    static const std::vector<std::string> system = {"sys/",     "unistd.h", "langinfo.h", "dlfcn.h",
-                                                    "cxxabi.h", "fcntl.h",  "pthread.h",  "link.h",
-                                                    "locale.h", "clocale",  "execinfo.h"};
+    struct House {
+        std::vector<std::string> headers;
+        std::vector<std::string> doors; // files, or folders that end in "/"
+        std::string rule;
+    };
+    static const std::vector<House> houses = {
+        {{"unicode/"},
+         {"kvt/encoding/icu.cpp", "kvt/encoding/detail/icu.h", "kvt/string/ustring_case.cpp"},
+         "ICU is used in kvt/encoding/icu.cpp and its private header"},
+        {{"date/"},
+         {"kvt/datetime/calendar.cpp", "kvt/datetime/local_zone.cpp", "kvt/datetime/zone_operations.cpp"},
+         "the date library is used for the calendar and for zones"},
+        {{"boost/regex"}, {"kvt/regex/"}, "Boost.Regex is used in kvt/regex"},
+        {{"boost/interprocess/", "boost/container/"},
+         {"kvt/mmap/"},
+         "Boost.Interprocess is used in kvt/mmap"},
+        {{"boost/date_time/"}, {"kvt/legacy/"}, "Boost.DateTime is used in kvt/legacy"},
+        {{"boost/multiprecision/"},
+         {"kvt/datetime/detail/nano_count.h"},
+         "NanoCount is the one large number"},
+        {{"sys/", "unistd.h", "langinfo.h", "dlfcn.h", "cxxabi.h", "fcntl.h", "pthread.h", "link.h",
+          "locale.h", "clocale", "execinfo.h"},
+         {"kvt/platform/"},
+         "the operating system is called in kvt/platform"},
+    };
     Offences offences;
     for (const Include& include : tree.includes) {
         if (!isOwn(include.file)) {
             continue;
         }
-        if (include.target.starts_with("unicode/") && !icuDoors.contains(include.file)) {
-            offences.push_back(
-                offence(include, "ICU is used in kvt/encoding/icu.cpp and its private header"));
-        }
-        if (include.target.starts_with("boost/date_time/") && folderOf(include.file) != "legacy") {
-            offences.push_back(offence(include, "Boost.DateTime is used in kvt/legacy"));
-        }
-        if (beginsWithOneOf(include.target, system) && folderOf(include.file) != "platform") {
-            offences.push_back(offence(include, "the operating system is called in kvt/platform"));
+        for (const House& house : houses) {
+            if (beginsWithOneOf(include.target, house.headers) &&
+                !beginsWithOneOf(include.file, house.doors)) {
+                offences.push_back(offence(include, house.rule));
+            }
         }
     }
     return offences;

@@ -3,6 +3,8 @@
 
 #include <kvt/string/ustring.h>
 
+#include <cstddef>
+#include <string>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
@@ -31,5 +33,12 @@ UString<0> textOfSystemBytes(std::string_view bytes);
 
 /// The same for messages: what a cut through a character has left of it is substituted.
 UString<0> readableSystemBytes(std::string_view bytes);
+
+/// The first `length` bytes, and where the system's encoding is UTF-8, the rest of the character that they end in.
+std::string_view wholeCharacters(std::string_view bytes, std::size_t length);
+
+/// A text was cut in two: where the system's encoding is UTF-8 and the cut goes through a character, gives all of that
+/// character to `back`.
+void cutBetweenCharacters(std::string& front, std::string& back);
 
 } // namespace kvt::ex::datetime::detail
