@@ -2,8 +2,7 @@
 #
 # One GoogleTest program, its cases registered one by one. It is linked against the shared library, as a user's
 # program would be; PRIVATE takes the static one instead, for tests of parts that are not exported, and STANDALONE
-# neither. Programs find helpers under tests/ by the include root "tests" (#include <support/...>) and data by
-# KVT_TEST_DATA_DIR.
+# neither. Programs find helpers under tests/ by the include root "tests" (#include <support/...>).
 #
 # An empty list of sources makes no program.
 
@@ -17,7 +16,6 @@ function(kvt_test)
     add_executable(${arg_NAME} ${arg_SOURCES})
     target_compile_features(${arg_NAME} PRIVATE cxx_std_20)
     target_include_directories(${arg_NAME} PRIVATE "${PROJECT_SOURCE_DIR}/tests")
-    target_compile_definitions(${arg_NAME} PRIVATE KVT_TEST_DATA_DIR="${PROJECT_SOURCE_DIR}/tests/data")
     if(arg_PRIVATE)
         target_link_libraries(${arg_NAME} PRIVATE kvt_static)
     elseif(NOT arg_STANDALONE)
