@@ -2,6 +2,8 @@
 #include <kvt/string/detail/ascii_check.h>
 
 #include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/foundation/detail/ascii.h>
+#include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
 
 #include <algorithm>
@@ -12,10 +14,6 @@ namespace {
 
 constexpr char substitute = '\x1A';
 
-bool isAscii(char byte) {
-    return static_cast<unsigned char>(byte) < 128;
-}
-
 // The trailing bytes that a lead byte announces; 0 for a byte that is no lead byte.
 std::size_t trailingBytes(char byte) {
     const auto lead = static_cast<unsigned char>(byte);
@@ -24,10 +22,6 @@ std::size_t trailingBytes(char byte) {
            : (lead & 0xF8) == 0xF0 ? 3
            : (lead & 0xFC) == 0xF8 ? 4
                                    : 0;
-}
-
-bool isTrailing(char byte) {
-    return (static_cast<unsigned char>(byte) & 0xC0) == 0x80;
 }
 
 UString<0> utf8(std::string_view text) {
@@ -54,7 +48,7 @@ bool appendSubstituted(std::string_view bytes, std::string& out) {
         bytes.remove_prefix(trailing.size());
         // One SUB for the character, and one for each byte that is none of its own.
         const auto own =
-            static_cast<std::size_t>(std::count_if(trailing.begin(), trailing.end(), isTrailing));
+            static_cast<std::size_t>(std::count_if(trailing.begin(), trailing.end(), isContinuation));
         out.append(1 + trailing.size() - own, substitute);
         wellFormed = wellFormed && announced != 0 && own == announced;
     }

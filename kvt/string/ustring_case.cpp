@@ -5,6 +5,7 @@
 #include <kvt/string/detail/instantiate.h>
 
 #include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/foundation/detail/ascii.h>
 #include <kvt/foundation/throwable.h>
 
 #include <unicode/ucasemap.h>
@@ -131,11 +132,7 @@ auto guarded(const char* context, std::string_view bytes, Encoding encoding, Act
 
 template <Mapping mapping>
 char mapAscii(char byte) {
-    if constexpr (mapping == Mapping::upper) {
-        return byte >= 'a' && byte <= 'z' ? static_cast<char>(byte - 0x20) : byte;
-    } else {
-        return byte >= 'A' && byte <= 'Z' ? static_cast<char>(byte + 0x20) : byte;
-    }
+    return mapping == Mapping::upper ? detail::asciiUpper(byte) : detail::asciiLower(byte);
 }
 
 // Maps a UTF-16 string, and from there every other one that is not mapped in its own form.
