@@ -1,7 +1,7 @@
 // The shortest text of floating-point numbers: its rows, the borders of its three forms, and samples of all numbers
 // against a naive reference. float_text_exhaustive_test.cpp goes through every float.
 #include <codec/float_text_reference.h>
-#include <foundation/counting_new.h>
+#include <support/allocations.h>
 
 #include <kvt/codec/float_text.h>
 
@@ -253,7 +253,7 @@ TEST(FloatText, TheLongestTextOfAFiniteNumberHas24Chars) {
 TEST(FloatText, NothingIsAllocated) {
     std::mt19937_64 random(5);
     std::array<char, floatTextBuffer> buffer;
-    const kvt_test::FailingAllocations failing(0);
+    const kvt::test::FailingAllocations failing(0);
     for (int i = 0; i < 100000; ++i) {
         const std::uint64_t bits = random();
         double_to_string(doubleOf(bits), buffer.data());

@@ -1,7 +1,7 @@
 // Lack of memory is a failure like any other: no function throws, and what it answers is good or says so.
 
 #include "answer.h"
-#include "failing_new.h"
+#include <support/allocations.h>
 
 #include <kvt/datetime/datetime.h>
 

@@ -1,9 +1,9 @@
 // Every message that the date and time functions can give, each reached once with its parameters; and that there is no
 // other, by the header that names them.
 #include "answer.h"
-#include "failing_new.h"
 #include "machine_zone.h"
 #include "zone_folder.h"
+#include <support/allocations.h>
 
 #include <kvt/datetime/datetime.h>
 

@@ -1,7 +1,7 @@
 // Every message of parse() and format(), reached once with its parameters, and none besides.
 
-#include "failing_new.h"
 #include "pattern_rows.h"
+#include <support/allocations.h>
 
 #include <kvt/datetime/message_numbers.h>
 

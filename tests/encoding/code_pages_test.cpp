@@ -96,7 +96,7 @@ void checkPages(const std::array<Page, Count>& pages) {
         EXPECT_EQ(encoding.id(), Encoding(View(page.name)).id()) << page.number << " " << page.name;
         EXPECT_EQ(page.get().id(), encoding.id()) << page.number << " again";
         if (page.number != 874) { // "TIS-620" names one converter and is the IANA name of another
-            EXPECT_EQ(encoding.getName(), kvt_test::canonicalName(page.name)) << page.number;
+            EXPECT_EQ(encoding.getName(), kvt::test::canonicalName(page.name)) << page.number;
         }
     }
 }

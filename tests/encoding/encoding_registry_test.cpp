@@ -3,8 +3,8 @@
 #include <encoding/fixed_names.h>
 #include <encoding/icu_oracle.h>
 #include <encoding/intercepted_icu.h>
-#include <foundation/counting_new.h>
 #include <foundation/items.h>
+#include <support/allocations.h>
 
 #include <kvt/encoding/detail/code_page_names.h>
 #include <kvt/encoding/detail/encoding_registry.h>
@@ -26,8 +26,8 @@ using kvt::ex::Encoding;
 using kvt::ex::InvalidEncodingException;
 using kvt::ex::detail::codePageName;
 using kvt::ex::detail::EncodingRegistry;
-using kvt_test::canonicalName;
-using kvt_test::openCalls;
+using kvt::test::canonicalName;
+using kvt::test::openCalls;
 
 EncodingRegistry& registry() {
     return EncodingRegistry::instance();
@@ -132,7 +132,7 @@ TEST(RegistryNormaliseName, PrefersMimeThenIanaThenIcusOwnName) {
 }
 
 TEST(RegistryNormaliseName, AgreesWithIcuForEveryAlias) {
-    for (const std::string& alias : kvt_test::icuAliases()) {
+    for (const std::string& alias : kvt::test::icuAliases()) {
         EXPECT_EQ(EncodingRegistry::normaliseName(alias), canonicalName(alias)) << alias;
     }
 }
@@ -146,7 +146,7 @@ TEST(RegistryNormaliseName, ClosesWhatItOpens) {
 }
 
 TEST(RegistryNames, OfLowIdsAreTheFixedOnes) {
-    for (const kvt_test::FixedName& row : kvt_test::fixedNames) {
+    for (const kvt::test::FixedName& row : kvt::test::fixedNames) {
         if (row.name != nullptr) {
             EXPECT_EQ(registry().nameOf(row.id), row.name);
         }
@@ -162,13 +162,13 @@ TEST(RegistryNames, OfIdsThatWereNotHandedOutAreEmpty) {
 }
 
 TEST(RegistryLookup, FixedNamesNeverReachIcu) {
-    for (const kvt_test::FixedName& row : kvt_test::fixedNames) {
+    for (const kvt::test::FixedName& row : kvt::test::fixedNames) {
         if (row.name != nullptr && row.id != Encoding::Unknown) {
             EXPECT_EQ(callsFor(row.name), 0u) << row.name;
             EXPECT_EQ(registry().lookupId(row.name), row.id);
         }
     }
-    for (const kvt_test::NameToId& row : kvt_test::nameAliases) {
+    for (const kvt::test::NameToId& row : kvt::test::nameAliases) {
         EXPECT_EQ(callsFor(row.name), 0u) << row.name;
         EXPECT_EQ(registry().lookupId(row.name), row.id);
     }
@@ -223,11 +223,11 @@ TEST(RegistryLookup, WhenMemoryRunsOutNoIdIsLostOrSharedByTwo) {
           "a name that is not known and does not fit a small-string buffer", "ibm-1154_P100-1999", "cp1155",
           "ibm-1156_P100-1999", "ibm-1157_P100-1999", "ibm-1158_P100-1999", "x-IBM1160"}) {
         std::uint32_t id = 0;
-        failures += kvt_test::failEachAllocation([&] { id = registry().lookupId(name); },
-                                                 [&](std::size_t) {
-                                                     // Another name is served all the same.
-                                                     EXPECT_EQ(registry().lookupId("UTF-8"), 0u);
-                                                 });
+        failures += kvt::test::failEachAllocation([&] { id = registry().lookupId(name); },
+                                                  [&](std::size_t) {
+                                                      // Another name is served all the same.
+                                                      EXPECT_EQ(registry().lookupId("UTF-8"), 0u);
+                                                  });
         const std::string canonical = canonicalName(name);
         if (canonical.empty()) {
             EXPECT_EQ(id, 30u) << name;
@@ -244,13 +244,13 @@ TEST(RegistryLookup, WhenMemoryRunsOutNoIdIsLostOrSharedByTwo) {
 
 TEST(CodePageTemplates, AFailingFirstCallIsTriedAgain) {
     registry(); // its construction asks ICU for the system's name
-    auto refused = std::make_unique<kvt_test::RefusedConverter>("x-mac-greek");
+    auto refused = std::make_unique<kvt::test::RefusedConverter>("x-mac-greek");
     const std::size_t before = openCalls();
     try {
         Encoding::windowsCodePage<10006>();
         FAIL() << "nothing was thrown";
     } catch (const InvalidEncodingException& failure) {
-        EXPECT_EQ(kvt_test::itemsOf(failure), std::vector<std::string>{"message 910005|x-mac-greek"});
+        EXPECT_EQ(kvt::test::itemsOf(failure), std::vector<std::string>{"message 910005|x-mac-greek"});
     }
     EXPECT_EQ(openCalls() - before, 1u);
     // The name is remembered as unknown, so the next call fails as well, without ICU.
@@ -262,7 +262,7 @@ TEST(CodePageTemplates, AFailingFirstCallIsTriedAgain) {
 
 TEST(CodePageTemplates, AFirstCallWithoutMemoryIsTriedAgain) {
     Encoding encoding = Encoding::Unknown;
-    const std::size_t failures = kvt_test::failEachAllocation(
+    const std::size_t failures = kvt::test::failEachAllocation(
         [&] { encoding = Encoding::windowsCodePage<10029>(); }, [](std::size_t) {});
     EXPECT_GE(failures, 1u);
     EXPECT_EQ(encoding.getName(), "x-mac-centraleurroman");
@@ -283,7 +283,7 @@ TEST(RegistryViews, StayWhileOthersAreAdded) {
     const std::string_view view =
         registry().nameOf(registry().lookupId("cp037")); // short enough to be inline
     const char* const data = view.data();
-    for (const std::string& alias : kvt_test::icuAliases()) {
+    for (const std::string& alias : kvt::test::icuAliases()) {
         registry().lookupId(alias);
     }
     EXPECT_EQ(registry().nameOf(registry().lookupId("cp037")).data(), data);

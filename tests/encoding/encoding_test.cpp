@@ -25,12 +25,12 @@ namespace {
 using kvt::ex::Encoding;
 using kvt::ex::InvalidEncodingException;
 using kvt::ex::UString;
-using kvt_test::canonicalName;
-using kvt_test::firstDynamicId;
-using kvt_test::FixedName;
-using kvt_test::fixedNames;
-using kvt_test::itemsOf;
-using kvt_test::NameToId;
+using kvt::test::canonicalName;
+using kvt::test::firstDynamicId;
+using kvt::test::FixedName;
+using kvt::test::fixedNames;
+using kvt::test::itemsOf;
+using kvt::test::NameToId;
 using View = kvt::future::string_view;
 
 Encoding of(const std::string& name) {
@@ -89,7 +89,7 @@ TEST(EncodingFixed, EachNameGivesItsIdBothWays) {
 }
 
 TEST(EncodingFixed, AliasesAreAcceptedAndNotGivenBack) {
-    for (const NameToId& row : kvt_test::nameAliases) {
+    for (const NameToId& row : kvt::test::nameAliases) {
         const Encoding encoding = of(row.name);
         EXPECT_EQ(encoding.id(), row.id) << row.name;
         EXPECT_NE(encoding.getName(), row.name);
@@ -209,7 +209,7 @@ TEST(EncodingNames, AreTerminatedAndStay) {
         views.push_back(encoding.getName());
         EXPECT_EQ(std::strlen(views.back().data()), views.back().size());
     }
-    for (const std::string& converter : kvt_test::icuConverters()) {
+    for (const std::string& converter : kvt::test::icuConverters()) {
         of(converter); // makes the registry grow
     }
     for (std::size_t i = 0; i < encodings.size(); ++i) {
@@ -274,7 +274,7 @@ public:
             }
         }
         fixed_.emplace(nameOf(Encoding::System), 27);
-        for (const NameToId& row : kvt_test::nameAliases) {
+        for (const NameToId& row : kvt::test::nameAliases) {
             fixed_.emplace(row.name, row.id);
         }
     }
@@ -319,12 +319,12 @@ std::uint32_t firstFreeId() {
 TEST(EncodingRegistration, EveryAliasOfIcuInRandomOrderBehavesAsTheModel) {
     if (firstFreeId() != firstDynamicId) {
         // A spelling that came before would have an id that the model does not know, so start from all of them.
-        for (const std::string& alias : kvt_test::icuAliases()) {
+        for (const std::string& alias : kvt::test::icuAliases()) {
             of(alias);
         }
     }
     const std::uint32_t first = firstFreeId();
-    std::vector<std::string> aliases = kvt_test::icuAliases();
+    std::vector<std::string> aliases = kvt::test::icuAliases();
     ASSERT_GT(aliases.size(), 1000u);
     std::mt19937 random(31);
     std::shuffle(aliases.begin(), aliases.end(), random);
@@ -359,7 +359,7 @@ TEST(EncodingSingleByte, OfFixedEncodings) {
         EXPECT_EQ(Encoding(row.type).isSingleByte(), expected) << row.name;
     }
     EXPECT_EQ(Encoding(Encoding::System).isSingleByte(),
-              kvt_test::hasOneByteCharacters(nameOf(Encoding::System)));
+              kvt::test::hasOneByteCharacters(nameOf(Encoding::System)));
     EXPECT_FALSE(of("binary").isSingleByte());
     EXPECT_FALSE(of("no-such-charset").isSingleByte());
 }
@@ -377,10 +377,10 @@ TEST(EncodingSingleByte, OfWwjdIsAFailureAsItHasNoConverter) {
 
 TEST(EncodingSingleByte, AgreesWithIcuForEveryConverter) {
     std::size_t single = 0;
-    for (const std::string& converter : kvt_test::icuConverters()) {
+    for (const std::string& converter : kvt::test::icuConverters()) {
         const Encoding encoding = of(converter);
         ASSERT_NE(encoding.id(), Encoding::Unknown) << converter;
-        const bool expected = kvt_test::hasOneByteCharacters(nameOf(encoding));
+        const bool expected = kvt::test::hasOneByteCharacters(nameOf(encoding));
         EXPECT_EQ(encoding.isSingleByte(), expected) << converter;
         single += expected ? 1 : 0;
     }
@@ -417,7 +417,7 @@ TEST(EncodingSupports7BitAscii, IsFalseForEveryOtherConverterOfIcu) {
     for (const char* const name : asciiCompatibleNames) {
         compatible.insert(of(name).evaluate());
     }
-    for (const std::string& converter : kvt_test::icuConverters()) {
+    for (const std::string& converter : kvt::test::icuConverters()) {
         const Encoding encoding = of(converter);
         const std::uint32_t id = encoding.evaluate();
         const bool expected =

@@ -6,7 +6,7 @@
 #include <array>
 #include <cstdint>
 
-namespace kvt_test {
+namespace kvt::test {
 
 struct FixedName {
     kvt::ex::Encoding::Type type;
@@ -63,4 +63,4 @@ inline constexpr std::array nameAliases{
 /// The first id that no fixed encoding has.
 inline constexpr std::uint32_t firstDynamicId = 31;
 
-} // namespace kvt_test
+} // namespace kvt::test

@@ -6,7 +6,7 @@
 #include <memory>
 #include <set>
 
-namespace kvt_test {
+namespace kvt::test {
 namespace {
 
 using Converter = std::unique_ptr<UConverter, decltype(&ucnv_close)>;
@@ -74,4 +74,4 @@ bool hasOneByteCharacters(const std::string& name) {
     return converter != nullptr && ucnv_getMaxCharSize(converter.get()) == 1;
 }
 
-} // namespace kvt_test
+} // namespace kvt::test

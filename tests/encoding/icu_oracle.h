@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-namespace kvt_test {
+namespace kvt::test {
 
 /// Every converter that ICU lists, by its own canonical name.
 const std::vector<std::string>& icuConverters();
@@ -19,4 +19,4 @@ std::string canonicalName(const std::string& name);
 /// Whether the longest character has one byte.
 bool hasOneByteCharacters(const std::string& name);
 
-} // namespace kvt_test
+} // namespace kvt::test

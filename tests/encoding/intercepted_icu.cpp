@@ -9,7 +9,7 @@
 #define KVT_TEXT_OF(name) #name
 #define KVT_NAME_OF(name) KVT_TEXT_OF(name)
 
-namespace kvt_test {
+namespace kvt::test {
 namespace {
 
 thread_local std::size_t calls = 0;
@@ -29,13 +29,13 @@ RefusedConverter::~RefusedConverter() {
     refused.clear();
 }
 
-} // namespace kvt_test
+} // namespace kvt::test
 
 extern "C" __attribute__((visibility("default"))) UConverter* ucnv_open(const char* name, UErrorCode* error) {
     using Open = UConverter* (*)(const char*, UErrorCode*);
     static const auto real = reinterpret_cast<Open>(dlsym(RTLD_NEXT, KVT_NAME_OF(ucnv_open)));
-    ++kvt_test::calls;
-    if (!kvt_test::refused.empty() && kvt_test::refused == name) {
+    ++kvt::test::calls;
+    if (!kvt::test::refused.empty() && kvt::test::refused == name) {
         *error = U_FILE_ACCESS_ERROR;
         return nullptr;
     }

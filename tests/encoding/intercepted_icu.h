@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <string>
 
-namespace kvt_test {
+namespace kvt::test {
 
 /// Calls of ucnv_open by this thread.
 std::size_t openCalls() noexcept;
@@ -19,4 +19,4 @@ public:
     ~RefusedConverter();
 };
 
-} // namespace kvt_test
+} // namespace kvt::test

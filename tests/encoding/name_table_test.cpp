@@ -1,5 +1,5 @@
 // The hash table of names: what it finds, how it grows, and the primes and the hash behind it.
-#include <foundation/counting_new.h>
+#include <support/allocations.h>
 
 #include <kvt/encoding/detail/name_table.h>
 #include <kvt/foundation/detail/fnv.h>
@@ -100,9 +100,9 @@ TEST(Fnv1a, GivesThePublishedValues) {
 }
 
 TEST(NameTable, IsEmptyWithoutMemory) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     const NameTable table;
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
     EXPECT_EQ(table.size(), 0u);
     EXPECT_EQ(table.buckets(), 0u);
     EXPECT_EQ(table.threshold(), 0u);
@@ -247,14 +247,14 @@ TEST(NameTable, AFailingAllocationLosesNothing) {
     const std::string tail = " and more than a small-string buffer can hold";
     for (std::uint32_t i = 0; i < 100; ++i) {
         const std::string key = std::to_string(i) + tail;
-        kvt_test::failEachAllocation([&] { table.insert(key, i); },
-                                     [&](std::size_t) {
-                                         EXPECT_FALSE(table.find(key)) << i;
-                                         EXPECT_EQ(table.size(), i);
-                                         for (std::uint32_t k = 0; k < i; ++k) {
-                                             EXPECT_EQ(table.find(std::to_string(k) + tail), k);
-                                         }
-                                     });
+        kvt::test::failEachAllocation([&] { table.insert(key, i); },
+                                      [&](std::size_t) {
+                                          EXPECT_FALSE(table.find(key)) << i;
+                                          EXPECT_EQ(table.size(), i);
+                                          for (std::uint32_t k = 0; k < i; ++k) {
+                                              EXPECT_EQ(table.find(std::to_string(k) + tail), k);
+                                          }
+                                      });
         EXPECT_EQ(table.find(key), i);
     }
 }

@@ -49,7 +49,7 @@ void onManyThreads(Work work) {
 }
 
 TEST(RegistryThreads, EveryAliasOnEveryThreadInItsOwnOrder) {
-    std::vector<std::string> spellings = kvt_test::icuAliases();
+    std::vector<std::string> spellings = kvt::test::icuAliases();
     for (int i = 0; i < 100; ++i) {
         spellings.push_back("no-such-" + std::to_string(i));
     }
@@ -84,7 +84,7 @@ TEST(RegistryThreads, EveryAliasOnEveryThreadInItsOwnOrder) {
     }
     std::set<std::uint32_t> dynamic;
     for (const auto& [spelling, id] : idOfSpelling) {
-        const std::string canonical = kvt_test::canonicalName(spelling);
+        const std::string canonical = kvt::test::canonicalName(spelling);
         if (id >= 31) {
             dynamic.insert(id);
         }

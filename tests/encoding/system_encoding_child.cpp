@@ -50,7 +50,7 @@ void printFailure(const char* key, Conversion conversion) {
         print(key, "none");
     } catch (const kvt::ex::Throwable& failure) {
         std::string text = failure.className().toStdString();
-        for (const std::string& item : kvt_test::itemsOf(failure)) {
+        for (const std::string& item : kvt::test::itemsOf(failure)) {
             text += " " + toHex(item);
         }
         print(key, text);

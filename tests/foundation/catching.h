@@ -6,7 +6,7 @@
 #include <functional>
 #include <string>
 
-namespace kvt_test {
+namespace kvt::test {
 
 template <typename Class>
 bool isCaughtAs(const std::function<void()>& operation) {
@@ -42,4 +42,4 @@ inline std::string caughtAs(const std::function<void()>& operation) {
     return names;
 }
 
-} // namespace kvt_test
+} // namespace kvt::test

@@ -1,9 +1,9 @@
 // The failures with a fixed content: number, parameters, texts, and the classes as which they are caught, within one
 // module and across modules.
 #include "catching.h"
-#include "counting_new.h"
 #include "items.h"
 #include "module.h"
+#include <support/allocations.h>
 
 #include <kvt/foundation/throwable.h>
 
@@ -21,8 +21,8 @@
 namespace {
 
 using namespace kvt::ex;
-using kvt_test::Items;
-using kvt_test::itemsOf;
+using kvt::test::Items;
+using kvt::test::itemsOf;
 
 UString<28> binary(const std::string& bytes) {
     return UString<28>(bytes.data(), bytes.size(), Encoding::Binary);
@@ -192,7 +192,7 @@ std::vector<Thrown> thrownByTheLibrary() {
 
 TEST(FailureAcrossModules, WhatTheLibraryThrowsIsCaughtByEachBase) {
     for (const Thrown& row : thrownByTheLibrary()) {
-        EXPECT_EQ(kvt_test::caughtAs(row.operation), row.classes) << row.name;
+        EXPECT_EQ(kvt::test::caughtAs(row.operation), row.classes) << row.name;
         EXPECT_EQ(plugin::caughtAs(row.operation), row.classes) << row.name;
     }
 }
@@ -207,7 +207,7 @@ TEST(FailureAcrossModules, WhatAPluginThrowsIsCaughtByEachBase) {
         {"HiddenFailure", "Throwable Exception "},
     }};
     for (const auto& [name, classes] : rows) {
-        EXPECT_EQ(kvt_test::caughtAs([n = name] { plugin::throwFailure(n); }), classes) << name;
+        EXPECT_EQ(kvt::test::caughtAs([n = name] { plugin::throwFailure(n); }), classes) << name;
     }
 }
 
@@ -241,7 +241,7 @@ TEST(FailureAcrossModules, AFailureOfTheProgramPassesThroughOthersAndGathersItem
 }
 
 TEST(FailureAcrossModules, AnArrayOfOneModuleGrowsAndEndsInAnother) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     {
         UStringArray<0> array = plugin::makeArray(20);
         ASSERT_EQ(array.size(), 20u);
@@ -257,7 +257,7 @@ TEST(FailureAcrossModules, AnArrayOfOneModuleGrowsAndEndsInAnother) {
         plugin::dropArray(std::make_unique<UStringArray<0>>(std::move(array)));
         plugin::dropArray(std::make_unique<UStringArray<0>>());
     }
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 } // namespace

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-namespace kvt_test {
+namespace kvt::test {
 
 /// One text for each item: `string TEXT`, `frame FILE|FUNCTION|LINE`, `pair NAME|VALUE`, `message NUMBER|%0|%1...`.
 inline std::vector<std::string> itemsOf(const kvt::ex::Throwable& failure) {
@@ -33,4 +33,4 @@ inline std::vector<std::string> itemsOf(const kvt::ex::Throwable& failure) {
 
 using Items = std::vector<std::string>;
 
-} // namespace kvt_test
+} // namespace kvt::test

@@ -1,5 +1,5 @@
 // Allocation on the library's side of the border, and the names behind which it stands.
-#include "counting_new.h"
+#include <support/allocations.h>
 
 #include <kvt/foundation/memory.h>
 #include <kvt/foundation/optional.h>
@@ -59,24 +59,24 @@ TEST(Memory, AllocateAndDeallocateAreProtected) {
 }
 
 TEST(Memory, AllocateTakesTheBytesFromTheGlobalFunction) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     void* const p = Allocator::allocate(12345);
-    EXPECT_EQ(kvt_test::lastRequest(), 12345u);
-    EXPECT_EQ(kvt_test::livingBlocks(), before + 1);
+    EXPECT_EQ(kvt::test::lastRequest(), 12345u);
+    EXPECT_EQ(kvt::test::livingBlocks(), before + 1);
     EXPECT_EQ(reinterpret_cast<std::uintptr_t>(p) % alignof(std::max_align_t), 0u);
     std::memset(p, 0xA5, 12345);
     Allocator::deallocate(p, 12345);
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(Memory, DeallocateDoesNotLookAtTheSize) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     for (const std::size_t claimed :
          {std::size_t{0}, std::size_t{1}, std::numeric_limits<std::size_t>::max()}) {
         Allocator::deallocate(Allocator::allocate(64), claimed);
     }
     Allocator::deallocate(nullptr, 64);
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(Memory, ZeroBytesAreABlockToo) {
@@ -91,7 +91,7 @@ TEST(Memory, WhenMemoryRunsOutAllocateThrowsBadAlloc) {
           static_cast<std::size_t>(std::numeric_limits<std::ptrdiff_t>::max())}) {
         EXPECT_THROW(Allocator::allocate(bytes), std::bad_alloc) << bytes;
     }
-    const kvt_test::FailingAllocations failing(0);
+    const kvt::test::FailingAllocations failing(0);
     EXPECT_THROW(Allocator::allocate(16), std::bad_alloc);
 }
 
@@ -99,10 +99,10 @@ TEST(Memory, AssignmentsDoNothingAndReturnTheObject) {
     Allocator target;
     Allocator source;
     BasicDllAllocator<DefaultAllocator>& base = target;
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     EXPECT_EQ(&(base = static_cast<const BasicDllAllocator<DefaultAllocator>&>(source)), &base);
     EXPECT_EQ(&(base = std::move(static_cast<BasicDllAllocator<DefaultAllocator>&>(source))), &base);
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(FutureTypes, AreTheStandardOnes) {

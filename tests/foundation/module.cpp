@@ -44,7 +44,7 @@ void throwFailure(const std::string& className) {
 }
 
 std::string caughtAs(const std::function<void()>& operation) {
-    return kvt_test::caughtAs(operation);
+    return kvt::test::caughtAs(operation);
 }
 
 void passThrough(const std::function<void()>& operation) {

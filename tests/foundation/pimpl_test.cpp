@@ -1,5 +1,5 @@
 // The two kinds of opaque implementation: one owned alone and copied deeply, one shared by counted handles.
-#include "counting_new.h"
+#include <support/allocations.h>
 
 #include <kvt/foundation/pimpl.h>
 
@@ -77,7 +77,7 @@ TEST(PimplBase, CopiesAreDeep) {
 }
 
 TEST(PimplBase, DestructionAndAssignmentReleaseTheImplementation) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     {
         Owner a(1);
         Owner b(2);
@@ -88,7 +88,7 @@ TEST(PimplBase, DestructionAndAssignmentReleaseTheImplementation) {
         EXPECT_EQ(b.d().value, 3);
     }
     EXPECT_EQ(Account::living, 0);
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(PimplBase, AMoveTakesThePointer) {
@@ -201,7 +201,7 @@ TEST(PimplShared, CopiesShareTheBlockAndMovesHandItOn) {
 
 TEST(PimplShared, TheLastHandleDestroysMutexImplAndBlock) {
     std::vector<std::string>().swap(Record::events);
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     {
         Handle first("impl");
         {
@@ -212,7 +212,7 @@ TEST(PimplShared, TheLastHandleDestroysMutexImplAndBlock) {
     }
     EXPECT_EQ(Record::events, (std::vector<std::string>{"mutex", "impl"}));
     std::vector<std::string>().swap(Record::events);
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(PimplShared, CopyAssignmentLetsGoOfTheOldBlockFirst) {

@@ -1,6 +1,6 @@
 // The list that a failure is: how it is made, added to, copied, read and rendered.
-#include "counting_new.h"
 #include "items.h"
+#include <support/allocations.h>
 
 #include <kvt/foundation/throwable.h>
 
@@ -37,8 +37,8 @@ using kvt::ex::Throwable;
 using kvt::ex::UString;
 using kvt::ex::UStringArray;
 using kvt::ex::UStringException;
-using kvt_test::Items;
-using kvt_test::itemsOf;
+using kvt::test::Items;
+using kvt::test::itemsOf;
 
 std::string what(const Throwable& failure) {
     return failure.what().toStdString();
@@ -102,11 +102,11 @@ TYPED_TEST(EachPlainClass, CopiesAndMoves) {
 }
 
 TYPED_TEST(EachPlainClass, IsDestroyedThroughTheRoot) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     std::unique_ptr<Throwable> failure =
         std::make_unique<TypeParam>("a message that is too long for the small-string buffer");
     failure.reset();
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(ThrowableTree, HasEachClassInItsPlace) {
@@ -285,13 +285,13 @@ TEST(ThrowableCopy, SharesTheItemsAndHasAListOfItsOwn) {
 }
 
 TEST(ThrowableCopy, AMovedFromFailureMayBeDestroyed) {
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     {
         Throwable source = oneOfEach();
         const Throwable target(std::move(source));
         EXPECT_EQ(itemsOf(target).size(), 5u);
     }
-    EXPECT_EQ(kvt_test::livingBlocks(), before);
+    EXPECT_EQ(kvt::test::livingBlocks(), before);
 }
 
 TEST(ThrowableInFlight, RethrowingKeepsAllItemsInOrder) {
@@ -371,13 +371,13 @@ TEST(ThrowableOutOfMemory, AddingChangesNothingWhenItFails) {
     Throwable failure("first");
     const Items before = itemsOf(failure);
     const auto unchanged = [&](std::size_t) { EXPECT_EQ(itemsOf(failure), before); };
-    EXPECT_GE(kvt_test::failEachAllocation([&] { failure.addMessageString(text); }, unchanged), 2u);
+    EXPECT_GE(kvt::test::failEachAllocation([&] { failure.addMessageString(text); }, unchanged), 2u);
     failure = Throwable("first");
-    EXPECT_GE(kvt_test::failEachAllocation([&] { failure.addNameValue(text, text); }, unchanged), 3u);
+    EXPECT_GE(kvt::test::failEachAllocation([&] { failure.addNameValue(text, text); }, unchanged), 3u);
     failure = Throwable("first");
-    EXPECT_GE(kvt_test::failEachAllocation([&] { failure.addStackFrame(text, text, 1); }, unchanged), 3u);
+    EXPECT_GE(kvt::test::failEachAllocation([&] { failure.addStackFrame(text, text, 1); }, unchanged), 3u);
     failure = Throwable("first");
-    EXPECT_GE(kvt_test::failEachAllocation([&] { failure.addMessage(1, parameters); }, unchanged), 3u);
+    EXPECT_GE(kvt::test::failEachAllocation([&] { failure.addMessage(1, parameters); }, unchanged), 3u);
     EXPECT_EQ(itemsOf(failure).size(), 2u);
 }
 
@@ -385,18 +385,18 @@ TEST(ThrowableOutOfMemory, ConstructorsAndCopiesLeakNothing) {
     const UString<0> text("a text that is too long for the small-string buffer");
     const Throwable original(text);
     Throwable target("target");
-    const std::ptrdiff_t before = kvt_test::livingBlocks();
+    const std::ptrdiff_t before = kvt::test::livingBlocks();
     const auto check = [&](std::size_t succeeding) {
-        EXPECT_EQ(kvt_test::livingBlocks(), before) << succeeding;
+        EXPECT_EQ(kvt::test::livingBlocks(), before) << succeeding;
         EXPECT_EQ(what(target), "target");
     };
-    kvt_test::failEachAllocation([&] { Throwable failure(text); }, check);
-    kvt_test::failEachAllocation([&] { Throwable failure(text, text); }, check);
-    kvt_test::failEachAllocation([&] { Throwable failure(1, {text, text}); }, check);
-    kvt_test::failEachAllocation([&] { Throwable failure(original); }, check);
-    kvt_test::failEachAllocation([&] { kvt::ex::InvalidEncodingException failure(text); }, check);
-    kvt_test::failEachAllocation([&] { original.what(); }, check);
-    const std::size_t failures = kvt_test::failEachAllocation([&] { target = original; }, check);
+    kvt::test::failEachAllocation([&] { Throwable failure(text); }, check);
+    kvt::test::failEachAllocation([&] { Throwable failure(text, text); }, check);
+    kvt::test::failEachAllocation([&] { Throwable failure(1, {text, text}); }, check);
+    kvt::test::failEachAllocation([&] { Throwable failure(original); }, check);
+    kvt::test::failEachAllocation([&] { kvt::ex::InvalidEncodingException failure(text); }, check);
+    kvt::test::failEachAllocation([&] { original.what(); }, check);
+    const std::size_t failures = kvt::test::failEachAllocation([&] { target = original; }, check);
     EXPECT_GE(failures, 1u);
 }
 

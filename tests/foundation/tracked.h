@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-namespace kvt_test {
+namespace kvt::test {
 
 struct TrackedCounts {
     long living = 0;
@@ -92,4 +92,4 @@ private:
 using Tracked = BasicTracked<false>;
 using TrackedThrowingMove = BasicTracked<true>;
 
-} // namespace kvt_test
+} // namespace kvt::test

@@ -15,7 +15,7 @@
 namespace {
 
 using kvt::ex::UString;
-using kvt_test::Tracked;
+using kvt::test::Tracked;
 
 template <typename T>
 struct Element {

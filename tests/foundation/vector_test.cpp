@@ -1,6 +1,6 @@
 // kvt::ex::vector: who owns the array, how elements move, and what is left when something throws.
-#include "counting_new.h"
 #include "tracked.h"
+#include <support/allocations.h>
 
 #include <kvt/foundation/vector.h>
 #include <kvt/string/ustring.h>
@@ -25,11 +25,11 @@ using kvt::ex::Encoding;
 using kvt::ex::UString;
 using kvt::ex::UStringArray;
 using kvt::ex::vector;
-using kvt_test::failEachAllocation;
-using kvt_test::livingBlocks;
-using kvt_test::Tracked;
-using kvt_test::TrackedFailure;
-using kvt_test::TrackedThrowingMove;
+using kvt::test::failEachAllocation;
+using kvt::test::livingBlocks;
+using kvt::test::Tracked;
+using kvt::test::TrackedFailure;
+using kvt::test::TrackedThrowingMove;
 
 std::vector<int> values(const vector<Tracked>& v) {
     std::vector<int> result;
@@ -148,13 +148,13 @@ TEST_F(VectorTest, TheArrayHasTheSizeOfItsCapacity) {
     vector<std::uint64_t> v;
     v.reserve(37);
     EXPECT_EQ(v.capacity(), 37u);
-    EXPECT_EQ(kvt_test::lastRequest(), 37 * sizeof(std::uint64_t));
+    EXPECT_EQ(kvt::test::lastRequest(), 37 * sizeof(std::uint64_t));
     while (v.size() < v.capacity()) {
         v.push_back(1);
     }
     v.push_back(2);
     EXPECT_GT(v.capacity(), 37u);
-    EXPECT_EQ(kvt_test::lastRequest(), v.capacity() * sizeof(std::uint64_t));
+    EXPECT_EQ(kvt::test::lastRequest(), v.capacity() * sizeof(std::uint64_t));
 }
 
 TEST_F(VectorTest, TheDeleterIsSetWithTheArrayAndReleasesIt) {
@@ -445,7 +445,7 @@ TEST_F(VectorTest, StringsSurviveEveryFailingAllocation) {
 
 // Relocation is the one place where elements are half here and half there.
 TEST(VectorThrowingMove, NoElementIsLostOrLeftOverWhenRelocationThrows) {
-    using Counts = kvt_test::TrackedCounts;
+    using Counts = kvt::test::TrackedCounts;
     TrackedThrowingMove::counts = Counts{};
     struct Row {
         const char* name;

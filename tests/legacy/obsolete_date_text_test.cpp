@@ -1,24 +1,22 @@
 // The text of a date: its formats, the special values, and how long it stays.
 #include "legacy_support.h"
-#include "private_member.h"
+#include <support/private_member.h>
 
 #include <locale>
 
 namespace kvt::test {
-namespace {
 
 // The private forms, which inline wrappers of a host call.
 struct Formatted {
     using Type = void (ObsoleteDate::*)(const char*, const char*&, std::uint64_t&) const;
+    friend Type memberOf(Formatted);
 };
 struct Unformatted {
     using Type = void (ObsoleteDate::*)(const char*&, std::uint64_t&) const;
+    friend Type memberOf(Unformatted);
 };
-
-} // namespace
-
-template struct PrivateMember<Formatted, &ObsoleteDate::asString>;
-template struct PrivateMember<Unformatted, &ObsoleteDate::asString>;
+template struct Opens<Formatted, &ObsoleteDate::asString>;
+template struct Opens<Unformatted, &ObsoleteDate::asString>;
 
 namespace {
 
@@ -85,13 +83,13 @@ TEST(ObsoleteDateText, BelongsToTheObjectUntilItsNext) {
     const ObsoleteDate date(1, 2, 2020);
     const char* out = nullptr;
     std::uint64_t length = 0;
-    (date.*privateMember<Formatted>)("%Y-%m-%d", out, length);
+    (date.*memberOf(Formatted()))("%Y-%m-%d", out, length);
     EXPECT_EQ(std::string(out, length), "2020-02-01");
     EXPECT_EQ(out[length], '\0');
 
     // A copy has a text of its own, and other operations on this object leave its text in place.
     ObsoleteDate copy(date);
-    (copy.*privateMember<Unformatted>)(out, length);
+    (copy.*memberOf(Unformatted()))(out, length);
     const char* const kept = out;
     EXPECT_EQ(std::string(kept, length), "02/01/20");
     ++copy;
@@ -106,11 +104,11 @@ TEST(ObsoleteDateText, StaysWhenTheNextFails) {
     ObsoleteDate date(1, 1, 1400);
     const char* out = nullptr;
     std::uint64_t length = 0;
-    (date.*privateMember<Formatted>)("%Y", out, length);
+    (date.*memberOf(Formatted()))("%Y", out, length);
     --date;
     const char* untouched = "untouched";
     std::uint64_t same = 9;
-    EXPECT_EQ(failureOf([&] { (date.*privateMember<Formatted>)("%Y", untouched, same); }), badYear);
+    EXPECT_EQ(failureOf([&] { (date.*memberOf(Formatted()))("%Y", untouched, same); }), badYear);
     EXPECT_EQ(std::string(untouched, same), "untouched");
     EXPECT_EQ(std::string(out, length), "1400");
 }

@@ -1,17 +1,14 @@
 // The text of a moment: its formats, and how long it stays.
 #include "legacy_support.h"
-#include "private_member.h"
+#include <support/private_member.h>
 
 namespace kvt::test {
-namespace {
 
 struct TextOfTime {
     using Type = void (ObsoleteTime::*)(const char*, const char*&, std::uint64_t&) const;
+    friend Type memberOf(TextOfTime);
 };
-
-} // namespace
-
-template struct PrivateMember<TextOfTime, &ObsoleteTime::asString>;
+template struct Opens<TextOfTime, &ObsoleteTime::asString>;
 
 namespace {
 
@@ -47,7 +44,7 @@ TEST(ObsoleteTimeText, BelongsToTheObjectUntilItsNext) {
     const ObsoleteTime time(ObsoleteDate(1, 2, 2020), 13, 2, 3);
     const char* out = nullptr;
     std::uint64_t length = 0;
-    (time.*privateMember<TextOfTime>)("%H:%M", out, length);
+    (time.*memberOf(TextOfTime()))("%H:%M", out, length);
     EXPECT_EQ(std::string(out, length), "13:02");
     EXPECT_EQ(out[length], '\0');
     const ObsoleteTime copy(time);

@@ -1,7 +1,7 @@
 // What is special: moments that arithmetic in whole seconds from a checked date does not reach, and the texts that a
 // copy takes along.
 #include "legacy_support.h"
-#include "private_member.h"
+#include <support/private_member.h>
 
 #include <kvt/legacy/detail/calendar.h>
 
@@ -9,30 +9,28 @@
 #include <memory>
 
 namespace kvt::test {
-namespace {
 
 struct ImplOfDate {
     using Type = std::unique_ptr<ex::detail::ObsoleteDateImpl> ObsoleteDate::*;
+    friend Type memberOf(ImplOfDate);
 };
 struct ImplOfTime {
     using Type = std::unique_ptr<ex::detail::ObsoleteTimeImpl> ObsoleteTime::*;
+    friend Type memberOf(ImplOfTime);
 };
-
-} // namespace
-
-template struct PrivateMember<ImplOfDate, &ObsoleteDate::impl_>;
-template struct PrivateMember<ImplOfTime, &ObsoleteTime::impl_>;
+template struct Opens<ImplOfDate, &ObsoleteDate::impl_>;
+template struct Opens<ImplOfTime, &ObsoleteTime::impl_>;
 
 namespace {
 
 using boost::date_time::special_values;
 
 ex::detail::ObsoleteDateImpl& implOf(ObsoleteDate& date) {
-    return *(date.*privateMember<ImplOfDate>);
+    return *(date.*memberOf(ImplOfDate()));
 }
 
 ex::detail::ObsoleteTimeImpl& implOf(ObsoleteTime& time) {
-    return *(time.*privateMember<ImplOfTime>);
+    return *(time.*memberOf(ImplOfTime()));
 }
 
 ObsoleteTime specialTime(special_values value) {

@@ -1,7 +1,7 @@
 // A named object in a segment that comes and goes, and the registrar that it could be registered with.
 
-#include "private_member.h"
 #include "scratch.h"
+#include <support/private_member.h>
 
 #include <kvt/mmap/managed_object.h>
 #include <kvt/mmap/memory_manager.h>
@@ -20,11 +20,13 @@
 namespace kvt::test {
 
 struct GrowthSize {
-    friend auto memberOf(GrowthSize);
+    using Type = const long long*;
+    friend Type memberOf(GrowthSize);
 };
 template struct Opens<GrowthSize, &ex::FileManager::growth_size>;
 struct MaxFileSize {
-    friend auto memberOf(MaxFileSize);
+    using Type = const long long*;
+    friend Type memberOf(MaxFileSize);
 };
 template struct Opens<MaxFileSize, &ex::FileManager::max_file_size>;
 

@@ -2,8 +2,8 @@
 // goes wrong on the way stands in memory_manager_failure_test.cpp.
 
 #include "manager_fixture.h"
-#include "private_member.h"
 #include "scratch.h"
+#include <support/private_member.h>
 
 #include <kvt/mmap/memory_manager.h>
 
@@ -29,7 +29,9 @@
 namespace kvt::test {
 
 struct LoadSegment {
-    friend auto memberOf(LoadSegment);
+    using Type = ex::mmap::mapped_region_segment (ex::mmap::memory_manager::*)(
+        unsigned long long index, future::optional<unsigned long long> size);
+    friend Type memberOf(LoadSegment);
 };
 template struct Opens<LoadSegment, &ex::mmap::memory_manager::load_segment>;
 

@@ -1,7 +1,7 @@
 // Who shares and who owns, seen by the blocks that are allocated.
 #include "regex_support.h"
 
-#include <foundation/counting_new.h>
+#include <support/allocations.h>
 
 #include <gtest/gtest.h>
 
@@ -13,7 +13,7 @@ namespace {
 
 using ex::URegex;
 using ex::UString;
-using kvt_test::livingBlocks;
+using kvt::test::livingBlocks;
 
 const UString<0> pattern("(a|b)+[c-e]{2,3}(?=f)");
 
@@ -97,20 +97,21 @@ TEST_F(RegexMemory, AnAssignmentThatFailsForLackOfMemoryChangesNothing) {
     const URegex<0> regex(pattern);
     URegex<0> target("x");
     const URegex<0> taken(std::move(target));
-    const std::size_t failures = kvt_test::failEachAllocation([&] { target = regex; },
-                                                              [&](std::size_t) {
-                                                                  EXPECT_TRUE(target); // moved-from as before
-                                                              });
+    const std::size_t failures =
+        kvt::test::failEachAllocation([&] { target = regex; },
+                                      [&](std::size_t) {
+                                          EXPECT_TRUE(target); // moved-from as before
+                                      });
     EXPECT_EQ(failures, 1u);
     EXPECT_TRUE(target.search("abccf"));
 }
 
 TEST_F(RegexMemory, CompilingAndSearchingReleaseAllWhenMemoryRunsOut) {
     const UString<0> subject("xx abccf, and more text than is kept in place");
-    EXPECT_GT(kvt_test::failEachAllocation([&] { URegex<0> regex(pattern); }, [](std::size_t) {}), 3u);
-    EXPECT_GT(kvt_test::failEachAllocation([&] { ObsoleteRegexp regexp("a(b)"); }, [](std::size_t) {}), 3u);
+    EXPECT_GT(kvt::test::failEachAllocation([&] { URegex<0> regex(pattern); }, [](std::size_t) {}), 3u);
+    EXPECT_GT(kvt::test::failEachAllocation([&] { ObsoleteRegexp regexp("a(b)"); }, [](std::size_t) {}), 3u);
     const URegex<0> regex(pattern);
-    EXPECT_GT(kvt_test::failEachAllocation([&] { regex.search(subject); }, [](std::size_t) {}), 1u);
+    EXPECT_GT(kvt::test::failEachAllocation([&] { regex.search(subject); }, [](std::size_t) {}), 1u);
     EXPECT_TRUE(regex.search(subject));
 }
 

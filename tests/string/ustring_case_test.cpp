@@ -4,8 +4,8 @@
 // map is checked against Unicode's own data in ustring_case_data_test.cpp.
 #include <string/case_mapping_members.h>
 #include <string/intercepted_case_mapping.h>
-#include <string/one_failing_allocation.h>
 #include <string/string_types.h>
+#include <support/allocations.h>
 #include <support/failure_record.h>
 
 #include <kvt/foundation/throwable.h>
@@ -173,7 +173,7 @@ TYPED_TEST(UStringCase, WithoutMemoryTheStringStaysAsItWas) {
                 UString<N> text(original);
                 std::string thrown;
                 try {
-                    const OneFailingAllocation failing(index);
+                    const FailingAllocations failing(index, 1);
                     member.run(text);
                 } catch (const kvt::ex::FatalError& failure) {
                     thrown = failure.what().toStdString();
@@ -183,7 +183,7 @@ TYPED_TEST(UStringCase, WithoutMemoryTheStringStaysAsItWas) {
                     EXPECT_FALSE(N == Encoding::Utf8 || N == Encoding::Utf16LE) << "allocation " << index;
                 }
                 EXPECT_EQ(text, thrown.empty() ? expected : original) << "allocation " << index;
-                if (!OneFailingAllocation::happened()) {
+                if (!FailingAllocations::happened()) {
                     break;
                 }
                 failures += thrown.empty() ? 0 : 1;

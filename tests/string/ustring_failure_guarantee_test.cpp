@@ -1,7 +1,7 @@
 // What a failing operation leaves behind: the string as it was. Memory runs out in two ways: the allocation functions
 // of this program fail on demand, at each allocation of an operation in turn, and a child process lives within limits.
-#include <foundation/counting_new.h>
 #include <string/operations_support.h>
+#include <support/allocations.h>
 
 #include <kvt/foundation/throwable.h>
 
@@ -20,8 +20,8 @@ namespace {
 
 using namespace kvt::test;
 using kvt::ex::detail::case_insensitive_t;
-using kvt_test::failEachAllocation;
-using kvt_test::FailingAllocations;
+using kvt::test::failEachAllocation;
+using kvt::test::FailingAllocations;
 
 template <typename Number>
 class UStringGuarantee : public StringTest<Number> {

@@ -1,8 +1,8 @@
 // Splitting and joining, the same for all string types but for the labels of UString<30>.
 //
 // The reference of the property tests walks the text unit by unit; the library jumps from one delimiter to the next.
-#include <string/one_failing_allocation.h>
 #include <string/string_types.h>
+#include <support/allocations.h>
 
 #include <gtest/gtest.h>
 
@@ -417,10 +417,10 @@ TYPED_TEST(UStringSplit, LackOfMemoryIsReportedAndLeavesNothingBehind) {
     std::size_t failures = 0;
     for (std::size_t index = 0;; ++index) {
         try {
-            const OneFailingAllocation failing(index);
+            const FailingAllocations failing(index, 1);
             const auto pieces = text.split(asciiUnits<N>(",")[0]);
             const auto joined = pieces.join(plain<N>(","));
-            if (!OneFailingAllocation::happened()) {
+            if (!FailingAllocations::happened()) {
                 EXPECT_EQ(joined, text);
                 break;
             }
