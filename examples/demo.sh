@@ -1,10 +1,10 @@
 #!/usr/bin/env bash
-# Performs the story that README.md tells under "One story", on the same data, with the kvt command as it was built.
+# Performs the story in docs/story.md, on the same data, with the kvt command as it was built.
 #
 #   examples/demo.sh [PROGRAM | BUILD-FOLDER]     or KVT=PROGRAM examples/demo.sh
 #
-# The commands stand in the README and nowhere else. Here each is shown as it stands there and run in a folder that is
-# gone afterwards, and what it really prints follows, and its exit status if that is not 0.
+# The commands stand in the story and nowhere else. Each is shown as it stands there and run in a folder that is gone
+# afterwards. What it really prints follows, and its exit status if that is not 0.
 
 set -euo pipefail
 export LC_ALL=C.UTF-8 NO_COLOR=1
@@ -38,7 +38,7 @@ count=0
 inside=no
 while IFS= read -r line; do
     case $inside:$line in
-    no:'### '*) printf '\n== %s\n' "${line#'### '}" ;;
+    no:'## '*) printf '\n== %s\n' "${line#'## '}" ;;
     no:'```console')
         printf '\n'
         inside=yes
@@ -53,9 +53,9 @@ while IFS= read -r line; do
         count=$((count + 1))
         ;;
     esac
-done < <(sed -n '/^## One story$/,/^## /p' "$repository/README.md")
+done <"$repository/docs/story.md"
 
 if [[ $count -eq 0 ]]; then
-    echo "demo: no story in $repository/README.md" >&2
+    echo "demo: no story in $repository/docs/story.md" >&2
     exit 2
 fi

@@ -28,6 +28,7 @@ struct FmtFormatter : fmt::formatter<fmt::string_view> {
 } // namespace kvt::ex::detail
 
 // One by one: a specialisation for all N would compete with that of <fmt/ranges.h>, as a string is a range, too.
+/// \cond the reference pages have no place for members of fmt
 // clang-format off
 template <> struct fmt::formatter<kvt::ex::UString<0>> : kvt::ex::detail::FmtFormatter<0> {};
 template <> struct fmt::formatter<kvt::ex::UString<1>> : kvt::ex::detail::FmtFormatter<1> {};
@@ -38,3 +39,4 @@ template <> struct fmt::formatter<kvt::ex::UString<28>> : kvt::ex::detail::FmtFo
 template <> struct fmt::formatter<kvt::ex::UString<29>> : kvt::ex::detail::FmtFormatter<29> {};
 template <> struct fmt::formatter<kvt::ex::UString<30>> : kvt::ex::detail::FmtFormatter<30> {};
 // clang-format on
+/// \endcond

@@ -1,35 +1,44 @@
 #!/usr/bin/env bash
-# Holds an example in the README to the program that is built from it.
+# Holds the example in the README to the program that is built from it.
 #
-#   readme_example.sh code README SOURCE [NUMBER]      the README's C++ block of that number (1) is the SOURCE
-#   readme_example.sh output README PROGRAM [NUMBER]   the README's first "text" block after it is what the PROGRAM
-#                                                      prints, in an empty folder
+#   readme_example.sh code README SOURCE      the README's C++ block is the SOURCE
+#   readme_example.sh output README PROGRAM   the README's "text" block is what the PROGRAM prints, and it ends well
+#   readme_example.sh notices README          `output` fails for a program that prints the block and ends by status 1
 
 set -euo pipefail
 export LC_ALL=C.UTF-8
 
-# block LANGUAGE FILE: the C++ block of the number; for "text", the first after that.
+readme=$2
+
+# block LANGUAGE: the first block of the README that is fenced as that.
 block() {
-    awk -v language="$1" -v number="$number" '
+    awk -v fence="\`\`\`$1" '
         inside && /^```$/ { exit }
         inside { print }
-        /^```cpp$/ { ++seen }
-        $0 == "```" language && seen == number { inside = 1 }' "$2"
+        $0 == fence { inside = 1 }' "$readme"
 }
 
-# Runs a program, which may leave files behind, in a folder that is removed again.
-run() {
-    local folder program
-    program=$(realpath "$1")
-    folder=$(mktemp -d)
-    trap 'rm -rf "$folder"' EXIT
-    cd "$folder"
-    "$program"
+# The program's status would be lost in a process substitution, so that its output is taken first.
+output() {
+    local printed
+    printed=$("$1")
+    diff -u <(block text) - <<<"$printed"
 }
 
-number=${4:-1}
+notices() {
+    local status=0
+    program=$(mktemp)
+    trap 'rm -f "$program"' EXIT
+    printf '#!/bin/sh\ncat <<"END"\n%s\nEND\nexit "$STATUS"\n' "$(block text)" >"$program"
+    chmod +x "$program"
+    STATUS=0 "$0" output "$readme" "$program"
+    STATUS=1 "$0" output "$readme" "$program" || status=$?
+    [[ $status -ne 0 ]]
+}
+
 case $1 in
-code) diff -u <(block cpp "$2") "$3" ;;
-output) diff -u <(block text "$2") <(run "$3") ;;
+code) diff -u <(block cpp) "$3" ;;
+output) output "$3" ;;
+notices) notices ;;
 *) exit 2 ;;
 esac

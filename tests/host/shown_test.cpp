@@ -1,5 +1,5 @@
-// The README and the pages beside it show the command at work, and examples/demo.sh performs the README's story. What
-// they show is what happens.
+// The story and the reference of the commands show the command at work, and examples/demo.sh performs the story. What they
+// show is what happens.
 
 #include "host_test.h"
 
@@ -86,8 +86,8 @@ protected:
     }
 };
 
-TEST_F(KvtShown, TheReadmeShowsWhatHappens) {
-    expectBlocksToHappen(KVT_SOURCE_DIR "/README.md", 5);
+TEST_F(KvtShown, TheStoryShowsWhatHappens) {
+    expectBlocksToHappen(KVT_SOURCE_DIR "/docs/story.md", 5);
 }
 
 TEST_F(KvtShown, ThePageOfCommandsShowsWhatHappens) {
@@ -95,24 +95,28 @@ TEST_F(KvtShown, ThePageOfCommandsShowsWhatHappens) {
 }
 
 TEST_F(KvtShown, NoOtherPageShowsWhatIsNotRun) {
+    std::vector<std::filesystem::path> pages = {KVT_SOURCE_DIR "/README.md",
+                                                KVT_SOURCE_DIR "/CONTRIBUTING.md"};
     for (const auto& entry : std::filesystem::directory_iterator(KVT_SOURCE_DIR "/docs")) {
-        if (entry.path().extension() == ".md" && entry.path().filename() != "commands.md") {
-            for (const Part& part : partsOf(entry.path())) {
-                EXPECT_NE(part.kind, Part::Block) << entry.path();
-            }
+        const std::string name = entry.path().filename().string();
+        if (name.ends_with(".md") && name != "commands.md" && name != "story.md") {
+            pages.push_back(entry.path());
+        }
+    }
+    for (const std::filesystem::path& page : pages) {
+        for (const Part& part : partsOf(page)) {
+            EXPECT_NE(part.kind, Part::Block) << page;
         }
     }
 }
 
-TEST_F(KvtShown, TheDemoIsTheStoryOfTheReadme) {
+TEST_F(KvtShown, TheDemoIsTheStory) {
     std::string story;
-    bool isStory = false;
-    for (const Part& part : partsOf(KVT_SOURCE_DIR "/README.md")) {
-        if (part.kind == Part::Heading && part.text.starts_with("## ")) {
-            isStory = part.text == "## One story";
-        } else if (isStory) {
-            story += part.kind == Part::Heading ? "\n==" + part.text.substr(part.text.find(' ')) + "\n"
-                                                : "\n" + part.text;
+    for (const Part& part : partsOf(KVT_SOURCE_DIR "/docs/story.md")) {
+        if (part.kind == Part::Block) {
+            story += "\n" + part.text;
+        } else if (part.text.starts_with("## ")) {
+            story += "\n==" + part.text.substr(2) + "\n";
         }
     }
     const ChildResult result = shell(KVT_SOURCE_DIR "/examples/demo.sh", folder_.string());
