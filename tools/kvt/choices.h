@@ -14,7 +14,7 @@ namespace host {
 template <typename Value>
 using Choices = std::vector<std::pair<std::string, Value>>;
 
-/// Throws Failure when `typed` is none of the words; it suggests the nearest.
+/// Throws Failure when `typed` is not one of the words. The failure suggests the nearest.
 template <typename Value>
 Value choose(const std::string& option, const std::string& typed, const Choices<Value>& choices) {
     std::vector<std::string> names;

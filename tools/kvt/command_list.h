@@ -1,5 +1,5 @@
-// The commands, one line for each, in the order in which the help lists them. Included by whoever wants the list,
-// with KVT_COMMAND(name) defined for the purpose; hence no include guard.
+// The commands, one line for each, in the order in which the help lists them. Who wants the list defines
+// KVT_COMMAND(name) and includes this, perhaps more than once; hence no include guard.
 
 KVT_COMMAND(convert)
 KVT_COMMAND(encodings)

@@ -13,7 +13,7 @@ namespace host {
 enum class OnError {
     Stop,    ///< at the first loss, without a result
     Replace, ///< put the substitution there and go on
-    Report,  ///< the same, and tell of each loss
+    Report,  ///< the same, and report each loss
 };
 
 struct ConvertOptions {

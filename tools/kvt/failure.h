@@ -1,5 +1,5 @@
 // How a command ends early. A Failure is a sentence for the user and ends the program with status 2; a ClosedPipe
-// ends it as well, but without a word: whoever read our output has seen enough.
+// ends it as well, but without a word: who read our output has seen enough.
 #pragma once
 
 #include <stdexcept>

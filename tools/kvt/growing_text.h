@@ -1,5 +1,5 @@
-// A text that is put together piece by piece and may become as long as a file: it stays in memory while it is short,
-// and grows in the workspace when it is not.
+// A text that is put together piece by piece and may become as long as a file. It stays in memory while it is short,
+// and goes on in the workspace when it is not.
 #pragma once
 
 #include "workspace.h"

@@ -47,7 +47,7 @@ void catchEndingSignals() {
     for (const int number : endingSignals) {
         struct sigaction before {};
         sigaction(number, nullptr, &before);
-        // Whoever started the program with a signal ignored (nohup does) wants it to stay so.
+        // A signal that was ignored when the program was started (as by nohup) stays so.
         if (before.sa_handler != SIG_IGN) {
             sigaction(number, &action, nullptr);
         }

@@ -19,7 +19,7 @@ namespace host {
 namespace {
 
 constexpr std::uint64_t leastMemory = 64 * 1024;
-// More than this is no more use to anybody, and at some point cannot be mapped.
+// More than this does not help anybody, and at some point cannot be mapped.
 constexpr std::uint64_t mostMemory = std::uint64_t{1} << 40;
 
 // Lines on their way out.

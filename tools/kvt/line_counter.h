@@ -2,10 +2,10 @@
 //
 // Only losses need a place, and most text has none, so nothing is decoded until a place is asked for. What is done
 // for every block is to look for line ends, which in most encodings are bytes (or units of two or four bytes) that
-// mean nothing else; only the rest of the last line is kept. In the other encodings (EBCDIC, those with shifts and
-// escapes) a line end can only be told by decoding, and every block is decoded.
+// mean nothing else. Only the rest of the last line is kept. In the other encodings (EBCDIC, those with shifts and
+// escapes) a line end is known by decoding only, and every block is decoded.
 //
-// Lines end with LF, CR or CRLF. Columns count code points from 1; a byte sequence that is no text counts as the
+// Lines end with LF, CR or CRLF. Columns count code points from 1; a byte sequence that is not text counts as the
 // one U+FFFD that stands for it. A byte order mark at the start is not counted.
 #pragma once
 

@@ -1,7 +1,7 @@
 // The lines of files on their way into a sorter.
 //
-// A line ends with LF, which is no part of it; the last one of a file need not. Lines are bytes, and of any length,
-// unless they are folded: then files are UTF-8, and what is none of it is refused with its place.
+// A line ends with LF, which does not belong to it; the last one of a file need not end so. Lines are bytes, of any
+// length. Where lines are folded, files are UTF-8, and what is not is refused with its place.
 #pragma once
 
 #include "growing_text.h"

@@ -15,7 +15,7 @@ namespace {
 
 using kvt::ex::Encoding;
 
-// With everything beyond printable ASCII as "\xHH", which is how the library writes bytes that are no text.
+// With everything beyond printable ASCII as "\xHH", which is how the library writes bytes that are not text.
 std::string shownBytes(const std::string& bytes) {
     std::ostringstream out;
     out << kvt::ex::BinaryString(bytes.data(), bytes.size());

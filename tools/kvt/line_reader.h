@@ -1,9 +1,9 @@
 // Input files as decoded lines: whatever encoding a file is in, its lines come out as UTF-8, one after the
 // other.
 //
-// A line ends with LF, CR or CRLF, as places are counted elsewhere in the program; the end is told apart from
-// the text, so that it can be written again as it was. What is no text in the encoding ends the reading with
-// its place. One block and the line that runs over its end are held, no more.
+// A line ends with LF, CR or CRLF, as places are counted elsewhere in the program. The end is kept apart from the
+// text, so that it can be written again as it was. Bytes that are not text in the encoding end the reading with
+// their place. One block and the line that runs over its end are held, no more.
 #pragma once
 
 #include "failure.h"
@@ -28,7 +28,7 @@ struct TextLine {
     std::string_view end;  ///< "\n", "\r", "\r\n", or nothing behind the last line
 };
 
-/// The failure of a loss in `file` when bytes that are no text are not to be replaced: the place, and which bytes.
+/// The failure of a loss in `file` when bytes that are not text must not be replaced: the place, and which bytes.
 Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineCounter& places,
                        const std::string& encodingName);
 
@@ -38,14 +38,14 @@ public:
     LineReader(const std::string& path, kvt::ex::Encoding encoding);
 
     /// Reads a block, of which next() then gives the lines; false behind the end of the file. Throws Failure,
-    /// with the place of bytes that are no text.
+    /// with the place of bytes that are not text.
     bool readBlock();
     /// The next line that is complete; false when there is none before the next block. Throws Failure when a
     /// line is longer than longestLine.
     bool next(TextLine& line);
 
-    /// The byte order mark at the start of the file, as UTF-8, for the first call; it is no part of the first
-    /// line.
+    /// The byte order mark at the start of the file, as UTF-8, for the first call. It does not belong to the
+    /// first line.
     std::string_view takeMark();
 
     const Input& input() const { return input_; }

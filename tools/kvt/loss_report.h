@@ -1,4 +1,4 @@
-// One loss at a time, told to a person or written as JSON.
+// One loss at a time, as a line for a person or as JSON.
 #pragma once
 
 #include "line_counter.h"

@@ -130,7 +130,7 @@ private:
         }
     }
 
-    // Appends the number to `out`; when it is none, writes what there is before failing.
+    // Appends the number to `out`. Where the text is not a number, writes what there is and then fails.
     template <typename Place>
     void add(std::string_view text, const Place& place, std::string& out, Output& output) const {
         try {

@@ -26,7 +26,7 @@ int writeAll(int descriptor, std::string_view bytes) {
         if (written >= 0) {
             bytes.remove_prefix(static_cast<std::size_t>(written));
         } else if (errno == EAGAIN) {
-            // Whoever gave us this descriptor has made it non-blocking.
+            // The descriptor was made non-blocking before we got it.
             pollfd waiting{descriptor, POLLOUT, 0};
             ::poll(&waiting, 1, -1);
         } else if (errno != EINTR) {
@@ -36,7 +36,7 @@ int writeAll(int descriptor, std::string_view bytes) {
     return 0;
 }
 
-// Sends the data to the device. Pipes and the like have no device behind them, which is no failure.
+// Sends the data to the device. Pipes and the like have no device behind them, which is not a failure.
 int synchronise(int descriptor) {
     return ::fsync(descriptor) == 0 || errno == EINVAL || errno == EROFS || errno == ENOTSUP ? 0 : errno;
 }

@@ -1,4 +1,4 @@
-// A bar on standard error while a long input is read, when that is a terminal; on demand, lines when it is none.
+// A bar on standard error while a long input is read, if that is a terminal; on demand, lines if it is not.
 #pragma once
 
 #include <chrono>

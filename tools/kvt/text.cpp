@@ -70,7 +70,7 @@ std::string codePointName(char32_t character) {
 }
 
 std::string printable(std::string_view utf8) {
-    // The library tells where a loss stood, which is where bytes are to be shown instead of a character.
+    // The library reports where a loss was, and there bytes are shown instead of a character.
     std::string out;
     std::uint64_t shown = 0;
     const auto showUpTo = [&](std::uint64_t offset) {

@@ -15,7 +15,7 @@ std::string hexBytes(std::string_view bytes);
 /// "U+0141", "U+1F600".
 std::string codePointName(char32_t character);
 
-/// The text as it stands, but with control characters and bytes that are no UTF-8 as `\xHH`, so that it is one
+/// The text as it stands, but with control characters and bytes that are not UTF-8 as `\xHH`, so that it is one
 /// harmless line on a terminal.
 std::string printable(std::string_view utf8);
 std::string printable(std::u32string_view text);

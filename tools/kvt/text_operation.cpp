@@ -96,7 +96,7 @@ private:
 // The library's own search without regard to case gives positions in the folded text, folds again at each
 // call, and counts the filling of a folded needle. Here both sides are folded once, without filling, and each
 // match is traced back to the characters that it came from; one that covers half a character ("s" in "ß",
-// which folds to "ss") is none.
+// which folds to "ss") does not count.
 class Matcher {
 public:
     Matcher(Utf8String needle, CaseRule rule) : needle_(std::move(needle)), rule_(rule) {

@@ -15,8 +15,8 @@ namespace host {
 class WwjdStream {
 public:
     virtual ~WwjdStream() = default;
-    /// Takes the next bytes and appends what is ready to `out`. Throws kvt::ex::Loss at the first loss, with
-    /// `offset` and `bytes` telling about the input.
+    /// Takes the next bytes and appends what is ready to `out`. Throws kvt::ex::Loss at the first loss, whose
+    /// `offset` and `bytes` are those of the input.
     virtual void convert(std::string_view block, std::string& out) = 0;
     /// The stream ends here; another may follow.
     virtual void finish(std::string& out) = 0;
