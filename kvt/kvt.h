@@ -25,6 +25,7 @@
 #include <kvt/mmap/mapped_region_segment.h>
 #include <kvt/mmap/memory_manager.h>
 #include <kvt/mmap/memory_registrar.h>
+#include <kvt/mmap/segment_file.h>
 #include <kvt/regex/obsolete_regexp.h>
 #include <kvt/regex/uregex.h>
 #include <kvt/string/ustring.h>

@@ -13,6 +13,7 @@
 #pragma once
 
 #include <kvt/foundation/export.h>
+#include <kvt/mmap/segment_file.h>
 
 #include <boost/interprocess/allocators/allocator.hpp>
 #include <boost/interprocess/indexes/iset_index.hpp>
@@ -43,10 +44,10 @@ template <typename T>
 using segment_allocator = boost::interprocess::allocator<T, segment_heap::segment_manager>;
 
 static_assert(
-    sizeof(segment_heap::memory_algorithm) == 56 && sizeof(segment_heap::segment_manager) == 120,
-    "the beginning of a heap is part of the form of persistent files: 56 bytes on free memory, then two "
-    "indices of objects of 32 bytes each; this version of Boost.Interprocess lays it out in another way, "
-    "so files would not be readable across versions");
+    sizeof(segment_heap::memory_algorithm) == segment_file::algorithmSize &&
+        sizeof(segment_heap::segment_manager) == segment_file::headSize,
+    "the head of a heap is part of the form of persistent files (docs/segment_file.md); this version of "
+    "Boost.Interprocess lays it out in another way, so files would not be readable across versions");
 
 /// The index of a segment that stands in no table.
 inline constexpr unsigned long long k_no_index = 0xFFFFFFFF;
@@ -57,6 +58,10 @@ inline constexpr unsigned long long k_no_index = 0xFFFFFFFF;
 /// full at that moment, the system has no way to report it but the signal SIGBUS, which ends the process. load() takes
 /// the room for the beginnings of a heap itself and fails in good order; for what a program writes afterwards no one
 /// does.
+///
+/// All that a program writes into a segment is in the file, the bytes between the members of its own types included.
+/// Boost writes four such bytes in front of each object that construct() makes in a segment, and in a program built
+/// without optimisation they are what happened to lie on the stack.
 class KVT_EXPORT mapped_region_segment {
 public:
     /// No stretch of any file: offset -1, size 0, index k_no_index. Not to be loaded.
@@ -76,19 +81,20 @@ public:
     /// Maps the stretch and opens its heap; does nothing on a segment that is loaded.
     ///
     /// `initialised` says that the stretch holds a heap already, which is believed: bytes that hold none are read as
-    /// one. Without it a heap is made over whatever is there, unless this segment was loaded before: then the
-    /// heap of that time is opened.
+    /// one: what uses it may crash, damage the file, or never end. Without it a heap is made over whatever is there, unless
+    /// this segment was loaded before: then the heap of that time is opened.
     ///
     /// Throws boost::interprocess::interprocess_exception, and the segment is not loaded:
-    ///   - when the stretch does not lie in the file as it is, with the code size_error,
+    ///   - with the code size_error, when the stretch does not lie in the file as it is, or begins at an offset that is
+    ///     no multiple of the page size,
     ///   - with the system's error, when it cannot be mapped or when the disk has no room for the heap's beginnings,
     ///   - "Could not initialize buffer in basic_managed_external_buffer constructor", when the stretch is too small
     ///     for a heap.
     void load(bool initialised);
 
     /// Unmaps the stretch; all pointers into it become invalid. If anything is allocated in the heap, waits until all
-    /// that was written is on the disk; a failure of that is not reported. This is the one way to see to it that a
-    /// segment is there after a loss of power. Gives the segment's size in bytes, or 0 when it was not loaded.
+    /// that was written is on the disk; a failure of that is not reported. This is the one way to have a segment
+    /// survive a loss of power. Gives the segment's size in bytes, or 0 when it was not loaded.
     unsigned long long release();
 
     /// Where the stretch begins, in bytes from the beginning of the file.

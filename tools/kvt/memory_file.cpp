@@ -1,6 +1,10 @@
+// A reader that follows the lists of a file by their pointers. Header keeps all reading within the header segment, and
+// Deque looks the numbers of a list over before it goes through its elements.
 #include "memory_file.h"
 
 #include "failure.h"
+
+#include <kvt/mmap/segment_file.h>
 
 #include <algorithm>
 #include <array>
@@ -14,35 +18,8 @@ namespace {
 
 static_assert(std::endian::native == std::endian::little, "the file is little-endian");
 
-// Positions in a segment that has a heap.
-constexpr std::uint64_t extraHeaderBytesAt = 32;
-constexpr std::uint64_t extraHeaderBytes = 64;
-constexpr std::uint64_t allocatedAt = 40;
-constexpr std::uint64_t heapSizeAt = 48;
-constexpr std::uint64_t namedCountAt = 56;
-constexpr std::uint64_t namedRootAt = 64;
-constexpr std::uint64_t heapStart = 120;
-// Blocks begin at a multiple of 16.
-constexpr std::uint64_t firstBlock = 128;
-
-// A named object: a node of a tree, then a header of its own, then the value, then the name.
-constexpr std::uint64_t nodeSize = 24;
-constexpr std::uint64_t valueHeaderSize = 16;
-constexpr std::uint64_t headerObjectSize = 192;
-constexpr std::string_view headerName = "segment_data";
-
-// A deque: two pointers of its allocators, its map and the size of that, and the two iterators.
-constexpr std::uint64_t dequeSize = 96;
-constexpr std::uint64_t mapAt = 16;
-constexpr std::uint64_t mapSizeAt = 24;
-constexpr std::uint64_t startAt = 32;
-constexpr std::uint64_t finishAt = 64;
-
-constexpr std::uint64_t rowSize = 16;
-constexpr std::uint64_t rowsInBlock = 32;
-constexpr std::uint64_t savedInBlock = 5;
-constexpr std::uint64_t wordSize = 8;
-constexpr std::uint64_t wordsInBlock = 64;
+namespace form = kvt::ex::mmap::segment_file;
+constexpr std::string_view headerName = form::headerName;
 
 constexpr const char* noHeap = "it does not begin with a heap; it is no persistent file of segments";
 
@@ -81,7 +58,7 @@ public:
     /// Where the pointer at `offset` leads to; nothing for the null pointer, whose value is 1.
     std::optional<std::uint64_t> pointer(std::uint64_t offset) const {
         const std::uint64_t distance = word(offset);
-        if (distance == 1) {
+        if (distance == form::nullPointer) {
             return std::nullopt;
         }
         const std::uint64_t target = offset + distance;
@@ -105,15 +82,15 @@ class Deque {
 public:
     Deque(const Header& header, std::uint64_t at, std::uint64_t elementSize, std::uint64_t inBlock)
         : header_(header), elementSize_(elementSize), inBlock_(inBlock) {
-        header.require(header.fits(at, dequeSize), "a list reaches beyond its end");
-        const std::optional<std::uint64_t> map = header.pointer(at + mapAt);
+        header.require(header.fits(at, form::listSize), "a list reaches beyond its end");
+        const std::optional<std::uint64_t> map = header.pointer(at + form::mapAt);
         if (!map) {
             return;
         }
-        const std::uint64_t mapSize = header.word(at + mapSizeAt);
+        const std::uint64_t mapSize = header.word(at + form::mapEntriesAt);
         header.require(mapSize <= header.size() / 8 && header.fits(*map, mapSize * 8), "a list has no map");
-        const Position start = position(at + startAt, *map, mapSize);
-        const Position finish = position(at + finishAt, *map, mapSize);
+        const Position start = position(at + form::beginAt, *map, mapSize);
+        const Position finish = position(at + form::endAt, *map, mapSize);
         header.require(
             start.index < inBlock_ && finish.index < inBlock_ &&
                 (start.node < finish.node || (start.node == finish.node && start.index <= finish.index)),
@@ -194,21 +171,22 @@ std::uint64_t wordAt(const ByteSource& bytes, std::uint64_t offset) {
 
 // Whether the beginning of a heap is at `offset`, with at least `size` bytes of file behind it.
 bool hasHeapMarks(const ByteSource& bytes, std::uint64_t offset, std::uint64_t size) {
-    if (size < firstBlock || wordAt(bytes, offset + extraHeaderBytesAt) != extraHeaderBytes) {
+    if (size < form::firstBlockAt || wordAt(bytes, offset + form::extraBytesAt) != form::extraBytes) {
         return false;
     }
-    const std::uint64_t heapSize = wordAt(bytes, offset + heapSizeAt);
-    return heapSize >= firstBlock && wordAt(bytes, offset + allocatedAt) <= heapSize - firstBlock;
+    const std::uint64_t heapSize = wordAt(bytes, offset + form::heapSizeAt);
+    return heapSize >= form::firstBlockAt &&
+           wordAt(bytes, offset + form::allocatedAt) <= heapSize - form::firstBlockAt;
 }
 
 void readHeapSizes(const ByteSource& bytes, SegmentReport& segment) {
     segment.state = SegmentState::Heap;
-    segment.allocated = wordAt(bytes, segment.offset + allocatedAt);
-    segment.free = segment.size - segment.allocated - firstBlock;
+    segment.allocated = wordAt(bytes, segment.offset + form::allocatedAt);
+    segment.free = segment.size - segment.allocated - form::firstBlockAt;
 }
 
 SegmentReport inspectHeader(const ByteSource& bytes, std::optional<std::uint64_t> segmentSize) {
-    if (bytes.size() < firstBlock) {
+    if (bytes.size() < form::firstBlockAt) {
         throw Failure("it is too short for a persistent file of segments: " + bytesText(bytes.size()));
     }
     SegmentReport header;
@@ -216,16 +194,16 @@ SegmentReport inspectHeader(const ByteSource& bytes, std::optional<std::uint64_t
         throw Failure("it has " + bytesText(bytes.size()) + ", less than the header segment of " +
                       bytesText(*segmentSize));
     }
-    if (isZeros(bytes, 0, firstBlock) && isZeros(bytes, 0, segmentSize.value_or(bytes.size()))) {
+    if (isZeros(bytes, 0, form::firstBlockAt) && isZeros(bytes, 0, segmentSize.value_or(bytes.size()))) {
         header.size = segmentSize.value_or(bytes.size());
         return header;
     }
     if (!hasHeapMarks(bytes, 0, bytes.size())) {
         throw Failure(noHeap);
     }
-    header.size = wordAt(bytes, heapSizeAt);
+    header.size = wordAt(bytes, form::heapSizeAt);
     // Executable files have the mark as well, and look like a file that was cut; but for what a count would be.
-    if (header.size > bytes.size() && wordAt(bytes, namedCountAt) > 1) {
+    if (header.size > bytes.size() && wordAt(bytes, form::namedObjectsAt) > 1) {
         throw Failure(noHeap);
     }
     if (segmentSize && *segmentSize != header.size) {
@@ -242,22 +220,23 @@ SegmentReport inspectHeader(const ByteSource& bytes, std::optional<std::uint64_t
 
 // Where the one object of the header segment is.
 std::uint64_t findHeaderObject(const Header& header) {
-    const std::uint64_t count = header.word(namedCountAt);
+    const std::uint64_t count = header.word(form::namedObjectsAt);
     if (count == 0) {
         throw Failure(
             "its first heap has no table of segments; it is no persistent file, or its header was not "
             "finished");
     }
     header.require(count == 1, "it has more than one object");
-    const std::uint64_t node = header.pointerThatIs(namedRootAt);
-    header.require(node >= heapStart, "its object lies in its head");
-    const std::uint64_t valueHeader = node + nodeSize;
-    const std::uint64_t value = valueHeader + valueHeaderSize;
+    const std::uint64_t node = header.pointerThatIs(form::namedObjectsAt + form::treeRootAt);
+    header.require(node >= form::headSize, "its object lies in its head");
+    const std::uint64_t description = node + form::nodeSize;
+    const std::uint64_t value = description + form::descriptionSize;
     std::array<char, headerName.size()> name{};
-    header.read(value + headerObjectSize, name.data(), name.size());
+    header.read(value + form::headerSize, name.data(), name.size());
     std::uint16_t nameLength = 0;
-    header.read(valueHeader + 8, reinterpret_cast<char*>(&nameLength), sizeof nameLength);
-    header.require(header.word(valueHeader) == headerObjectSize && nameLength == headerName.size() &&
+    header.read(description + form::nameLengthAt, reinterpret_cast<char*>(&nameLength), sizeof nameLength);
+    header.require(header.word(description + form::objectSizeAt) == form::headerSize &&
+                       nameLength == headerName.size() &&
                        std::string_view(name.data(), name.size()) == headerName,
                    "its object is not the table of segments");
     return value;
@@ -267,22 +246,22 @@ void inspectSegment(const ByteSource& bytes, SegmentReport& segment) {
     if (segment.offset > bytes.size() || segment.size > bytes.size() - segment.offset) {
         segment.state = SegmentState::CutOff;
     } else if (hasHeapMarks(bytes, segment.offset, segment.size) &&
-               wordAt(bytes, segment.offset + heapSizeAt) == segment.size) {
+               wordAt(bytes, segment.offset + form::heapSizeAt) == segment.size) {
         readHeapSizes(bytes, segment);
-    } else if (!isZeros(bytes, segment.offset, std::min(segment.size, firstBlock))) {
+    } else if (!isZeros(bytes, segment.offset, std::min(segment.size, form::firstBlockAt))) {
         segment.state = SegmentState::Damaged;
     }
 }
 
 void inspectTable(const ByteSource& bytes, const Header& header, std::uint64_t table,
                   MemoryFileReport& report) {
-    constexpr std::uint64_t noOffset = ~std::uint64_t{0};
+    constexpr auto noOffset = static_cast<std::uint64_t>(form::noOffset);
     std::uint64_t end = header.size();
-    const Deque rows(header, table, rowSize, rowsInBlock);
+    const Deque rows(header, table, form::rowSize, form::rowsInBlock);
     rows.forEach([&](std::uint64_t row) {
         SegmentReport segment;
-        segment.offset = header.word(row);
-        segment.size = header.word(row + 8);
+        segment.offset = header.word(row + form::rowOffsetAt);
+        segment.size = header.word(row + form::rowLengthAt);
         if (segment.offset == noOffset) {
             segment.state = SegmentState::NotMade;
         } else {
@@ -296,10 +275,11 @@ void inspectTable(const ByteSource& bytes, const Header& header, std::uint64_t t
 }
 
 void inspectQueue(const Header& header, std::uint64_t queue, MemoryFileReport& report) {
-    const Deque saved(header, queue, dequeSize, savedInBlock);
+    const Deque saved(header, queue, form::listSize, form::vectorsInBlock);
     report.savedVectors = saved.count();
-    saved.forEach(
-        [&](std::uint64_t at) { report.savedWords += Deque(header, at, wordSize, wordsInBlock).count(); });
+    saved.forEach([&](std::uint64_t at) {
+        report.savedWords += Deque(header, at, form::wordSize, form::wordsInBlock).count();
+    });
 }
 
 std::uint64_t unaccountedBytes(const MemoryFileReport& report) {
@@ -323,8 +303,8 @@ MemoryFileReport inspectMemoryFile(const ByteSource& bytes, std::optional<std::u
     if (report.header.state == SegmentState::Heap) {
         const Header header(bytes, report.header.size);
         const std::uint64_t object = findHeaderObject(header);
-        inspectTable(bytes, header, object, report);
-        inspectQueue(header, object + dequeSize, report);
+        inspectTable(bytes, header, object + form::tableAt, report);
+        inspectQueue(header, object + form::queueAt, report);
     }
     report.unaccounted = unaccountedBytes(report);
     return report;

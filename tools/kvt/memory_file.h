@@ -2,8 +2,8 @@
 //
 // The library trusts such a file, maps it for writing, and changes it when it opens it. Here nothing is believed and
 // nothing is written: every number is checked before it is used, so that no file, whatever is in it, leads outside
-// of itself or around in circles. The on-disk form is the one described in <kvt/mmap/memory_manager.h>, with the
-// heap of Boost.Interprocess and the deque of Boost.Container, all of whose pointers are relative to their own place.
+// of itself or around in circles. docs/segment_file.md describes the form of the file, and <kvt/mmap/segment_file.h>
+// has its numbers.
 #pragma once
 
 #include <cstddef>
@@ -49,7 +49,7 @@ struct MemoryFileReport {
 };
 
 /// `segmentSize` is what the header segment should have, where that is known. Throws Failure, with a text that goes on
-/// behind the name of the file, when the bytes are no such file.
+/// behind the name of the file, when the bytes are not such a file.
 MemoryFileReport inspectMemoryFile(const ByteSource& bytes, std::optional<std::uint64_t> segmentSize);
 
 } // namespace host
