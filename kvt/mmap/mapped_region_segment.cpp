@@ -1,7 +1,9 @@
-// Mapping by boost::interprocess::mapped_region, which neither looks at the length of the file nor at the room on the
-// disk; both are looked at here, since touching memory that has no file behind it ends the process.
+// Mapping by boost::interprocess::mapped_region, which looks neither at the length of the file nor at the room on the
+// disk; both are looked at here, since touching memory that has no file behind it ends the process. It also maps a
+// stretch from any offset, at an address that is as crooked as the offset; a heap there would be misaligned.
 #include <kvt/mmap/mapped_region_segment.h>
 #include <kvt/platform/backing_file.h>
+#include <kvt/platform/page_size.h>
 
 #include <boost/interprocess/creation_tags.hpp>
 #include <boost/interprocess/errors.hpp>
@@ -21,9 +23,11 @@ int descriptorOf(const ipc::file_mapping& mapping) {
     return mapping.get_mapping_handle().handle;
 }
 
-void requireWithinFile(const ipc::file_mapping& mapping, long long offset, unsigned long long size) {
+void requireWholePagesInFile(const ipc::file_mapping& mapping, long long offset, unsigned long long size) {
     const long long end = platform::fileSize(descriptorOf(mapping));
-    if (offset < 0 || size == 0 || end < offset || static_cast<unsigned long long>(end - offset) < size) {
+    const bool isWithin =
+        offset >= 0 && size > 0 && end >= offset && static_cast<unsigned long long>(end - offset) >= size;
+    if (!isWithin || static_cast<unsigned long long>(offset) % platform::pageSize() != 0) {
         throw ipc::interprocess_exception(ipc::error_info(ipc::size_error));
     }
 }
@@ -73,7 +77,7 @@ void mapped_region_segment::load(bool initialised) {
         return;
     }
     segment_state& state = *state_;
-    requireWithinFile(*state.mapping, state.offset, state.size);
+    requireWholePagesInFile(*state.mapping, state.offset, state.size);
     if (!initialised && !state.initialised && state.size >= segment_heap::segment_manager::get_min_size()) {
         takeRoomForHeap(*state.mapping, state.offset);
     }

@@ -12,6 +12,7 @@
 #include <csignal>
 #include <cstdint>
 #include <filesystem>
+#include <fstream>
 #include <iterator>
 #include <string>
 #include <sys/resource.h>
@@ -128,6 +129,32 @@ TEST_F(MemoryManagerFailure, SegmentWithoutSizeTakesNothingFromItsNeighbours) {
     mapped_region_segment after = manager.create_segment(page());
     EXPECT_EQ(after.offset(), static_cast<std::int64_t>(page()));
     expectOutsideTheFile([&] { none.load(false); });
+}
+
+// The end of the file decides where a segment lies, and a heap that does not begin at a page would be misaligned.
+TEST_F(MemoryManagerFailure, SegmentBehindStrayBytesIsNotLoadedAndTheFileStaysAsItIs) {
+    for (const std::uint64_t stray : {std::uint64_t(1), std::uint64_t(3), std::uint64_t(16), page() - 1}) {
+        for (const bool persists : {false, true}) {
+            SCOPED_TRACE(testing::Message() << stray << ", " << persists);
+            fs::remove(path);
+            memory_manager manager(path, {65536, persists});
+            manager.restore();
+            const std::uint64_t length = lengthOf(path) + stray;
+            std::ofstream(path, std::ios::binary | std::ios::app) << std::string(stray, 'x');
+            mapped_region_segment segment = manager.create_segment(2 * page());
+            EXPECT_EQ(segment.offset(), static_cast<std::int64_t>(length));
+            const std::string bytes = contentsOf(path);
+            for (const bool initialised : {false, true}) {
+                expectOutsideTheFile([&] { segment.load(initialised); });
+                EXPECT_EQ(segment.segment_manager(), nullptr);
+                EXPECT_EQ(segment.release(), 0u);
+            }
+            if (persists) {
+                expectOutsideTheFile([&] { manager.open_segment(0); });
+            }
+            EXPECT_EQ(contentsOf(path), bytes);
+        }
+    }
 }
 
 TEST_F(MemoryManagerFailure, GrowthNeedsTheFileUnderItsName) {
