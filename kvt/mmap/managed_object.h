@@ -6,7 +6,10 @@
 
 #include <kvt/mmap/mapped_region_segment.h>
 #include <kvt/mmap/memory_registrar.h>
+#include <kvt/mmap/segment_file.h>
 
+#include <cstdint>
+#include <cstring>
 #include <memory>
 #include <mutex>
 #include <utility>
@@ -56,9 +59,26 @@ private:
             if (object == nullptr) {
                 segment.load(false);
                 segment_heap::segment_manager* const heap = segment.segment_manager();
-                object = heap->template find_or_construct<T>("segment_data")(segment_allocator<void>(heap));
+                T* const found = heap->template find<T>(segment_file::headerName).first;
+                object = found != nullptr ? found : make(heap);
             }
             return *object;
+        }
+
+        static T* make(segment_heap::segment_manager* heap) {
+            T* const made =
+                heap->template construct<T>(segment_file::headerName)(segment_allocator<void>(heap));
+            clearDescriptionPadding(made);
+            return made;
+        }
+
+        // In front of a named object stands its description. Boost copies that from the stack into the segment, and an
+        // unoptimised build copies what happened to lie between its members along.
+        static void clearDescriptionPadding(T* made) noexcept {
+            constexpr std::uint64_t description =
+                (segment_file::descriptionSize + alignof(T) - 1) / alignof(T) * alignof(T);
+            char* const begin = static_cast<char*>(static_cast<void*>(made)) - description;
+            std::memset(begin + segment_file::descriptionPaddingAt, 0, segment_file::descriptionPaddingSize);
         }
 
         unsigned long long release_memory() override {

@@ -1,4 +1,8 @@
 // How a backing file is opened, grows and goes.
+//
+// The heap of a persistent file's header is made when the header is first wanted, and by then another manager of this
+// process may have made it in the same file. So it is then, and not when the file is opened, that the bytes say whether
+// there is one: header() is the only way to it.
 #include <kvt/mmap/detail/memory_manager_impl.h>
 #include <kvt/platform/backing_file.h>
 #include <kvt/platform/page_size.h>
@@ -35,6 +39,7 @@ int descriptorOf(const ipc::file_mapping& mapping) {
 memory_manager_impl::memory_manager_impl(const std::string& path, const manager_options& options)
     : path_(path), options_(options) {
     options_.segment_size = roundedToPages(options.segment_size);
+    headerPlace_.size = options_.segment_size;
     const bool absent = isAbsent(path_);
     bool hasItsLength = false;
     bool made = false;
@@ -43,9 +48,13 @@ memory_manager_impl::memory_manager_impl(const std::string& path, const manager_
         made = hasItsLength || platform::makeEmptyFile(path_.c_str());
     }
     openMapping(absent && made);
-    if (options_.persistent) {
-        header_ = std::make_unique<managed_object<header_obj>>(absent ? headerOfNewFile(hasItsLength)
-                                                                      : headerOfOldFile());
+    if (!options_.persistent) {
+        return;
+    }
+    if (absent && !hasItsLength) {
+        headerPlace_ = grow(options_.segment_size);
+    } else if (!absent && !isHeaderUnused()) {
+        openHeader(); // now, so that a file that is too short is reported by the constructor
     }
 }
 
@@ -54,7 +63,8 @@ memory_manager_impl::~memory_manager_impl() {
         return; // moved from, or never opened
     }
     header_.reset();
-    const bool worthless = withoutHeader_ && platform::fileSize(descriptorOf(*mapping_)) == 0;
+    const bool worthless =
+        headerPlace_.offset == segment_file::noOffset && platform::fileSize(descriptorOf(*mapping_)) == 0;
     mapping_.reset();
     if (!options_.persistent || worthless) {
         ipc::file_mapping::remove(path_.c_str());
@@ -73,26 +83,30 @@ void memory_manager_impl::openMapping(bool removeOnFailure) {
     platform::closeOnExec(descriptorOf(*mapping_));
 }
 
-mapped_region_segment memory_manager_impl::headerOfNewFile(bool hasItsLength) {
-    if (hasItsLength) {
-        return segmentAt({0, options_.segment_size}, k_no_index);
-    }
-    mapped_region_segment segment = createSegment({});
-    withoutHeader_ = segment.offset() < 0;
-    return segment;
+// Whether the stretch of the header is zeros all over, so that no heap is in it yet.
+bool memory_manager_impl::isHeaderUnused() const {
+    const int file = descriptorOf(*mapping_);
+    const long long length = platform::fileSize(file);
+    const bool isWhole = headerPlace_.offset == 0 && headerPlace_.size > 0 && length >= 0 &&
+                         static_cast<unsigned long long>(length) >= headerPlace_.size;
+    return isWhole && platform::holdsZerosOnly(file, 0, headerPlace_.size);
 }
 
-// A stretch that is zeros all over has no heap in it: it is left for the first access to make one.
-mapped_region_segment memory_manager_impl::headerOfOldFile() {
-    const int file = descriptorOf(*mapping_);
-    mapped_region_segment segment = segmentAt({0, options_.segment_size}, 0);
-    const long long length = platform::fileSize(file);
-    const bool isWhole =
-        segment.size() > 0 && length >= 0 && static_cast<unsigned long long>(length) >= segment.size();
-    if (!isWhole || !platform::holdsZerosOnly(file, 0, segment.size())) {
-        segment.load(true);
+void memory_manager_impl::openHeader() {
+    mapped_region_segment segment = segmentAt(headerPlace_, k_no_index);
+    segment.load(!isHeaderUnused());
+    header_ = std::make_unique<managed_object<header_obj>>(std::move(segment));
+}
+
+memory_manager_impl::header_obj& memory_manager_impl::header() {
+    if (header_ == nullptr) {
+        openHeader();
     }
-    return segment;
+    return *header_->access();
+}
+
+memory_manager_impl::segment_record memory_manager_impl::grow(unsigned long long size) const {
+    return {platform::growFile(path_.c_str(), size), size};
 }
 
 mapped_region_segment memory_manager_impl::segmentAt(const segment_record& record,
@@ -102,12 +116,10 @@ mapped_region_segment memory_manager_impl::segmentAt(const segment_record& recor
 
 // The end of the file, and not the table, says where the segment goes.
 mapped_region_segment memory_manager_impl::createSegment(const future::optional<unsigned long long>& size) {
-    segment_record record{};
-    record.size = size ? roundedToPages(*size) : options_.segment_size;
-    record.offset = platform::growFile(path_.c_str(), record.size);
+    const segment_record record = grow(size ? roundedToPages(*size) : options_.segment_size);
     unsigned long long index = k_no_index;
-    if (header_ != nullptr) {
-        auto& table = header_->access()->segment_table;
+    if (options_.persistent) {
+        auto& table = header().segment_table;
         index = table.size();
         table.push_back(record);
     }
@@ -116,8 +128,8 @@ mapped_region_segment memory_manager_impl::createSegment(const future::optional<
 
 mapped_region_segment memory_manager_impl::load_segment(unsigned long long index,
                                                         const future::optional<unsigned long long>& size) {
-    if (header_ != nullptr) {
-        const auto& table = header_->access()->segment_table;
+    if (options_.persistent) {
+        const auto& table = header().segment_table;
         if (index < table.size()) {
             mapped_region_segment segment = segmentAt(table.at(index), index);
             segment.load(true);
@@ -131,19 +143,19 @@ mapped_region_segment memory_manager_impl::load_segment(unsigned long long index
 }
 
 void memory_manager_impl::save(const ex::vector<unsigned long long>& words) {
-    if (header_ == nullptr) {
+    if (!options_.persistent) {
         return;
     }
-    auto& queue = header_->access()->saved_queue;
+    auto& queue = header().saved_queue;
     queue.emplace_back(saved_words::allocator_type(queue.get_allocator()));
     queue.back().assign(words.begin(), words.end());
 }
 
 ex::vector<unsigned long long> memory_manager_impl::restore() {
-    if (header_ == nullptr) {
+    if (!options_.persistent) {
         return {};
     }
-    auto& queue = header_->access()->saved_queue;
+    auto& queue = header().saved_queue;
     if (queue.empty()) {
         return {};
     }

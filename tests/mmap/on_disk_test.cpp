@@ -72,7 +72,7 @@ TEST_F(OnDisk, TheHeaderSegmentIsAHeapWithOneNamedObject) {
     EXPECT_TRUE(header.queue.blocks.empty());
 }
 
-// The whole of a header that has just been reached, word by word.
+// The whole of a header that has just been reached, word by word. docs/segment_file.md has it as its example.
 TEST_F(OnDisk, EveryWordOfAnEmptyHeaderIsWhatTheFormSays) {
     memory_manager manager = persistent(4096);
     manager.restore();
@@ -104,6 +104,10 @@ TEST_F(OnDisk, EveryWordOfAnEmptyHeaderIsWhatTheFormSays) {
     for (std::size_t i = 0; i < words.size(); ++i) {
         EXPECT_EQ(file.word(i * 8), words[i]) << "the word at " << i * 8;
     }
+    EXPECT_TRUE(file.zero(words.size() * 8, 4080 - words.size() * 8)) << "nothing in the free block";
+    // The mark at the end: the units of the free block before it; units back to the first block, allocated.
+    EXPECT_EQ(file.word(4080), Word{(4096 - 384) / 16 - 1});
+    EXPECT_EQ(file.word(4088), 0x8000000000000000 + (4096 - 128) / 16 - 1);
 }
 
 TEST_F(OnDisk, SegmentsFollowEachOtherAndEachHasARow) {
@@ -262,7 +266,7 @@ TEST_F(OnDisk, ATemporaryFileBeginsWithItsFirstSegment) {
     }
 }
 
-// Nothing in the file tells where it is mapped, or what it is called.
+// Nothing in the file says where it is mapped, or what it is called.
 TEST_F(OnDisk, ACopyOfTheBytesIsAsGoodAtAnyAddress) {
     memory_manager manager = persistent();
     mapped_region_segment segment = manager.create_segment(32768);

@@ -1,4 +1,7 @@
 // The backing file of a memory_manager, and the header of a persistent one. Nothing here takes a lock.
+//
+// The types below are the form of persistent files (docs/segment_file.md), as segment_file.h has it in numbers; what of
+// it rests on Boost is asserted at the end.
 #pragma once
 
 #include <kvt/foundation/optional.h>
@@ -6,6 +9,7 @@
 #include <kvt/mmap/managed_object.h>
 #include <kvt/mmap/mapped_region_segment.h>
 #include <kvt/mmap/memory_manager.h>
+#include <kvt/mmap/segment_file.h>
 
 #include <boost/container/deque.hpp>
 #include <boost/interprocess/file_mapping.hpp>
@@ -23,7 +27,7 @@ public:
 
     // A row of the table of segments, as it stands in the file.
     struct segment_record {
-        long long offset; // from the beginning of the file; -1: the file could not grow for it
+        long long offset; // from the beginning of the file, or segment_file::noOffset
         unsigned long long size;
     };
 
@@ -50,36 +54,45 @@ public:
 
 private:
     void openMapping(bool removeOnFailure);
-    mapped_region_segment headerOfNewFile(bool hasItsLength);
-    mapped_region_segment headerOfOldFile();
+    bool isHeaderUnused() const;
+    void openHeader();
+    header_obj& header();
+    segment_record grow(unsigned long long size) const;
     mapped_region_segment segmentAt(const segment_record& record, unsigned long long index) const;
     mapped_region_segment createSegment(const future::optional<unsigned long long>& size);
 
     std::string path_;
     std::unique_ptr<boost::interprocess::file_mapping> mapping_; // segments hold its address
-    std::unique_ptr<managed_object<header_obj>> header_;         // null for a temporary file
+    std::unique_ptr<managed_object<header_obj>> header_;         // null while the header is not in use
     manager_options options_;
-    bool withoutHeader_ = false; // a new persistent file for whose header segment there was no room
+    segment_record headerPlace_{
+        0, 0}; // of a persistent file; without an offset when there was no room to make it
 };
 
 #define KVT_FROZEN                                                                                           \
-    "the form of persistent files depends on it, and this version of Boost.Container has another layout: "
-static_assert(sizeof(memory_manager_impl::segment_record) == 16,
-              "a row of the table is 16 bytes in persistent files");
-static_assert(sizeof(memory_manager_impl::segment_deque<memory_manager_impl::segment_record>) == 96,
-              KVT_FROZEN "the table of segments is a deque of 96 bytes");
-static_assert(sizeof(memory_manager_impl::segment_deque<memory_manager_impl::saved_words>) == 96,
-              KVT_FROZEN "the queue of saved vectors is a deque of 96 bytes");
-static_assert(sizeof(memory_manager_impl::saved_words) == 96,
-              KVT_FROZEN "a saved vector is a deque of 96 bytes");
-static_assert(memory_manager_impl::segment_deque<memory_manager_impl::segment_record>::get_block_size() == 32,
-              KVT_FROZEN "a block of the table holds 32 rows");
-static_assert(memory_manager_impl::segment_deque<memory_manager_impl::saved_words>::get_block_size() == 5,
-              KVT_FROZEN "a block of the queue holds 5 vectors");
-static_assert(memory_manager_impl::saved_words::get_block_size() == 64,
-              KVT_FROZEN "a block of a saved vector holds 64 words");
-static_assert(sizeof(memory_manager_impl::header_obj) == 192 && alignof(memory_manager_impl::header_obj) == 8,
-              KVT_FROZEN "the header is 192 bytes, aligned to 8: the table, then the queue");
+    "the form of persistent files depends on it (docs/segment_file.md), and this version of "                \
+    "Boost.Container "                                                                                       \
+    "has another layout: "
+static_assert(sizeof(memory_manager_impl::segment_record) == segment_file::rowSize, "a row of the table");
+static_assert(sizeof(memory_manager_impl::segment_deque<memory_manager_impl::segment_record>) ==
+                  segment_file::listSize,
+              KVT_FROZEN "the table of segments");
+static_assert(sizeof(memory_manager_impl::segment_deque<memory_manager_impl::saved_words>) ==
+                  segment_file::listSize,
+              KVT_FROZEN "the queue of saved vectors");
+static_assert(sizeof(memory_manager_impl::saved_words) == segment_file::listSize,
+              KVT_FROZEN "a saved vector");
+static_assert(memory_manager_impl::segment_deque<memory_manager_impl::segment_record>::get_block_size() ==
+                  segment_file::rowsInBlock,
+              KVT_FROZEN "rows in a block of the table");
+static_assert(memory_manager_impl::segment_deque<memory_manager_impl::saved_words>::get_block_size() ==
+                  segment_file::vectorsInBlock,
+              KVT_FROZEN "vectors in a block of the queue");
+static_assert(memory_manager_impl::saved_words::get_block_size() == segment_file::wordsInBlock,
+              KVT_FROZEN "words in a block of a saved vector");
+static_assert(sizeof(memory_manager_impl::header_obj) == segment_file::headerSize &&
+                  alignof(memory_manager_impl::header_obj) == segment_file::headerAlignment,
+              KVT_FROZEN "the header, which is the table and then the queue");
 #undef KVT_FROZEN
 
 } // namespace kvt::ex::mmap
