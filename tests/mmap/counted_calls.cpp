@@ -3,6 +3,7 @@
 // the way of whatever a sanitizer does before main.
 #include <mmap/counted_calls.h>
 
+#include <cerrno>
 #include <cstdarg>
 #include <fcntl.h>
 #include <sys/mman.h>
@@ -15,6 +16,7 @@ namespace kvt::test {
 namespace {
 
 thread_local CountedCalls* counting = nullptr;
+thread_local std::size_t opensToFailure = 0; // 0: none fails
 
 void note(const char* name, std::size_t written = 0) {
     // What noting itself calls is not counted.
@@ -36,6 +38,18 @@ CallCounter::CallCounter() {
 
 CallCounter::~CallCounter() {
     counting = nullptr;
+}
+
+FailingOpen::FailingOpen(std::size_t number) {
+    opensToFailure = number;
+}
+
+FailingOpen::~FailingOpen() {
+    opensToFailure = 0;
+}
+
+static bool isToFail() {
+    return opensToFailure > 0 && --opensToFailure == 0;
 }
 
 } // namespace kvt::test
@@ -82,5 +96,9 @@ int kvt_counted_open(const char* path, int flags, ...) {
         va_end(more);
     }
     kvt::test::note("open");
+    if (kvt::test::isToFail()) {
+        errno = EACCES;
+        return -1;
+    }
     return kvt_real_open(path, flags, mode);
 }

@@ -1,4 +1,4 @@
-// Counts the calls to the operating system by which the library reaches files and memory.
+// Counts the calls to the operating system by which the library reaches files and memory, and can let one fail.
 #pragma once
 
 #include <cstddef>
@@ -24,6 +24,15 @@ public:
 
 private:
     CountedCalls counted_;
+};
+
+/// Lets one call of open() on this thread fail with EACCES: the one of this number, from 1. Once at a time.
+class FailingOpen {
+public:
+    explicit FailingOpen(std::size_t number);
+    FailingOpen(const FailingOpen&) = delete;
+    FailingOpen& operator=(const FailingOpen&) = delete;
+    ~FailingOpen();
 };
 
 } // namespace kvt::test

@@ -2,6 +2,7 @@
 #include <mmap/counted_calls.h>
 #include <mmap/segment_words.h>
 
+#include <boost/interprocess/exceptions.hpp>
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -150,6 +151,36 @@ TEST(SystemCalls, ADestroyedSegmentIsUnmappedWithoutAFlush) {
     EXPECT_NE(counted.names.find("munmap"), std::string::npos) << counted.names;
     EXPECT_EQ(counted.names.find("sync"), std::string::npos) << counted.names;
     EXPECT_EQ(mappingsOf(path), 0U);
+}
+
+// The first open() of a temporary manager empties the file or makes it, and its second one is to map it. A persistent
+// manager makes a file by the first one, and maps a file that is there by it.
+TEST(SystemCalls, AFileThatCannotBeMappedIsRemovedOnlyWhenItWasMadeForThat) {
+    const struct {
+        int line;
+        bool persists;
+        bool wasThere;
+        std::size_t failingOpen;
+    } rows[] = {
+        {__LINE__, false, true, 2}, // emptied, and there
+        {__LINE__, true, true, 1},   {__LINE__, false, false, 1},
+        {__LINE__, false, false, 2}, {__LINE__, true, false, 2},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.line);
+        const ScratchFolder folder;
+        const std::string path = folder.file("backing");
+        if (row.wasThere) {
+            std::ofstream(path) << std::string(65536, 'x');
+        }
+        {
+            const FailingOpen failing(row.failingOpen);
+            EXPECT_THROW(
+                memory_manager(path, row.persists ? persistentOptions(65536) : temporaryOptions(65536)),
+                boost::interprocess::interprocess_exception);
+        }
+        EXPECT_EQ(std::filesystem::exists(path), row.wasThere);
+    }
 }
 
 TEST(SystemCalls, NoOpenFileIsLeftBehind) {
