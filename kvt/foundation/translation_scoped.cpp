@@ -19,10 +19,6 @@ Registered& registered() {
 
 } // namespace
 
-TranslationScoped::~TranslationScoped() {
-    unregisterTS(this);
-}
-
 void TranslationScoped::registerTS(TranslationScoped* object) {
     registered().insert(object);
 }

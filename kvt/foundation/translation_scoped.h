@@ -19,7 +19,7 @@ protected:
     // A copy is an object of its own and registers itself; assignment changes nobody's registration.
     TranslationScoped(const TranslationScoped&) { registerTS(this); }
     TranslationScoped& operator=(const TranslationScoped&) = default;
-    virtual ~TranslationScoped();
+    virtual ~TranslationScoped() { unregisterTS(this); }
 
 public:
     /// Drops the state held for the translation that ended. It must neither make nor destroy objects of this kind,

@@ -2,6 +2,8 @@
 #include <kvt/legacy/detail/calendar.h>
 #include <kvt/legacy/obsolete_date.h>
 
+#include <cstdint>
+
 using kvt::ex::detail::dateOf;
 using kvt::ex::detail::ObsoleteDateImpl;
 
@@ -129,11 +131,11 @@ bool ObsoleteDate::operator>=(const ObsoleteDate& other) const {
     return dayNumber(*impl_) >= dayNumber(*other.impl_);
 }
 
-void ObsoleteDate::asString(const char*& out, std::uint64_t& length) const {
+void ObsoleteDate::asString(const char*& out, unsigned long long& length) const {
     asString("%x", out, length);
 }
 
-void ObsoleteDate::asString(const char* format, const char*& out, std::uint64_t& length) const {
+void ObsoleteDate::asString(const char* format, const char*& out, unsigned long long& length) const {
     impl_->text = kvt::ex::detail::written<boost::gregorian::date_facet>(impl_->date, format);
     out = impl_->text.c_str();
     length = impl_->text.size();

@@ -12,14 +12,13 @@
 // arithmetic, and has no year, month or day: asking for them throws bad_year.
 //
 // Failures are the classes of <boost/date_time/gregorian/greg_{day,month,year,day_of_year}.hpp>, each derived from
-// std::out_of_range; a host needs those headers only to tell the classes apart.
+// std::out_of_range; a host needs those headers only to distinguish the classes.
 //
 // An object belongs to one thread at a time, const access included: asString() keeps its text in the object.
 #pragma once
 
 #include <kvt/foundation/export.h>
 
-#include <cstdint>
 #include <ctime>
 #include <memory>
 #include <string>
@@ -31,7 +30,7 @@ struct ObsoleteDateImpl;
 class KVT_EXPORT ObsoleteDate {
 public:
     /// Today in the zone of the machine. Throws std::runtime_error "could not convert calendar time to local time"
-    /// when the system cannot tell.
+    /// when the system does not know it.
     ObsoleteDate();
     /// The date of `t`, which is not null: `tm_year` + 1900, `tm_mon` + 1 and `tm_mday`, each taken and checked as
     /// the three parts below are. The other fields are not looked at.
@@ -95,7 +94,7 @@ public:
     /// The date as the global C++ locale writes dates: asString("%x").
     std::string asString() const {
         const char* text = nullptr;
-        std::uint64_t length = 0;
+        unsigned long long length = 0;
         asString(text, length);
         return std::string(text, length);
     }
@@ -103,7 +102,7 @@ public:
     /// special values read "not-a-date-time", "-infinity" and "+infinity" whatever the format. Fails as year() does.
     std::string asString(const char* format) const {
         const char* text = nullptr;
-        std::uint64_t length = 0;
+        unsigned long long length = 0;
         asString(format, text, length);
         return std::string(text, length);
     }
@@ -111,8 +110,8 @@ public:
 private:
     // The two that the wrappers above stand on. `out` gets the text, which this object keeps until its next text or
     // its end, and `length` the chars in it without the terminating zero. Where they throw, all stays as it was.
-    void asString(const char*& out, std::uint64_t& length) const;
-    void asString(const char* format, const char*& out, std::uint64_t& length) const;
+    void asString(const char*& out, unsigned long long& length) const;
+    void asString(const char* format, const char*& out, unsigned long long& length) const;
 
     std::unique_ptr<kvt::ex::detail::ObsoleteDateImpl> impl_;
 };

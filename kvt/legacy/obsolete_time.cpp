@@ -5,6 +5,8 @@
 #include <kvt/legacy/detail/calendar.h>
 #include <kvt/legacy/obsolete_time.h>
 
+#include <cstdint>
+
 using kvt::ex::detail::dateOf;
 using kvt::ex::detail::localNow;
 using kvt::ex::detail::ObsoleteTimeImpl;
@@ -119,7 +121,7 @@ bool ObsoleteTime::operator>(const ObsoleteTime& other) {
     return impl_->time > other.impl_->time;
 }
 
-void ObsoleteTime::asString(const char* format, const char*& out, std::uint64_t& length) const {
+void ObsoleteTime::asString(const char* format, const char*& out, unsigned long long& length) const {
     impl_->text = kvt::ex::detail::written<boost::posix_time::time_facet>(impl_->time, format);
     out = impl_->text.c_str();
     length = impl_->text.size();

@@ -3,7 +3,7 @@
 // The moment is that of Boost.DateTime, a signed count of microseconds of 64 bits, of which three values are special:
 // not-a-date-time and two infinities. What is built here has whole seconds. The interface is smaller than that of
 // ObsoleteDate and not as regular: the unit of addition is the second, the two comparisons want objects that are not
-// const, and there is no date to be asked for. New code uses <kvt/datetime/datetime.h>.
+// const, and the date cannot be asked for. New code uses <kvt/datetime/datetime.h>.
 //
 // A moment is checked by its date where it is built, and nowhere after that: arithmetic may leave the calendar, and
 // then extract() and asString() throw what ObsoleteDate throws for such a date.
@@ -14,7 +14,6 @@
 #include <kvt/foundation/export.h>
 #include <kvt/legacy/obsolete_date.h>
 
-#include <cstdint>
 #include <ctime>
 #include <memory>
 #include <string>
@@ -26,7 +25,7 @@ struct ObsoleteTimeImpl;
 class KVT_EXPORT ObsoleteTime {
 public:
     /// Now in the zone of the machine, to the whole second. Throws std::runtime_error "could not convert calendar time
-    /// to local time" when the system cannot tell.
+    /// to local time" when the system does not know it.
     ObsoleteTime();
     /// The moment of `t`, which is not null: its date as ObsoleteDate(std::tm*) takes and checks it, and `tm_hour`,
     /// `tm_min` and `tm_sec`, which are not checked: they are added to the date. Where one of the three is negative,
@@ -75,14 +74,14 @@ public:
     /// what ObsoleteDate::year() throws for a moment outside the calendar.
     std::string asString(const char* format) const {
         const char* text = nullptr;
-        std::uint64_t length = 0;
+        unsigned long long length = 0;
         asString(format, text, length);
         return std::string(text, length);
     }
 
 private:
     // What the wrapper above stands on, as in ObsoleteDate.
-    void asString(const char* format, const char*& out, std::uint64_t& length) const;
+    void asString(const char* format, const char*& out, unsigned long long& length) const;
 
     std::unique_ptr<kvt::ex::detail::ObsoleteTimeImpl> impl_;
 };

@@ -24,6 +24,16 @@ ObsoleteRegexp::ObsoleteRegexp(const char* pattern, std::uint64_t length) {
     d().regex.assign(kvt::ex::detail::perlPattern({pattern, length}), boost::regex_constants::normal);
 }
 
+ObsoleteRegexp::ObsoleteRegexp(const ObsoleteRegexp& other) = default;
+
+ObsoleteRegexp::ObsoleteRegexp(ObsoleteRegexp&& other) noexcept = default;
+
+ObsoleteRegexp& ObsoleteRegexp::operator=(const ObsoleteRegexp& other) = default;
+
+ObsoleteRegexp& ObsoleteRegexp::operator=(ObsoleteRegexp&& other) noexcept = default;
+
+ObsoleteRegexp::~ObsoleteRegexp() = default;
+
 std::uint64_t ObsoleteRegexp::index(const char* text, std::uint64_t length, std::uint64_t* matchLength,
                                     std::uint64_t start) const {
     boost::cmatch result;

@@ -25,7 +25,7 @@ static_assert(std::is_same_v<std::uint64_t, unsigned long>, "or the two forms of
 class ObsoleteRegexpImpl;
 
 namespace kvt::ex::detail {
-extern template class KVT_EXPORT PimplBase<ObsoleteRegexpImpl>;
+extern template class PimplBase<ObsoleteRegexpImpl>; // whose members stay in the library
 }
 
 /// A compiled pattern. Copies share the compiled program; a moved-from object may only be destroyed or assigned to.
@@ -40,6 +40,11 @@ public:
     ObsoleteRegexp(const char* pattern);
     /// The same for `length` bytes, among which there may be zeros. `pattern` may be null when `length` is 0.
     ObsoleteRegexp(const char* pattern, std::uint64_t length);
+    ObsoleteRegexp(const ObsoleteRegexp& other);
+    ObsoleteRegexp(ObsoleteRegexp&& other) noexcept;
+    ObsoleteRegexp& operator=(const ObsoleteRegexp& other);
+    ObsoleteRegexp& operator=(ObsoleteRegexp&& other) noexcept;
+    ~ObsoleteRegexp();
 
     /// Looks for the first match in the `length` bytes of `text`, at or after the byte `start`, before which the
     /// pattern sees nothing. Returns its position, counted from `text`, and sets `*matchLength` to its length in bytes.
@@ -53,7 +58,7 @@ public:
     /// The same, for hosts that count in `unsigned long long`, which is another type of the same 64 bits here.
     std::uint64_t index(const char* text, std::uint64_t length, unsigned long long* matchLength,
                         std::uint64_t start) const {
-        std::uint64_t found = *matchLength;
+        std::uint64_t found = 0;
         const std::uint64_t position = index(text, length, &found, start);
         *matchLength = found;
         return position;

@@ -8,11 +8,11 @@ namespace kvt::test {
 
 // The private forms, which inline wrappers of a host call.
 struct Formatted {
-    using Type = void (ObsoleteDate::*)(const char*, const char*&, std::uint64_t&) const;
+    using Type = void (ObsoleteDate::*)(const char*, const char*&, unsigned long long&) const;
     friend Type memberOf(Formatted);
 };
 struct Unformatted {
-    using Type = void (ObsoleteDate::*)(const char*&, std::uint64_t&) const;
+    using Type = void (ObsoleteDate::*)(const char*&, unsigned long long&) const;
     friend Type memberOf(Unformatted);
 };
 template struct Opens<Formatted, &ObsoleteDate::asString>;
@@ -82,7 +82,7 @@ TEST(ObsoleteDateText, IsWrittenByTheGlobalLocale) {
 TEST(ObsoleteDateText, BelongsToTheObjectUntilItsNext) {
     const ObsoleteDate date(1, 2, 2020);
     const char* out = nullptr;
-    std::uint64_t length = 0;
+    unsigned long long length = 0;
     (date.*memberOf(Formatted()))("%Y-%m-%d", out, length);
     EXPECT_EQ(std::string(out, length), "2020-02-01");
     EXPECT_EQ(out[length], '\0');
@@ -103,11 +103,11 @@ TEST(ObsoleteDateText, BelongsToTheObjectUntilItsNext) {
 TEST(ObsoleteDateText, StaysWhenTheNextFails) {
     ObsoleteDate date(1, 1, 1400);
     const char* out = nullptr;
-    std::uint64_t length = 0;
+    unsigned long long length = 0;
     (date.*memberOf(Formatted()))("%Y", out, length);
     --date;
     const char* untouched = "untouched";
-    std::uint64_t same = 9;
+    unsigned long long same = 9;
     EXPECT_EQ(failureOf([&] { (date.*memberOf(Formatted()))("%Y", untouched, same); }), badYear);
     EXPECT_EQ(std::string(untouched, same), "untouched");
     EXPECT_EQ(std::string(out, length), "1400");

@@ -5,7 +5,7 @@
 namespace kvt::test {
 
 struct TextOfTime {
-    using Type = void (ObsoleteTime::*)(const char*, const char*&, std::uint64_t&) const;
+    using Type = void (ObsoleteTime::*)(const char*, const char*&, unsigned long long&) const;
     friend Type memberOf(TextOfTime);
 };
 template struct Opens<TextOfTime, &ObsoleteTime::asString>;
@@ -43,7 +43,7 @@ TEST(ObsoleteTimeText, FollowsTheFormat) {
 TEST(ObsoleteTimeText, BelongsToTheObjectUntilItsNext) {
     const ObsoleteTime time(ObsoleteDate(1, 2, 2020), 13, 2, 3);
     const char* out = nullptr;
-    std::uint64_t length = 0;
+    unsigned long long length = 0;
     (time.*memberOf(TextOfTime()))("%H:%M", out, length);
     EXPECT_EQ(std::string(out, length), "13:02");
     EXPECT_EQ(out[length], '\0');

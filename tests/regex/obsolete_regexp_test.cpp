@@ -135,6 +135,16 @@ TEST(ObsoleteRegexp, TheLengthMayBeEitherTypeOfSixtyFourBits) {
     EXPECT_EQ(length, 0u);
 }
 
+// g++ warns, when it optimises, of a variable that is read before it is set. Here that is an error in every build.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic error "-Wuninitialized"
+TEST(ObsoleteRegexp, TheLengthIsOnlyWritten) {
+    unsigned long long length;
+    EXPECT_EQ(ObsoleteRegexp("abc").index("xxabc", 5, &length, 1), 2u);
+    EXPECT_EQ(length, 3u);
+}
+#pragma GCC diagnostic pop
+
 TEST(ObsoleteRegexp, LengthsCutThePatternAndTheText) {
     const ObsoleteRegexp regexp("ab(", 2);
     std::uint64_t length = 0;
