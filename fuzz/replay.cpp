@@ -1,6 +1,6 @@
 // The main of a fuzzer in builds without libFuzzer: NAME_fuzz [FILE-OR-FOLDER...] [--rounds N]
 //
-// Feeds each file, then N inputs (20000 unless told) from a fixed seed: damaged copies of the files, and noise.
+// Feeds each file, then N inputs (20000 by default) from a fixed seed: damaged copies of the files, and noise.
 #include <fuzzing.h>
 
 #include <filesystem>

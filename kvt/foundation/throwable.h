@@ -11,7 +11,7 @@
 //     Throwable
 //       Exception                                recoverable
 //         UStringException
-//           UStringBadEncodingException          910002  bytes that are no text in their encoding
+//           UStringBadEncodingException          910002  bytes that are not text in their encoding
 //           UStringTranscodingException          910003  characters without a form in the target encoding
 //           UStringBinaryTranscodingException    910004  bytes without a text meaning where text is wanted
 //           UStringNotImplementedException
@@ -103,7 +103,7 @@ public:
     using Exception::Exception;
 };
 
-/// Bytes that are no text in the encoding they are said to have. Message 910002: %0 the bytes, with everything but
+/// Bytes that are not text in the encoding they are said to have. Message 910002: %0 the bytes, with everything but
 /// printable ASCII as `\xHH`, %1 the encoding's name.
 class KVT_EXPORT UStringBadEncodingException : public UStringException {
 public:

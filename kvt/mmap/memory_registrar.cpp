@@ -1,3 +1,4 @@
+// What hosts go on calling, without anything behind it.
 #include <kvt/mmap/memory_registrar.h>
 
 namespace kvt::ex {

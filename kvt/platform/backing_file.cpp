@@ -109,7 +109,7 @@ bool holdsZerosOnly(int file, std::int64_t offset, std::uint64_t bytes) noexcept
         if (written < 0 && errno == ENXIO) {
             return true; // a hole up to the end of the file
         }
-        at = std::max(at, written); // a system that cannot tell holes says less than `at`: it is read
+        at = std::max(at, written); // a system that does not know of holes reports less than `at`: it is read
         if (at >= end) {
             return true;
         }

@@ -20,11 +20,10 @@ bool makeFileAtOnce(const char* path, std::uint64_t bytes) noexcept;
 /// had, or -1, with the file as it was, when it cannot be made longer.
 std::int64_t growFile(const char* path, std::uint64_t bytes) noexcept;
 
-/// The length of an open file, -1 when it cannot be told.
+/// The length of an open file, -1 when the system does not report it.
 std::int64_t fileSize(int file) noexcept;
 
-/// Writes one zero byte into an open file, which sees to it that the page that holds it has room on the disk and is in
-/// memory. Gives 0, or the system's error number. A first touch of mapped memory could not report a full disk, and
+/// Writes one zero byte into an open file, so that the page around it has room on the disk and is in memory. Gives 0, or the system's error number. A first touch of mapped memory could not report a full disk, and
 /// would read in a long stretch of nothing around it.
 int writeZero(int file, std::int64_t offset) noexcept;
 

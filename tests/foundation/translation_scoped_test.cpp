@@ -1,4 +1,4 @@
-// Objects that hold state for one translation, and the call that tells them to drop it.
+// Objects that hold state for one translation, and the call that makes them drop it.
 #include <kvt/foundation/translation_scoped.h>
 
 #include <gtest/gtest.h>

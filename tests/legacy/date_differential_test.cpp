@@ -29,7 +29,7 @@ protected:
         return greg::date(first + upTo(last - first));
     }
 
-    // Dates, their neighbourhood, special values, and numbers that are no date.
+    // Dates, their neighbourhood, special values, and numbers that are not dates.
     unsigned int anyNumber() {
         switch (upTo(3)) {
         case 0:

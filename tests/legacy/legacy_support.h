@@ -39,7 +39,7 @@ inline Parts partsOf(const ObsoleteDate& date) {
     return {date.year(), date.month(), date.dayOfMonth(), date.day()};
 }
 
-/// The class of what `call` throws, as its own tells it, and the text: "bad_month: ...".
+/// The class of what `call` throws, by its name, and the text: "bad_month: ...".
 template <typename Call>
 std::string failureOf(Call call) {
     const auto named = [](const char* name, const std::exception& failure) {

@@ -1,3 +1,4 @@
+// The functions of the C library by which the machine is asked for its time, replaced in this program.
 #include "machine_clock.h"
 
 #include <dlfcn.h>

@@ -9,7 +9,7 @@
 
 namespace kvt::test {
 
-/// While it lives, local time is `now`, or cannot be told.
+/// While it lives, local time is `now`, or is unknown.
 class LocalTime {
 public:
     explicit LocalTime(std::optional<std::tm> now);

@@ -3,7 +3,7 @@
 // What it wrote stands in the operating system's memory of the file, which outlives it. So a segment that it
 // released is whole, whenever it is killed. The table of segments and the queue of saved vectors are whole unless the
 // kill comes while one of them is being changed, and the file opens again; so there the worker asks before each such
-// change, and is not killed before it has told the end of it.
+// change, and is not killed before it has reported the end of it.
 #include <mmap/segment_words.h>
 #include <reference/mapped_file_reference.h>
 
@@ -45,7 +45,7 @@ struct Report {
 };
 static_assert(sizeof(Report) < 512, "a pipe takes it in one piece");
 
-// What the test knows of the file, from what it was told.
+// What the test knows of the file, from the reports.
 struct Segment {
     Word tag;
     Word offset;
@@ -103,14 +103,14 @@ public:
     }
 
 private:
-    void tell(const Report& report) {
+    void send(const Report& report) {
         if (::write(out_, &report, sizeof report) != sizeof report) {
             ::_exit(0);
         }
     }
 
     void ask() {
-        tell({Report::asks});
+        send({Report::asks});
         char answer = 0;
         if (::read(in_, &answer, 1) != 1) {
             ::_exit(0);
@@ -121,20 +121,20 @@ private:
         const Word tag = model_.nextTag++;
         manager_.save(toSave(savedWords(tag)));
         model_.saved.push_back(tag);
-        tell({Report::saved, tag});
+        send({Report::saved, tag});
     }
 
     void took(const Words& words) {
         const Words expected = model_.saved.empty() ? Words() : savedWords(model_.saved.front());
         if (words != expected) {
-            tell({Report::wrong, words.empty() ? 0 : words.front()});
+            send({Report::wrong, words.empty() ? 0 : words.front()});
         }
         if (model_.saved.empty()) {
-            tell({Report::restored, 0});
+            send({Report::restored, 0});
         } else {
             const Word tag = model_.saved.front();
             model_.saved.pop_front();
-            tell({Report::restored, tag});
+            send({Report::restored, tag});
         }
     }
 
@@ -143,7 +143,7 @@ private:
         ask();
         mapped_region_segment segment = manager_.create_segment(4096 * (8 + tag % 9));
         const auto offset = static_cast<Word>(segment.offset());
-        tell({Report::created, tag, segment.index(), offset});
+        send({Report::created, tag, segment.index(), offset});
         segment.load(false);
         for (std::size_t number = 0; number < arraysInASegment; ++number) {
             put(segment, arrayName(number), arrayOf(tag, number));
@@ -157,7 +157,7 @@ private:
         }
         segment.release();
         model_.segments[segment.index()] = {tag, offset, true};
-        tell({Report::released, tag, segment.index(), offset});
+        send({Report::released, tag, segment.index(), offset});
     }
 
     void readSegment() {
@@ -171,7 +171,7 @@ private:
         mapped_region_segment segment = manager_.open_segment(index);
         for (std::size_t number = 0; number < arraysInASegment; ++number) {
             if (get(segment, arrayName(number)) != arrayOf(model_.segments.at(index).tag, number)) {
-                tell({Report::wrong, index});
+                send({Report::wrong, index});
             }
         }
     }
@@ -247,7 +247,7 @@ private:
         constexpr long long patience = 60'000'000'000; // a worker that says nothing for so long hangs
         for (; reports > 0; --reports) {
             const auto report = next(patience);
-            ASSERT_TRUE(report) << "the worker tells nothing";
+            ASSERT_TRUE(report) << "the worker reports nothing";
             note(*report);
         }
         const Clock::time_point end = Clock::now() + time;
@@ -259,7 +259,7 @@ private:
             if (const auto report = next(changing_ ? patience : left)) {
                 note(*report);
             } else {
-                ASSERT_FALSE(changing_) << "the worker does not tell the end of a change";
+                ASSERT_FALSE(changing_) << "the worker does not report the end of a change";
             }
         }
     }
@@ -311,10 +311,10 @@ private:
     Model model_;
     int in_ = -1;
     int out_ = -1;
-    bool changing_ = false; // the worker has leave to change the header and has not told the end of it
+    bool changing_ = false; // the worker has leave to change the header and has not reported the end of it
 };
 
-// Every segment of which the release was told, as it stands in the bytes of the file.
+// Every segment of which the release was reported, as it stands in the bytes of the file.
 std::size_t checkReleased(const std::string& path, const Model& model) {
     const reference::RawFile file(path);
     std::size_t whole = 0;

@@ -28,7 +28,7 @@ using ex::mmap::memory_manager;
 
 // ---- The mutex ---------------------------------------------------------------------------------------------------
 
-// A handle whose mutex is made one that tells its owner of a second lock, and is held by this thread.
+// A handle whose mutex is made one that reports a second lock to its owner, and is held by this thread.
 class Locked : public memory_manager {
 public:
     explicit Locked(const std::string& path) : memory_manager(path, {65536, true}) {

@@ -101,7 +101,7 @@ TEST(Threads, TheLastHandleToGoDeletesTheFileOnceWhereverItGoes) {
     }
 }
 
-// Each word of a saved vector tells who saved it and as which.
+// Each word of a saved vector says who saved it and as which.
 TEST(Threads, EachSavedVectorComesBackOnceAndInOrderForEachSaver) {
     const ScratchFolder folder;
     memory_manager manager(folder.file("backing"), persistentOptions(headerSize));

@@ -1,3 +1,4 @@
+// Pages by madvise and mmap.
 #include "memory_pages.h"
 
 #include <new>

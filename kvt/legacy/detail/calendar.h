@@ -22,7 +22,7 @@ struct ObsoleteTimeImpl {
     std::string text; // of the last asString()
 };
 
-/// The calendar time of now in the zone of the machine. Throws std::runtime_error when the system cannot tell.
+/// The calendar time of now in the zone of the machine. Throws std::runtime_error when the system does not know it.
 std::tm localNow();
 
 /// A date of parts, each narrowed to 16 bits first. Throws as ObsoleteDate(day, month, year).
