@@ -40,9 +40,13 @@ public:
     ObsoleteRegexp(const char* pattern);
     /// The same for `length` bytes, among which there may be zeros. `pattern` may be null when `length` is 0.
     ObsoleteRegexp(const char* pattern, std::uint64_t length);
+    /// Shares the compiled program of `other`. Throws std::bad_alloc.
     ObsoleteRegexp(const ObsoleteRegexp& other);
+    /// Takes over the pattern of `other`.
     ObsoleteRegexp(ObsoleteRegexp&& other) noexcept;
+    /// Shares the compiled program of `other`. Throws std::bad_alloc, and is then unchanged.
     ObsoleteRegexp& operator=(const ObsoleteRegexp& other);
+    /// Takes over the pattern of `other`.
     ObsoleteRegexp& operator=(ObsoleteRegexp&& other) noexcept;
     ~ObsoleteRegexp();
 

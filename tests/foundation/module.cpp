@@ -1,3 +1,4 @@
+// What the plug-in makes, changes, throws and catches; the test does the other half.
 #include "module.h"
 
 #include "catching.h"

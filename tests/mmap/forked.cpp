@@ -1,3 +1,4 @@
+// The text comes back through a pipe, and how the process ended through waitpid.
 #include <mmap/forked.h>
 
 #include <array>
