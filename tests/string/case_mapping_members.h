@@ -1,7 +1,7 @@
 // What the tests of case mapping share: the nine members, by name, and what each asks of ICU and says of a failure.
 #pragma once
 
-#include <string/string_types.h>
+#include <support/string_types.h>
 
 #include <array>
 #include <cstdint>

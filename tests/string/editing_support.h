@@ -1,7 +1,7 @@
 // What the tests of editing share: the fixture that its typed suite has in each file, and what a standard exception says.
 #pragma once
 
-#include <string/operations_support.h>
+#include <support/string_types.h>
 
 #include <stdexcept>
 #include <string>

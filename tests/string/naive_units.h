@@ -17,6 +17,21 @@ inline constexpr std::uint64_t npos = std::numeric_limits<std::uint64_t>::max();
 template <typename Unit>
 using Text = std::basic_string<Unit>;
 
+/// Every text of up to `longest` units over the alphabet, the short ones first.
+template <typename Unit>
+std::vector<Text<Unit>> textsUpTo(std::size_t longest, const Text<Unit>& alphabet) {
+    std::vector<Text<Unit>> texts{Text<Unit>()};
+    for (std::size_t begin = 0, length = 1; length <= longest; ++length) {
+        const std::size_t end = texts.size();
+        for (; begin < end; ++begin) {
+            for (const Unit unit : alphabet) {
+                texts.push_back(texts[begin] + unit);
+            }
+        }
+    }
+    return texts;
+}
+
 template <typename Unit>
 std::make_unsigned_t<Unit> numberOf(Unit unit) {
     return static_cast<std::make_unsigned_t<Unit>>(unit);

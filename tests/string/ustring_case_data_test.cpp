@@ -2,7 +2,7 @@
 //
 // The files and ICU may be of different versions of Unicode. What is compared are the characters that both know;
 // case folding of a character never changes once it is assigned.
-#include <string/string_types.h>
+#include <support/string_types.h>
 
 #include <kvt/codec/wwjd.h>
 #include <kvt/string/ustring.h>

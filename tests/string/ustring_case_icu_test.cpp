@@ -1,8 +1,8 @@
 // What becomes of ICU's answers to a case mapping: statuses, lengths, exceptions that pass, and its default locale.
 #include <string/case_mapping_members.h>
 #include <string/intercepted_case_mapping.h>
-#include <string/string_types.h>
 #include <support/failure_record.h>
+#include <support/string_types.h>
 
 #include <kvt/foundation/throwable.h>
 

@@ -2,8 +2,8 @@
 // gives less, and how many calls and allocations that takes.
 #include <string/case_mapping_members.h>
 #include <string/intercepted_case_mapping.h>
-#include <string/string_types.h>
 #include <support/allocations.h>
+#include <support/string_types.h>
 
 #include <gtest/gtest.h>
 

@@ -1,7 +1,7 @@
 // The one case map of the process. Each of these tests needs a process in which nothing was mapped yet.
 #include <string/intercepted_case_mapping.h>
-#include <string/string_types.h>
 #include <support/failure_record.h>
+#include <support/string_types.h>
 
 #include <kvt/foundation/throwable.h>
 

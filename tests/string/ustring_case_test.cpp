@@ -4,9 +4,9 @@
 // map is checked against Unicode's own data in ustring_case_data_test.cpp.
 #include <string/case_mapping_members.h>
 #include <string/intercepted_case_mapping.h>
-#include <string/string_types.h>
 #include <support/allocations.h>
 #include <support/failure_record.h>
+#include <support/string_types.h>
 
 #include <kvt/foundation/throwable.h>
 
@@ -30,10 +30,10 @@ using kvt::ex::UStringView;
 template <typename Type>
 class UStringCase : public ::testing::Test {
 public:
-    static constexpr std::uint32_t number = Type::number;
+    static constexpr std::uint32_t number = Type::value;
     static constexpr bool refuses = number == Encoding::Binary || number == Encoding::Unknown;
 };
-TYPED_TEST_SUITE(UStringCase, AllStringTypes, StringTypeName);
+TYPED_TEST_SUITE(UStringCase, StringTypes, StringTypeNames);
 
 TYPED_TEST(UStringCase, AllNineMembersMapTheTextOrRefuse) {
     constexpr auto N = TestFixture::number;

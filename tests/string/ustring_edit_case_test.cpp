@@ -14,9 +14,7 @@ class UStringEditWithoutCase : public StringTest<Number> {
 public:
     static constexpr case_insensitive_t tag{};
 };
-using FoldingTypes = testing::Types<StringType<0>, StringType<1>, StringType<2>, StringType<3>,
-                                    StringType<27>, StringType<29>>;
-TYPED_TEST_SUITE(UStringEditWithoutCase, FoldingTypes, StringTypeNames);
+TYPED_TEST_SUITE(UStringEditWithoutCase, FoldingStringTypes, StringTypeNames);
 
 TYPED_TEST(UStringEditWithoutCase, ReplacesBothCasesAndPutsInWhatItIsGiven) {
     const struct {

@@ -1,7 +1,7 @@
 // Editing against plain loops: every small text over two units with every position and count, and long random
 // histories of edits on one object.
 #include <string/naive_units.h>
-#include <string/operations_support.h>
+#include <support/string_types.h>
 
 #include <random>
 #include <stdexcept>
@@ -20,19 +20,6 @@ public:
     using typename Base::Units;
     using typename Base::View;
     using Naive = std::optional<Units>;
-
-    static std::vector<Units> textsUpTo(std::size_t longest, const Units& alphabet) {
-        std::vector<Units> texts{Units()};
-        for (std::size_t begin = 0, length = 1; length <= longest; ++length) {
-            const std::size_t end = texts.size();
-            for (; begin < end; ++begin) {
-                for (const Unit unit : alphabet) {
-                    texts.push_back(texts[begin] + unit);
-                }
-            }
-        }
-        return texts;
-    }
 
     static std::vector<std::uint64_t> positionsFor(std::size_t size) {
         std::vector<std::uint64_t> positions;
@@ -61,12 +48,12 @@ public:
         ASSERT_EQ(thrown, expected ? "" : "invalid string position") << describe();
         const Units& wanted = expected ? *expected : text;
         ASSERT_TRUE(Base::textOf(string) == wanted)
-            << describe() << " is " << show(Base::textOf(string)) << " and not " << show(wanted);
+            << describe() << " is " << shown(Base::textOf(string)) << " and not " << shown(wanted);
         ASSERT_EQ(string.rawData()[string.size()], Unit{0}) << describe();
     }
 
     static std::string rowOf(const Units& text, std::uint64_t pos, std::uint64_t count, const Units& with) {
-        return show(text) + ' ' + std::to_string(pos) + ' ' + std::to_string(count) + ' ' + show(with);
+        return shown(text) + ' ' + std::to_string(pos) + ' ' + std::to_string(count) + ' ' + shown(with);
     }
 
     /// How a replacement finds what it replaces.
@@ -87,7 +74,7 @@ public:
     /// All three replacements of one text by another.
     template <typename Tag>
     static void replaceEach(const Units& text, const Units& from, const Units& to, Tag tag) {
-        const auto describe = [&] { return show(text) + ": " + show(from) + " by " + show(to); };
+        const auto describe = [&] { return shown(text) + ": " + shown(from) + " by " + shown(to); };
         const auto find = finder(from, tag);
         if (!from.empty()) {
             const Naive all = naive::replaceAll(text, from, to, find);
@@ -110,7 +97,7 @@ TYPED_TEST_SUITE(UStringEditProperty, StringTypes, StringTypeNames);
 
 TYPED_TEST(UStringEditProperty, EditsAtEachPosition) {
     using Tested = typename TestFixture::String;
-    for (const auto& text : this->textsUpTo(4, this->twoUnits())) {
+    for (const auto& text : naive::textsUpTo(4, this->twoUnits())) {
         for (const std::uint64_t pos : this->positionsFor(text.size())) {
             for (const char* const ascii : {"", "x", "xy", "xyzxyzxyzxyzxyzxyz"}) {
                 const auto with = this->units(ascii);
@@ -145,8 +132,8 @@ TYPED_TEST(UStringEditProperty, EditsAtEachPosition) {
 }
 
 TYPED_TEST(UStringEditProperty, ReplacesEachSmallNeedleInEachSmallText) {
-    const auto texts = this->textsUpTo(6, this->twoUnits());
-    const auto needles = this->textsUpTo(2, this->twoUnits());
+    const auto texts = naive::textsUpTo(6, this->twoUnits());
+    const auto needles = naive::textsUpTo(2, this->twoUnits());
     for (const auto& text : texts) {
         for (const auto& from : needles) {
             for (const auto& to : needles) {
@@ -160,8 +147,8 @@ TYPED_TEST(UStringEditProperty, ReplacesEachSmallNeedleInEachSmallText) {
 TYPED_TEST(UStringEditProperty, ReplacesWithoutRegardToCase) {
     if constexpr (TestFixture::number != Encoding::Unknown) {
         const auto alphabet = this->units("aAb");
-        const auto needles = this->textsUpTo(2, alphabet);
-        for (const auto& text : this->textsUpTo(3, alphabet)) {
+        const auto needles = naive::textsUpTo(2, alphabet);
+        for (const auto& text : naive::textsUpTo(3, alphabet)) {
             for (const auto& from : needles) {
                 for (const char* const to : {"", "A", "ba"}) {
                     ASSERT_NO_FATAL_FAILURE(
@@ -202,7 +189,7 @@ TYPED_TEST(UStringEditProperty, ReplacesAtFoldedPositionsAsStated) {
                     [&](typename TestFixture::String& s) {
                         s.replaceFirst(this->viewOf(from), this->viewOf(to), case_insensitive_t());
                     },
-                    [&] { return show(text) + ": " + show(from) + " by " + show(to); });
+                    [&] { return shown(text) + ": " + shown(from) + " by " + shown(to); });
             } else {
                 ASSERT_NO_FATAL_FAILURE(this->replaceEach(some(random() % 5), some(1 + random() % 2),
                                                           some(random() % 3), case_insensitive_t()));
@@ -215,10 +202,10 @@ TYPED_TEST(UStringEditProperty, EditsUnitsBySet) {
     using Tested = typename TestFixture::String;
     const typename TestFixture::Units alphabet{TestFixture::unit('a'), TestFixture::unit('\0'),
                                                TestFixture::highest};
-    for (const auto& text : this->textsUpTo(5, alphabet)) {
-        for (const auto& members : this->textsUpTo(2, alphabet)) {
+    for (const auto& text : naive::textsUpTo(5, alphabet)) {
+        for (const auto& members : naive::textsUpTo(2, alphabet)) {
             const auto set = this->set(members);
-            const auto describe = [&] { return show(text) + " by " + show(members); };
+            const auto describe = [&] { return shown(text) + " by " + shown(members); };
             this->expectEdit(
                 text, naive::strip(text, members), [&](Tested& s) { s.strip(set); }, describe);
             this->expectEdit(
@@ -318,7 +305,7 @@ TYPED_TEST(UStringEditProperty, FollowsAPlainSequenceThroughManyEdits) {
                 model += with;
                 break;
             }
-            ASSERT_EQ(show(this->textOf(string)), show(model))
+            ASSERT_EQ(shown(this->textOf(string)), shown(model))
                 << history << '.' << step << ": operation " << operation;
             ASSERT_EQ(string.rawData()[string.size()], typename TestFixture::Unit{0});
             if (model.size() > 300) {

@@ -145,7 +145,7 @@ TYPED_TEST(UStringEdit, ViewsAPartWithoutACopy) {
         SCOPED_TRACE(std::to_string(row.pos) + ' ' + std::to_string(row.count));
         const auto view = string.substr(row.pos, row.count);
         EXPECT_EQ(view.data(), string.begin() + row.start);
-        EXPECT_EQ(show(this->textOf(view)), show(this->units(row.expected)));
+        EXPECT_EQ(shown(this->textOf(view)), shown(this->units(row.expected)));
     }
     EXPECT_EQ(string.substr(2).size(), 4u);
     EXPECT_TRUE(this->make("").substr(5, 1).isEmpty());
@@ -205,7 +205,7 @@ TYPED_TEST(UStringEdit, TakesViewsOfItsOwnText) {
             for (const std::size_t from : {std::size_t{0}, std::size_t{1}, size / 2, size}) {
                 for (const std::size_t count : {std::size_t{0}, std::size_t{2}, size}) {
                     const auto part = text.substr(from, count);
-                    SCOPED_TRACE(show(part) + " of " + show(text) + (roomy ? " with room" : ""));
+                    SCOPED_TRACE(shown(part) + " of " + shown(text) + (roomy ? " with room" : ""));
                     auto string = fresh();
                     string.append(string.substr(from, count));
                     this->expectText(string, text + part);

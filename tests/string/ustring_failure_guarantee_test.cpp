@@ -1,7 +1,7 @@
 // What a failing operation leaves behind: the string as it was. Memory runs out in two ways: the allocation functions
 // of this program fail on demand, at each allocation of an operation in turn, and a child process lives within limits.
-#include <string/operations_support.h>
 #include <support/allocations.h>
+#include <support/string_types.h>
 
 #include <kvt/foundation/throwable.h>
 
@@ -107,7 +107,7 @@ TYPED_TEST(UStringGuarantee, AStringOutlivesAnOutOfMemoryAtEachAllocation) {
         SCOPED_TRACE(edit.name);
         auto expected = this->make(text);
         edit.run(expected); // also opens the converters, which are no part of the operation
-        EXPECT_NE(show(this->textOf(expected)), show(text));
+        EXPECT_NE(shown(this->textOf(expected)), shown(text));
 
         auto string = this->make(text);
         const std::size_t failures = failEachAllocation([&] { edit.run(string); },

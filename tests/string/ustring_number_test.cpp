@@ -1,6 +1,6 @@
 // Numbers as text, and text as numbers.
-#include <string/string_types.h>
 #include <support/failure_record.h>
+#include <support/string_types.h>
 
 #include <kvt/codec/float_text.h>
 
@@ -30,7 +30,7 @@ using kvt::ex::UStringView;
 template <typename Type>
 class UStringNumber : public ::testing::Test {
 public:
-    static constexpr std::uint32_t number = Type::number;
+    static constexpr std::uint32_t number = Type::value;
 
     /// The text of a number, which has to be labelled where there is a label.
     template <typename Number>
@@ -40,7 +40,7 @@ public:
         return shown(string);
     }
 };
-TYPED_TEST_SUITE(UStringNumber, AllStringTypes, StringTypeName);
+TYPED_TEST_SUITE(UStringNumber, StringTypes, StringTypeNames);
 
 template <typename F, typename Integer>
 void expectIntegers() {

@@ -1,7 +1,7 @@
 // Search against plain loops: every small text and needle over two units from every position, and random texts that
 // are long enough for matches to lie across the blocks in which the library looks.
 #include <string/naive_units.h>
-#include <string/operations_support.h>
+#include <support/string_types.h>
 
 #include <random>
 
@@ -16,20 +16,6 @@ public:
     using typename StringTest<Number>::Unit;
     using typename StringTest<Number>::Array;
     using Needles = std::vector<Units>;
-
-    /// Every text of up to `longest` units over the alphabet.
-    static Needles textsUpTo(std::size_t longest, const Units& alphabet) {
-        Needles texts{Units()};
-        for (std::size_t begin = 0, length = 1; length <= longest; ++length) {
-            const std::size_t end = texts.size();
-            for (; begin < end; ++begin) {
-                for (const Unit unit : alphabet) {
-                    texts.push_back(texts[begin] + unit);
-                }
-            }
-        }
-        return texts;
-    }
 
     /// Every position that a text of that size has, some beyond it, and those where additions wrap.
     static std::vector<std::uint64_t> positionsFor(std::size_t size) {
@@ -66,7 +52,7 @@ public:
         const auto sought = StringTest<Number>::make(needle);
         for (const std::uint64_t pos : positionsFor(text.size())) {
             const auto where = [&] {
-                return show(needle) + " in " + show(text) + " from " + std::to_string(pos);
+                return shown(needle) + " in " + shown(text) + " from " + std::to_string(pos);
             };
             ASSERT_EQ(string.find(sought, pos), naive::find(text, needle, pos)) << where();
             ASSERT_EQ(string.rfind(sought, pos), naive::rfind(text, needle, pos)) << where();
@@ -78,10 +64,10 @@ public:
         const bool begins = naive::standsAt(text, 0, needle);
         const bool ends =
             needle.size() <= text.size() && naive::standsAt(text, text.size() - needle.size(), needle);
-        ASSERT_EQ(string.beginsWith(sought), begins) << show(needle) << " and " << show(text);
-        ASSERT_EQ(string.endsWith(sought), ends) << show(needle) << " and " << show(text);
+        ASSERT_EQ(string.beginsWith(sought), begins) << shown(needle) << " and " << shown(text);
+        ASSERT_EQ(string.endsWith(sought), ends) << shown(needle) << " and " << shown(text);
         ASSERT_EQ(string.contains(sought), naive::find(text, needle, 0) != npos)
-            << show(needle) << " in " << show(text);
+            << shown(needle) << " in " << shown(text);
     }
 
     static void searchSetEverywhere(const Units& text, const Units& members) {
@@ -89,7 +75,7 @@ public:
         const auto set = StringTest<Number>::set(members);
         for (const std::uint64_t pos : positionsFor(text.size())) {
             const auto where = [&] {
-                return show(members) + " in " + show(text) + " from " + std::to_string(pos);
+                return shown(members) + " in " + shown(text) + " from " + std::to_string(pos);
             };
             ASSERT_EQ(string.findFirstOf(set, pos), naive::findFirstOf(text, members, pos)) << where();
             ASSERT_EQ(string.findLastOf(set, pos), naive::findLastOf(text, members, pos)) << where();
@@ -101,11 +87,11 @@ public:
         const Array array = arrayOf(needles);
         for (const std::uint64_t pos : positionsFor(text.size())) {
             const auto where = [&] {
-                std::string shown;
+                std::string row;
                 for (const Units& needle : needles) {
-                    shown += show(needle) + ' ';
+                    row += shown(needle) + ' ';
                 }
-                return shown + "in " + show(text) + " from " + std::to_string(pos);
+                return row + "in " + shown(text) + " from " + std::to_string(pos);
             };
             ASSERT_EQ(string.findFirstOf(array, pos), naive::findFirstOf(text, needles, pos)) << where();
             ASSERT_EQ(string.findLastOf(array, pos), naive::findLastOf(text, needles, pos)) << where();
@@ -121,14 +107,14 @@ typename Test::Units twoUnits() {
 }
 
 TYPED_TEST(UStringSearchProperty, FindsEachSmallNeedleInEachSmallText) {
-    for (const auto& text : this->textsUpTo(7, twoUnits<TestFixture>())) {
-        for (const auto& needle : this->textsUpTo(3, twoUnits<TestFixture>())) {
+    for (const auto& text : naive::textsUpTo(7, twoUnits<TestFixture>())) {
+        for (const auto& needle : naive::textsUpTo(3, twoUnits<TestFixture>())) {
             ASSERT_NO_FATAL_FAILURE(this->searchEverywhere(text, needle));
         }
     }
     // Needles longer than the text, and the text itself.
-    for (const auto& text : this->textsUpTo(4, twoUnits<TestFixture>())) {
-        for (const auto& needle : this->textsUpTo(5, twoUnits<TestFixture>())) {
+    for (const auto& text : naive::textsUpTo(4, twoUnits<TestFixture>())) {
+        for (const auto& needle : naive::textsUpTo(5, twoUnits<TestFixture>())) {
             ASSERT_NO_FATAL_FAILURE(this->searchEverywhere(text, needle));
         }
     }
@@ -137,16 +123,16 @@ TYPED_TEST(UStringSearchProperty, FindsEachSmallNeedleInEachSmallText) {
 TYPED_TEST(UStringSearchProperty, FindsTheUnitsOfEachSmallSet) {
     const typename TestFixture::Units alphabet{TestFixture::unit('a'), TestFixture::unit('\0'),
                                                TestFixture::highest};
-    for (const auto& text : this->textsUpTo(5, alphabet)) {
-        for (const auto& members : this->textsUpTo(2, alphabet)) {
+    for (const auto& text : naive::textsUpTo(5, alphabet)) {
+        for (const auto& members : naive::textsUpTo(2, alphabet)) {
             ASSERT_NO_FATAL_FAILURE(this->searchSetEverywhere(text, members));
         }
     }
 }
 
 TYPED_TEST(UStringSearchProperty, FindsTheStringsOfEachSmallArray) {
-    const auto needles = this->textsUpTo(2, twoUnits<TestFixture>());
-    for (const auto& text : this->textsUpTo(5, twoUnits<TestFixture>())) {
+    const auto needles = naive::textsUpTo(2, twoUnits<TestFixture>());
+    for (const auto& text : naive::textsUpTo(5, twoUnits<TestFixture>())) {
         ASSERT_NO_FATAL_FAILURE(this->searchArrayEverywhere(text, {}));
         for (const auto& one : needles) {
             ASSERT_NO_FATAL_FAILURE(this->searchArrayEverywhere(text, {one}));
@@ -228,20 +214,20 @@ TYPED_TEST(UStringSearchProperty, FindsANeedleBehindManyThatAlmostMatch) {
 TYPED_TEST(UStringSearchProperty, ComparesAndHashesEachPairOfSmallTexts) {
     const typename TestFixture::Units alphabet{TestFixture::unit('a'), TestFixture::unit('\0'),
                                                TestFixture::highest};
-    const auto texts = this->textsUpTo(4, alphabet);
+    const auto texts = naive::textsUpTo(4, alphabet);
     for (const auto& left : texts) {
         const auto string = this->make(left);
-        ASSERT_EQ(string.hash(), naive::hash(left)) << show(left);
+        ASSERT_EQ(string.hash(), naive::hash(left)) << shown(left);
         for (const auto& right : texts) {
             const auto other = this->make(right);
             const int expected = naive::compare(left, right);
             const int compared = string.compare(other);
-            ASSERT_EQ((compared > 0) - (compared < 0), expected) << show(left) << ' ' << show(right);
+            ASSERT_EQ((compared > 0) - (compared < 0), expected) << shown(left) << ' ' << shown(right);
             if (!TestFixture::narrow) {
-                ASSERT_EQ(compared, expected) << show(left) << ' ' << show(right);
+                ASSERT_EQ(compared, expected) << shown(left) << ' ' << shown(right);
             }
-            ASSERT_EQ(string == other, expected == 0) << show(left) << ' ' << show(right);
-            ASSERT_EQ(string < other, expected < 0) << show(left) << ' ' << show(right);
+            ASSERT_EQ(string == other, expected == 0) << shown(left) << ' ' << shown(right);
+            ASSERT_EQ(string < other, expected < 0) << shown(left) << ' ' << shown(right);
         }
     }
 }
@@ -253,7 +239,7 @@ TYPED_TEST(UStringSearchProperty, HashesRandomUnits) {
         for (std::size_t size = random() % 50; text.size() < size;) {
             text += static_cast<typename TestFixture::Unit>(random());
         }
-        ASSERT_EQ(this->make(text).hash(), naive::hash(text)) << show(text);
+        ASSERT_EQ(this->make(text).hash(), naive::hash(text)) << shown(text);
     }
 }
 
@@ -268,21 +254,21 @@ TYPED_TEST(UStringSearchProperty, WithoutRegardToCaseIsSearchInFoldedText) {
             return text;
         };
         const auto alphabet = TestFixture::units("aAb");
-        for (const auto& text : this->textsUpTo(4, alphabet)) {
+        for (const auto& text : naive::textsUpTo(4, alphabet)) {
             const auto string = this->make(text);
-            for (const auto& needle : this->textsUpTo(2, alphabet)) {
+            for (const auto& needle : naive::textsUpTo(2, alphabet)) {
                 const auto sought = this->make(needle);
                 const auto foldedText = fold(text);
                 const auto foldedNeedle = fold(needle);
                 for (const std::uint64_t pos : {std::uint64_t{0}, std::uint64_t{1}, std::uint64_t{4}, npos}) {
                     ASSERT_EQ(string.find(sought, pos, tag), naive::find(foldedText, foldedNeedle, pos))
-                        << show(needle) << " in " << show(text) << " from " << pos;
+                        << shown(needle) << " in " << shown(text) << " from " << pos;
                     ASSERT_EQ(string.rfind(sought, pos, tag), naive::rfind(foldedText, foldedNeedle, pos))
-                        << show(needle) << " in " << show(text) << " from " << pos;
+                        << shown(needle) << " in " << shown(text) << " from " << pos;
                 }
                 const int compared = string.compare(sought, tag);
                 ASSERT_EQ((compared > 0) - (compared < 0), naive::compare(foldedText, foldedNeedle))
-                    << show(needle) << " and " << show(text);
+                    << shown(needle) << " and " << shown(text);
                 ASSERT_EQ(string.beginsWith(sought, tag), naive::standsAt(foldedText, 0, foldedNeedle));
                 ASSERT_EQ(string.endsWith(sought, tag),
                           needle.size() <= text.size() &&

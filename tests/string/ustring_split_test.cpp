@@ -1,8 +1,8 @@
 // Splitting and joining, the same for all string types but for the labels of UString<30>.
 //
 // The reference of the property tests walks the text unit by unit; the library jumps from one delimiter to the next.
-#include <string/string_types.h>
 #include <support/allocations.h>
+#include <support/string_types.h>
 
 #include <gtest/gtest.h>
 
@@ -29,7 +29,7 @@ constexpr std::uint64_t npos = UString<0>::npos;
 template <typename Type>
 class UStringSplit : public ::testing::Test {
 public:
-    static constexpr std::uint32_t number = Type::number;
+    static constexpr std::uint32_t number = Type::value;
     using String = UString<number>;
     using View = UStringView<number>;
     using Set = kvt::ex::vector<Unit<number>>;
@@ -40,7 +40,7 @@ public:
     }
     static auto behaviour(bool keep) { return keep ? String::KeepEmptyParts : String::SkipEmptyParts; }
 };
-TYPED_TEST_SUITE(UStringSplit, AllStringTypes, StringTypeName);
+TYPED_TEST_SUITE(UStringSplit, StringTypes, StringTypeNames);
 
 /// A delimiter of one unit, so that all four overloads have to give the same.
 struct UnitRow {
