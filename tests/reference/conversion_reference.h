@@ -1,7 +1,7 @@
 // The rules of conversion between strings, worked out with plain decoders for the few encodings that have a
-// string type of their own. No ICU and no code of the library is behind it, only the failure classes' shape.
+// string type of their own. It uses neither ICU nor the library.
 //
-// It counts on a system encoding of UTF-8, as the plain "C" locale gives.
+// It expects the system encoding to be UTF-8, as it is in the plain "C" locale.
 #pragma once
 
 #include <support/failure_record.h>
@@ -16,7 +16,7 @@ namespace kvt::test::reference {
 struct Conversion {
     std::string bytes;
     FailureRecord failure;
-    /// Whether `bytes` is what the target of a failed conversion holds; else that is nobody's business.
+    /// Whether `bytes` is what the target of a failed conversion holds; else nothing is promised.
     bool stateIsKnown = true;
 };
 

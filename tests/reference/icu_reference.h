@@ -1,4 +1,4 @@
-// What a conversion must give, worked out the slow way: ICU's own functions, fresh converters for each call, one
+// The expected result of a conversion, computed slowly: ICU's own functions, new converters for each call, one
 // buffer for everything, callbacks that only take notes. It shares no code with the library; the tests compare.
 #pragma once
 

@@ -1,9 +1,9 @@
 // The form of a backing file, read from the bytes alone: by pread, word by word, following the self-relative
-// pointers without mapping anything. No code of the library and none of Boost is behind it.
+// pointers without mapping anything. It uses no code of the library or of Boost.
 //
 // What a reader returns has been checked on the way: the blocks of a heap lie end to end, their marks agree with
 // each other and with the tree of free ones and the counts in the heap's first words, and every pointer leads to a
-// place inside its heap. Where something is amiss, std::runtime_error says what and where.
+// place inside its heap. Where something is wrong, std::runtime_error says what and where.
 //
 // Positions are bytes from the start of the file.
 #pragma once

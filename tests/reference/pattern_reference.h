@@ -1,5 +1,5 @@
-// A second reading of values by patterns, to hold parse() against: with streams, strings and exceptions, step by step
-// and without any regard for speed. It shares no code with the library; its calendar counts.
+// A second reader of values by patterns, to compare parse() with. It uses streams, strings and exceptions, goes step by
+// step, and does not care for speed. It shares no code with the library; its calendar counts.
 #pragma once
 
 #include <cstdint>

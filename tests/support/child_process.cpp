@@ -155,7 +155,7 @@ private:
         std::array<char, 65536> bytes;
         const ssize_t count = ::read(descriptor, bytes.data(), bytes.size());
         if (count <= 0) {
-            // A terminal whose other side is closed gives an error in place of an end.
+            // A terminal whose other side is closed reports an error, not an end.
             closeOnce(descriptor);
         } else if (take) {
             take({bytes.data(), static_cast<std::size_t>(count)});

@@ -1,4 +1,4 @@
-// Runs a program and tells what came of it. Input can be made and output looked at piece by piece, so that streams
+// Runs a program and reports how it ended and what it wrote. Input can be made and output read piece by piece: streams
 // of any length pass without being held; a stream can be left unread, and standard error can be a terminal.
 #pragma once
 
@@ -50,7 +50,7 @@ public:
     /// Writes to its standard input, which stays open.
     void write(std::string_view bytes);
     void signal(int number);
-    /// Waits for its end; gives a status as in ChildResult.
+    /// Waits for its end. Returns a status as in ChildResult.
     int wait();
 
 private:

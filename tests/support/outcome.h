@@ -1,4 +1,4 @@
-// What a call that may fail with a Throwable came to, in plain strings, to be compared with what was expected.
+// The outcome of a call that may fail with a Throwable, in plain strings, to compare with the expected one.
 #pragma once
 
 #include <reference/icu_reference.h>
