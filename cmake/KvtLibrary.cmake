@@ -27,7 +27,9 @@ set_target_properties(kvt PROPERTIES
     SOVERSION ${PROJECT_VERSION_MAJOR}
     LINK_DEPENDS "${PROJECT_SOURCE_DIR}/cmake/kvt.map")
 target_link_options(kvt PRIVATE
-    "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map")
+    "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map"
+    # The system calls back into it at the end of each thread that has converted text.
+    LINKER:-z,nodelete)
 if(NOT KVT_SANITIZE) # a sanitizer's run-time is in the program, not in its libraries
     target_link_options(kvt PRIVATE LINKER:--no-undefined)
 endif()

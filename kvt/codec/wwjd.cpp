@@ -6,6 +6,7 @@
 
 #include <kvt/encoding/detail/lossy_text.h>
 #include <kvt/foundation/throwable.h>
+#include <kvt/platform/thread_end.h>
 #include <kvt/string/ustring.h>
 
 #include <algorithm>
@@ -189,10 +190,20 @@ std::string wwjdToBytes(std::string_view text) {
     return out;
 }
 
+namespace {
+
+/// What the last call of wwjdDecode() on a thread gave, which its caller views.
+template <typename CharT>
+struct Decoded {
+    std::basic_string<CharT> text;
+};
+
+} // namespace
+
 template <typename CharT>
 void wwjdDecode(kvt::future::basic_string_view<CharT, std::char_traits<CharT>> text, const CharT*& data,
                 std::uint64_t& size) {
-    thread_local std::basic_string<CharT> decoded;
+    std::basic_string<CharT>& decoded = platform::ofThisThread<Decoded<CharT>>().text;
     decoded = wwjdToBytes(text);
     data = decoded.data();
     size = decoded.size();

@@ -5,7 +5,8 @@
 #include <kvt/encoding/icu_transcoder.h>
 #include <kvt/foundation/throwable.h>
 
-#include <set>
+#include <algorithm>
+#include <array>
 
 namespace kvt::ex {
 
@@ -48,7 +49,7 @@ bool Encoding::supports7BitASCII() const {
     if (evaluated != System && evaluated <= Unknown) {
         return false;
     }
-    static const std::set<Encoding> compatible = {
+    static const std::array compatible = {
         Encoding("ibm-5471_P100-2006"),
         windowsCodePage<874>(),
         windowsCodePage<936>(),
@@ -62,7 +63,7 @@ bool Encoding::supports7BitASCII() const {
         Encoding("EUC-KR"),
         Encoding("KOI8-R"),
     };
-    return compatible.count(*this) != 0;
+    return std::find(compatible.begin(), compatible.end(), *this) != compatible.end();
 }
 
 } // namespace kvt::ex

@@ -46,7 +46,8 @@ std::array<std::string_view, EncodingRegistry::firstDynamic> namesWithSystem(std
 DebuggerView encodingNames{};
 
 EncodingRegistry& EncodingRegistry::instance() {
-    static EncodingRegistry registry;
+    // Never destroyed: destructors of static objects convert text, too, in whatever order they run.
+    static auto& registry = *new EncodingRegistry();
     return registry;
 }
 
@@ -141,9 +142,7 @@ std::string_view EncodingRegistry::nameOf(std::uint32_t id) {
 
 std::string EncodingRegistry::normaliseName(std::string_view name) {
     // ICU wants a terminated name, so that text behind a zero does not count.
-    // The buffer is kept so that odd spellings do not allocate each time.
-    thread_local std::string terminated;
-    terminated = name;
+    const std::string terminated(name);
     std::string standard = icu::standardName(terminated.c_str());
     if (standard == "UTF-16") {
         return "UTF-16LE";

@@ -118,8 +118,13 @@ void Converter::Close::operator()(UConverter* converter) const noexcept {
 }
 
 Converter::Converter(Encoding encoding) : encoding_(encoding) {
+    const std::string_view name = encoding.getName();
+    // An id that was never handed out has no name, and ICU takes no name for that of its own default.
+    if (name.empty()) {
+        return;
+    }
     UErrorCode error = U_ZERO_ERROR;
-    converter_.reset(ucnv_open(encoding.getName().data(), &error));
+    converter_.reset(ucnv_open(name.data(), &error));
     // Compound text is left with ICU's own substitution: once another is set, ucnv_close frees what is not its own.
     if (converter_ == nullptr || isUnicodeForm(encoding) ||
         ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {

@@ -2,11 +2,22 @@
 #include <kvt/encoding/detail/transcoder_helper.h>
 
 #include <kvt/foundation/throwable.h>
+#include <kvt/platform/thread_end.h>
 
 #include <array>
 #include <map>
 
 namespace kvt::ex::detail {
+namespace {
+
+/// The converters that one thread has opened.
+struct ThreadConverters {
+    // The encodings of the string types are met all the time and need no search.
+    std::array<TranscoderHelper, 5> common;
+    std::map<std::uint32_t, TranscoderHelper> others;
+};
+
+} // namespace
 
 void TranscoderHelper::open(Encoding encoding) {
     encoding_ = encoding;
@@ -47,9 +58,7 @@ TranscoderHelper& helperFor(Encoding encoding) {
     if (id == Encoding::Unknown || id == Encoding::Binary || id == Encoding::Wwjd) {
         throw InvalidEncodingException("unknown");
     }
-    // The encodings of the string types are met all the time and need no search.
-    thread_local std::array<TranscoderHelper, 5> common;
-    thread_local std::map<std::uint32_t, TranscoderHelper> others;
+    auto& [common, others] = platform::ofThisThread<ThreadConverters>();
     TranscoderHelper& helper = id <= Encoding::Utf32LE  ? common[id]
                                : id == Encoding::System ? common.back()
                                                         : others[id];

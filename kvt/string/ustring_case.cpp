@@ -21,19 +21,19 @@ namespace {
 /// The mappings, as indexes of the tables below.
 enum class Mapping { upper, lower, folded };
 
-using CaseMap = std::unique_ptr<UCaseMap, decltype(&ucasemap_close)>;
-
-// Opened at first use and only read after that; when it cannot be opened, the next use tries again.
+// Opened at first use and only read after that; when it cannot be opened, the next use tries again. It is never closed:
+// destructors of static objects map text, too.
 const UCaseMap* defaultCaseMap() {
-    static const CaseMap map = [] {
+    static const UCaseMap* const map = [] {
         UErrorCode status = U_ZERO_ERROR;
-        CaseMap opened(ucasemap_open("", 0, &status), &ucasemap_close);
+        std::unique_ptr<UCaseMap, decltype(&ucasemap_close)> opened(ucasemap_open("", 0, &status),
+                                                                    &ucasemap_close);
         if (status != U_ZERO_ERROR) {
             throw UStringException("Unable to open an ICU case map for the default locale.");
         }
-        return opened;
+        return opened.release();
     }();
-    return map.get();
+    return map;
 }
 
 // Whether ICU has written the text, or would have with more room.

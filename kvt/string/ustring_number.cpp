@@ -16,17 +16,23 @@ namespace {
 
 constexpr std::uint64_t smallNumbers = 500;
 
+// The digits of a number below 1000.
+struct SmallNumber {
+    std::array<char, 3> digits{};
+    std::uint8_t length = 0;
+};
+
 // The texts of the small numbers, which are most of all numbers that are written.
-const std::array<std::string, smallNumbers>& smallNumberTexts() {
-    static const auto texts = [] {
-        std::array<std::string, smallNumbers> made;
-        for (std::size_t i = 0; i < made.size(); ++i) {
-            made[i] = std::to_string(i);
+constexpr auto smallNumberTexts = [] {
+    std::array<SmallNumber, smallNumbers> made{};
+    for (std::uint64_t number = 0; number < smallNumbers; ++number) {
+        SmallNumber& text = made[number];
+        for (std::uint64_t unit = number < 10 ? 1 : number < 100 ? 10 : 100; unit != 0; unit /= 10) {
+            text.digits[text.length++] = static_cast<char>('0' + number / unit % 10);
         }
-        return made;
-    }();
-    return texts;
-}
+    }
+    return made;
+}();
 
 // A string of text that is ASCII in every encoding of the types; a UString<30> is labelled so.
 template <std::uint32_t N>
@@ -44,7 +50,8 @@ template <std::uint32_t N, typename Integer>
 UString<N> integerText(Integer number) {
     const auto value = static_cast<std::uint64_t>(number);
     if (value < smallNumbers) {
-        return fromAsciiText<N>(smallNumberTexts()[value]);
+        const SmallNumber& text = smallNumberTexts[value];
+        return fromAsciiText<N>({text.digits.data(), text.length});
     }
     std::array<char, std::numeric_limits<Integer>::digits10 + 2> text;
     const char* const end = std::to_chars(text.data(), text.data() + text.size(), number).ptr;
