@@ -8,6 +8,8 @@
 
 #include <algorithm>
 #include <array>
+#include <optional>
+#include <vector>
 
 namespace kvt::ex::detail::icu {
 namespace {
@@ -88,6 +90,91 @@ bool isSingleByte(UConverter* converter) {
     const UConverterType type = ucnv_getType(converter);
     return (type == UCNV_SBCS || type == UCNV_LATIN_1) && ucnv_getMaxCharSize(converter) == 1;
 }
+
+/// Finds out whether an encoding has a state, by characters of which each follows each other: what comes out for one
+/// must be the same as for the character alone. They are of many scripts, since an encoding changes its state where it
+/// changes its set of characters, and U+FEFF is among them, which some read and write at the beginning only.
+class Trial {
+public:
+    explicit Trial(Encoding encoding)
+        : converter_(ucnv_open(encoding.getName().data(), &openError_), &ucnv_close) {
+        UErrorCode error = U_ZERO_ERROR;
+        ucnv_setFromUCallBack(converter_.get(), UCNV_FROM_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
+        ucnv_setToUCallBack(converter_.get(), UCNV_TO_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
+    }
+
+    bool isStateless() const {
+        std::vector<Sample> samples;
+        for (const std::u16string_view character : characters) {
+            const std::optional<std::string> bytes = encoded(character);
+            // An encoding that lacks it may have one that resembles it.
+            if (bytes && decoded(*bytes) == character) {
+                samples.push_back({character, *bytes});
+            }
+        }
+        std::u16string text;
+        std::string bytes;
+        const auto append = [&](const Sample& sample) {
+            text += sample.text;
+            bytes += sample.bytes;
+        };
+        for (std::size_t first = 0; first < samples.size(); ++first) {
+            for (std::size_t second = 0; second <= first; ++second) {
+                append(samples[first]);
+                append(samples[second]);
+            }
+        }
+        return encoded(text) == bytes && decoded(bytes) == text;
+    }
+
+    /// Of all converters only some that read letters with marks behind them are.
+    bool isBehind() const {
+        const std::optional<std::string> letter = encoded(u"A");
+        UErrorCode unused = U_ZERO_ERROR;
+        return letter && decoded(*letter, false)->empty() &&
+               ucnv_toUCountPending(converter_.get(), &unused) == 0;
+    }
+
+private:
+    struct Sample {
+        std::u16string_view text;
+        std::string bytes;
+    };
+
+    static constexpr std::u16string_view characters[] = {
+        u"\uFEFF", u"A",      u"~",      u"\u00E9", u"\u00D7", u"\u0159", u"\u03B1",     u"\u0416",
+        u"\u05D0", u"\u0634", u"\u0905", u"\u0985", u"\u0B85", u"\u0E01", u"\u20AC",     u"\u3042",
+        u"\uFF71", u"\u4E2D", u"\u6587", u"\uAC00", u"\uFFFD", u"\n",     u"\U0001F600", u"\U00020000",
+    };
+
+    // From the converter's initial state on and back to it.
+    std::optional<std::string> encoded(std::u16string_view text) const {
+        std::string bytes(text.size() * 16, '\0');
+        char* target = bytes.data();
+        const char16_t* source = text.data();
+        UErrorCode error = U_ZERO_ERROR;
+        ucnv_reset(converter_.get());
+        ucnv_fromUnicode(converter_.get(), &target, target + bytes.size(), &source, source + text.size(),
+                         nullptr, 1, &error);
+        bytes.resize(static_cast<std::size_t>(target - bytes.data()));
+        return U_SUCCESS(error) ? std::optional(bytes) : std::nullopt;
+    }
+
+    std::optional<std::u16string> decoded(std::string_view bytes, bool flush = true) const {
+        std::u16string text(bytes.size() * 4, u'\0');
+        char16_t* target = text.data();
+        const char* source = bytes.data();
+        UErrorCode error = U_ZERO_ERROR;
+        ucnv_reset(converter_.get());
+        ucnv_toUnicode(converter_.get(), &target, target + text.size(), &source, source + bytes.size(),
+                       nullptr, flush ? 1 : 0, &error);
+        text.resize(static_cast<std::size_t>(target - text.data()));
+        return U_SUCCESS(error) ? std::optional(text) : std::nullopt;
+    }
+
+    UErrorCode openError_ = U_ZERO_ERROR;
+    std::unique_ptr<UConverter, decltype(&ucnv_close)> converter_;
+};
 
 } // namespace
 
@@ -197,22 +284,7 @@ Form Converter::form() {
 }
 
 bool Converter::isStateless() const {
-    switch (ucnv_getType(converter_.get())) {
-    case UCNV_SBCS:
-    case UCNV_DBCS:
-    case UCNV_MBCS:
-    case UCNV_LATIN_1:
-    case UCNV_US_ASCII:
-    case UCNV_UTF8:
-    case UCNV_UTF16_BigEndian:
-    case UCNV_UTF16_LittleEndian:
-    case UCNV_UTF32_BigEndian:
-    case UCNV_UTF32_LittleEndian:
-    case UCNV_CESU8:
-        return true;
-    default:
-        return false;
-    }
+    return Trial(encoding_).isStateless();
 }
 
 Converter Converter::clone() const {
@@ -246,6 +318,10 @@ bool Converter::countsHeldBytes() const {
     default:
         return true;
     }
+}
+
+bool Converter::isBehind() const {
+    return Trial(encoding_).isBehind();
 }
 
 bool Converter::holdsUnits() const {

@@ -66,7 +66,8 @@ public:
     Impl(Encoding from, Encoding to)
         : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from),
           toTable_(to), hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
-          isStateless_(from_.isStateless() && to_.isStateless()), substitution_(to_.substitution()) {
+          isStateless_(from_.isStateless() && to_.isStateless()), isBehind_(from_.isBehind()),
+          countsHeldBytes_(from_.countsHeldBytes() && !isBehind_), substitution_(to_.substitution()) {
         from_.setListener(*this);
         to_.setListener(*this);
     }
@@ -96,7 +97,7 @@ public:
         recent_.clear();
         position_ = 0;
         characterBegin_ = 0;
-        settledEnd_ = 0;
+        badEnd_ = 0;
     }
 
     std::uint64_t position() const { return position_; }
@@ -119,7 +120,11 @@ private:
     void recordBadInput(std::string_view bytes, std::size_t index);
     void recordNotRepresentable(char32_t codePoint);
     std::optional<std::uint64_t> placeOfBadInput(std::string_view bytes, std::size_t between) const;
+    std::uint64_t openBegin() const;
     void attribute(std::size_t behind, std::uint64_t end);
+    std::uint64_t lateBytes(std::uint64_t justRead) const {
+        return isBehind_ && position_ - justRead > characterBegin_ ? justRead : 0;
+    }
     std::uint64_t recentBegin() const { return position_ - recent_.size(); }
     std::string bytesOfInput(std::uint64_t begin, std::uint64_t end) const;
 
@@ -131,12 +136,14 @@ private:
     detail::SingleByteTable toTable_;
     bool hasShortcut_;
     bool isStateless_;
+    bool isBehind_;
+    bool countsHeldBytes_;
     std::string substitution_;
 
     std::uint64_t position_ = 0;
     std::uint64_t characterBegin_ = 0; // where the bytes held by the source's converter begin
-    std::uint64_t settledEnd_ = 0; // behind the last character that came out, before shifts that followed it
-    std::string recent_;           // the last bytes before position_
+    std::uint64_t badEnd_ = 0;         // behind the last bad input
+    std::string recent_;               // the last bytes before position_
 
     std::array<char16_t, bufferUnits> buffer_{};
     std::size_t filled_ = 0;
@@ -153,7 +160,7 @@ private:
 // Converts a slice whole. When something is lost in it, all is as it was before, and the answer is false. So it is where
 // it could not be known afterwards, or not be taken back, what the converters hold.
 bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& out) {
-    if (!from_.countsHeldBytes() || !units_.empty() || (isStateless_ && !holdsNothing())) {
+    if (!countsHeldBytes_ || !units_.empty() || (isStateless_ && !holdsNothing())) {
         return false;
     }
     Converter savedFrom;
@@ -178,7 +185,6 @@ bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& ou
     if (isSettled) {
         passOver(slice);
         characterBegin_ = position_ - from_.heldBytes();
-        settledEnd_ = characterBegin_;
         return true;
     }
     out.resize(outSize);
@@ -223,8 +229,8 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
         isReadAgain_ = false;
         progress = decode(source, byte.data() + byte.size(), flush);
         if (filled_ > attributed_) {
-            attribute(filled_, position_ - from_.heldBytes());
-        } else if (from_.countsHeldBytes()) {
+            attribute(filled_, position_ - (isBehind_ ? lateBytes(byte.size()) : from_.heldBytes()));
+        } else if (countsHeldBytes_) {
             characterBegin_ = position_ - from_.heldBytes();
         }
         encode(flush && progress.end != Progress::outputFull, out);
@@ -269,7 +275,6 @@ void StreamTranscoder::Impl::passOver(std::string_view bytes) {
     keepRecent(bytes);
     position_ += bytes.size();
     characterBegin_ = position_;
-    settledEnd_ = position_;
 }
 
 void StreamTranscoder::Impl::keepRecent(std::string_view bytes) {
@@ -317,27 +322,35 @@ void StreamTranscoder::Impl::recordBadInput(std::string_view bytes, std::size_t 
     if (index > attributed_) {
         attribute(index, found ? *found : characterBegin_ + (index - attributed_));
     }
-    // Where ICU puts together what does not stand together, all that came to nothing is the bad input.
-    const std::uint64_t begin = found ? *found : settledEnd_;
+    const std::uint64_t begin = found ? *found : openBegin();
     const std::uint64_t end = found ? begin + bytes.size() : position_;
     losses_.push_back({Loss::BadInput, begin, bytesOfInput(begin, end), U'\uFFFD'});
     units_.push_back({u'\uFFFD', begin, end, true});
     characterBegin_ = end;
-    settledEnd_ = end;
+    badEnd_ = end;
     attributed_ = index + 1;
 }
 
 // Where bad bytes stand: behind the last character that came out and `between` further ones, or earlier where the
-// converter did not count all that it held.
+// converter did not count all that it held. Nowhere when ICU does not show them, or puts together what does not stand
+// together.
 std::optional<std::uint64_t> StreamTranscoder::Impl::placeOfBadInput(std::string_view bytes,
                                                                      std::size_t between) const {
-    for (const std::uint64_t from : {characterBegin_ + between, settledEnd_}) {
-        const std::size_t found = recent_.find(bytes, std::max(from, recentBegin()) - recentBegin());
-        if (found != std::string::npos) {
-            return recentBegin() + found;
-        }
+    if (bytes.empty()) {
+        return std::nullopt;
     }
-    return std::nullopt;
+    const std::uint64_t open = std::max(characterBegin_ + between, recentBegin());
+    std::size_t found = recent_.find(bytes, open - recentBegin());
+    if (found == std::string::npos) {
+        found = recent_.rfind(bytes);
+    }
+    const bool isNew = found != std::string::npos && recentBegin() + found >= badEnd_;
+    return isNew ? std::optional(recentBegin() + found) : std::nullopt;
+}
+
+// Where that begins which came to nothing: a character that is open, or else the last byte, unless it was a loss already.
+std::uint64_t StreamTranscoder::Impl::openBegin() const {
+    return characterBegin_ < position_ ? characterBegin_ : std::max(badEnd_, position_ - 1);
 }
 
 // The units of the buffer up to `behind` come from the bytes up to `end`: all of them from all, unless bytes were read
@@ -350,7 +363,6 @@ void StreamTranscoder::Impl::attribute(std::size_t behind, std::uint64_t end) {
         characterBegin_ += oneEach ? 1 : 0;
     }
     characterBegin_ = end;
-    settledEnd_ = end;
 }
 
 void StreamTranscoder::Impl::onNotRepresentable(char32_t codePoint, int) noexcept {
@@ -378,7 +390,11 @@ void StreamTranscoder::Impl::recordNotRepresentable(char32_t codePoint) {
                                    wanted.begin() + static_cast<std::ptrdiff_t>(length),
                                    [](const Unit& unit, char16_t want) { return unit.unit == want; });
     if (found == units_.end()) {
-        losses_.push_back({Loss::NotRepresentable, characterBegin_, {}, codePoint});
+        // Some map a character to another one before they find out that they lack it.
+        const std::uint64_t begin = units_.empty() ? openBegin() : units_.front().begin;
+        const std::uint64_t end = units_.empty() ? position_ : units_.back().end;
+        losses_.push_back({Loss::NotRepresentable, begin, bytesOfInput(begin, end), codePoint});
+        units_.clear();
         return;
     }
     const auto last = found + static_cast<std::ptrdiff_t>(length) - 1;

@@ -263,6 +263,67 @@ Raw convertWithIcu(const std::string& from, const std::string& to, std::string_v
     return raw;
 }
 
+Losses lossesOfIcu(const std::string& from, const std::string& to, std::string_view bytes) {
+    Notes unused;
+    const ConverterPtr source = prepare(from, unused);
+    const ConverterPtr target = prepare(to, unused);
+    Losses losses;
+
+    std::u16string text(bytes.size() * 8 + 64, u'\0');
+    struct Bad {
+        const UChar* begin;
+        std::vector<std::string>& bytes;
+        std::vector<std::size_t> places; // of the substitutions, in the text
+    } bad{text.data(), losses.badInput, {}};
+    const auto noteBad = [](const void* context, UConverterToUnicodeArgs* args, const char* lost,
+                            int32_t length, UConverterCallbackReason reason, UErrorCode* error) {
+        if (reason <= UCNV_IRREGULAR) {
+            auto& notes = *static_cast<Bad*>(const_cast<void*>(context));
+            notes.bytes.emplace_back(lost, static_cast<std::size_t>(length));
+            notes.places.push_back(static_cast<std::size_t>(args->target - notes.begin));
+        }
+        UCNV_TO_U_CALLBACK_SUBSTITUTE(nullptr, args, lost, length, reason, error);
+    };
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_setToUCallBack(source.get(), noteBad, &bad, nullptr, nullptr, &error);
+    UChar* textEnd = text.data();
+    const char* in = bytes.data();
+    ucnv_toUnicode(source.get(), &textEnd, text.data() + text.size(), &in, bytes.data() + bytes.size(),
+                   nullptr, 1, &error);
+    text.resize(static_cast<std::size_t>(textEnd - text.data()));
+
+    const auto noteLost = [](const void* context, UConverterFromUnicodeArgs* args, const UChar* units,
+                             int32_t length, UChar32 codePoint, UConverterCallbackReason reason,
+                             UErrorCode* code) {
+        if (reason <= UCNV_IRREGULAR) {
+            static_cast<std::vector<char32_t>*>(const_cast<void*>(context))
+                ->push_back(static_cast<char32_t>(codePoint));
+        }
+        UCNV_FROM_U_CALLBACK_SUBSTITUTE(nullptr, args, units, length, codePoint, reason, code);
+    };
+    std::vector<char32_t> lost;
+    ucnv_setFromUCallBack(target.get(), noteLost, &lost, nullptr, nullptr, &error);
+    losses.bytes.resize(text.size() * 16 + 64);
+    char* out = losses.bytes.data();
+    const UChar* position = text.data();
+    ucnv_fromUnicode(target.get(), &out, losses.bytes.data() + losses.bytes.size(), &position,
+                     text.data() + text.size(), nullptr, 1, &error);
+    losses.bytes.resize(static_cast<std::size_t>(out - losses.bytes.data()));
+
+    // A target without U+FFFD loses each one; those that stand for bad input have been counted as that.
+    std::size_t place = 0;
+    for (const char32_t c : lost) {
+        if (c == 0xFFFD) {
+            place = text.find(u'\uFFFD', place);
+            if (std::binary_search(bad.places.begin(), bad.places.end(), place++)) {
+                continue;
+            }
+        }
+        losses.characters.push_back(c);
+    }
+    return losses;
+}
+
 Outcome expectedTranscode(const std::string& from, const std::string& to, std::string_view bytes) {
     if (from == to || bytes.empty()) {
         return {std::string(bytes), 0, {}, {}};

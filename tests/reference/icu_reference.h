@@ -45,6 +45,15 @@ struct Buffers {
 Raw convertWithIcu(const std::string& from, const std::string& to, std::string_view bytes,
                    Buffers buffers = {});
 
+/// What is lost of a text on its way, by callbacks that see each loss. The two kinds are apart, since ICU converts a
+/// text in two steps.
+struct Losses {
+    std::string bytes;                 ///< the text with its substitutions
+    std::vector<std::string> badInput; ///< the bytes of each place that is no text
+    std::vector<char32_t> characters;  ///< that the target lacks, substitutions for bad input not among them
+};
+Losses lossesOfIcu(const std::string& from, const std::string& to, std::string_view bytes);
+
 /// What ICUTranscoder has to do.
 Outcome expectedTranscode(const std::string& from, const std::string& to, std::string_view bytes);
 
