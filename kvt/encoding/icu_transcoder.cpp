@@ -137,6 +137,9 @@ void ICUTranscoder::transcode(kvt::future::basic_string_view<CharIn> in, std::ba
         detail::copyBytes(bytes, out);
         return;
     }
+    if (!isValid()) {
+        throw InvalidEncodingException(UString<0>(UStringView<0>((from_->isOpen() ? to : from).getName())));
+    }
     const Losses losses = convertAll(*this, *from_, *to_, bytes, out);
     if (losses == Losses::none) {
         return;

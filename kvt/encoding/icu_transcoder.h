@@ -56,7 +56,8 @@ public:
     /// Converts all of `in` and replaces `out` by the result. The units of both are bytes to the converters. `in`
     /// must not view `out`. Between equal encodings the input is copied without being looked at.
     ///
-    /// Throws, with `out` holding the substituted text:
+    /// Throws InvalidEncodingException (910005, %0 = the name) when ICU cannot open one of the two, as for an id that
+    /// was never handed out. Throws, with `out` holding the substituted text:
     /// - UStringBadEncodingException (910002) when `in` is not valid text of the source encoding;
     /// - UStringTranscodingException (910003) when that was not so and a character has no form in the target.
     ///

@@ -3,6 +3,7 @@
 #include <support/outcome.h>
 
 #include <kvt/encoding/icu_transcoder.h>
+#include <kvt/encoding/stream_transcoder.h>
 #include <kvt/string/ustring.h>
 
 #include <gtest/gtest.h>
@@ -21,6 +22,8 @@ namespace {
 using kvt::ex::Encoding;
 using kvt::ex::ICUTranscoder;
 using kvt::ex::InvalidEncodingException;
+using kvt::ex::StreamTranscoder;
+using kvt::ex::UString;
 using kvt::ex::UStringBadEncodingException;
 using kvt::ex::UStringTranscodingException;
 using View = kvt::future::string_view;
@@ -95,6 +98,29 @@ TEST(IcuTranscoder, EncodingsWithoutAConverterAreUnknownToIt) {
     }
     EXPECT_THROW(ICUTranscoder(Encoding("no-such-charset", kvt::ex::nothrow), Encoding::Utf8),
                  InvalidEncodingException);
+}
+
+TEST(IcuTranscoder, AnIdThatWasNeverHandedOutCannotBeOpened) {
+    const Encoding nobody(static_cast<Encoding::Type>(30000));
+    EXPECT_EQ(nobody.getName(), "");
+    EXPECT_FALSE(ICUTranscoder(nobody, Encoding::Utf8).isValid());
+    EXPECT_FALSE(ICUTranscoder(Encoding::Utf8, nobody).isValid());
+    EXPECT_FALSE(ICUTranscoder::isSingleByteEncoding(nobody));
+    EXPECT_FALSE(nobody.isSingleByte());
+    EXPECT_FALSE(nobody.supports7BitASCII());
+    const Outcome invalid{"before", 910005, {""}, {}};
+    EXPECT_EQ(convert(nobody, Encoding::Utf8, "a"), invalid);
+    EXPECT_EQ(convert(Encoding::Utf8, nobody, "a"), invalid);
+    EXPECT_EQ(outcomeOf([&] { StreamTranscoder(nobody, Encoding::Utf8); }).number, 910005U);
+    EXPECT_EQ(outcomeOf([&] { UString<0>("\u00e9").getAsEncoding(nobody); }).number, 910005U);
+}
+
+TEST(IcuTranscoder, AnIdIsOpenedWhenItHasBecomeThatOfAName) {
+    const std::uint32_t last = Encoding("ibm-1124_P100-1996").id();
+    const Encoding next(static_cast<Encoding::Type>(last + 1));
+    ASSERT_FALSE(ICUTranscoder(next, Encoding::Utf8).isValid());
+    ASSERT_EQ(Encoding("ibm-1129_P100-1997"), next);
+    EXPECT_EQ(convert(next, Encoding::Utf8, "\xC3"), quiet("\u0102"));
 }
 
 TEST(IcuTranscoder, ASingleByteEncodingHasNoLongerCharacter) {

@@ -117,6 +117,15 @@ TEST_F(KvtConvertMark, AKeptMarkThatTheTargetCannotHoldIsALossWithAHint) {
               "a");
 }
 
+TEST_F(KvtConvertMark, ACharacterLikeTheMarkWithinTheTextIsALossWithoutTheHint) {
+    const ChildResult result = convert("UTF-8", "windows-1252",
+                                       "a\uFEFF"
+                                       "b");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_TRUE(contains(result.err, "U+FEFF ZERO WIDTH NO-BREAK SPACE (EF BB BF)")) << result.err;
+    EXPECT_FALSE(contains(result.err, "byte order mark")) << result.err;
+}
+
 TEST_F(KvtConvertMark, OffsetsCountTheMarkThatWasDropped) {
     const ChildResult result = convert("UTF-8", "US-ASCII",
                                        "\uFEFF"

@@ -1,0 +1,134 @@
+// Streams against ICU's callbacks on the whole text and against ICUTranscoder, from and to every converter that ICU
+// lists: the same text, the same losses with the same bytes, wherever the stream is cut.
+//
+// The converters are dealt out to shards, so that the cases run side by side.
+#include <reference/icu_reference.h>
+#include <reference/stream_reference.h>
+
+#include <kvt/encoding/encoding.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace kvt::test {
+namespace {
+
+using kvt::ex::Encoding;
+using kvt::ex::StreamTranscoder;
+
+class StreamDifferential : public testing::TestWithParam<std::size_t> {
+public:
+    static constexpr std::size_t shards = 8;
+
+    /// Calls `check` for each converter as source and as target, with another one that takes turns.
+    template <typename Check>
+    void forEachPair(Check check) {
+        const std::vector<std::string> all = availableConverters();
+        ASSERT_GT(all.size(), 100U);
+        const char* const others[] = {"UTF-8", "windows-1252", "UTF-16BE", "US-ASCII", "GB18030"};
+        for (std::size_t i = GetParam(); i < all.size() && !HasFailure(); i += shards) {
+            const std::string name = canonicalName(all[i]);
+            for (std::size_t k = 0; k < 2; ++k) {
+                const std::string other = others[(i / shards + k) % std::size(others)];
+                if (name != other) {
+                    check(name, other, i);
+                    check(other, name, i);
+                }
+            }
+        }
+    }
+};
+INSTANTIATE_TEST_SUITE_P(Shard, StreamDifferential,
+                         testing::Range(std::size_t{0}, StreamDifferential::shards));
+
+std::string damaged(std::string text, std::mt19937_64& random) {
+    for (auto changes = random() % 4; changes > 0 && !text.empty(); --changes) {
+        const std::size_t at = random() % text.size();
+        switch (random() % 3) {
+        case 0:
+            text[at] = static_cast<char>(random());
+            break;
+        case 1:
+            text.insert(at, 1, static_cast<char>(random()));
+            break;
+        default:
+            text.erase(at, 1);
+        }
+    }
+    return text;
+}
+
+std::string sampleText(const std::string& from, const std::string& to, std::mt19937_64& random) {
+    if (random() % 4 == 0) {
+        std::string noise(1 + random() % 8, '\0');
+        std::generate(noise.begin(), noise.end(), [&] { return static_cast<char>(random()); });
+        return noise;
+    }
+    const std::string text =
+        encodeWithIcu(from, ownText(random() % 3 == 0 ? from : to, 1 + random() % 12, random()));
+    const char16_t* const special = random() % 8 == 0 ? u"a\uFEFFb\uFFFDc\u3042\uFEFF\u00e9" : u"";
+    return damaged(encodeWithIcu(from, special) + text, random);
+}
+
+TEST_P(StreamDifferential, ShortTextsCutAnywhere) {
+    forEachPair([](const std::string& from, const std::string& to, std::size_t seed) {
+        std::mt19937_64 random(seed);
+        for (int round = 0; round < 40 && !HasFailure(); ++round) {
+            const std::string text = sampleText(from, to, random);
+            EXPECT_EQ(differenceInStream(from, to, text, {1, 2, 3, 5}), "");
+        }
+    });
+}
+
+// Slices of the text go through ICU as a whole, and blocks end where the caller likes: around a border of the one the
+// others are put at every place.
+TEST_P(StreamDifferential, EveryCutAroundTheBordersOfSlices) {
+    forEachPair([](const std::string& from, const std::string& to, std::size_t seed) {
+        std::mt19937_64 random(seed);
+        for (const std::size_t border : {512U, 4096U}) {
+            const std::string filling = encodeWithIcu(from, std::u16string(border, u'a'));
+            const std::string text = sampleText(from, to, random) + filling.substr(0, border - 8) +
+                                     sampleText(from, to, random) + sampleText(from, to, random);
+            std::vector<std::size_t> cuts;
+            for (std::size_t cut = border - 12; cut < std::min(border + 12, text.size()); ++cut) {
+                cuts.push_back(cut);
+            }
+            EXPECT_EQ(differenceInStream(from, to, text, cuts), "");
+        }
+    });
+}
+
+// Found by a fuzzer, each with a fault of its own.
+TEST(StreamDifferential, TextsThatWentWrong) {
+    struct Row {
+        const char* from;
+        const char* to;
+        std::string text;
+    };
+    const Row rows[] = {
+        // A reset behind a loss armed the byte order mark again.
+        {"UTF-8", "UTF-16BE,version=1", std::string(512, 'a') + "\xFFz"},
+        {"UTF-8", "UTF-16LE,version=1", std::string(512, 'a') + "\xFFz"},
+        {"UTF-16BE,version=1", "UTF-8", std::string("\0a\xDC\0\xFE\xFF\0z", 8)},
+        // ICU shows no bytes of these.
+        {"gsm-03.38-2009", "UTF-8", "a\x89z"},
+        {"BOCU-1", "UTF-8", "\x3F\x29\x88\xF4\xE4\x27"},
+        {"ISCII,version=0", "windows-1252", "a\xB3\xD8\xE0"},
+        {"UTF-8", "ISCII,version=0", "\u0CD5"},
+        // What was lost began where a block had ended.
+        {"SCSU", "US-ASCII", "\x0c\x1e\xb2\xb0"},
+        {"SCSU", "US-ASCII",
+         "\x1f\x29\x40\xbb\x0f\xdb\x32\xdc\xb5\xe7\x30\x3b\x30\xd9\xed\xdd\x1f\xd9\xaf\xdd\xc9"},
+    };
+    for (const Row& row : rows) {
+        EXPECT_EQ(differenceInStream(row.from, row.to, row.text, {1, 2, 3, 5, 512}), "");
+    }
+}
+
+} // namespace
+} // namespace kvt::test
