@@ -91,9 +91,9 @@ bool isSingleByte(UConverter* converter) {
     return (type == UCNV_SBCS || type == UCNV_LATIN_1) && ucnv_getMaxCharSize(converter) == 1;
 }
 
-/// Finds out whether an encoding has a state, by characters of which each follows each other: what comes out for one
-/// must be the same as for the character alone. They are of many scripts, since an encoding changes its state where it
-/// changes its set of characters, and U+FEFF is among them, which some read and write at the beginning only.
+/// Tries out how a converter treats characters that follow each other. They are of many scripts, since an encoding
+/// changes its state where it changes its set of characters, and U+FEFF is among them, which some read and write at the
+/// beginning only.
 class Trial {
 public:
     explicit Trial(Encoding encoding)
@@ -103,6 +103,7 @@ public:
         ucnv_setToUCallBack(converter_.get(), UCNV_TO_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
     }
 
+    /// Whether characters are in a text the same bytes as alone, both ways.
     bool isStateless() const {
         std::vector<Sample> samples;
         for (const std::u16string_view character : characters) {
@@ -112,18 +113,23 @@ public:
                 samples.push_back({character, *bytes});
             }
         }
+        const bool isTried = std::any_of(samples.begin(), samples.end(),
+                                         [](const Sample& sample) { return sample.text[0] >= 0x80; });
+        if (!isTried && ucnv_getMaxCharSize(converter_.get()) > 1) {
+            return false;
+        }
         std::u16string text;
         std::string bytes;
         const auto append = [&](const Sample& sample) {
             text += sample.text;
             bytes += sample.bytes;
         };
-        for (std::size_t first = 0; first < samples.size(); ++first) {
-            for (std::size_t second = 0; second <= first; ++second) {
-                append(samples[first]);
-                append(samples[second]);
-            }
-        }
+        // Each behind its neighbours of both sides, and behind itself.
+        std::for_each(samples.begin(), samples.end(), append);
+        std::for_each(samples.rbegin(), samples.rend(), [&](const Sample& sample) {
+            append(sample);
+            append(sample);
+        });
         return encoded(text) == bytes && decoded(bytes) == text;
     }
 
@@ -283,8 +289,9 @@ Form Converter::form() {
     return keepsAscii(converter_.get()) ? Form::asciiCompatible : Form::other;
 }
 
-bool Converter::isStateless() const {
-    return Trial(encoding_).isStateless();
+Converter::Nature Converter::nature() const {
+    const Trial trial(encoding_);
+    return {trial.isStateless(), trial.isBehind()};
 }
 
 Converter Converter::clone() const {
@@ -318,10 +325,6 @@ bool Converter::countsHeldBytes() const {
     default:
         return true;
     }
-}
-
-bool Converter::isBehind() const {
-    return Trial(encoding_).isBehind();
 }
 
 bool Converter::holdsUnits() const {

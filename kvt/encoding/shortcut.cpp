@@ -16,6 +16,7 @@
 #include <kvt/encoding/detail/shortcut.h>
 
 #include <kvt/encoding/detail/single_byte_table.h>
+#include <kvt/foundation/detail/utf.h>
 
 #include <array>
 #include <bit>
@@ -27,9 +28,9 @@ namespace {
 
 constexpr std::size_t chunkBytes = 8192;
 constexpr std::size_t blockLength = 16;     // characters; a multiple of what a vector register holds
-constexpr std::size_t longestCharacter = 4; // bytes, in every form
+constexpr std::size_t longestCharacter = 4; // bytes, in every form, as in UTF-8
+static_assert(longestCharacter == longestUtf8);
 constexpr std::size_t blockBytes = blockLength * longestCharacter;
-constexpr char32_t lastCodePoint = 0x10FFFF;
 
 constexpr bool swappedIfLittle = std::endian::native != std::endian::little;
 constexpr bool swappedIfBig = std::endian::native != std::endian::big;
@@ -40,10 +41,6 @@ struct Character {
     std::size_t length;
 };
 constexpr Character noCharacter{0, 0};
-
-constexpr bool isSurrogate(char32_t c) {
-    return (c & 0xFFFFF800) == 0xD800;
-}
 
 /// How units of type `Unit` lie in memory. Text comes as bytes of any alignment.
 template <typename U, bool Swapped>
@@ -145,58 +142,34 @@ struct Utf8 : Units<std::uint8_t, false> {
         }
         const auto available = static_cast<std::size_t>(end - p);
         if (lead < 0xE0) {
-            if (available < 2 || !isTrail(p[1])) {
+            if (available < 2 || !isContinuation(p[1])) {
                 return noCharacter;
             }
-            return {(lead & 0x1F) << 6 | bits(p[1]), 2};
+            return {(lead & 0x1F) << 6 | continuationBits(p[1]), 2};
         }
         if (lead < 0xF0) {
-            if (available < 3 || !isTrail(p[1]) || !isTrail(p[2])) {
+            if (available < 3 || !isContinuation(p[1]) || !isContinuation(p[2])) {
                 return noCharacter;
             }
-            const char32_t c = (lead & 0x0F) << 12 | bits(p[1]) << 6 | bits(p[2]);
+            const char32_t c = (lead & 0x0F) << 12 | continuationBits(p[1]) << 6 | continuationBits(p[2]);
             return c >= 0x800 && !isSurrogate(c) ? Character{c, 3} : noCharacter;
         }
-        if (lead > 0xF4 || available < 4 || !isTrail(p[1]) || !isTrail(p[2]) || !isTrail(p[3])) {
+        if (lead > 0xF4 || available < 4 || !isContinuation(p[1]) || !isContinuation(p[2]) ||
+            !isContinuation(p[3])) {
             return noCharacter;
         }
-        const char32_t c = (lead & 0x07) << 18 | bits(p[1]) << 12 | bits(p[2]) << 6 | bits(p[3]);
-        return c >= 0x10000 && c <= lastCodePoint ? Character{c, 4} : noCharacter;
+        const char32_t c = (lead & 0x07) << 18 | continuationBits(p[1]) << 12 | continuationBits(p[2]) << 6 |
+                           continuationBits(p[3]);
+        return c >= firstSupplementary && c <= lastCodePoint ? Character{c, 4} : noCharacter;
     }
 
-    static std::size_t write(char* p, char32_t c) {
-        if (c < 0x80) {
-            p[0] = static_cast<char>(c);
-            return 1;
-        }
-        if (c < 0x800) {
-            p[0] = static_cast<char>(0xC0 | c >> 6);
-            p[1] = trail(c);
-            return 2;
-        }
-        if (c < 0x10000) {
-            p[0] = static_cast<char>(0xE0 | c >> 12);
-            p[1] = trail(c >> 6);
-            p[2] = trail(c);
-            return 3;
-        }
-        p[0] = static_cast<char>(0xF0 | c >> 18);
-        p[1] = trail(c >> 12);
-        p[2] = trail(c >> 6);
-        p[3] = trail(c);
-        return 4;
-    }
+    static std::size_t write(char* p, char32_t c) { return encodeUtf8(c, p); }
 
     /// Whether a well-formed character of two bytes begins at `p`, where two bytes can be read.
     static bool hasTwoBytes(const char* p) {
         const auto lead = static_cast<unsigned char>(p[0]);
-        return lead >= 0xC2 && lead < 0xE0 && isTrail(p[1]);
+        return lead >= 0xC2 && lead < 0xE0 && isContinuation(p[1]);
     }
-
-private:
-    static bool isTrail(char byte) { return (static_cast<unsigned char>(byte) & 0xC0) == 0x80; }
-    static char32_t bits(char byte) { return static_cast<unsigned char>(byte) & 0x3F; }
-    static char trail(char32_t c) { return static_cast<char>(0x80 | (c & 0x3F)); }
 };
 
 template <bool Swapped>
@@ -215,23 +188,23 @@ struct Utf16 : Units<std::uint16_t, Swapped> {
         if (!isSurrogate(unit)) {
             return {unit, 2};
         }
-        if (unit >= 0xDC00 || available < 4) {
+        if (isLowSurrogate(unit) || available < 4) {
             return noCharacter;
         }
-        const char32_t low = Base::load(p + 2);
-        if ((low & 0xFC00) != 0xDC00) {
+        const Unit low = Base::load(p + 2);
+        if (!isLowSurrogate(low)) {
             return noCharacter;
         }
-        return {0x10000 + ((unit & 0x3FF) << 10 | (low & 0x3FF)), 4};
+        return {codePointOf(static_cast<char16_t>(unit), low), 4};
     }
 
     static std::size_t write(char* p, char32_t c) {
-        if (c < 0x10000) {
+        if (c < firstSupplementary) {
             Base::store(p, static_cast<Unit>(c));
             return 2;
         }
-        Base::store(p, static_cast<Unit>(0xD7C0 + (c >> 10)));
-        Base::store(p + 2, static_cast<Unit>(0xDC00 | (c & 0x3FF)));
+        Base::store(p, highSurrogate(c));
+        Base::store(p + 2, lowSurrogate(c));
         return 4;
     }
 };

@@ -2,6 +2,7 @@
 #include <kvt/encoding/detail/single_byte_table.h>
 
 #include <kvt/encoding/detail/icu.h>
+#include <kvt/foundation/detail/utf.h>
 
 #include <iterator>
 
@@ -30,8 +31,8 @@ public:
         isQuiet_ = true;
         const icu::Progress progress =
             converter_.toUnicode(position, &source + 1, target, std::end(units), false);
-        const bool isSurrogate = (units[0] & 0xF800) == 0xD800;
-        return endedWell(progress, converter_.heldBytes() != 0) && target - units == 1 && !isSurrogate
+        return endedWell(progress, converter_.heldBytes() != 0) && target - units == 1 &&
+                       !isSurrogate(units[0])
                    ? units[0]
                    : SingleByteTable::noUnit;
     }
@@ -72,14 +73,10 @@ SingleByteTable::Utf8 utf8Of(char16_t unit) {
     if (unit == SingleByteTable::noUnit) {
         return {{}, 0};
     }
-    const auto trail = [](unsigned bits) { return static_cast<char>(0x80 | (bits & 0x3F)); };
-    if (unit < 0x80) {
-        return {{static_cast<char>(unit)}, 1};
-    }
-    if (unit < 0x800) {
-        return {{static_cast<char>(0xC0 | unit >> 6), trail(unit)}, 2};
-    }
-    return {{static_cast<char>(0xE0 | unit >> 12), trail(unit >> 6), trail(unit)}, 3};
+    // No single unit of UTF-16 takes more bytes than there are here.
+    SingleByteTable::Utf8 character{};
+    character.length = static_cast<std::uint8_t>(encodeUtf8(unit, character.bytes.data()));
+    return character;
 }
 
 std::unique_ptr<const SingleByteTable::Tables> build(Encoding encoding) {

@@ -9,6 +9,7 @@
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
 #include <kvt/encoding/detail/single_byte_table.h>
+#include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
 
 #include <algorithm>
@@ -66,8 +67,9 @@ public:
     Impl(Encoding from, Encoding to)
         : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from),
           toTable_(to), hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
-          isStateless_(from_.isStateless() && to_.isStateless()), isBehind_(from_.isBehind()),
-          countsHeldBytes_(from_.countsHeldBytes() && !isBehind_), substitution_(to_.substitution()) {
+          fromNature_(from_.nature()), isStateless_(fromNature_.isStateless && to_.nature().isStateless),
+          countsHeldBytes_(from_.countsHeldBytes() && !fromNature_.isBehind),
+          substitution_(to_.substitution()) {
         from_.setListener(*this);
         to_.setListener(*this);
     }
@@ -123,7 +125,7 @@ private:
     std::uint64_t openBegin() const;
     void attribute(std::size_t behind, std::uint64_t end);
     std::uint64_t lateBytes(std::uint64_t justRead) const {
-        return isBehind_ && position_ - justRead > characterBegin_ ? justRead : 0;
+        return fromNature_.isBehind && position_ - justRead > characterBegin_ ? justRead : 0;
     }
     std::uint64_t recentBegin() const { return position_ - recent_.size(); }
     std::string bytesOfInput(std::uint64_t begin, std::uint64_t end) const;
@@ -135,8 +137,8 @@ private:
     detail::SingleByteTable fromTable_;
     detail::SingleByteTable toTable_;
     bool hasShortcut_;
+    Converter::Nature fromNature_;
     bool isStateless_;
-    bool isBehind_;
     bool countsHeldBytes_;
     std::string substitution_;
 
@@ -229,7 +231,8 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
         isReadAgain_ = false;
         progress = decode(source, byte.data() + byte.size(), flush);
         if (filled_ > attributed_) {
-            attribute(filled_, position_ - (isBehind_ ? lateBytes(byte.size()) : from_.heldBytes()));
+            attribute(filled_,
+                      position_ - (fromNature_.isBehind ? lateBytes(byte.size()) : from_.heldBytes()));
         } else if (countsHeldBytes_) {
             characterBegin_ = position_ - from_.heldBytes();
         }
@@ -381,9 +384,8 @@ void StreamTranscoder::Impl::onNotRepresentable(char32_t codePoint, int) noexcep
 void StreamTranscoder::Impl::recordNotRepresentable(char32_t codePoint) {
     std::array<char16_t, 2> wanted = {static_cast<char16_t>(codePoint), 0};
     std::size_t length = 1;
-    if (codePoint > 0xFFFF) {
-        wanted = {static_cast<char16_t>(0xD7C0 + (codePoint >> 10)),
-                  static_cast<char16_t>(0xDC00 + (codePoint & 0x3FF))};
+    if (codePoint >= detail::firstSupplementary) {
+        wanted = {detail::highSurrogate(codePoint), detail::lowSurrogate(codePoint)};
         length = 2;
     }
     const auto found = std::search(units_.begin(), units_.end(), wanted.begin(),

@@ -63,17 +63,20 @@ public:
     /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
     Form form();
 
-    /// Whether nothing but the beginning of a character is ever carried from one piece of text to the next, as some
-    /// hundred characters show that are tried anew in each call.
-    bool isStateless() const;
+    /// What cannot be asked of ICU, found out by some conversions.
+    struct Nature {
+        /// Whether nothing but the beginning of a character is ever carried from one piece of text to the next.
+        bool isStateless;
+        /// Whether a character comes out only when the next one is read, and its bytes are not counted as held.
+        bool isBehind;
+    };
+    Nature nature() const;
     /// A converter in the same state, with the same listener; not open when ICU cannot copy this one.
     Converter clone() const;
 
     /// Bytes held as the beginning of a character, none where the converter does not count them.
     std::size_t heldBytes() const;
     bool countsHeldBytes() const;
-    /// Whether a character comes out when the next one is read only, and its bytes are not counted as held.
-    bool isBehind() const;
     /// Whether UTF-16 is held of which the output has not been given yet.
     bool holdsUnits() const;
 
