@@ -10,6 +10,7 @@
 #include <iostream>
 #include <string>
 #include <string_view>
+#include <vector>
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);
 
@@ -35,6 +36,11 @@ public:
     template <typename T, std::size_t N>
     const T& pick(const T (&table)[N]) {
         return table[byte() % N];
+    }
+
+    template <typename T>
+    const T& pick(const std::vector<T>& table) {
+        return table[byte() % table.size()];
     }
 
 private:
@@ -84,5 +90,23 @@ inline constexpr const char* encodings[] = {
     "IMAP-mailbox-name",
     "ISO-2022-CN",
 };
+
+/// By canonical names those above, then all others that ICU lists; fewer than a byte can tell apart, of the releases of
+/// ICU so far.
+inline const std::vector<std::string>& allEncodings() {
+    static const std::vector<std::string> all = [] {
+        std::vector<std::string> names(std::begin(encodings), std::end(encodings));
+        for (const std::string& listed : kvt::test::availableConverters()) {
+            const std::string name = kvt::test::canonicalName(listed);
+            // A name that opens another converter than the one it is the name of is only a spelling.
+            const bool isOwn = kvt::test::canonicalName(name) == name;
+            if (isOwn && std::find(names.begin(), names.end(), name) == names.end()) {
+                names.push_back(name);
+            }
+        }
+        return names;
+    }();
+    return all;
+}
 
 } // namespace kvt::fuzz

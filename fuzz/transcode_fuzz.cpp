@@ -15,8 +15,8 @@ using kvt::test::Outcome;
 
 int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     Input input(data, size);
-    const std::string from = input.pick(encodings);
-    const std::string to = input.pick(encodings);
+    const std::string from = input.pick(allEncodings());
+    const std::string to = input.pick(allEncodings());
     const unsigned repeat = input.byte();
     std::string text;
     do {

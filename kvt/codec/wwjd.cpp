@@ -4,7 +4,7 @@
 // between tokens and in whether they know `<uXXXX>`.
 #include <kvt/codec/wwjd.h>
 
-#include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/encoding/detail/failure_text.h>
 #include <kvt/foundation/throwable.h>
 #include <kvt/platform/thread_end.h>
 #include <kvt/string/ustring.h>
@@ -166,7 +166,7 @@ UString<2> wwjdToUtf16(std::string_view text) {
         const std::string_view units(reinterpret_cast<const char*>(out.data()),
                                      out.size() * sizeof(char16_t));
         throw UStringBadEncodingException(UString<28>(UStringView<28>(scanner.rest())), Encoding::Wwjd,
-                                          lossyUtf8(units, Encoding::Utf16LE), "\xEF\xBF\xBD");
+                                          textForFailure(units, Encoding::Utf16LE), "\xEF\xBF\xBD");
     }
     return UString<2>(out.data(), out.size());
 }

@@ -1,7 +1,7 @@
 // Conversion of whole texts and of pieces, on the converters of the calling thread.
 #include <kvt/encoding/icu_transcoder.h>
 
-#include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/encoding/detail/failure_text.h>
 #include <kvt/encoding/detail/shortcut.h>
 #include <kvt/encoding/detail/transcoder_helper.h>
 #include <kvt/foundation/throwable.h>
@@ -65,7 +65,7 @@ Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderH
 
 namespace detail {
 
-UString<0> lossyUtf8(std::string_view bytes, Encoding encoding) {
+UString<0> textForFailure(std::string_view bytes, Encoding encoding) {
     // ASCII text is trusted to be UTF-8, here as in every conversion between the two.
     if (encoding == Encoding(Encoding::Utf8) || encoding == Encoding(Encoding::UsAscii)) {
         return UString<0>(UStringView<0>(bytes));
@@ -145,13 +145,13 @@ void ICUTranscoder::transcode(kvt::future::basic_string_view<CharIn> in, std::ba
         return;
     }
     const std::string_view converted = bytesOf(std::basic_string_view<CharOut>(out));
-    UString<0> lossy = detail::lossyUtf8(converted, to);
-    UString<0> substitution = detail::lossyUtf8(to_->substitutionChars(), to);
+    UString<0> lossy = detail::textForFailure(converted, to);
+    UString<0> substitution = detail::textForFailure(to_->substitutionChars(), to);
     if (losses == Losses::badInput) {
         throw UStringBadEncodingException(UString<28>(UStringView<28>(bytes)), from, std::move(lossy),
                                           std::move(substitution));
     }
-    throw UStringTranscodingException(detail::lossyUtf8(bytes, from), from, to, std::move(lossy),
+    throw UStringTranscodingException(detail::textForFailure(bytes, from), from, to, std::move(lossy),
                                       std::move(substitution));
 }
 

@@ -388,15 +388,24 @@ void StreamTranscoder::Impl::recordNotRepresentable(char32_t codePoint) {
         wanted = {detail::highSurrogate(codePoint), detail::lowSurrogate(codePoint)};
         length = 2;
     }
-    const auto found = std::search(units_.begin(), units_.end(), wanted.begin(),
-                                   wanted.begin() + static_cast<std::ptrdiff_t>(length),
-                                   [](const Unit& unit, char16_t want) { return unit.unit == want; });
+    auto found = std::search(units_.begin(), units_.end(), wanted.begin(),
+                             wanted.begin() + static_cast<std::ptrdiff_t>(length),
+                             [](const Unit& unit, char16_t want) { return unit.unit == want; });
     if (found == units_.end()) {
-        // Some map a character to another one before they find out that they lack it.
-        const std::uint64_t begin = units_.empty() ? openBegin() : units_.front().begin;
-        const std::uint64_t end = units_.empty() ? position_ : units_.back().end;
-        losses_.push_back({Loss::NotRepresentable, begin, bytesOfInput(begin, end), codePoint});
-        units_.clear();
+        // Some encodings map a character to another one before they find out that they lack it.
+        found =
+            std::find_if(units_.begin(), units_.end(), [](const Unit& unit) { return !unit.isSubstitution; });
+        length = 1;
+        codePoint = found != units_.end() ? found->unit : codePoint;
+        if (units_.end() - found > 1 && detail::isHighSurrogate(found->unit) &&
+            detail::isLowSurrogate(found[1].unit)) {
+            length = 2;
+            codePoint = detail::codePointOf(found->unit, found[1].unit);
+        }
+    }
+    if (found == units_.end()) {
+        losses_.push_back(
+            {Loss::NotRepresentable, openBegin(), bytesOfInput(openBegin(), position_), codePoint});
         return;
     }
     const auto last = found + static_cast<std::ptrdiff_t>(length) - 1;

@@ -1,7 +1,7 @@
 // The passes over the bytes, and the failures at their ends.
 #include <kvt/string/detail/ascii_check.h>
 
-#include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/encoding/detail/failure_text.h>
 #include <kvt/foundation/detail/ascii.h>
 #include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
@@ -79,7 +79,7 @@ void singleByteToAscii(Encoding from, std::string_view bytes, std::string& out) 
     }
     std::replace_if(
         first, out.end(), [](char byte) { return !isAscii(byte); }, substitute);
-    throw UStringTranscodingException(lossyUtf8(bytes, from), from, Encoding::UsAscii, utf8(out),
+    throw UStringTranscodingException(textForFailure(bytes, from), from, Encoding::UsAscii, utf8(out),
                                       substitution());
 }
 

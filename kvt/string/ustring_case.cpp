@@ -4,7 +4,7 @@
 // real units that count in size() and take part in comparisons.
 #include <kvt/string/detail/instantiate.h>
 
-#include <kvt/encoding/detail/lossy_text.h>
+#include <kvt/encoding/detail/failure_text.h>
 #include <kvt/foundation/detail/ascii.h>
 #include <kvt/foundation/throwable.h>
 
@@ -113,7 +113,7 @@ constexpr std::array utf16Contexts = {
 template <typename Action>
 auto guarded(const char* context, std::string_view bytes, Encoding encoding, Action action) {
     const auto addContext = [&](Throwable& failure) {
-        const UString<0> text = detail::lossyUtf8(bytes, encoding);
+        const UString<0> text = detail::textForFailure(bytes, encoding);
         std::string line(context);
         line.append(text.rawData(), text.size());
         failure.addMessageString(UString<0>(UStringView<0>(line)));

@@ -21,7 +21,7 @@ enum class Way {
     decode,        ///< from wwjd to UTF-16
     encode,        ///< from UTF-16 to wwjd
     binaryFailure, ///< bytes without a text meaning do not convert
-    kernel,        ///< one of the encodings is known at run time only
+    atRunTime,     ///< one of the encodings is known at run time only
 };
 
 // The types as rows and columns of the grid.
@@ -32,14 +32,14 @@ constexpr std::size_t gridIndex(std::uint32_t type) {
 // clang-format off
 constexpr Way grid[8][8] = {
     // to: 0              1                   2                   3                   27                  28          29                  30
-    {Way::copy,          Way::asciiCheck,    Way::icu,           Way::icu,           Way::icu,           Way::bytes, Way::viaUtf16,      Way::kernel},        // from 0
-    {Way::asciiSource,   Way::copy,          Way::icu,           Way::icu,           Way::asciiSource,   Way::bytes, Way::viaUtf16,      Way::kernel},        // from 1
-    {Way::icu,           Way::icu,           Way::copy,          Way::icu,           Way::icu,           Way::bytes, Way::encode,        Way::kernel},        // from 2
-    {Way::icu,           Way::icu,           Way::icu,           Way::copy,          Way::icu,           Way::bytes, Way::viaUtf16,      Way::kernel},        // from 3
-    {Way::icu,           Way::asciiCheck,    Way::icu,           Way::icu,           Way::copy,          Way::bytes, Way::viaUtf16,      Way::kernel},        // from 27
+    {Way::copy,          Way::asciiCheck,    Way::icu,           Way::icu,           Way::icu,           Way::bytes, Way::viaUtf16,      Way::atRunTime},     // from 0
+    {Way::asciiSource,   Way::copy,          Way::icu,           Way::icu,           Way::asciiSource,   Way::bytes, Way::viaUtf16,      Way::atRunTime},     // from 1
+    {Way::icu,           Way::icu,           Way::copy,          Way::icu,           Way::icu,           Way::bytes, Way::encode,        Way::atRunTime},     // from 2
+    {Way::icu,           Way::icu,           Way::icu,           Way::copy,          Way::icu,           Way::bytes, Way::viaUtf16,      Way::atRunTime},     // from 3
+    {Way::icu,           Way::asciiCheck,    Way::icu,           Way::icu,           Way::copy,          Way::bytes, Way::viaUtf16,      Way::atRunTime},     // from 27
     {Way::binaryFailure, Way::binaryFailure, Way::binaryFailure, Way::binaryFailure, Way::binaryFailure, Way::copy,  Way::binaryFailure, Way::binaryFailure}, // from 28
-    {Way::viaUtf16,      Way::viaUtf16,      Way::decode,        Way::viaUtf16,      Way::viaUtf16,      Way::bytes, Way::copy,          Way::kernel},        // from 29
-    {Way::kernel,        Way::kernel,        Way::kernel,        Way::kernel,        Way::kernel,        Way::bytes, Way::kernel,        Way::kernel},        // from 30
+    {Way::viaUtf16,      Way::viaUtf16,      Way::decode,        Way::viaUtf16,      Way::viaUtf16,      Way::bytes, Way::copy,          Way::atRunTime},     // from 29
+    {Way::atRunTime,     Way::atRunTime,     Way::atRunTime,     Way::atRunTime,     Way::atRunTime,     Way::bytes, Way::atRunTime,     Way::atRunTime},     // from 30
 };
 // clang-format on
 
@@ -66,7 +66,7 @@ void convertAlong(Way way, Encoding from, Encoding to, std::string_view bytes,
     case Way::viaUtf16:
     case Way::decode:
     case Way::encode:
-    case Way::kernel:
+    case Way::atRunTime:
         // The rules for run-time encodings hold the two steps of wwjd.
         detail::convertChars(from, to, bytes, out);
         break;
