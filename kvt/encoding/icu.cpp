@@ -19,7 +19,7 @@ bool isUnicodeForm(Encoding encoding) {
     return id == Encoding::Utf8 || (id >= Encoding::Utf16LE && id <= Encoding::Utf32BE);
 }
 
-// Reset, close and clone reach the callbacks too, and are no losses.
+// Reset, close and clone reach the callbacks too, and are not losses.
 bool isLoss(UConverterCallbackReason reason) {
     return reason == UCNV_UNASSIGNED || reason == UCNV_ILLEGAL || reason == UCNV_IRREGULAR;
 }

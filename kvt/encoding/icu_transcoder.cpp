@@ -31,7 +31,7 @@ Losses takeLosses(TranscoderHelper& from, TranscoderHelper& to) {
     return badInput ? Losses::badInput : notRepresentable ? Losses::notRepresentable : Losses::none;
 }
 
-// Converts all of `bytes`, what needs no ICU first, and tells of losses by its result. The text of the two
+// Converts all of `bytes`, what needs no ICU first, and returns what was lost. The text of the two
 // encodings differs.
 template <typename CharOut>
 Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,

@@ -253,7 +253,7 @@ struct Run {
     bool ended;
 };
 
-/// Moves one character; says whether there was one to take. `end` is that of the input or a nearer place behind the
+/// Moves one character; returns whether there was one to take. `end` is that of the input or a nearer place behind the
 /// character: where it is a fixed distance away, no comparisons with it are left in the code.
 template <typename From, typename To>
 bool moveCharacter(const From& from, const To& to, const char*& p, const char* end, char*& q) {

@@ -1,9 +1,12 @@
 // A stream conversion that knows where each loss stands.
 //
 // Text without losses goes fast: the short way where there is one, else through two ICU converters by way of UTF-16,
-// a slice of input at a time. ICU tells that a slice loses something, but not where, since its offsets do not reach
+// a slice of input at a time. ICU reports that a slice loses something, but not where, since its offsets do not reach
 // across calls. Such a slice is done again from its beginning, byte by byte: what comes out after a byte is the
 // character that ended with it. So each unit of UTF-16 is known with the bytes that it comes from.
+//
+// The caller's blocks must not show in the result. So nothing rests on where a slice ended, and a slice is taken back by
+// copies of the converters that were made before it, or by a reset where that comes to the same.
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <kvt/encoding/detail/icu.h>
@@ -155,7 +158,7 @@ private:
     std::size_t attributed_ = 0;   // units of the buffer whose bytes are known
     bool isReadAgain_ = false;     // Bad input was met in the byte under way.
     std::vector<Unit> units_;      // which the target's converter has not settled yet
-    std::vector<Loss> losses_;     // which have not been told yet
+    std::vector<Loss> losses_;     // which have not been reported yet
     std::exception_ptr exception_; // that a callback could not throw through ICU
 };
 
@@ -200,7 +203,7 @@ bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& ou
     return false;
 }
 
-// Converts byte by byte and tells of the losses. Where nothing hangs over, it ends when the character that was open at
+// Converts byte by byte and reports the losses. Where nothing hangs over, it ends when the character that was open at
 // the beginning is complete, or some way behind a loss.
 std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::string& out,
                                                    const LossHandler& onLoss) {

@@ -1,6 +1,6 @@
 // Conversion of a stream of any length, in bounded memory, with the place of every loss.
 //
-// ICUTranscoder converts a text that is held whole and tells of its losses at the end. A host that reads files wants
+// ICUTranscoder converts a text that is held whole and reports losses at the end. A host that reads files wants
 // to know where in the input each loss stands and what it was, and to decide for itself whether to go on:
 //
 //     StreamTranscoder stream(Encoding("Shift_JIS"), Encoding::Utf8);
@@ -22,14 +22,14 @@ namespace kvt::ex {
 /// One place where the converted text does not hold what the input said.
 struct Loss {
     enum Kind {
-        BadInput = 0,         ///< bytes that are no text in the source encoding
+        BadInput = 0,         ///< bytes that are not text in the source encoding
         NotRepresentable = 1, ///< a character without a form in the target encoding
     };
 
     Kind kind;
     /// Bytes from the start of the stream to the first byte of the loss.
     std::uint64_t offset;
-    /// The bytes of the input that were lost.
+    /// The bytes of the input that were lost. None where the stream ends and something that had to follow is missing.
     std::string bytes;
     /// The character that was lost; U+FFFD for bad input.
     char32_t codePoint;

@@ -39,7 +39,7 @@ bool TranscoderHelper::takeLoss() {
     return true;
 }
 
-// Input that is this converter's own substitution was lost earlier, and is no new loss.
+// Input that is this converter's own substitution was lost earlier, and is not a new loss.
 void TranscoderHelper::onBadInput(std::string_view bytes, const char16_t*, int error) noexcept {
     if (bytes != substitutionChars_) {
         lastError_ = error;

@@ -26,7 +26,7 @@ std::string_view errorName(int error);
 /// within ICU and must not throw.
 class LossListener {
 public:
-    /// Bytes that are no text; `target` is where the substitution is about to be written, `error` ICU's code.
+    /// Bytes that are not text; `target` is where the substitution is about to be written, `error` ICU's code.
     virtual void onBadInput(std::string_view bytes, const char16_t* target, int error) noexcept = 0;
     /// A character without a form in the converter's encoding.
     virtual void onNotRepresentable(char32_t codePoint, int error) noexcept = 0;
@@ -58,7 +58,7 @@ public:
 
     /// The bytes of the longest character.
     int maxCharSize() const;
-    /// The bytes that stand for a lost character; empty when ICU does not tell.
+    /// The bytes that stand for a lost character; empty when ICU does not know.
     std::string substitution() const;
     /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
     Form form();

@@ -29,7 +29,7 @@ public:
 
     /// The id of `key`.
     std::optional<std::uint32_t> find(std::string_view key) const;
-    /// Adds `key` unless it is there already, with whatever id; says whether it was added.
+    /// Adds `key` unless it is there already, with whatever id; returns whether it was added.
     bool insert(std::string_view key, std::uint32_t id);
 
     std::uint32_t size() const { return used_; }
