@@ -8,6 +8,7 @@
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/message_numbers.h>
 #include <kvt/datetime/utc_offset.h>
+#include <kvt/datetime/zone_folder.h>
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/icu_transcoder.h>
 #include <kvt/encoding/stream_transcoder.h>

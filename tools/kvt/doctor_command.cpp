@@ -9,6 +9,7 @@
 #include "text.h"
 
 #include <kvt/datetime/datetime.h>
+#include <kvt/datetime/zone_folder.h>
 #include <kvt/encoding/encoding.h>
 
 #include <cerrno>
@@ -175,6 +176,18 @@ Finding databaseVersion(const std::string& folder) {
     return finding;
 }
 
+// What the library finds where it looks the folder over, before it loads it.
+Finding databaseFiles(const std::string& folder) {
+    Finding finding{"its files", "good", "as the library reads them", ""};
+    if (const auto fault = datetime::zoneFolderFault(folder)) {
+        const std::string line = fault->line == 0 ? "" : ", line " + std::to_string(fault->line);
+        finding.value = fault->file.empty() ? "none" : printable(fault->file) + line;
+        finding.warning = fault->file.empty() ? "" : printable(folder + "/" + fault->file) + line + ": ";
+        finding.warning += printable(fault->reason) + ". The library takes nothing from such a folder.";
+    }
+    return finding;
+}
+
 Finding localTime() {
     const DateOutcome now = outcomeOf(datetime::now(datetime::ZoneMode::LocalWithOffset));
     if (now.isGood()) {
@@ -254,10 +267,15 @@ public:
             datetime::setInstallPathWrapper(folder);
         }
         const std::vector<Finding> findings = {
-            systemEncoding(),        zoneOfMachine(),
-            zoneVariable(),          databaseFolder(folder, isGiven),
-            databaseVersion(folder), localTime(),
-            temporarySpace(),        freeSpace(".", "for files in this folder"),
+            systemEncoding(),
+            zoneOfMachine(),
+            zoneVariable(),
+            databaseFolder(folder, isGiven),
+            databaseVersion(folder),
+            databaseFiles(folder),
+            localTime(),
+            temporarySpace(),
+            freeSpace(".", "for files in this folder"),
         };
         print(json_ ? asJson(findings) : asTable(findings));
         for (const Finding& finding : findings) {

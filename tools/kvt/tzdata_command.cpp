@@ -34,6 +34,8 @@ that, the library looks for a folder "tzdata" in the user's folder "Downloads".
 The leap seconds come from leapseconds or leap-seconds.list beside FILE, else
 beside the system's file. Where the package unicode-cldr-core is installed, its
 windowsZones.xml, which maps names of zones on Windows, goes into the folder too.
+The library refuses a folder in which it finds a fault. The file kvt-checksums,
+in the form of cksum(1), lets it find all damage to what this command has written.
 
 Exit status:
   0  done
@@ -107,7 +109,9 @@ private:
         const std::string zoneinfo = contentsOf(from_);
         const std::string leapText = leapSeconds ? contentsOf(*leapSeconds) : std::string();
         try {
-            return makeZoneDatabase(zoneinfo, leapText);
+            ZoneDatabase database = makeZoneDatabase(zoneinfo, leapText);
+            requireGood(database);
+            return database;
         } catch (const ZoneDatabaseError& error) {
             throw Failure(printable(from_) + ": " + printable(error.what()));
         }

@@ -1,5 +1,7 @@
 #include "zone_database.h"
 
+#include <kvt/datetime/zone_folder.h>
+
 #include <algorithm>
 #include <array>
 #include <charconv>
@@ -77,6 +79,11 @@ std::string joined(std::span<const std::string> fields) {
     return line;
 }
 
+struct Rule {
+    std::string lines;
+    std::vector<std::string> origins;
+};
+
 class Writer {
 public:
     ZoneDatabase run(std::string_view zoneinfo, std::string_view leapSeconds) {
@@ -92,12 +99,18 @@ public:
         placeRules();
         source_ = "leap seconds, ";
         forEachLine(leapSeconds, [this](const Words& words) { takeLeapSecond(words); });
+        database_.files["kvt-checksums"] = kvt::ex::datetime::zoneChecksums(database_.files);
         return std::move(database_);
     }
 
 private:
-    [[noreturn]] void fail(const std::string& why) const {
-        throw ZoneDatabaseError(source_ + "line " + std::to_string(line_) + ": " + why);
+    [[noreturn]] void fail(const std::string& why) const { throw ZoneDatabaseError(here() + ": " + why); }
+
+    std::string here() const { return source_ + "line " + std::to_string(line_); }
+
+    void addLine(const std::string& file, const std::string& line) {
+        database_.files[file] += line + "\n";
+        database_.origins[file].push_back(here());
     }
 
     // The first line says it in a comment.
@@ -173,7 +186,9 @@ private:
                                                     timeOfDay(words[7]),
                                                     amount(words[8]),
                                                     std::string(words[9])};
-        rules_[std::string(words[1])] += joined(fields) + "\n";
+        Rule& rule = rules_[std::string(words[1])];
+        rule.lines += joined(fields) + "\n";
+        rule.origins.push_back(here());
         ++database_.rules;
     }
 
@@ -212,7 +227,7 @@ private:
             }
         }
         fileOfRules_.try_emplace(fields[2], file_);
-        database_.files[file_] += joined(fields) + "\n";
+        addLine(file_, joined(fields));
         zoneContinues_ = count > 3;
     }
 
@@ -222,14 +237,17 @@ private:
             fail("a link has three fields");
         }
         const std::array<std::string, 3> fields = {"Link", std::string(words[1]), std::string(words[2])};
-        database_.files["backward"] += joined(fields) + "\n";
+        addLine("backward", joined(fields));
         ++database_.links;
     }
 
     void placeRules() {
-        for (const auto& [name, lines] : rules_) {
-            const auto file = fileOfRules_.find(name);
-            database_.files[file != fileOfRules_.end() ? file->second : "etcetera"].insert(0, lines);
+        for (const auto& [name, rule] : rules_) {
+            const auto found = fileOfRules_.find(name);
+            const std::string file = found != fileOfRules_.end() ? found->second : "etcetera";
+            database_.files[file].insert(0, rule.lines);
+            std::vector<std::string>& origins = database_.origins[file];
+            origins.insert(origins.begin(), rule.origins.begin(), rule.origins.end());
         }
     }
 
@@ -277,7 +295,7 @@ private:
     }
 
     void addLeapSecond(const std::string& line) {
-        database_.files["leapseconds"] += line + "\n";
+        addLine("leapseconds", line);
         ++database_.leapSeconds;
     }
 
@@ -368,7 +386,7 @@ private:
     }
 
     ZoneDatabase database_;
-    std::map<std::string, std::string> rules_;       ///< lines by name
+    std::map<std::string, Rule> rules_;              ///< by name
     std::map<std::string, std::string> fileOfRules_; ///< the file of the first zone that follows them
     std::string file_;                               ///< of the zone in hand
     bool zoneContinues_ = false;
@@ -381,6 +399,16 @@ private:
 
 ZoneDatabase makeZoneDatabase(std::string_view zoneinfo, std::string_view leapSeconds) {
     return Writer().run(zoneinfo, leapSeconds);
+}
+
+void requireGood(const ZoneDatabase& database) {
+    const auto fault = kvt::ex::datetime::zoneFilesFault(database.files);
+    if (!fault) {
+        return;
+    }
+    const bool isLine = fault->line != 0;
+    throw ZoneDatabaseError((isLine ? database.origins.at(fault->file).at(fault->line - 1) + ": " : "") +
+                            fault->reason);
 }
 
 } // namespace host

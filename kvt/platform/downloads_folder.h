@@ -1,0 +1,12 @@
+// Where the user's downloads go.
+#pragma once
+
+#include <string>
+
+namespace kvt::platform {
+
+/// The folder "Downloads" in the user's home folder, without a slash behind it. Throws std::runtime_error where there
+/// is no telling which that is.
+std::string downloadsFolder();
+
+} // namespace kvt::platform
