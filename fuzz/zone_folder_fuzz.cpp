@@ -81,8 +81,9 @@ private:
 };
 
 void askForOffsets(const date::time_zone& zone) {
-    for (const int year : {1000, 1800, 1893, 1917, 1945, 1980, 1996, 2011, 2024, 2500, 9999}) {
-        for (const unsigned month : {1U, 4U, 7U, 11U}) {
+    // Few, as each is found by going through all changes from the first on.
+    for (const int year : {1893, 1944, 2011, 2500}) {
+        for (const unsigned month : {1U, 7U}) {
             const date::sys_seconds moment = date::sys_days(date::year(year) / month / 1);
             const auto offset = zone.get_info(moment).offset;
             require(offset > -std::chrono::hours(28) && offset < std::chrono::hours(28), "an offset");
