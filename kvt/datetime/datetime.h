@@ -177,8 +177,8 @@ KVT_EXPORT TextResult timezoneSet(const UString<0>& value, const UString<0>& zon
 /// The value without its offset; its wall clock stays. A value that has none comes back as it was given.
 KVT_EXPORT TextResult timezoneRemove(const UString<0>& value);
 
-/// Names the folder of the zone database. To be called before anything that needs the zone of the machine, and not
-/// beside any other call: the database is loaded once, at its first use.
+/// Names the folder of the zone database. To be called before anything that needs the zone of the machine: the database
+/// is loaded once, at its first use. A folder in which zoneFolderFault() finds something (zone_folder.h) is not loaded.
 KVT_EXPORT void setInstallPathWrapper(const std::string& path);
 
 } // namespace kvt::ex::datetime

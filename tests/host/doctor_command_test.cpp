@@ -94,6 +94,30 @@ TEST_F(KvtDoctor, TheDatabaseIsLookedForAndItsVersionCompared) {
     }
 }
 
+TEST_F(KvtDoctor, ADamagedDatabaseIsNamedWithFileAndLine) {
+    ASSERT_EQ(kvt({"tzdata", "--output", "zones"}).status, 0);
+    const nlohmann::json good = finding("its files", {}, {"--zone-database", "zones"});
+    EXPECT_EQ(good["value"], "good");
+    EXPECT_TRUE(good["warning"].is_null()) << good;
+
+    const std::string europe = read("zones/europe");
+    const std::string line = std::to_string(std::count(europe.begin(), europe.end(), '\n') + 1);
+    write("zones/europe", europe + "Zone\tEurope/Berlin\tgarbage\n");
+    const nlohmann::json bad = finding("its files", {}, {"--zone-database", "zones"});
+    EXPECT_EQ(bad["value"], "europe, line " + line);
+    EXPECT_EQ(bad["warning"],
+              "zones/europe, line " + line +
+                  ": the zone \"Europe/Berlin\" is there already. The library takes nothing from "
+                  "such a folder.");
+    const ChildResult now = kvt({"date", "now", "--zone-database", "zones"});
+    EXPECT_TRUE(contains(now.err, "zones/europe, line " + line)) << now.err;
+    EXPECT_NE(now.status, 0);
+
+    write("zones/europe", europe.substr(0, europe.size() / 2) + "\n");
+    EXPECT_FALSE(finding("its files", {}, {"--zone-database", "zones"})["warning"].is_null());
+    EXPECT_EQ(finding("its files", {}, {"--zone-database", "none"})["value"], "none");
+}
+
 TEST_F(KvtDoctor, TheSpaceIsThatOfTheTemporaryFolderAndOfThisOne) {
     const nlohmann::json space = finding("space in " + folder_.string(), {{"TMPDIR", folder_.string()}});
     EXPECT_EQ(space["source"], "for temporary files, by TMPDIR");

@@ -95,6 +95,36 @@ TEST_F(KvtTzdata, WritesNothingWhenSomethingCannotBeRead) {
     EXPECT_FALSE(exists("zones"));
 }
 
+TEST_F(KvtTzdata, WritesNothingThatTheLibraryWouldRefuse) {
+    struct Row {
+        const char* text;
+        const char* fault;
+    };
+    for (const Row& row :
+         {Row{"", "there is no zone in any file"}, Row{"# version 2031x\n", "there is no zone in any file"},
+          Row{"Z Etc/UTC 0 - UTC 2020 Jan 99\n0 - UTC\n", "line 1: \"99\" is not a day of that month"},
+          Row{"L Etc/UTC UTC\nR E 1917 1318 - Ap 1 0 0 -\nZ Etc/UTC 0 E UTC\n",
+              "line 2: the rule ends before it begins"},
+          Row{"Z Etc/UTC 0 E UTC\n", "line 1: there is no rule \"E\""},
+          Row{"L Etc/UTC UTC\n\n\nL A B\nZ Etc/UTC 0 - UTC\n", "line 4: there is no zone \"A\""}}) {
+        const ChildResult refused = tzdata({"--from", write("bad.zi", row.text)});
+        EXPECT_EQ(refused.status, 2) << row.fault;
+        EXPECT_EQ(refused.err, "kvt: " + path("bad.zi") + ": " + row.fault + "\n");
+        EXPECT_FALSE(exists("zones"));
+    }
+    write("leapseconds", "Leap 1972 Jun 31 23:59:60 + S\n");
+    EXPECT_EQ(tzdata({"--from", write("mine.zi", rules)}).err,
+              "kvt: " + path("mine.zi") + ": leap seconds, line 1: \"31\" is not a day of that month\n");
+}
+
+TEST_F(KvtTzdata, WritesChecksumsThatAnybodyCanCheck) {
+    ASSERT_EQ(tzdata({}).status, 0);
+    ChildSetup made = setup({});
+    made.command = {"sh", "-c", "cksum $(cut -d ' ' -f 3 kvt-checksums)"};
+    made.folder = path("zones");
+    EXPECT_EQ(runChild(made).out, read("zones/kvt-checksums"));
+}
+
 TEST_F(KvtTzdata, SaysWhereItCannotWrite) {
     write("zones", "a file");
     const ChildResult result = tzdata({});
