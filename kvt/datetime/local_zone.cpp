@@ -24,7 +24,7 @@ namespace kvt::ex::datetime {
 
 namespace {
 
-// "/opt/tzdata/europe, line 12: there is no rule "EU"". The two faults of a folder that is no database at all have their
+// "/opt/tzdata/europe, line 12: there is no rule "EU"". The two faults of a folder that is not a database have their
 // own words, path included.
 std::string textOf(const std::string& folder, const ZoneFolderFault& fault) {
     if (fault.file.empty() || fault.file == "version") {

@@ -6,7 +6,7 @@
 // - A line that is none of its own, it prints. One that it cannot read it prints as well, and where that is a zone's, it
 //   loads the database from within its loading, which ends the process.
 // - The last line of a zone reigns for ever, so that a zone cut off behind a line gives that line's offset.
-// - A word that is no rule's name is read as a length of time, and a failure there leaves the zone half made; so does a
+// - A word that is not a rule's name is read as a length of time, and a failure there leaves the zone half made; so does a
 //   rule without standard time.
 // - Of rules with one name it makes pieces of which any two stand in the same years or in none together, and goes from
 //   change to change by them, year by year. The work grows with the square of the pieces.

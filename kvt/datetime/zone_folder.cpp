@@ -80,12 +80,10 @@ void checkVersion(const std::string& folder) {
     }
     std::string_view rest = text ? std::string_view(*text) : std::string_view();
     const std::string_view version = isNews ? releaseIn(rest) : takeWord(rest);
-    if (version.empty()) {
-        fail(versionFile, "Unable to get Timezone database version from " + folder + "/");
-    }
     const auto isPlain = [](char c) { return c >= '!' && c <= '~'; };
-    if (version.size() > longestVersion || !std::all_of(version.begin(), version.end(), isPlain)) {
-        fail(isNews ? newsFile : versionFile, "its version is not a word");
+    if (version.empty() || version.size() > longestVersion ||
+        !std::all_of(version.begin(), version.end(), isPlain)) {
+        fail(versionFile, "Unable to get Timezone database version from " + folder + "/");
     }
 }
 

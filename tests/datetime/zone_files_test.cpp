@@ -263,9 +263,9 @@ TEST_F(ZoneFolderOnDisk, NeedsAVersion) {
     const std::string missing = "version:0: Unable to get Timezone database version from " + folder_ + "/";
     EXPECT_EQ(fault(), missing);
     write("version", std::string(100, '1'));
-    EXPECT_EQ(fault(), "version:0: its version is not a word");
+    EXPECT_EQ(fault(), missing);
     write("version", "20\x01\n");
-    EXPECT_EQ(fault(), "version:0: its version is not a word");
+    EXPECT_EQ(fault(), missing);
     std::filesystem::remove(path("version"));
     EXPECT_EQ(fault(), missing);
     write("NEWS", "News for the zones\n\nRelease 2025b - 2025-03-22\n");

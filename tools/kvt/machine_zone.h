@@ -8,7 +8,7 @@
 namespace host {
 
 struct MachineZone {
-    std::string name;   ///< "Europe/Berlin"; empty where it cannot be told
+    std::string name;   ///< "Europe/Berlin"; empty where it is not known
     std::string source; ///< how it was found, or why not
 };
 

@@ -379,7 +379,7 @@ private:
         return text;
     }
 
-    // Without the letter that tells standard time from summer time, on which no offset depends.
+    // Without the letter that marks standard or summer time, on which no offset depends.
     static std::string amount(std::string_view word) {
         const char last = word.back();
         return std::string(last == 's' || last == 'd' ? word.substr(0, word.size() - 1) : word);
