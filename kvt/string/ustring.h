@@ -136,7 +136,8 @@ public:
     /// string's own encoding (an incomplete last unit is dropped), and converted otherwise. A UString<28> takes the
     /// bytes as they are; a UString<30> takes them and carries `from`.
     /// Throws what a conversion throws: UStringBadEncodingException (910002), UStringTranscodingException (910003),
-    /// UStringBinaryTranscodingException (910004) from `Binary`, InvalidEncodingException (910005) from `Unknown`.
+    /// UStringBinaryTranscodingException (910004) from `Binary`, InvalidEncodingException (910005) from `Unknown`,
+    /// std::invalid_argument from `Wwjd` with a token such as `<uzzzz>`.
     UString(const char* data, std::size_t byteLength, Encoding from = Encoding::Utf8);
 
     // The number of an encoding would pass for a length.
@@ -184,7 +185,9 @@ public:
 
     /// Replaces the text by that of `other`, converted into this string's encoding. On a UString<30> that is the
     /// encoding which the object holds, and it keeps it, where plain assignment would take over that of the source.
-    /// Fails as the constructor from bytes; the string then holds the substituted text.
+    /// Fails as the constructor from bytes. The string then holds the substituted text that the failure carries; it is
+    /// unchanged when no text came that far: from `Binary`, from wwjd text that cannot be decoded, to `Wwjd`, and
+    /// where an encoding is unknown.
     template <std::uint32_t M>
     UString& assign(const UString<M>& other);
 
