@@ -11,42 +11,41 @@ namespace kvt::ex::datetime {
 namespace {
 
 using detail::CanonicalRecord;
-using detail::Outcome;
 
 TextResult impossible(std::initializer_list<std::string_view> words) {
     return detail::failed<UString<0>>(message_number::castImpossible, words);
 }
 
-// A text of the record. An offset in it makes the state tell whether it was repaired.
-Outcome<TextResult> rendered(Outcome<UString<0>> text, bool repaired) {
-    if (!text) {
-        return text.failure();
-    }
-    return detail::makeDateTimeResult(repaired ? ReturnState::Repaired : ReturnState::Success,
-                                      std::move(*text));
+// The state says whether the offset was repaired, if the text has it.
+TextResult castTo(TemporalType kind, const CanonicalRecord& record) {
+    const bool keepsOffset = kind != TemporalType::Date;
+    return detail::makeDateTimeResult(
+        keepsOffset && record.offsetRepaired ? ReturnState::Repaired : ReturnState::Success,
+        detail::canonicalText(kind, detail::carriedFields(record),
+                              keepsOffset ? record.offsetText() : std::string_view()));
 }
 
-Outcome<TextResult> castDate(const CanonicalRecord& record, CastToTemporalType target) {
+TextResult castDate(const CanonicalRecord& record, CastToTemporalType target) {
     switch (target) {
     case CastToTemporalType::Date:
-        return rendered(detail::dateText(record), false);
+        return castTo(TemporalType::Date, record);
     case CastToTemporalType::Time:
-        return rendered(detail::timeText(record, false), false);
+        return castTo(TemporalType::Time, record);
     case CastToTemporalType::Datetime:
-        return rendered(detail::datetimeText(record, false), false);
+        return castTo(TemporalType::Datetime, record);
     case CastToTemporalType::Unknown:
         return impossible({"date", "unknown"});
     }
     return impossible({"date"});
 }
 
-// What a time cannot become is told with all the later targets behind it.
-Outcome<TextResult> castTime(const CanonicalRecord& record, CastToTemporalType target) {
+// What a time cannot become is named with all the later targets behind it.
+TextResult castTime(const CanonicalRecord& record, CastToTemporalType target) {
     switch (target) {
     case CastToTemporalType::Date:
         return impossible({"time", "date", "datetime", "unknown"});
     case CastToTemporalType::Time:
-        return rendered(detail::timeText(record, true), record.offsetRepaired);
+        return castTo(TemporalType::Time, record);
     case CastToTemporalType::Datetime:
         return impossible({"time", "datetime", "unknown"});
     case CastToTemporalType::Unknown:
@@ -55,14 +54,14 @@ Outcome<TextResult> castTime(const CanonicalRecord& record, CastToTemporalType t
     return impossible({"time"});
 }
 
-Outcome<TextResult> castDatetime(const CanonicalRecord& record, CastToTemporalType target) {
+TextResult castDatetime(const CanonicalRecord& record, CastToTemporalType target) {
     switch (target) {
     case CastToTemporalType::Date:
-        return rendered(detail::dateText(record), false);
+        return castTo(TemporalType::Date, record);
     case CastToTemporalType::Time:
-        return rendered(detail::timeText(record, true), record.offsetRepaired);
+        return castTo(TemporalType::Time, record);
     case CastToTemporalType::Datetime:
-        return rendered(detail::datetimeText(record, true), record.offsetRepaired);
+        return castTo(TemporalType::Datetime, record);
     case CastToTemporalType::Unknown:
         return impossible({"datetime", "unknown"});
     }
@@ -72,18 +71,13 @@ Outcome<TextResult> castDatetime(const CanonicalRecord& record, CastToTemporalTy
 } // namespace
 
 TextResult cast(const UString<0>& value, CastToTemporalType target) {
-    return detail::guarded<UString<0>>([&]() -> Outcome<TextResult> {
-        const auto record = detail::parseCanonical(detail::viewOf(value), false);
-        if (!record) {
-            return record.failure();
-        }
-        if (record->type == TemporalType::Unsupported) {
-            return detail::failed<UString<0>>(message_number::valueUnsupported, {detail::viewOf(value)});
-        }
-        if (record->type == TemporalType::Date) {
-            return castDate(*record, target);
-        }
-        return detail::isTimeKind(record->type) ? castTime(*record, target) : castDatetime(*record, target);
+    return detail::guarded<UString<0>>([&] {
+        return detail::readValue(detail::viewOf(value)).andThen([&](const CanonicalRecord& record) {
+            if (record.type == TemporalType::Date) {
+                return castDate(record, target);
+            }
+            return detail::isTimeKind(record.type) ? castTime(record, target) : castDatetime(record, target);
+        });
     });
 }
 

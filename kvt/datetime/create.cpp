@@ -5,7 +5,9 @@
 #include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/interval.h>
 #include <kvt/datetime/detail/parts_access.h>
+#include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
+#include <kvt/datetime/detail/text.h>
 
 #include <optional>
 
@@ -25,25 +27,26 @@ std::optional<DatePartRange> unwritablePart(const DateTimeParts& parts) {
     const std::int64_t year = PartsAccess::year(parts);
     const std::uint64_t month = PartsAccess::month(parts);
     const std::uint64_t day = PartsAccess::day(parts);
+    const auto hours = static_cast<std::uint64_t>(parts.hours());
+    const auto minutes = static_cast<std::uint64_t>(parts.minutes());
     if (year < detail::lowestYear || year > detail::highestYear) {
-        return DatePartRange{UString<0>::fromNumber(year), "year", "1000", "9999"};
+        return detail::yearOutOfRange(year);
     }
     if (month == 0 || month > highestTwoDigits) {
-        return DatePartRange{UString<0>::fromNumber(month), "month", "1", "12"};
+        return detail::monthOutOfRange(month);
     }
     if (day == 0 || day > highestTwoDigits) {
-        const unsigned last = detail::lastDayOfMonth(year, static_cast<unsigned>(month));
-        return DatePartRange{UString<0>::fromNumber(day), "day", "1", detail::lastDayText(last)};
+        return detail::dayOutOfRange(day, detail::lastDayOfMonth(year, static_cast<unsigned>(month)));
     }
-    if (static_cast<std::uint64_t>(parts.hours()) > highestTwoDigits) {
-        return DatePartRange{UString<0>::fromNumber(parts.hours()), "hours", "0", "23"};
+    if (hours > highestTwoDigits) {
+        return detail::hoursOutOfRange(parts.hours());
     }
-    if (static_cast<std::uint64_t>(parts.minutes()) > highestTwoDigits) {
-        return DatePartRange{UString<0>::fromNumber(parts.minutes()), "minutes", "0", "59"};
+    if (minutes > highestTwoDigits) {
+        return detail::minutesOutOfRange(parts.minutes());
     }
     if (static_cast<std::uint64_t>(parts.seconds()) > highestTwoDigits ||
         static_cast<std::uint64_t>(parts.nanoseconds()) > highestNanosecond) {
-        return DatePartRange{parts.secondsFractionalToString(), "seconds", "0", "59.999999999"};
+        return detail::secondsOutOfRange(detail::viewOf(parts.secondsFractionalToString()));
     }
     return std::nullopt;
 }
@@ -54,15 +57,14 @@ TextResult create(const DateTimeParts& parts) {
     return detail::guarded<UString<0>>(
         [&]() -> Outcome<TextResult> {
             if (std::optional<DatePartRange> unwritable = unwritablePart(parts)) {
-                return std::move(*unwritable);
+                return *unwritable;
             }
-            const auto instant = detail::instantFromParts(parts, false);
-            if (!instant) {
-                return instant.failure();
-            }
-            return detail::makeDateTimeResult(ReturnState::Success, detail::instantText(*instant, true));
+            return detail::instantFromParts(parts, false).andThen([](const detail::TemporalInstant& instant) {
+                return detail::makeDateTimeResult(ReturnState::Success,
+                                                  detail::canonicalText(TemporalType::Datetime, instant));
+            });
         },
-        detail::LastResort::Silence, detail::messageOf);
+        detail::LastResort::Silence);
 }
 
 TextResult intervalCreate(const IntervalParts& parts) {

@@ -3,9 +3,9 @@
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/detail/arithmetic.h>
 #include <kvt/datetime/detail/interval.h>
+#include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
-#include <kvt/datetime/message_numbers.h>
 
 namespace kvt::ex::datetime {
 
@@ -13,10 +13,13 @@ namespace {
 
 using detail::CanonicalRecord;
 using detail::Outcome;
+using detail::TimeCount;
 
+/// Two values that can be compared, in UTC where they have an offset.
 struct Pair {
-    CanonicalRecord first;
-    CanonicalRecord second;
+    TimeCount first;
+    TimeCount second;
+    bool haveDates;
 };
 
 bool areComparable(TemporalType first, TemporalType second) noexcept {
@@ -24,49 +27,27 @@ bool areComparable(TemporalType first, TemporalType second) noexcept {
            (first == TemporalType::Datetime && second == TemporalType::Date);
 }
 
-// Reads both values, the second one first, and hands a pair that can be compared to `use`.
-template <typename Value, typename Use>
-Outcome<detail::Result<Value>> withPair(const UString<0>& first, const UString<0>& second, Use use) {
-    auto secondRecord = detail::parseCanonical(detail::viewOf(second), false);
-    if (!secondRecord) {
-        return secondRecord.failure();
-    }
-    auto firstRecord = detail::parseCanonical(detail::viewOf(first), false);
-    if (!firstRecord) {
-        return firstRecord.failure();
-    }
-    if (firstRecord->type == TemporalType::Unsupported) {
-        return detail::failed<Value>(message_number::valueUnsupported, {detail::viewOf(first)});
-    }
-    if (secondRecord->type == TemporalType::Unsupported) {
-        return detail::failed<Value>(message_number::valueUnsupported, {detail::viewOf(second)});
-    }
-    if (!areComparable(firstRecord->type, secondRecord->type)) {
-        return detail::failed<Value>(message_number::kindsNotComparable,
-                                     {detail::viewOf(first), detail::viewOf(second)});
-    }
-    return use(*firstRecord, *secondRecord);
+// Reads both values, the second one first: its parts are checked before those of the first, but it is the first one
+// that is named if neither is a value.
+Outcome<Pair> readPair(const UString<0>& first, const UString<0>& second) {
+    return detail::parseCanonical(detail::viewOf(second), false).andThen([&](const CanonicalRecord& right) {
+        return detail::readValue(detail::viewOf(first))
+            .andThen([&](const CanonicalRecord& left) -> Outcome<Pair> {
+                if (right.type == TemporalType::Unsupported) {
+                    return detail::ValueUnsupported{detail::viewOf(second)};
+                }
+                if (!areComparable(left.type, right.type)) {
+                    return detail::KindsNotComparable{detail::viewOf(first), detail::viewOf(second)};
+                }
+                return Pair{detail::utcCount(detail::instantWithOffset(left)),
+                            detail::utcCount(detail::instantWithOffset(right)),
+                            !detail::isTimeKind(right.type)};
+            });
+    });
 }
 
-Outcome<double> diffSeconds(const CanonicalRecord& first, const CanonicalRecord& second) {
-    const auto firstInstant = detail::instantFromRecord(first, true);
-    if (!firstInstant) {
-        return firstInstant.failure();
-    }
-    const auto secondInstant = detail::instantFromRecord(second, true);
-    if (!secondInstant) {
-        return secondInstant.failure();
-    }
-    const detail::NanoCount difference = detail::utcCount(*firstInstant) - detail::utcCount(*secondInstant);
-    return detail::toDouble(difference) / 1e9;
-}
-
-Outcome<double> diffMonths(const CanonicalRecord& first, const CanonicalRecord& second) {
-    const auto difference = detail::diffParts(first, second);
-    if (!difference) {
-        return difference.failure();
-    }
-    return difference->months;
+double secondsBetween(const Pair& pair) {
+    return detail::nanosecondsAsDouble(pair.first - pair.second) / 1e9;
 }
 
 // The divisions are made one by one, so that all builds round alike.
@@ -85,58 +66,47 @@ double inUnit(double seconds, UnitType unit) noexcept {
     }
 }
 
-Outcome<double> difference(const CanonicalRecord& first, const CanonicalRecord& second, UnitType unit) {
+Outcome<double> numberBetween(const Pair& pair, UnitType unit) {
     if (unit > UnitType::Seconds) {
         return detail::Unexpected{};
     }
-    Outcome<double> number =
-        unit <= UnitType::Months ? diffMonths(first, second) : diffSeconds(first, second);
-    if (!number) {
-        return number;
+    if (unit > UnitType::Months) {
+        return inUnit(secondsBetween(pair), unit);
     }
-    if (unit <= UnitType::Months) {
-        return unit == UnitType::Years ? *number / 12.0 : *number;
-    }
-    return inUnit(*number, unit);
+    return detail::diffParts(pair.first, pair.second, pair.haveDates)
+        .andThen([&](const detail::Difference& difference) {
+            return unit == UnitType::Years ? difference.months / 12.0 : difference.months;
+        });
 }
 
 } // namespace
 
 TextResult diff(const UString<0>& first, const UString<0>& second) {
     return detail::guarded<UString<0>>([&] {
-        return withPair<UString<0>>(
-            first, second,
-            [](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<TextResult> {
-                const auto parts = detail::diffParts(left, right);
-                if (!parts) {
-                    return parts.failure();
-                }
-                return detail::makeDateTimeResult(ReturnState::Success, detail::intervalText(parts->parts));
+        return readPair(first, second)
+            .andThen(
+                [](const Pair& pair) { return detail::diffParts(pair.first, pair.second, pair.haveDates); })
+            .andThen([](const detail::Difference& difference) {
+                return detail::makeDateTimeResult(ReturnState::Success,
+                                                  detail::intervalText(difference.parts));
             });
     });
 }
 
 NumberResult diffAsNumber(const UString<0>& first, const UString<0>& second, UnitType unit) {
     return detail::guarded<double>([&] {
-        return withPair<double>(
-            first, second,
-            [&](const CanonicalRecord& left, const CanonicalRecord& right) -> Outcome<NumberResult> {
-                const Outcome<double> number = difference(left, right, unit);
-                if (!number) {
-                    return number.failure();
-                }
-                return detail::makeDateTimeResult(ReturnState::Success, *number);
-            });
+        return readPair(first, second)
+            .andThen([&](const Pair& pair) { return numberBetween(pair, unit); })
+            .andThen([](double number) { return detail::makeDateTimeResult(ReturnState::Success, number); });
     });
 }
 
 int compare(const UString<0>& first, const UString<0>& second) {
-    const NumberResult result = diffAsNumber(first, second, UnitType::Seconds);
-    if (std::get<0>(result) != ReturnState::Success) {
+    const Outcome<Pair> pair = readPair(first, second);
+    if (!pair) {
         return -3;
     }
-    const double seconds = std::get<1>(result);
-    return seconds < 0.0 ? -1 : seconds > 0.0 ? 1 : 0;
+    return pair->first < pair->second ? -1 : pair->first > pair->second ? 1 : 0;
 }
 
 } // namespace kvt::ex::datetime

@@ -109,20 +109,12 @@ Outcome<TextResult> formatByPattern(const UString<0>& value, const CanonicalReco
     if (auto complaint = complaintAbout(pattern, record.type)) {
         return makeDateTimeResult(ReturnState::Failure, UString<0>(), std::move(*complaint));
     }
-    const Outcome<TemporalInstant> instant = instantFromRecord(record, false);
-    if (!instant) {
-        return instant.failure();
-    }
-    std::optional<std::int32_t> offsetMinutes;
-    if (!record.offsetText.isEmpty()) {
-        if (const std::optional<OffsetForm> offset = readOffset(viewOf(record.offsetText))) {
-            offsetMinutes = offset->minutes;
-        }
-    }
+    const std::optional<std::int32_t> offsetMinutes =
+        hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt;
     const SystemBytes patternBytes(pattern);
     PatternText text;
     if (std::optional<Failure> failure =
-            renderFields(text, patternBytes.view(), instant->count, offsetMinutes)) {
+            renderFields(text, patternBytes.view(), nanosOf(record.count), offsetMinutes)) {
         return std::move(*failure);
     }
     return success(textOfSystemBytes(text.view()));

@@ -80,10 +80,10 @@ std::uint64_t& fieldOf(IntervalParts& parts, Rank rank) noexcept {
 
 } // namespace
 
-Outcome<std::optional<IntervalParts>> parseInterval(std::string_view text) {
-    const std::optional<IntervalParts> none;
+Outcome<IntervalParts> readInterval(std::string_view given) {
+    const IntervalUnreadable none = {given};
     IntervalParts parts;
-    text = trimmed(text);
+    std::string_view text = trimmed(given);
     if (text.size() < shortestInterval) {
         return none;
     }
@@ -135,7 +135,7 @@ Outcome<std::optional<IntervalParts>> parseInterval(std::string_view text) {
         nextRank = rank + 1;
         text.remove_prefix(1);
     }
-    return std::optional<IntervalParts>(parts);
+    return parts;
 }
 
 UString<0> intervalText(const IntervalParts& parts) {

@@ -6,7 +6,6 @@
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/detail/local_zone.h>
-#include <kvt/datetime/detail/nano_count.h>
 #include <kvt/datetime/detail/zone_files.h>
 #include <kvt/platform/downloads_folder.h>
 
@@ -100,8 +99,8 @@ namespace detail {
 std::int32_t localOffsetMinutes(const TemporalInstant& instant) {
     const date::tzdb& database = Database::instance().get();
     const date::time_zone& zone = *database.locate_zone(database.current_zone()->name());
-    // Zones change at whole seconds, and whole seconds are what 64 bits hold for all years.
-    const std::chrono::seconds seconds(floorDivide(utcCount(instant), nanosPerSecond).quotient);
+    // Zones change at whole seconds.
+    const std::chrono::seconds seconds(wholeSeconds(utcCount(instant)));
     const date::sys_seconds moment =
         instant.offsetMinutes ? date::sys_seconds(seconds) : zone.to_sys(date::local_seconds(seconds));
     return static_cast<std::int32_t>(zone.get_info(moment).offset.count() / secondsPerMinute);

@@ -75,11 +75,10 @@ UString<0> resultText(const PatternReading& reading, const Wanted& wanted) {
         writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
                   static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
                   false);
-        TextBuffer offset;
-        writeOffset(offset, reading.offsetMinutes);
         // Offsets of 100 hours and more can be read but not written; there is none then.
-        if (wanted.offset && readOffset(offset.view())) {
-            text.put(offset.view());
+        const std::optional<OffsetForm> offset = offsetOfMinutes(reading.offsetMinutes);
+        if (wanted.offset && offset) {
+            text.put(offset->view());
         }
     }
     return text.toString();

@@ -1,5 +1,6 @@
-#include <kvt/datetime/detail/offset.h>
+// One pass over the digits, the fraction and the offset of a text. The number of digits alone says what they are.
 #include <kvt/datetime/detail/record.h>
+
 #include <kvt/datetime/detail/text.h>
 
 #include <optional>
@@ -11,8 +12,15 @@ namespace {
 constexpr std::size_t dateDigits = 8;
 constexpr std::size_t timeDigits = 6;
 
-UString<0> stringOf(std::string_view text) {
-    return UString<0>(UStringView<0>(text));
+// Cuts the digits off that a text begins with.
+std::string_view takeDigits(std::string_view& text) noexcept {
+    std::size_t size = 0;
+    while (size < text.size() && isDigit(text[size])) {
+        ++size;
+    }
+    const std::string_view digits = text.substr(0, size);
+    text.remove_prefix(size);
+    return digits;
 }
 
 std::string_view withoutZerosAtEnd(std::string_view digits) noexcept {
@@ -22,19 +30,6 @@ std::string_view withoutZerosAtEnd(std::string_view digits) noexcept {
     return digits;
 }
 
-// Cuts `text` in front of the first character that `isCut` accepts, and returns the rest with it; empty if none.
-template <typename Predicate>
-std::string_view cutAt(std::string_view& text, Predicate isCut) noexcept {
-    std::size_t position = 0;
-    while (position < text.size() && !isCut(text[position])) {
-        ++position;
-    }
-    const std::string_view rest = text.substr(position);
-    text = text.substr(0, position);
-    return rest;
-}
-
-// The kind by the number of digits alone.
 TemporalType typeOf(std::size_t digits, bool hasPoint, bool hasOffset) noexcept {
     switch (digits) {
     case dateDigits:
@@ -48,25 +43,54 @@ TemporalType typeOf(std::size_t digits, bool hasPoint, bool hasOffset) noexcept 
     }
 }
 
-// The numbers of a record as they are written, unchecked.
-DateTimeFields numbersOf(const CanonicalRecord& record) noexcept {
-    DateTimeFields fields;
-    if (!record.dateText.isEmpty()) {
-        const std::string_view date = viewOf(record.dateText);
-        fields.year = static_cast<std::int64_t>(digitsValue(date.substr(0, 4)));
-        fields.month = digitsValue(date.substr(4, 2));
-        fields.day = digitsValue(date.substr(6, 2));
+// Splits the text up; false for a wrong shape. Anything but digits, one "." and an offset is one, so that it can be met
+// in the order in which it stands.
+bool split(std::string_view text, CanonicalRecord& record) noexcept {
+    text = trimmed(text);
+    const std::string_view digits = takeDigits(text);
+    const bool hasPoint = !text.empty() && text.front() == '.';
+    if (hasPoint) {
+        text.remove_prefix(1);
+        record.fractionText = withoutZerosAtEnd(takeDigits(text));
     }
-    if (!record.timeText.isEmpty()) {
-        const std::string_view time = viewOf(record.timeText);
-        fields.hours = static_cast<std::int64_t>(digitsValue(time.substr(0, 2)));
-        fields.minutes = static_cast<std::int64_t>(digitsValue(time.substr(2, 2)));
-        fields.seconds = static_cast<std::int64_t>(digitsValue(time.substr(4)));
+    const bool isOffset = !text.empty();
+    if (isOffset) {
+        const std::optional<OffsetForm> offset = readOffset(text);
+        if (!offset) {
+            return false;
+        }
+        record.offset = *offset;
+        record.offsetRepaired = offset->view() != text;
     }
-    if (!record.fractionText.isEmpty()) {
-        fields.nanoseconds = static_cast<std::int64_t>(fractionNanoseconds(viewOf(record.fractionText)));
+    record.type = typeOf(digits.size(), hasPoint, isOffset);
+    if (record.type == TemporalType::Unsupported) {
+        return false;
     }
-    return fields;
+    const std::size_t dateSize = digits.size() == timeDigits ? 0 : dateDigits;
+    record.dateText = digits.substr(0, dateSize);
+    record.timeText = digits.substr(dateSize);
+    return true;
+}
+
+std::uint64_t pairAt(std::string_view digits, std::size_t position) noexcept {
+    return static_cast<std::uint64_t>((digits[position] - '0') * 10 + (digits[position + 1] - '0'));
+}
+
+void readNumbers(CanonicalRecord& record) noexcept {
+    DateTimeFields& fields = record.fields;
+    if (const std::string_view date = record.dateText; !date.empty()) {
+        fields.year = static_cast<std::int64_t>(pairAt(date, 0) * 100 + pairAt(date, 2));
+        fields.month = pairAt(date, 4);
+        fields.day = pairAt(date, 6);
+    }
+    if (const std::string_view time = record.timeText; !time.empty()) {
+        fields.hours = static_cast<std::int64_t>(pairAt(time, 0));
+        fields.minutes = static_cast<std::int64_t>(pairAt(time, 2));
+        fields.seconds = static_cast<std::int64_t>(pairAt(time, 4));
+    }
+    if (!record.fractionText.empty()) {
+        fields.nanoseconds = static_cast<std::int64_t>(fractionNanoseconds(record.fractionText));
+    }
 }
 
 } // namespace
@@ -75,133 +99,66 @@ Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
     Outcome<CanonicalRecord> outcome{CanonicalRecord()};
     CanonicalRecord& record = *outcome;
     record.lenient = lenient;
-
-    std::string_view digits = trimmed(text);
-    const std::string_view rawOffset = cutAt(digits, [](char c) { return c == '+' || c == '-'; });
-    std::optional<OffsetForm> offset;
-    if (!rawOffset.empty()) {
-        offset = readOffset(rawOffset);
-        if (!offset) {
-            return outcome;
-        }
-        record.offsetRepaired = offset->view() != rawOffset;
-    }
-    std::string_view fraction = cutAt(digits, [](char c) { return c == '.'; });
-    const bool hasPoint = !fraction.empty();
-    if (hasPoint) {
-        fraction = withoutZerosAtEnd(fraction.substr(1));
-    }
-    if (!allDigits(digits) || !allDigits(fraction)) {
+    if (!split(text, record)) {
+        record.type = TemporalType::Unsupported;
         return outcome;
     }
-    record.fractionText = stringOf(fraction);
-    record.type = typeOf(digits.size(), hasPoint, offset.has_value());
-    if (record.type == TemporalType::Unsupported) {
-        return outcome;
-    }
-    if (digits.size() != timeDigits) {
-        record.dateText = stringOf(digits.substr(0, dateDigits));
-    }
-    if (digits.size() != dateDigits) {
-        record.timeText = stringOf(digits.substr(digits.size() - timeDigits));
-    }
-    if (offset) {
-        record.offsetText = stringOf(offset->view());
-    }
-    Outcome<NanoCount> checked = countFromFields(numbersOf(record), lenient);
-    if (!checked) {
-        outcome = std::move(checked.failure());
-    }
-    return outcome;
-}
-
-Outcome<DateTimeParts> partsFromRecord(const CanonicalRecord& record, bool withOffset) {
-    DateTimeParts parts;
-    if (record.type == TemporalType::Unsupported) {
-        return parts;
-    }
-    const DateTimeFields fields = numbersOf(record);
-    const Outcome<NanoCount> checked = countFromFields(fields, record.lenient);
-    if (!checked) {
-        return checked.failure();
-    }
-    parts.setYear(fields.year);
-    parts.setMonth(fields.month);
-    parts.setDay(fields.day);
-    parts.setHours(static_cast<std::uint64_t>(fields.hours));
-    parts.setMinutes(static_cast<std::uint64_t>(fields.minutes));
-    parts.setSeconds(static_cast<std::uint64_t>(fields.seconds));
-    parts.setNanoseconds(static_cast<std::uint64_t>(fields.nanoseconds));
-    parts.setType(record.type);
-    if (withOffset) {
-        parts.setOffset(record.offsetText);
-    }
-    return parts;
-}
-
-Outcome<TemporalInstant> instantFromRecord(const CanonicalRecord& record, bool withOffset) {
-    const Outcome<NanoCount> count = countFromFields(numbersOf(record), record.lenient);
+    readNumbers(record);
+    const Outcome<TimeCount> count = countFromFields(record.fields, lenient);
     if (!count) {
         return count.failure();
     }
-    TemporalInstant instant{*count, std::nullopt};
-    if (withOffset) {
-        if (const std::optional<OffsetForm> offset = readOffset(viewOf(record.offsetText))) {
-            instant.offsetMinutes = offset->minutes;
-        }
+    record.count = *count;
+    return outcome;
+}
+
+Outcome<CanonicalRecord> readValue(std::string_view text) {
+    Outcome<CanonicalRecord> record = parseCanonical(text, false);
+    if (record && record->type == TemporalType::Unsupported) {
+        return ValueUnsupported{text};
     }
-    return instant;
+    return record;
+}
+
+TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept {
+    return {record.count, hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt};
+}
+
+DateTimeFields carriedFields(const CanonicalRecord& record) noexcept {
+    const bool mayRunOver = record.lenient || record.fields.nanoseconds >= nanosPerSecond;
+    return mayRunOver ? fieldsFromCount(record.count) : record.fields;
 }
 
 // ---- Writing
 
-namespace {
-
-// What a text is made of; a record has the parts of its kind only.
-struct Wanted {
-    bool date;
-    bool time;
-    bool offset;
-};
-
-// The numbers go through a count, so that what `lenient` or a rounded fraction let run over is carried.
-Outcome<UString<0>> textOf(const CanonicalRecord& record, Wanted wanted) {
-    const Outcome<NanoCount> count = countFromFields(numbersOf(record), record.lenient);
-    if (!count) {
-        return count.failure();
-    }
-    const DateTimeFields fields = fieldsFromCount(*count);
+UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset) {
     TextBuffer text;
-    if (wanted.date && !isTimeKind(record.type)) {
-        writeDate(text, fields.year, fields.month, fields.day, false);
+    if (kind == TemporalType::Unsupported) {
+        return text.toString();
     }
-    if (wanted.time) {
-        writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
-                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
-                  false);
+    if (!isTimeKind(kind)) {
+        text.putSigned(fields.year, 4);
+        text.putPair(static_cast<unsigned>(fields.month));
+        text.putPair(static_cast<unsigned>(fields.day));
     }
-    if (wanted.offset) {
-        text.put(viewOf(record.offsetText));
+    if (kind != TemporalType::Date) {
+        text.putPair(static_cast<unsigned>(fields.hours));
+        text.putPair(static_cast<unsigned>(fields.minutes));
+        text.putPair(static_cast<unsigned>(fields.seconds));
+        text.putFraction(static_cast<std::uint64_t>(fields.nanoseconds));
     }
+    text.put(offset);
     return text.toString();
 }
 
-} // namespace
-
-Outcome<UString<0>> dateText(const CanonicalRecord& record) {
-    return textOf(record, {true, false, false});
+UString<0> canonicalText(const CanonicalRecord& record) {
+    return canonicalText(record.type, carriedFields(record), record.offsetText());
 }
 
-Outcome<UString<0>> timeText(const CanonicalRecord& record, bool withOffset) {
-    return textOf(record, {false, true, withOffset});
-}
-
-Outcome<UString<0>> datetimeText(const CanonicalRecord& record, bool withOffset) {
-    return textOf(record, {true, true, withOffset});
-}
-
-Outcome<UString<0>> canonicalText(const CanonicalRecord& record) {
-    return textOf(record, {true, record.type != TemporalType::Date, true});
+UString<0> canonicalText(TemporalType kind, const TemporalInstant& instant) {
+    const std::optional<OffsetForm> offset =
+        instant.offsetMinutes ? offsetOfMinutes(*instant.offsetMinutes) : std::nullopt;
+    return canonicalText(kind, fieldsFromCount(instant.count), offset ? offset->view() : std::string_view());
 }
 
 std::string_view kindWord(TemporalType type) noexcept {

@@ -19,9 +19,18 @@ LogMessageInfo genericMessage() {
 }
 
 std::optional<LogMessageInfo> messageOf(const Failure& failure) {
+    if (const auto* unsupported = std::get_if<ValueUnsupported>(&failure)) {
+        return message(message_number::valueUnsupported, {unsupported->value});
+    }
+    if (const auto* unreadable = std::get_if<IntervalUnreadable>(&failure)) {
+        return message(message_number::intervalUnreadable, {unreadable->interval});
+    }
+    if (const auto* kinds = std::get_if<KindsNotComparable>(&failure)) {
+        return message(message_number::kindsNotComparable, {kinds->first, kinds->second});
+    }
     if (const auto* range = std::get_if<DatePartRange>(&failure)) {
         return message(message_number::partOutOfRange,
-                       {viewOf(range->value), range->part, range->lowest, range->highest});
+                       {range->value.view(), range->part, range->lowest, range->highest});
     }
     if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
         return message(message_number::formatMismatch, {mismatch->matched, mismatch->rest});

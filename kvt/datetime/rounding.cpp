@@ -5,21 +5,20 @@
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
-#include <kvt/datetime/message_numbers.h>
 
 namespace kvt::ex::datetime {
 
 namespace {
 
+using detail::CanonicalRecord;
 using detail::Outcome;
 
 constexpr std::int16_t toMinutes = -1;
 constexpr std::int16_t toNanoseconds = 9;
-constexpr std::uint64_t halfSecond = 500'000'000;
-constexpr std::uint64_t highestNanosecond = 999'999'999;
+constexpr std::int64_t halfSecond = 500'000'000;
 
-std::uint64_t roundedNanoseconds(std::uint64_t nanoseconds, std::int16_t decimals) noexcept {
-    std::uint64_t scale = 1;
+std::int64_t roundedNanoseconds(std::int64_t nanoseconds, std::int16_t decimals) noexcept {
+    std::int64_t scale = 1;
     for (std::int16_t i = decimals; i < toNanoseconds; ++i) {
         scale *= 10;
     }
@@ -27,29 +26,35 @@ std::uint64_t roundedNanoseconds(std::uint64_t nanoseconds, std::int16_t decimal
 }
 
 // Whether a field has run over its bound or may have.
-bool roundFields(DateTimeParts& parts, std::int16_t precision) noexcept {
+bool roundFields(detail::DateTimeFields& fields, std::int16_t precision) noexcept {
     if (precision == toMinutes) {
-        if (parts.seconds() < 30) {
-            return false;
-        }
-        parts.setMinutes(static_cast<std::uint64_t>(parts.minutes()) + 1);
-        return true;
+        const bool up = fields.seconds >= 30;
+        fields.minutes += up ? 1 : 0;
+        return up;
     }
-    const auto nanoseconds = static_cast<std::uint64_t>(parts.nanoseconds());
+    const std::int64_t nanoseconds = fields.nanoseconds;
     if (precision == toNanoseconds || nanoseconds == 0) {
         return false;
     }
     if (precision == 0) {
-        parts.setNanoseconds(0);
-        if (nanoseconds < halfSecond) {
-            return false;
-        }
-        parts.setSeconds(static_cast<std::uint64_t>(parts.seconds()) + 1);
-        return true;
+        const bool up = nanoseconds >= halfSecond;
+        fields.nanoseconds = 0;
+        fields.seconds += up ? 1 : 0;
+        return up;
     }
-    const std::uint64_t rounded = roundedNanoseconds(nanoseconds, precision);
-    parts.setNanoseconds(rounded);
-    return rounded > highestNanosecond;
+    fields.nanoseconds = roundedNanoseconds(nanoseconds, precision);
+    return fields.nanoseconds >= detail::nanosPerSecond;
+}
+
+// The parts of a value, rounded. Where a field has run over, the parts are those of a moment: of a datetime.
+Outcome<DateTimeParts> roundedParts(const CanonicalRecord& record, std::int16_t precision) {
+    detail::DateTimeFields fields = record.fields;
+    if (!roundFields(fields, precision)) {
+        return detail::partsOf(record.type, fields, record.offsetText());
+    }
+    return detail::countFromFields(fields, true).andThen([&](const detail::TimeCount& count) {
+        return detail::partsFromInstant({count, detail::instantWithOffset(record).offsetMinutes});
+    });
 }
 
 } // namespace
@@ -59,25 +64,11 @@ PartsResult parseZQTDateTime(const UString<0>& value, std::int16_t precision) {
         if (precision < toMinutes || precision > toNanoseconds) {
             return detail::Unexpected{};
         }
-        const auto record = detail::parseCanonical(detail::viewOf(value), false);
-        if (!record) {
-            return record.failure();
-        }
-        if (record->type == TemporalType::Unsupported) {
-            return detail::failed<DateTimeParts>(message_number::valueUnsupported, {detail::viewOf(value)});
-        }
-        Outcome<DateTimeParts> parts = detail::partsFromRecord(*record, true);
-        if (!parts) {
-            return parts.failure();
-        }
-        if (roundFields(*parts, precision)) {
-            const auto instant = detail::instantFromParts(*parts, true);
-            if (!instant) {
-                return instant.failure();
-            }
-            *parts = detail::partsFromInstant(*instant);
-        }
-        return detail::makeDateTimeResult(ReturnState::Success, std::move(*parts));
+        return detail::readValue(detail::viewOf(value))
+            .andThen([&](const CanonicalRecord& record) { return roundedParts(record, precision); })
+            .andThen([](DateTimeParts& parts) {
+                return detail::makeDateTimeResult(ReturnState::Success, std::move(parts));
+            });
     });
 }
 

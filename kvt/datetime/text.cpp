@@ -100,6 +100,10 @@ SplitSeconds splitSeconds(double seconds) noexcept {
 
 // ---- Writing
 
+ShortText::ShortText(std::string_view text) noexcept : size_(static_cast<std::uint8_t>(text.size())) {
+    std::copy(text.begin(), text.end(), data_.begin());
+}
+
 char* writeFixed(char* first, char* last, double value) noexcept {
     char* end = std::to_chars(first, last, value, std::chars_format::fixed, 9).ptr;
     while (end != first && end[-1] == '0') {

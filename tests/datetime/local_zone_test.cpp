@@ -26,10 +26,14 @@ public:
     void SetUp() override { kvt::test::setMachineZone("Europe/Berlin"); }
 };
 
-NanoCount at(std::int64_t year, unsigned month, unsigned day, std::int64_t hour = 0,
+TimeCount at(std::int64_t year, unsigned month, unsigned day, std::int64_t hour = 0,
              std::int64_t minute = 0) {
-    return NanoCount(daysFromCivil(year, month, day)) * nanosPerDay +
-           NanoCount(hour * 60 + minute) * nanosPerMinute;
+    return timeCount(daysFromCivil(year, month, day), (hour * 60 + minute) * nanosPerMinute);
+}
+
+// The nanosecond before.
+TimeCount before(const TimeCount& count) {
+    return timeCount(count.days, count.nanoseconds - 1);
 }
 
 TEST_F(LocalOffset, OfAnInstantWithOffsetIsThatOfTheMoment) {
@@ -39,23 +43,23 @@ TEST_F(LocalOffset, OfAnInstantWithOffsetIsThatOfTheMoment) {
     EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 1), 0}), 120);
     EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 2), 60}), 120);
     EXPECT_EQ(localOffsetMinutes({at(2020, 3, 28, 13, 30), -690}), 120);
-    EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 1) - 1, 0}), 60);
-    EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 2) - 1, 60}), 60);
-    EXPECT_EQ(localOffsetMinutes({at(2020, 3, 28, 13, 30) - 1, -690}), 60);
+    EXPECT_EQ(localOffsetMinutes({before(at(2020, 3, 29, 1)), 0}), 60);
+    EXPECT_EQ(localOffsetMinutes({before(at(2020, 3, 29, 2)), 60}), 60);
+    EXPECT_EQ(localOffsetMinutes({before(at(2020, 3, 28, 13, 30)), -690}), 60);
 }
 
 TEST_F(LocalOffset, OfAnInstantWithoutIsThatOfTheWallClock) {
-    EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 2) - 1, {}}), 60);
+    EXPECT_EQ(localOffsetMinutes({before(at(2020, 3, 29, 2)), {}}), 60);
     EXPECT_EQ(localOffsetMinutes({at(2020, 3, 29, 3), {}}), 120);
-    EXPECT_EQ(localOffsetMinutes({at(2020, 10, 25, 2) - 1, {}}), 120);
+    EXPECT_EQ(localOffsetMinutes({before(at(2020, 10, 25, 2)), {}}), 120);
     EXPECT_EQ(localOffsetMinutes({at(2020, 10, 25, 3), {}}), 60);
 }
 
 TEST_F(LocalOffset, IsNotGuessedInGapAndOverlap) {
     EXPECT_THROW(localOffsetMinutes({at(2020, 3, 29, 2), {}}), date::nonexistent_local_time);
-    EXPECT_THROW(localOffsetMinutes({at(2020, 3, 29, 3) - 1, {}}), date::nonexistent_local_time);
+    EXPECT_THROW(localOffsetMinutes({before(at(2020, 3, 29, 3)), {}}), date::nonexistent_local_time);
     EXPECT_THROW(localOffsetMinutes({at(2020, 10, 25, 2), {}}), date::ambiguous_local_time);
-    EXPECT_THROW(localOffsetMinutes({at(2020, 10, 25, 3) - 1, {}}), date::ambiguous_local_time);
+    EXPECT_THROW(localOffsetMinutes({before(at(2020, 10, 25, 3)), {}}), date::ambiguous_local_time);
 }
 
 TEST_F(LocalOffset, IsCutTowardsZero) {

@@ -98,10 +98,12 @@ TEST(LackOfMemory, ForTheResultAloneGetsTheFunctionsLastResort) {
     EXPECT_EQ(answerOf(*result), kvt::test::genericFailure());
 }
 
-TEST(LackOfMemory, ComparesNothing) {
+TEST(LackOfMemory, DoesNotHinderAComparison) {
     const UString<0> longFraction("20200102120000.12345678901234567890");
+    const UString<0> later("20200102120000.12345678991234567890");
     const FailingAllocations failing(0);
-    EXPECT_EQ(compare(longFraction, longFraction), -3);
+    EXPECT_EQ(compare(longFraction, longFraction), 0);
+    EXPECT_EQ(compare(longFraction, later), -1);
 }
 
 // A value within the small buffer of a string is worked on without any.

@@ -1,27 +1,36 @@
-// How a failure travels inside: as a value. A step that can fail returns an Outcome, which holds what was asked for
-// or a Failure, and each caller passes the failure on until a public function words it (result.h). No exception is
-// thrown on the way of a value; what does get thrown comes from outside: lack of memory, conversions, the zone
+// What can be wrong with a value, a pattern or an interval, as it travels inside: in an Outcome (outcome.h), until a
+// public function words it (result.h). What does get thrown comes from outside: lack of memory, conversions, the zone
 // database.
-//
-//     Outcome<TemporalInstant> instant = instantFromParts(parts, false);
-//     if (!instant) {
-//         return instant.failure();
-//     }
 #pragma once
 
-#include <kvt/string/ustring.h>
+#include <kvt/datetime/detail/outcome.h>
+#include <kvt/datetime/detail/text.h>
 
 #include <string>
 #include <string_view>
-#include <type_traits>
-#include <utility>
 #include <variant>
 
 namespace kvt::ex::datetime::detail {
 
+/// A text that is no value: 933063. It stays the caller's.
+struct ValueUnsupported {
+    std::string_view value;
+};
+
+/// A text that is no interval: 933064. It stays the caller's.
+struct IntervalUnreadable {
+    std::string_view interval;
+};
+
+/// Two values of kinds that are not compared: 933059. They stay the caller's.
+struct KindsNotComparable {
+    std::string_view first;
+    std::string_view second;
+};
+
 /// A part of a value is out of its range: 933065. All but the value itself are texts that live for ever.
 struct DatePartRange {
-    UString<0> value;
+    ShortText value;
     std::string_view part;
     std::string_view lowest;
     std::string_view highest;
@@ -74,34 +83,11 @@ enum class FormatFlag {
 /// What nobody has words for; the public function answers with its last resort.
 struct Unexpected {};
 
-using Failure = std::variant<Unexpected, DatePartRange, ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange,
+using Failure = std::variant<Unexpected, ValueUnsupported, IntervalUnreadable, KindsNotComparable,
+                             DatePartRange, ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange,
                              ParseValidation, FormatStringBadCombo, FormatFlag>;
 
-/// A value, or why there is none. Made from either; the two are never the same type.
-template <typename Value>
-class [[nodiscard]] Outcome {
-public:
-    Outcome(Value value) : state_(std::in_place_index<0>, std::move(value)) {}
-    template <typename Cause, std::enable_if_t<std::is_constructible_v<Failure, Cause&&> &&
-                                                   !std::is_convertible_v<Cause&&, Value> &&
-                                                   !std::is_same_v<std::remove_cvref_t<Cause>, Outcome>,
-                                               int> = 0>
-    Outcome(Cause&& cause) : state_(std::in_place_index<1>, std::forward<Cause>(cause)) {}
-
-    explicit operator bool() const noexcept { return state_.index() == 0; }
-
-    /// Only with a value.
-    Value& operator*() noexcept { return *std::get_if<0>(&state_); }
-    const Value& operator*() const noexcept { return *std::get_if<0>(&state_); }
-    Value* operator->() noexcept { return std::get_if<0>(&state_); }
-    const Value* operator->() const noexcept { return std::get_if<0>(&state_); }
-
-    /// Only without one.
-    Failure& failure() noexcept { return *std::get_if<1>(&state_); }
-    const Failure& failure() const noexcept { return *std::get_if<1>(&state_); }
-
-private:
-    std::variant<Value, Failure> state_;
-};
+template <typename Value, typename Cause = Failure>
+class Outcome;
 
 } // namespace kvt::ex::datetime::detail

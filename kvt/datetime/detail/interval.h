@@ -4,14 +4,13 @@
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/detail/failure.h>
 
-#include <optional>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
 
-/// No value for a text that is no interval. A failure, Unexpected, for one whose shape is right so far and whose
-/// number cannot be stored: a fraction of anything but seconds, or more than 2^31 - 1.
-Outcome<std::optional<IntervalParts>> parseInterval(std::string_view text);
+/// Reads an interval. A text that is none fails by IntervalUnreadable; by Unexpected one whose shape is right so far
+/// and whose number cannot be stored: a fraction of anything but seconds, or more than 2^31 - 1.
+Outcome<IntervalParts> readInterval(std::string_view text);
 
 /// The fields as they are, without those that are not above zero as signed numbers; "PT0S" if none is left.
 UString<0> intervalText(const IntervalParts& parts);

@@ -4,21 +4,31 @@
 #include <kvt/datetime/datetime_parts.h>
 
 #include <cstdint>
+#include <string_view>
 
 namespace kvt::ex::datetime::detail {
 
 struct PartsAccess {
-    static DateTimeParts dateTime(std::int64_t year, std::uint64_t month, std::uint64_t day,
-                                  std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
-                                  std::uint64_t nanoseconds, const UString<0>& offset) {
-        return DateTimeParts(year, month, day, hours, minutes, seconds, nanoseconds, offset);
+    /// The offset is a text that is known to be canonical or empty.
+    static DateTimeParts make(std::int64_t year, std::uint64_t month, std::uint64_t day, std::uint64_t hours,
+                              std::uint64_t minutes, std::uint64_t seconds, std::uint64_t nanoseconds,
+                              std::string_view offset, TemporalType type) {
+        DateTimeParts parts;
+        parts.year_ = year;
+        parts.month_ = month;
+        parts.day_ = day;
+        parts.hours_ = hours;
+        parts.minutes_ = minutes;
+        parts.seconds_ = seconds;
+        parts.nanoseconds_ = nanoseconds;
+        parts.offset_ = UString<0>(UStringView<0>(offset));
+        parts.type_ = type;
+        return parts;
     }
     static std::int64_t year(const DateTimeParts& parts) noexcept { return parts.year_; }
     static std::uint64_t month(const DateTimeParts& parts) noexcept { return parts.month_; }
     static std::uint64_t day(const DateTimeParts& parts) noexcept { return parts.day_; }
     static const UString<0>& offset(const DateTimeParts& parts) noexcept { return parts.offset_; }
-    /// Stores a text that is known to be canonical or empty.
-    static void setCanonicalOffset(DateTimeParts& parts, const UString<0>& offset) { parts.offset_ = offset; }
 
     static std::uint64_t& years(IntervalParts& parts) noexcept { return parts.years_; }
     static std::uint64_t& months(IntervalParts& parts) noexcept { return parts.months_; }

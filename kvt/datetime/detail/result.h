@@ -5,7 +5,9 @@
 // exception from outside included, gets the function's last resort. So nothing is thrown at the host.
 //
 //     TextResult cast(const UString<0>& value, CastToTemporalType target) {
-//         return guarded<UString<0>>([&]() -> Outcome<TextResult> { ... });
+//         return guarded<UString<0>>([&] {
+//             return readValue(viewOf(value)).andThen([&](const CanonicalRecord& record) { ... });
+//         });
 //     }
 #pragma once
 
@@ -52,8 +54,8 @@ Result<Value> failed(std::uint32_t number, std::initializer_list<std::string_vie
     return makeDateTimeResult(ReturnState::Failure, Value(), message(number, parameters));
 }
 
-/// The message of a failure whose words depend on nothing but the failure: DatePartRange (933065), ParseMismatch
-/// (933067), ParseEpochTimeRange (933093) and FormatStringBadCombo (933083). None for the others.
+/// The message of a failure whose words depend on nothing but the failure: ValueUnsupported (933063),
+/// IntervalUnreadable (933064), KindsNotComparable (933059), DatePartRange (933065), ParseMismatch (933067), ParseEpochTimeRange (933093) and FormatStringBadCombo (933083). None for the others.
 std::optional<LogMessageInfo> messageOf(const Failure& failure);
 
 /// What a function answers where there are no words.

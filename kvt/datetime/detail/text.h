@@ -49,6 +49,19 @@ inline constexpr std::size_t longestFixedDouble = 1 + 309 + 1 + 9;
 /// ends.
 char* writeFixed(char* first, char* last, double value) noexcept;
 
+/// A copy of a text of up to 40 bytes that needs no memory: a number in a failure.
+class ShortText {
+public:
+    ShortText() = default;
+    explicit ShortText(std::string_view text) noexcept;
+
+    std::string_view view() const noexcept { return {data_.data(), size_}; }
+
+private:
+    std::array<char, 40> data_{};
+    std::uint8_t size_ = 0;
+};
+
 /// Text in the making, in place. The capacity suffices for each field of a value or an interval with 20 digits, and
 /// the caller writes no more than that.
 class TextBuffer {
@@ -57,6 +70,12 @@ public:
     void put(std::string_view text) noexcept;
     /// In decimal, with leading zeros up to `width`.
     void putNumber(std::uint64_t number, unsigned width = 1) noexcept;
+    /// Two digits; the number is below 100.
+    void putPair(unsigned number) noexcept {
+        data_[size_] = static_cast<char>('0' + number / 10);
+        data_[size_ + 1] = static_cast<char>('0' + number % 10);
+        size_ += 2;
+    }
     /// The same with "-" in front of a negative number, which counts as one of the `width`.
     void putSigned(std::int64_t number, unsigned width = 1) noexcept;
     /// "." and nine digits without the zeros at their end; nothing for zero. Below 1,000,000,000.

@@ -1,0 +1,53 @@
+#include <kvt/datetime/detail/apply_offset.h>
+
+#include <kvt/datetime/detail/local_zone.h>
+#include <kvt/datetime/detail/offset.h>
+
+#include <algorithm>
+
+namespace kvt::ex::datetime::detail {
+
+namespace {
+
+// The keywords are ASCII letters, and no other character folds to one of theirs.
+bool isKeyword(std::string_view text, std::string_view keyword) noexcept {
+    return std::equal(text.begin(), text.end(), keyword.begin(), keyword.end(), [](char c, char lower) {
+        return (c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c) == lower;
+    });
+}
+
+std::optional<std::int32_t> offsetOfZone(const TemporalInstant& instant, std::string_view zone) {
+    if (isLocalZone(zone)) {
+        return localOffsetMinutes(instant);
+    }
+    if (isKeyword(zone, "utc")) {
+        return 0;
+    }
+    const std::optional<OffsetForm> offset = readOffset(zone);
+    return offset ? std::optional(offset->minutes) : std::nullopt;
+}
+
+} // namespace
+
+bool isLocalZone(std::string_view zone) noexcept {
+    return isKeyword(zone, "local");
+}
+
+void applyOffsetText(TemporalInstant& instant, std::string_view zone, SetZoneMode mode) {
+    if (mode == SetZoneMode::Automatic) {
+        mode = instant.offsetMinutes ? SetZoneMode::Convert : SetZoneMode::Replace;
+    }
+    // What "local" is asked about: a wall clock, or a moment in UTC. A wall clock is what has no offset, so the zero of
+    // UTC matters: without it the zone would take the moment for its own wall clock.
+    if (mode == SetZoneMode::Replace) {
+        instant.offsetMinutes.reset();
+    } else if (instant.offsetMinutes) {
+        instant = {utcCount(instant), 0};
+    }
+    instant.offsetMinutes = offsetOfZone(instant, zone);
+    if (mode == SetZoneMode::Convert && instant.offsetMinutes) {
+        instant.count = plusMinutes(instant.count, *instant.offsetMinutes);
+    }
+}
+
+} // namespace kvt::ex::datetime::detail
