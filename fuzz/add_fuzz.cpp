@@ -15,7 +15,10 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     const TextResult nothing = add(value, ustring("PT0S"));
     requireCanonical(nothing);
     if (isGood(nothing) && !textOf(nothing).empty()) {
-        requireEqual(compare(std::get<1>(nothing), value), 0, "nothing added changes nothing");
+        // The value in canonical form: a time whose fraction is rounded up may have wrapped at midnight.
+        const TextResult canonical = format(value, ustring("ZQT"));
+        requireEqual(compare(std::get<1>(nothing), std::get<1>(canonical)), 0,
+                     "nothing added changes nothing");
     }
     return 0;
 }
