@@ -169,9 +169,10 @@ KVT_EXPORT TextResult now(ZoneMode mode);
 KVT_EXPORT TextResult timezoneGet(const UString<0>& value, UTCOffsetType type);
 
 /// The value with another offset: a text such as "+01:00", "utc", or "local" for that of the machine's zone at that
-/// moment, in any case. A date comes back as a datetime. In order: 933096 for "local" on a time, 933073 where Convert
-/// has no offset to start from, 933092 for an empty zone; then 933094 and 933095 for a wall clock that the machine's
-/// zone skips or repeats. A missing zone database has no message.
+/// moment, in any case. Any other text is not refused: it takes the offset away, and the state is `Success`; Convert
+/// then leaves the wall clock of UTC. A date comes back as a datetime. In order: 933096 for "local" on a time, 933073
+/// where Convert has no offset to start from, 933092 for an empty zone; then 933094 and 933095 for a wall clock that
+/// the machine's zone skips or repeats. A missing zone database has no message.
 KVT_EXPORT TextResult timezoneSet(const UString<0>& value, const UString<0>& zone, const SetZoneMode& mode);
 
 /// The value without its offset; its wall clock stays. A value that has none comes back as it was given.
