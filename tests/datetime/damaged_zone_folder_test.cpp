@@ -47,7 +47,7 @@ std::string drained(int descriptor) {
     return all;
 }
 
-// Runs `work` in a child; what it returns is the child's output. Whoever takes longer than 20 seconds is ended.
+// Runs `work` in a child; what it returns is the child's output. Whoever takes longer than a minute is ended.
 Ended inChild(const std::function<std::string()>& work) {
     int out[2];
     std::FILE* const errors = std::tmpfile();
@@ -56,7 +56,7 @@ Ended inChild(const std::function<std::string()>& work) {
     if (child == 0) {
         ::close(out[0]);
         ::dup2(::fileno(errors), STDERR_FILENO);
-        ::alarm(20);
+        ::alarm(60);
         const std::string text = work();
         const bool isWritten = ::write(out[1], text.data(), text.size()) == static_cast<ssize_t>(text.size());
         ::_exit(isWritten ? 0 : 1);
