@@ -29,7 +29,7 @@ install() {
     "$cmake" --install "$build" --prefix "$prefix" >>"$work/install.log"
     libdir=$(library_dir)
     [[ -f $prefix/share/gdb/auto-load$libdir/$(basename "$(realpath "$libdir/libkvt.so")")-gdb.py ]]
-    # clang leaves out whatever type it takes to be described elsewhere, unless it is told not to.
+    # clang leaves out a type that it takes to be described elsewhere, unless it gets this flag.
     if "$compiler" --version | grep -q clang; then
         flavour=(-fstandalone-debug)
     fi
@@ -70,7 +70,8 @@ process() {
     # Nothing may be called in the program.
     show 'set may-call-functions off' 'info locals' | compare "$source/shown.txt"
     # A value that is nowhere in memory, the limit on elements, and a printer set aside.
-    show 'print madeByACall()' 'set print elements 4' 'print utf8' 'print utf32' 'print array' 'print/r fixed' |
+    show 'set $copy = utf16' 'print $copy' 'set print elements 4' 'print utf8' 'print utf32' 'print array' \
+        'print/r fixed' |
         compare "$source/special.txt"
 }
 
@@ -89,10 +90,14 @@ stripped() {
         echo "the library is not stripped"
         return 1
     fi
-    # Arrays are the one type that only the library's own type information describes.
     show 'info sharedlibrary libkvt' | grep -F "$libdir/libkvt.so"
-    show 'info locals' | grep -v 'rray = ' >"$work/stripped.txt"
-    grep -v 'rray = ' "$source/shown.txt" | compare "$work/stripped.txt"
+    show 'info locals' >"$work/stripped.txt"
+    # Only the library's own type information describes arrays. Older gdb stops there, and newer asks the printers.
+    local arrays='^$'
+    if grep -q 'rray = <incomplete type>$' "$work/stripped.txt"; then
+        arrays='rray = '
+    fi
+    grep -v "$arrays" "$source/shown.txt" | diff -u - <(grep -v "$arrays" "$work/stripped.txt")
 }
 
 plain_charset() {

@@ -23,7 +23,7 @@ FIXED_NAMES = (
 )
 UTF16, UTF32, SYSTEM, BINARY, WWJD, UNKNOWN = 2, 3, 27, 28, 29, 30
 
-STRING_SIZE = 6 * WORD  # of a UString with a fixed encoding; behind it a UString<30> has its encoding
+STRING_SIZE = 6 * WORD  # of a UString with a fixed encoding; behind it a UString<30> has its encoding, in a word
 
 
 # ---- Memory
@@ -119,7 +119,7 @@ ESCAPES = {"\n": "\\n", "\r": "\\r", "\t": "\\t", "\0": "\\0"}
 
 
 def escaped(character, quoted):
-    """A character as it is shown; a lone surrogate stands for itself, or for a byte that is no text (see decoded)."""
+    """A character as it is shown; a lone surrogate stands for itself, or for a byte that is not text (see decoded)."""
     code = ord(character)
     if character in ESCAPES:
         return ESCAPES[character]
@@ -138,7 +138,7 @@ def characters(data, codec, errors, cut):
 
 
 def decoded(data, encoding, quoted=True, cut=False):
-    """The shown form of bytes in an encoding; what is no text in it is shown as numbers."""
+    """The shown form of bytes in an encoding; what is not text in it is shown as numbers."""
     if encoding == UTF16:
         codec = "utf-16-" + {"little": "le", "big": "be"}[little_or_big()]
         text = characters(data, codec, "surrogatepass", cut)
@@ -198,6 +198,22 @@ def unit_size_of(encoding):
     return {UTF16: 2, UTF32: 4}.get(encoding, 1)
 
 
+def string_parts_at(address, kind):
+    """Pointer, size and encoding of the UString<kind> at an address."""
+    encoding = number(address + STRING_SIZE) if kind == UNKNOWN else kind
+    return word(address), word(address + WORD), encoding
+
+
+def text_of_string(parts, kind):
+    pointer, size, encoding = parts
+    return text_of(pointer, size, encoding, unit_size_of(kind), name_of(encoding))
+
+
+def array_parts_at(address):
+    """Size and data of the vector at an address: behind the table come size, capacity, deleter (four words) and data."""
+    return word(address + WORD), word(address + 7 * WORD)
+
+
 # ---- Strings, views, arrays, encodings
 
 class StringPrinter:
@@ -207,15 +223,13 @@ class StringPrinter:
         self.value, self.encoding = value, encoding
 
     def to_string(self):
-        pointer, size, encoding = self.parts()
-        return for_value(text_of(pointer, size, encoding, unit_size_of(self.encoding), name_of(encoding)))
+        return for_value(text_of_string(self.parts(), self.encoding))
 
     def parts(self):
         # By place, since a compiler may leave the type of standard strings out of a program's type information; by
-        # name for what is not in memory, such as the result of a call.
+        # name for what is not in memory, such as a copy that gdb holds.
         if self.value.address is not None:
-            at = int(self.value.address)
-            return word(at), word(at + WORD), number(at + STRING_SIZE) if self.encoding == UNKNOWN else self.encoding
+            return string_parts_at(int(self.value.address), self.encoding)
         storage = self.value["storage_"]
         encoding = int(self.value["encoding_"]["id_"]) if self.encoding == UNKNOWN else self.encoding
         return int(storage["_M_dataplus"]["_M_p"]), int(storage["_M_string_length"]), encoding
@@ -234,7 +248,7 @@ class ViewPrinter:
 
 
 class ArrayPrinter:
-    """UStringArray<N> and vector<T>: the number of elements, and the elements."""
+    """vector<T>: the number of elements, and the elements."""
 
     def __init__(self, value, what):
         self.value, self.what = value, what
@@ -249,6 +263,33 @@ class ArrayPrinter:
 
     def display_hint(self):
         return "array"
+
+
+class StringArrayPrinter(ArrayPrinter):
+    """UStringArray<N>, shown as a vector of its strings. Its type is described in the library alone, and in a
+    stripped one nowhere, so it is read by place."""
+
+    def __init__(self, value, encoding):
+        super().__init__(value, "array" if encoding == UNKNOWN else "%s array" % FIXED_NAMES[encoding])
+        self.encoding = encoding
+
+    def to_string(self):
+        if self.value.address is None:
+            return super().to_string()
+        return "%s of %s" % (self.what, plural(array_parts_at(int(self.value.address))[0], "element"))
+
+    def children(self):
+        if self.value.address is None:
+            yield from super().children()
+            return
+        size, data = array_parts_at(int(self.value.address))
+        step = STRING_SIZE + (WORD if self.encoding == UNKNOWN else 0)
+        try:
+            for index in range(size):
+                parts = string_parts_at(data + index * step, self.encoding)
+                yield "[%d]" % index, for_child(text_of_string(parts, self.encoding))
+        except gdb.MemoryError:
+            return
 
 
 class EncodingPrinter:
@@ -294,8 +335,8 @@ def string_at(address):
 
 
 def array_at(address):
-    """The texts of the UStringArray<0> at an address: behind the table come size, capacity, deleter and data."""
-    size, data = word(address + WORD), word(address + 3 * WORD + 4 * WORD)
+    """The texts of the UStringArray<0> at an address, without quotes."""
+    size, data = array_parts_at(address)
     return [string_at(data + index * STRING_SIZE) for index in range(size)]
 
 
@@ -373,7 +414,7 @@ class Printers(gdb.printing.PrettyPrinter):
                 return StringPrinter(value, encoding)
             if kind == "UStringView":
                 return ViewPrinter(value, encoding)
-            return ArrayPrinter(value, "%s array" % FIXED_NAMES[encoding] if encoding != UNKNOWN else "array")
+            return StringArrayPrinter(value, encoding)
         if type_.name == "kvt::ex::Encoding":
             return EncodingPrinter(value)
         if type_.name.startswith("kvt::ex::vector<"):
