@@ -54,9 +54,13 @@ inline void requireShape(const kvt::ex::datetime::TextResult& result) {
     }
 }
 
-/// Whether a fraction that was rounded up has led behind the last year; such a text cannot be read again.
+/// Whether a fraction that was rounded up, or a day that `lenient` let run over, has led behind the last year. Such a text
+/// has one digit more than a value and cannot be read again.
 inline bool isBehindLastYear(const kvt::ex::datetime::TextResult& result) {
-    return textOf(result).substr(0, 9) == "100000101";
+    const std::size_t digits = textOf(result).find_first_not_of("0123456789");
+    const std::size_t length = std::min(digits, textOf(result).size());
+    return length == std::string_view("100000101").size() ||
+           length == std::string_view("100000101000000").size();
 }
 
 /// A result that is a value is read again as the same text.

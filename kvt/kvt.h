@@ -7,6 +7,7 @@
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/message_numbers.h>
+#include <kvt/datetime/pattern_trace.h>
 #include <kvt/datetime/utc_offset.h>
 #include <kvt/datetime/zone_folder.h>
 #include <kvt/encoding/encoding.h>

@@ -92,29 +92,41 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 ///     ZQT    the canonical form itself, which is normalised
 ///     ISO    2020-01-02, 03:04:05, 2020-01-02T03:04:05, the last two also with an offset, "Z" included
 ///
-/// Any other format is a pattern. What stands in it outside the following stands for itself, byte for byte, in the
-/// system's encoding; so do blanks. Numbers take as many digits as there are up to their width, but a number right
-/// behind another one takes the whole width. Where a bound is in brackets, `lenient` lifts it.
+/// Any other format is a pattern. What is not in the following list stands for itself, byte for byte, in the system's
+/// encoding; so do blanks. Numbers take as many digits as there are up to their width, but a number right behind another
+/// one takes the whole width, all but %j. Where a bound is in brackets, `lenient` lifts it.
 ///
-///     %Y           year, up to 4 digits, 1000 to 9999
-///     %m %N        month, up to 2 digits, 1 to (12)
-///     %b           month by three letters, any case; an unknown one leaves the month open
-///     %B           month by its name, any case; an unknown one is a mismatch
-///     %d %e        day of the month, up to 2 digits, 1 to (31)
-///     %j           day of the year, up to 3 digits, 1 to (366); needs %Y
-///     %H %k        hour, up to 2 digits, 0 to (23)
-///     %I %l        hour of a 12-hour clock, up to 2 digits, 1 to 12
-///     %p           "am" or "pm", any case
-///     %M           minute, up to 2 digits, 0 to (59)
-///     %S           second, up to 2 digits, 0 to (59), then a fraction if there is one
-///     %T           the same as %H:%M:%S
-///     %s           seconds since 1970 in UTC, with sign and fraction; the result has the offset +00:00
-///     %Es          the same digits as a local time; the result has no offset
-///     %z %Ez       offset: Z, +hh, +hhmm or +hh:mm
-///     %% %$ %* %?  the character itself
-///     ?            any one character
-///     *            one whole word, up to a blank; it has to end in what stands behind the "*" up to a blank or "$"
-///     $            the end of the value, as the last character of the format; without it, the rest is not looked at
+///     $    the end of the value, as the end of the format
+///     *    one word, up to a blank
+///     ?    any one character
+///     %$   the character itself
+///     %%   the character itself
+///     %*   the character itself
+///     %?   the character itself
+///     %Y   year: up to 4 digits, 1000 to 9999
+///     %m   month: up to 2 digits, 1 to (12)
+///     %N   month: up to 2 digits, 1 to (12)
+///     %d   day of the month: up to 2 digits, 1 to (31)
+///     %e   day of the month: up to 2 digits, 1 to (31)
+///     %j   day of the year: up to 3 digits, 1 to (366)
+///     %H   hour: up to 2 digits, 0 to (23)
+///     %k   hour: up to 2 digits, 0 to (23)
+///     %I   hour: up to 2 digits, 1 to 12
+///     %l   hour: up to 2 digits, 1 to 12
+///     %M   minute: up to 2 digits, 0 to (59)
+///     %S   second: up to 2 digits, 0 to (59), and a fraction
+///     %T   time, as %H:%M:%S
+///     %b   month by three letters; an unknown one leaves it open
+///     %B   month by its whole name
+///     %p   am or pm
+///     %s   seconds since 1970 in UTC
+///     %Es  seconds since 1970 as a local time
+///     %z   offset: Z, +hh, +hhmm or +hh:mm
+///     %Ez  offset: Z, +hh, +hhmm or +hh:mm
+///
+/// Names, "am" and "pm" are read in any case, and %B fails by an unknown one. A fraction is taken where there is one. %j
+/// needs %Y. The result of %s has the offset +00:00, that of %Es none. The word of "*" has to end in what stands behind
+/// the "*" up to a blank or "$". Without a "$" at the end of the format the rest of the value is not looked at.
 ///
 /// A format without any of %T %H %I %p %M %S %s %Es gives a date, so that %k and %l alone are read and dropped; one
 /// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A date is
@@ -133,25 +145,39 @@ KVT_EXPORT TextResult parse(const UString<0>& value, const UString<0>& format, b
 /// `format` without a "%" is a list of keywords, as for parse(): "ZQT" for the canonical form, "ISO" for that of ISO
 /// 8601. Where no keyword is known the format itself comes out. Any other format is a pattern:
 ///
-///     %Y %y        year, 4 digits; its last two
-///     %m %N        month, 2 digits; without padding
-///     %b %B        month by name, short and full, in English
-///     %d %e        day of the month, 2 digits; without padding
-///     %j           day of the year, 3 digits
-///     %a %A        day of the week by name, short and full, in English
-///     %u %w        day of the week, 1 to 7 from Monday; 0 to 6 from Sunday
-///     %U %W        week of the year, 2 digits, weeks beginning on Sunday; on Monday
-///     %H %k        hour, 2 digits; without padding
-///     %I %l        hour of a 12-hour clock, 2 digits; without padding
-///     %p           AM or PM
-///     %M           minute, 2 digits
-///     %S           second, 2 digits, then the fraction if there is one
-///     %T           the same as %H:%M:%S
-///     %s           seconds since 1970 in UTC, with the fraction if there is one; needs an offset
-///     %Es          the same for the wall clock as it stands; only without an offset
-///     %z           offset, +hh:mm; needs one
-///     %Ez          the same, but Z for zero
-///     %%           a percent sign
+///     $    itself
+///     *    itself
+///     ?    itself
+///     %%   a percent sign
+///     %Y   year, 4 digits; not on a time
+///     %m   month, 2 digits; not on a time
+///     %N   month, without padding; not on a time
+///     %d   day of the month, 2 digits; not on a time
+///     %e   day of the month, without padding; not on a time
+///     %j   day of the year, 3 digits; not on a time
+///     %H   hour, 2 digits
+///     %k   hour, without padding
+///     %I   hour of a 12-hour clock, 2 digits
+///     %l   hour of a 12-hour clock, without padding
+///     %M   minute, 2 digits
+///     %S   second, 2 digits, and a fraction if there is one
+///     %T   time, as %H:%M:%S
+///     %b   month by three letters; not on a time
+///     %B   month by its whole name; not on a time
+///     %p   AM or PM
+///     %s   seconds since 1970 in UTC, and a fraction; needs a date and an offset
+///     %Es  local seconds since 1970, and a fraction; needs a date and no offset
+///     %z   offset, +hh:mm; needs an offset
+///     %Ez  offset, +hh:mm, or Z for zero; needs an offset
+///     %y   year, its last 2 digits; not on a time
+///     %a   day of the week by three letters; not on a time
+///     %A   day of the week by its whole name; not on a time
+///     %u   day of the week, 1 to 7 from Monday; not on a time
+///     %w   day of the week, 0 to 6 from Sunday; not on a time
+///     %U   week of the year, from Sunday, 2 digits; not on a time
+///     %W   week of the year, from Monday, 2 digits; not on a time
+///
+/// Names are English. %T has the fraction of %S.
 ///
 /// On a date the time reads as midnight, but there is no offset to ask for; on a time no part of a date can be asked
 /// for. Such a flag is 933078, an unknown one 933079, a "%" at the end 933076, %s beside %z 933083. An empty value

@@ -21,172 +21,147 @@ namespace {
 
 using namespace detail;
 
-constexpr std::array<std::string_view, 5> isoPatterns = {
-    "%Y-%m-%d$", "%Y-%m-%dT%H:%M:%S$", "%Y-%m-%dT%H:%M:%S%Ez$", "%H:%M:%S$", "%H:%M:%S%Ez$",
-};
-
-// The flags that make a format ask for a time and for a date. %k and %l are not among the first, so that a format
-// whose only time is one of them gives a date. %s and %Es ask for both.
-constexpr std::string_view timeFlags = "THIpMSs";
-constexpr std::string_view dateFlags = "YmNbBdejs";
-// Those that give the result an offset: %z, %Ez and %s, but not %Es.
-constexpr std::string_view offsetFlags = "zs";
-
-constexpr bool holds(std::string_view flags, char flag) {
-    return flags.find(flag) != std::string_view::npos;
+// What a pattern that fits gives: a date, a time or both, as it asks for them.
+TextResult resultOf(const PatternReading& reading) {
+    const bool hasTime = (reading.parts & timePart) != 0;
+    const bool hasDate = (reading.parts & datePart) != 0 || !hasTime;
+    const TemporalType kind = hasDate && hasTime ? TemporalType::Datetime
+                              : hasTime          ? TemporalType::Time
+                                                 : TemporalType::Date;
+    // Offsets of 100 hours and more can be read but not written; there is none then.
+    const std::optional<OffsetForm> offset =
+        hasTime && (reading.parts & offsetPart) != 0 ? offsetOfMinutes(reading.offsetMinutes) : std::nullopt;
+    return TextResult(ReturnState::Success,
+                      canonicalText(kind, reading.fields, offset ? offset->view() : std::string_view()),
+                      std::nullopt);
 }
 
-/// What a format asks for.
-struct Wanted {
-    bool date = false;
-    bool time = false;
-    bool offset = false;
-};
+// ---- Messages
 
-// The format is looked at as a text: what stands in it behind a fuzzy word counts as well. In the search for offsets
-// even the second character of "%%" counts as the beginning of a flag, so that "%%z" asks for one.
-Wanted wantedBy(std::string_view format) {
-    Wanted wanted;
-    bool isSecondOfPair = false;
-    for (std::size_t at = format.find('%'); at != std::string_view::npos; at = format.find('%', at + 1)) {
-        std::string_view behind = format.substr(at + 1);
-        const bool isModified =
-            behind.size() > 1 && behind[0] == 'E' && (behind[1] == 's' || behind[1] == 'z');
-        behind.remove_prefix(isModified ? 1 : 0);
-        const char flag = behind.empty() ? '\0' : behind.front();
-        wanted.offset |= holds(offsetFlags, flag) && !(isModified && flag == 's');
-        if (!isSecondOfPair) {
-            wanted.date |= holds(dateFlags, flag);
-            wanted.time |= holds(timeFlags, flag);
-        }
-        isSecondOfPair = !isSecondOfPair && flag == '%';
+// A part of a format that has been read, as it reads with every "%T" replaced.
+std::string expanded(std::string_view format) {
+    std::string text;
+    while (!format.empty()) {
+        const std::string_view element = elementOf(format);
+        const PatternRow* const row = rowOfElement(element);
+        text += row != nullptr && row->reads.reading == Reading::Time ? timeExpansion : element;
+        format.remove_prefix(element.size());
     }
-    return wanted;
+    return text;
 }
 
-// What a pattern that is known to fit gives: a date, a time or both, as it asks for them.
-UString<0> resultText(const PatternReading& reading, const Wanted& wanted) {
-    const DateTimeFields fields = fieldsFromCount(reading.count);
-    TextBuffer text;
-    if (wanted.date || !wanted.time) {
-        writeDate(text, fields.year, fields.month, fields.day, false);
-    }
-    if (wanted.time) {
-        writeTime(text, static_cast<std::uint64_t>(fields.hours), static_cast<std::uint64_t>(fields.minutes),
-                  static_cast<std::uint64_t>(fields.seconds), static_cast<std::uint64_t>(fields.nanoseconds),
-                  false);
-        // Offsets of 100 hours and more can be read but not written; there is none then.
-        const std::optional<OffsetForm> offset = offsetOfMinutes(reading.offsetMinutes);
-        if (wanted.offset && offset) {
-            text.put(offset->view());
-        }
-    }
-    return text.toString();
+// Made in place, since a value that does not fit is nothing rare.
+TextResult failedByMismatch(std::string_view format, std::size_t place) {
+    place = placeBetweenCharacters(format, place);
+    const std::string_view matched = format.substr(0, place);
+    TextResult result(ReturnState::Failure, UString<0>(), LogMessageInfo());
+    LogMessageInfo& info = *std::get<2>(result);
+    info.messageNumber = message_number::formatMismatch;
+    info.parameters.reserve(2);
+    appendReadable(info.parameters,
+                   matched.find("%T") == std::string_view::npos ? matched : expanded(matched));
+    appendReadable(info.parameters, format.substr(place));
+    return result;
 }
 
-// `value` and `format` are bytes in the system's encoding.
-Outcome<UString<0>> readPattern(std::string_view value, std::string_view format, bool lenient) {
-    const Wanted wanted = wantedBy(format);
-    Outcome<PatternReading> reading = readFields(value, format, wanted.offset, lenient);
-    if (!reading) {
-        return std::move(reading.failure());
-    }
-    return resultText(*reading, wanted);
-}
-
-// The messages of patterns. A format's bytes come back as text.
-std::optional<LogMessageInfo> wordsOf(const Failure& failure, std::string_view format) {
+// The message about the fields as a whole; its parameter is the format as the caller gave it.
+std::uint32_t numberOf(ParseValidation problem) {
     using namespace message_number;
-    if (const auto* unknown = std::get_if<ParseUnknownFlag>(&failure)) {
-        return message(unknownFlag, {viewOf(readableSystemBytes(unknown->flag)), "@DateTimeParse()"});
-    }
+    constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete, offsetWithoutTime,
+                                    timeIncomplete,     nothingGiven,   hourNotForMeridiem,
+                                    ordinalPastYearEnd, noSuchDate,     resultYearOutOfRange};
+    return numbers[static_cast<std::size_t>(problem)];
+}
+
+// `bytes` is the format in the system's encoding, in which the failure has its place.
+TextResult failedBy(const PatternFailure& failure, std::string_view format, std::string_view bytes) {
     if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
-        std::string matched = mismatch->matched;
-        std::string rest = mismatch->rest;
-        cutBetweenCharacters(matched, rest);
-        return message(formatMismatch,
-                       {viewOf(readableSystemBytes(matched)), viewOf(readableSystemBytes(rest))});
+        return failedByMismatch(bytes, mismatch->place);
     }
-    if (const auto* validation = std::get_if<ParseValidation>(&failure)) {
-        constexpr std::array numbers = {ordinalWithoutYear, dateIncomplete, offsetWithoutTime,
-                                        timeIncomplete,     nothingGiven,   hourNotForMeridiem,
-                                        ordinalPastYearEnd, noSuchDate,     resultYearOutOfRange};
-        const auto index = static_cast<std::size_t>(*validation);
-        return index < numbers.size() ? std::optional(message(numbers[index], {format})) : std::nullopt;
+    if (const auto* problem = std::get_if<ParseValidation>(&failure)) {
+        return failed<UString<0>>(numberOf(*problem), {format});
     }
-    return messageOf(failure);
+    if (const auto* unknown = std::get_if<ParseUnknownFlag>(&failure)) {
+        const std::string_view rest =
+            bytes.substr(static_cast<std::size_t>(unknown->flag.data() - bytes.data()));
+        const std::string_view flag = wholeCharacters(rest, unknown->flag.size());
+        return failed<UString<0>>(message_number::unknownFlag,
+                                  {viewOf(readableSystemBytes(flag)), "@DateTimeParse()"});
+    }
+    if (const auto* epoch = std::get_if<ParseEpochTimeRange>(&failure)) {
+        return failed<UString<0>>(message_number::epochTimeOutOfRange, {epoch->seconds});
+    }
+    const auto& flags = std::get<FormatStringBadCombo>(failure);
+    return failed<UString<0>>(message_number::flagsExcludeEachOther, {flags.first, flags.second});
 }
 
-TextResult success(UString<0> text) {
-    return makeDateTimeResult(ReturnState::Success, std::move(text));
-}
+// ---- The two kinds of format
 
-// The first keyword that fits the value.
-Outcome<TextResult> parseByKeywords(const UString<0>& value, const UString<0>& format,
-                                    std::string_view keywords, bool lenient) {
-    std::optional<Outcome<UString<0>>> found;
-    const auto readAsIso = [&] {
-        const std::string_view plain = trimmed(viewOf(value));
-        if (!isAscii(plain)) {
-            return false; // all of the value has to match, and the patterns are ASCII
+// By the first form of ISO 8601 that fits.
+std::optional<PatternReading> readIso(std::string_view value, bool lenient) {
+    if (!isAscii(value)) {
+        return std::nullopt; // all of the value has to match, and the patterns are ASCII
+    }
+    const SystemBytes bytes(value);
+    PatternReader reader(bytes.view(), isoReadPattern(isoOrder.front()), lenient);
+    for (const TemporalType kind : isoOrder) {
+        const std::string_view pattern = isoReadPattern(kind);
+        // Most forms begin like the one before, and need not be read from their beginning.
+        if (!reader.goOnBy(pattern)) {
+            reader = PatternReader(bytes.view(), pattern, lenient);
         }
-        const SystemBytes bytes(plain);
-        return std::any_of(isoPatterns.begin(), isoPatterns.end(), [&](std::string_view pattern) {
-            Outcome<UString<0>> text = readPattern(bytes.view(), pattern, lenient);
-            if (text) {
-                found = std::move(text);
+        if (const auto reading = reader.readAll()) {
+            return *reading;
+        }
+    }
+    return std::nullopt;
+}
+
+// By the first keyword that fits the value.
+TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bool lenient) {
+    std::optional<TextResult> found;
+    const auto use = [&](Keyword keyword) {
+        if (keyword == Keyword::Iso) {
+            if (const auto reading = readIso(trimmed(viewOf(value)), lenient)) {
+                found = resultOf(*reading);
             }
-            return found.has_value();
-        });
-    };
-    const auto readAsCanonical = [&] {
-        Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient);
-        if (!record) {
-            found = Outcome<UString<0>>(std::move(record.failure()));
+        } else if (const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient); !record) {
+            found = makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
         } else if (record->type != TemporalType::Unsupported) {
-            found = canonicalText(*record);
+            found = TextResult(ReturnState::Success, canonicalText(*record), std::nullopt);
         }
         return found.has_value();
     };
-    const bool anyKnown = forEachKeyword(
-        keywords, [&](Keyword keyword) { return keyword == Keyword::Zqt ? readAsCanonical() : readAsIso(); });
-    if (!found) {
-        return anyKnown ? failed<UString<0>>(message_number::noKeywordMatched, {viewOf(value)})
-                        : failed<UString<0>>(message_number::noKnownKeyword, {viewOf(format)});
+    const bool anyKnown = forEachKeyword(viewOf(format), use);
+    if (found) {
+        return std::move(*found);
     }
-    if (!*found) {
-        return std::move(found->failure());
-    }
-    return success(std::move(**found));
+    return anyKnown ? failed<UString<0>>(message_number::noKeywordMatched, {viewOf(value)})
+                    : failed<UString<0>>(message_number::noKnownKeyword, {viewOf(format)});
 }
 
-Outcome<TextResult> parseByPattern(std::string_view value, std::string_view pattern, bool lenient) {
+TextResult parseByPattern(std::string_view value, std::string_view pattern, bool lenient) {
     const SystemBytes valueBytes(value);
     const SystemBytes patternBytes(pattern);
-    Outcome<UString<0>> text = readPattern(valueBytes.view(), patternBytes.view(), lenient);
-    if (!text) {
-        return std::move(text.failure());
-    }
-    return success(std::move(*text));
+    const auto reading = readFields(valueBytes.view(), patternBytes.view(), lenient);
+    return reading ? resultOf(*reading) : failedBy(reading.failure(), pattern, patternBytes.view());
 }
 
 } // namespace
 
 TextResult parse(const UString<0>& value, const UString<0>& format, bool lenient) {
-    const std::string_view trimmedFormat = trimmed(viewOf(format));
-    return guarded<UString<0>>(
-        [&]() -> Outcome<TextResult> {
-            const std::string_view trimmedValue = trimmed(viewOf(value));
-            if (trimmedValue.empty()) {
-                return makeDateTimeResult(ReturnState::Failure, UString<0>());
-            }
-            if (trimmedFormat.empty()) {
-                return failed<UString<0>>(message_number::formatEmpty);
-            }
-            return isKeywordList(trimmedFormat) ? parseByKeywords(value, format, trimmedFormat, lenient)
-                                                : parseByPattern(trimmedValue, trimmedFormat, lenient);
-        },
-        LastResort::Generic, [&](const Failure& failure) { return wordsOf(failure, trimmedFormat); });
+    return guarded<UString<0>>([&]() -> TextResult {
+        const std::string_view trimmedValue = trimmed(viewOf(value));
+        const std::string_view trimmedFormat = trimmed(viewOf(format));
+        if (trimmedValue.empty()) {
+            return TextResult(ReturnState::Failure, UString<0>(), std::nullopt);
+        }
+        if (trimmedFormat.empty()) {
+            return failed<UString<0>>(message_number::formatEmpty);
+        }
+        return isKeywordList(trimmedFormat) ? parseByKeywords(value, format, lenient)
+                                            : parseByPattern(trimmedValue, trimmedFormat, lenient);
+    });
 }
 
 } // namespace kvt::ex::datetime

@@ -3,104 +3,124 @@
 
 #include <kvt/datetime/detail/calendar.h>
 
-#include <string>
-
 namespace kvt::ex::datetime::detail {
 
 namespace {
 
-constexpr std::int64_t defaultYear = 1970;
-constexpr std::int64_t monthsPerYear = 12;
+constexpr std::int32_t monthsPerYear = 12;
+constexpr std::uint64_t shortestMonth = 28;
 
-std::optional<ParseValidation> incompleteness(const PatternFields& fields, bool wantsOffset) {
-    if (fields.ordinal && !fields.year) {
+using Problem = std::optional<ParseValidation>;
+
+Problem incompleteness(const PatternFields& fields, bool wantsOffset) {
+    const bool hasYear = fields.has(Field::Year);
+    const bool hasMonth = fields.has(Field::Month);
+    const bool hasDay = fields.has(Field::Day);
+    const bool hasOrdinal = fields.has(Field::Ordinal);
+    const bool hasHours = fields.has(Field::Hours);
+    const bool hasMinutes = fields.has(Field::Minutes);
+    const bool hasSeconds = fields.has(Field::Seconds);
+    if (hasOrdinal && !hasYear) {
         return ParseValidation::OrdinalWithoutYear;
     }
-    const bool anyOfDate = fields.year || fields.month || fields.day;
-    if (!fields.ordinal && anyOfDate && !(fields.year && fields.month && fields.day)) {
+    const bool anyOfDate = hasYear || hasMonth || hasDay;
+    if (!hasOrdinal && anyOfDate && !(hasYear && hasMonth && hasDay)) {
         return ParseValidation::DateIncomplete;
     }
-    if (fields.hours ? fields.hasSeconds && !fields.minutes : fields.minutes || fields.hasSeconds) {
+    if (hasHours ? hasSeconds && !hasMinutes : hasMinutes || hasSeconds) {
         return ParseValidation::TimeIncomplete;
     }
-    if (!fields.hours && wantsOffset) {
+    if (!hasHours && wantsOffset) {
         return ParseValidation::OffsetWithoutTime;
     }
-    if (!anyOfDate && !fields.ordinal && !fields.hours) {
+    if (!anyOfDate && !hasOrdinal && !hasHours) {
         return ParseValidation::NothingGiven;
     }
     return std::nullopt;
 }
 
-// Hours of a 12-hour clock to those of the day.
-std::optional<ParseValidation> applyMeridiem(PatternFields& fields) {
-    const std::int64_t hours = fields.hours.value_or(0);
-    if (hours < 1 || hours > 12) {
-        return ParseValidation::HourNotForMeridiem;
-    }
-    fields.hours = hours % 12 + (fields.meridiem == 'p' ? 12 : 0);
-    return std::nullopt;
+// With the time of day of `time`, which may run over.
+DateTimeFields fieldsOn(std::int64_t days, const DateTimeFields& time) {
+    const std::int64_t seconds = time.hours * secondsPerHour + time.minutes * secondsPerMinute + time.seconds;
+    return fieldsFromCount(timeCountOfSeconds(days * secondsPerDay + seconds, time.nanoseconds));
 }
 
 // The fraction alone may reach the next second, when it was rounded.
-NanoCount countOn(const PatternFields& fields, std::int64_t days) {
-    const std::int64_t minutes = fields.hours.value_or(0) * 60 + fields.minutes.value_or(0);
-    return nanosOf(days * secondsPerDay + minutes * secondsPerMinute + fields.seconds, fields.nanoseconds);
+bool runsOver(const DateTimeFields& time) {
+    return time.hours > 23 || time.minutes > 59 || time.seconds > 59 || time.nanoseconds >= nanosPerSecond;
 }
 
-std::int64_t yearOf(const NanoCount& count) {
-    return civilFromDays(floorDivide(count, nanosPerDay).quotient).year;
+bool isOfCalendar(const DateTimeFields& date) {
+    return date.month <= monthsPerYear &&
+           (date.day <= shortestMonth ||
+            date.day <= lastDayOfMonth(date.year, static_cast<unsigned>(date.month)));
 }
 
-Outcome<NanoCount> countOnOrdinal(const PatternFields& fields, std::int64_t year, bool lenient) {
-    const NanoCount count = countOn(fields, daysFromCivil(year, 1, 1) + *fields.ordinal - 1);
-    if (!lenient && yearOf(count) != year) {
-        return Failure(ParseValidation::OrdinalPastYearEnd);
-    }
-    return count;
-}
-
-Outcome<NanoCount> countOnDate(const PatternFields& fields, std::int64_t year, bool lenient) {
-    std::int64_t month = fields.month.value_or(1);
-    const auto day = static_cast<unsigned>(fields.day.value_or(1));
-    if (month > monthsPerYear || day > lastDayOfMonth(year, static_cast<unsigned>(month))) {
-        if (!lenient) {
-            return Failure(ParseValidation::NoSuchDate);
+// The fields with all that runs over carried on, if the date is one.
+Problem carryOverDate(DateTimeFields& fields, bool lenient) {
+    if (isOfCalendar(fields)) {
+        if (!runsOver(fields)) {
+            return std::nullopt; // as nearly always: the fields are those of the value
         }
-        year += (month - 1) / monthsPerYear;
-        month = (month - 1) % monthsPerYear + 1;
+    } else if (!lenient) {
+        return ParseValidation::NoSuchDate;
     }
-    return countOn(fields, daysFromCivil(year, static_cast<unsigned>(month), day));
+    const std::uint64_t months = fields.month - 1;
+    const std::int64_t days =
+        daysFromCivil(fields.year + static_cast<std::int64_t>(months / monthsPerYear),
+                      static_cast<unsigned>(months % monthsPerYear + 1), static_cast<unsigned>(fields.day));
+    fields = fieldsOn(days, fields);
+    return std::nullopt;
+}
+
+Problem carryOverOrdinal(DateTimeFields& fields, std::int64_t ordinal, bool lenient) {
+    const std::int64_t year = fields.year;
+    fields = fieldsOn(daysFromCivil(year, 1, 1) + ordinal - 1, fields);
+    return !lenient && fields.year != year ? Problem(ParseValidation::OrdinalPastYearEnd) : std::nullopt;
 }
 
 } // namespace
 
-Outcome<PatternReading> instantOfFields(PatternFields fields, bool wantsOffset, bool lenient) {
-    const bool isEpoch = !fields.epochFlag.empty();
-    if (isEpoch && fields.hasOffset) {
-        return FormatStringBadCombo{std::string(fields.epochFlag), "%z"};
+Outcome<PatternReading, PatternFailure> readingOf(const PatternFields& fields, Parts parts, bool lenient) {
+    if (fields.isEpoch() && fields.hasOffset) {
+        return PatternFailure(FormatStringBadCombo{fields.epochFlag, "%z"});
     }
-    if (const auto problem = isEpoch ? std::nullopt : incompleteness(fields, wantsOffset)) {
-        return *problem;
+    if (const Problem problem =
+            fields.isEpoch() ? std::nullopt : incompleteness(fields, (parts & offsetPart) != 0)) {
+        return PatternFailure(*problem);
     }
-    if (const auto problem = fields.meridiem == '\0' ? std::nullopt : applyMeridiem(fields)) {
-        return *problem;
+    std::int32_t hours = fields.get(Field::Hours);
+    if (fields.meridiem != '\0') {
+        if (hours < 1 || hours > 12) {
+            return PatternFailure(ParseValidation::HourNotForMeridiem);
+        }
+        hours = hours % 12 + (fields.meridiem == 'p' ? 12 : 0);
     }
-    if (isEpoch) {
+    Outcome<PatternReading, PatternFailure> outcome{
+        PatternReading{parts, DateTimeFields(), fields.offsetMinutes}};
+    DateTimeFields& numbers = outcome->fields;
+    if (fields.isEpoch()) {
         // Seconds since 1970 were checked against the range of years as they were read.
-        return PatternReading{nanosOf(fields.seconds, fields.nanoseconds), fields.offsetMinutes};
+        numbers = fieldsFromCount(timeCountOfSeconds(fields.epochSeconds, fields.nanoseconds));
+        return outcome;
     }
-    const std::int64_t year = fields.year.value_or(defaultYear);
-    const Outcome<NanoCount> count =
-        fields.ordinal ? countOnOrdinal(fields, year, lenient) : countOnDate(fields, year, lenient);
-    if (!count) {
-        return count.failure();
+    numbers.year = fields.get(Field::Year);
+    numbers.month = static_cast<std::uint64_t>(fields.get(Field::Month));
+    numbers.day = static_cast<std::uint64_t>(fields.get(Field::Day));
+    numbers.hours = hours;
+    numbers.minutes = fields.get(Field::Minutes);
+    numbers.seconds = fields.get(Field::Seconds);
+    numbers.nanoseconds = fields.nanoseconds;
+    Problem problem = fields.has(Field::Ordinal)
+                          ? carryOverOrdinal(numbers, fields.get(Field::Ordinal), lenient)
+                          : carryOverDate(numbers, lenient);
+    if (!problem && (numbers.year < lowestYear || numbers.year > highestYear)) {
+        problem = ParseValidation::ResultYearOutOfRange;
     }
-    const std::int64_t reached = yearOf(*count);
-    if (reached < lowestYear || reached > highestYear) {
-        return ParseValidation::ResultYearOutOfRange;
+    if (problem) {
+        outcome = PatternFailure(*problem);
     }
-    return PatternReading{*count, fields.offsetMinutes};
+    return outcome;
 }
 
 } // namespace kvt::ex::datetime::detail

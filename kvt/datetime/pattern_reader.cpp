@@ -1,29 +1,19 @@
-// The pattern reader: the elements of the format one by one, each of which takes something from the value; then the
-// fields that were given are put together (pattern_fields.h).
+// The pattern reader: the elements of the format one by one, each of which takes something from the value by its row in
+// the table; then the fields that were given are put together (pattern_fields.h).
 //
-// A step answers by a bool whether the value fits. What is wrong with the format or the numbers as such, and not just
-// a mismatch, is kept in `failure_`, which outranks it.
+// A step answers by a bool whether the value fits. Why it does not is kept as a reason, for the trace; what is wrong
+// with the format or with a number as such, and not just a mismatch, outranks that.
 #include <kvt/datetime/detail/pattern_reader.h>
 
-#include <kvt/datetime/detail/calendar.h>
-#include <kvt/datetime/detail/system_bytes.h>
+#include <kvt/datetime/detail/nano_count.h>
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
 #include <array>
-#include <optional>
-#include <string>
 
 namespace kvt::ex::datetime::detail {
 
 namespace {
-
-constexpr std::string_view expansionOfT = "%H:%M:%S";
-
-constexpr std::array<std::string_view, 12> monthNames = {"january",   "february", "march",    "april",
-                                                         "may",       "june",     "july",     "august",
-                                                         "september", "october",  "november", "december"};
-constexpr std::size_t shortNameLength = 3;
 
 // 1000-01-01 and 10000-01-01, in seconds since 1970.
 constexpr std::int64_t firstSecond = -30'610'224'000;
@@ -39,10 +29,6 @@ constexpr bool isInRange(std::int64_t seconds, std::int64_t nanoseconds) {
     return seconds + nanoseconds / nanosPerSecond < endSecond;
 }
 
-constexpr bool isSpace(char c) {
-    return c == ' ' || (c >= '\t' && c <= '\r');
-}
-
 constexpr char lowered(char c) {
     return c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
 }
@@ -55,57 +41,21 @@ bool endsWith(std::string_view text, std::string_view tail) {
     return text.size() >= tail.size() && text.substr(text.size() - tail.size()) == tail;
 }
 
-std::int64_t nanosecondsOf(std::string_view fraction) {
-    return static_cast<std::int64_t>(fractionNanoseconds(fraction));
-}
-
-/// The bytes of the value that are still to be read.
-class Input {
-public:
-    explicit Input(std::string_view text) : rest_(text) {}
-
-    bool atEnd() const { return rest_.empty(); }
-    bool nextIs(char c) const { return !rest_.empty() && rest_.front() == c; }
-    bool nextIsDigit() const { return !rest_.empty() && isDigit(rest_.front()); }
-
-    bool take(char c) {
-        const bool taken = nextIs(c);
-        rest_.remove_prefix(taken ? 1 : 0);
-        return taken;
-    }
-    std::string_view takeBytes(std::size_t count) {
-        const std::string_view taken = rest_.substr(0, count);
-        rest_.remove_prefix(taken.size());
-        return taken;
-    }
-    template <typename Predicate>
-    std::string_view takeWhile(Predicate predicate, std::size_t most = std::string_view::npos) {
-        std::size_t count = 0;
-        while (count < rest_.size() && count < most && predicate(rest_[count])) {
-            ++count;
-        }
-        return takeBytes(count);
-    }
-
-private:
-    std::string_view rest_;
-};
-
-/// The number of a month, 1 to 12, whose name begins with or is `name`; none when there is no such month.
-std::optional<std::int64_t> monthOf(std::string_view name, std::size_t significant) {
+// The number of a month, 1 to 12, whose name begins with or is `name`, in any case; none when there is no such month.
+std::optional<std::int32_t> monthOf(std::string_view name, std::size_t significant) {
     for (std::size_t i = 0; i < monthNames.size(); ++i) {
         const std::string_view candidate = monthNames[i].substr(0, significant);
         if (std::equal(candidate.begin(), candidate.end(), name.begin(), name.end(),
-                       [](char left, char right) { return left == lowered(right); })) {
-            return static_cast<std::int64_t>(i) + 1;
+                       [](char left, char right) { return lowered(left) == lowered(right); })) {
+            return static_cast<std::int32_t>(i) + 1;
         }
     }
     return std::nullopt;
 }
 
-// ---- The elements of a format
+// ---- Words of unknown length
 
-// What a word of unknown length has to end in: the format behind the "*", up to white space or "$".
+// What such a word has to end in: the format behind the "*", up to white space or "$".
 std::string_view tailOf(std::string_view behind) {
     std::size_t length = 0;
     while (length < behind.size() && !isSpace(behind[length]) && behind[length] != '$') {
@@ -119,7 +69,8 @@ bool isFlag(std::string_view tail) {
 }
 
 bool isLiteralFlag(std::string_view tail) {
-    return isFlag(tail) && tail.size() > 1 && std::string_view("%*?").find(tail[1]) != std::string_view::npos;
+    const PatternRow* const row = isFlag(tail) ? rowOfElement(tail.substr(0, 2)) : nullptr;
+    return row != nullptr && row->reads.reading == Reading::Itself;
 }
 
 // How much of the tail is done with when the word has been read.
@@ -130,8 +81,30 @@ std::size_t coveredLength(std::string_view tail) {
     return tail.size();
 }
 
-// The first element of a format, which is not empty.
-std::string_view elementOf(std::string_view format) {
+// The parts that a result has by this format, which is looked at as a text: what stands in it behind a fuzzy word counts
+// as well. In the search for offsets even the second character of "%%" counts as the beginning of a flag, so that "%%z" asks for one.
+Parts partsOf(std::string_view format) noexcept {
+    Parts parts = noPart;
+    bool isSecondOfPair = false;
+    for (std::size_t at = 0; at + 1 < format.size(); ++at) {
+        if (format[at] != '%') {
+            isSecondOfPair = false;
+            continue;
+        }
+        const bool isModified = format[at + 1] == 'E' && at + 2 < format.size();
+        const PatternRow* const row = rowOfFlag(format[at + (isModified ? 2 : 1)], isModified);
+        if (row != nullptr) {
+            parts = parts |
+                    (isSecondOfPair ? static_cast<Parts>(row->reads.gives & offsetPart) : row->reads.gives);
+        }
+        isSecondOfPair = !isSecondOfPair && format[at + 1] == '%';
+    }
+    return parts;
+}
+
+} // namespace
+
+std::string_view elementOf(std::string_view format) noexcept {
     switch (format.front()) {
     case '%':
         return format.substr(0, format.size() > 1 && format[1] == 'E' ? 3 : 2);
@@ -142,294 +115,329 @@ std::string_view elementOf(std::string_view format) {
     }
 }
 
-// A part of a format that has been read, as it reads with every "%T" replaced.
-std::string expanded(std::string_view format) {
-    if (format.find("%T") == std::string_view::npos) {
-        return std::string(format);
-    }
-    std::string text;
-    while (!format.empty()) {
-        const std::string_view element = elementOf(format);
-        text += element == "%T" ? expansionOfT : element;
-        format.remove_prefix(element.size());
-    }
-    return text;
+// ---- The value
+
+inline bool PatternReader::take(char c) noexcept {
+    const bool isTaken = !isAtEnd() && *at_ == c;
+    at_ += isTaken ? 1 : 0;
+    return isTaken;
 }
 
-class PatternReader {
-public:
-    PatternReader(std::string_view value, std::string_view format, bool wantsOffset, bool lenient)
-        : input_(value), format_(format), wantsOffset_(wantsOffset), lenient_(lenient) {}
+inline std::string_view PatternReader::takeBytes(std::size_t count) noexcept {
+    const std::string_view taken(at_, std::min(count, static_cast<std::size_t>(valueEnd_ - at_)));
+    at_ += taken.size();
+    return taken;
+}
 
-    Outcome<PatternReading> run() {
-        while (at_ < format_.size()) {
-            const std::string_view element = elementOf(format_.substr(at_));
-            if (!readElement(element)) {
-                return failure();
-            }
-            at_ += element.size();
-        }
-        return instantOfFields(fields_, wantsOffset_, lenient_);
+template <typename Predicate>
+std::string_view PatternReader::takeWhile(Predicate predicate) noexcept {
+    const char* const begin = at_;
+    at_ = std::find_if_not(begin, valueEnd_, predicate);
+    return {begin, static_cast<std::size_t>(at_ - begin)};
+}
+
+// Up to `width` digits, or exactly that many; negative where there are not.
+inline std::int32_t PatternReader::takeNumber(unsigned width, bool exactWidth) noexcept {
+    const char* const begin = at_;
+    const char* const end =
+        valueEnd_ - begin > static_cast<std::ptrdiff_t>(width) ? begin + width : valueEnd_;
+    const char* place = begin;
+    std::int32_t number = 0;
+    for (; place != end && isDigit(*place); ++place) {
+        number = number * 10 + (*place - '0');
     }
-
-private:
-    // ---- The pass over the format. `at_` is where the present element begins.
-
-    Failure failure() {
-        if (failure_) {
-            return std::move(*failure_);
-        }
-        // Where two flags exclude each other it is the format that is wrong, whatever the value.
-        if (!fields_.epochFlag.empty() && fields_.hasOffset) {
-            return FormatStringBadCombo{std::string(fields_.epochFlag), "%z"};
-        }
-        return ParseMismatch{expanded(format_.substr(0, at_)), std::string(format_.substr(at_))};
+    at_ = place;
+    if (place == begin) {
+        stop(isAtEnd() ? StopReason::EndOfValue : StopReason::NotANumber);
+        return -1;
     }
-
-    bool readElement(std::string_view element) {
-        const char c = element.front();
-        if (c == '%') {
-            return readFlag(element);
-        }
-        afterNumber_ = false;
-        switch (c) {
-        case '$':
-            return input_.atEnd() && at_ + 1 == format_.size();
-        case '*':
-            return readFuzzyWord(tailOf(format_.substr(at_ + 1)));
-        case '?':
-            return !input_.takeBytes(1).empty();
-        default:
-            return input_.take(c);
-        }
+    if (exactWidth && place - begin < static_cast<std::ptrdiff_t>(width)) {
+        stop(StopReason::TooFewDigits);
+        return -1;
     }
+    return number;
+}
 
-    bool readFlag(std::string_view element) {
-        if (element == "%T") {
-            return readTime();
-        }
-        if (element.size() == 2 && element[1] != 'E') {
-            return readFlag(element[1]);
-        }
-        if (element == "%Es") {
-            return readEpochSeconds(element);
-        }
-        return element == "%Ez" ? readOffset() : failByUnknownFlag(element.size());
-    }
+// "." and digits, as many as there are, in nanoseconds; 0 without them.
+std::int64_t PatternReader::takeFraction() noexcept {
+    return take('.') ? static_cast<std::int64_t>(fractionNanoseconds(takeWhile(isDigit))) : 0;
+}
 
-    // A failure within the expansion is one of the element "%T".
-    bool readTime() { return readFlag('H') && readColon() && readFlag('M') && readColon() && readFlag('S'); }
+inline bool PatternReader::stop(StopReason reason) noexcept {
+    stopReason_ = reason;
+    return false;
+}
 
-    bool readColon() {
-        afterNumber_ = false;
-        return input_.take(':');
-    }
+inline bool PatternReader::stopAtCharacter() noexcept {
+    return stop(isAtEnd() ? StopReason::EndOfValue : StopReason::OtherCharacter);
+}
 
-    // One word of the input, which has to end in what the format says comes next; a flag that is not a character
-    // reads what stands behind the word. Two words of unknown length cannot be told apart.
-    bool readFuzzyWord(std::string_view tail) {
-        const std::string_view word = input_.takeWhile([](char c) { return !isSpace(c); });
-        if (word.empty()) {
-            return false;
-        }
-        if (isFlag(tail)) {
-            return !isLiteralFlag(tail) || endsWith(word, tail.substr(1));
-        }
-        const bool isFuzzy = !tail.empty() && (tail.front() == '*' || tail.front() == '?');
-        return !isFuzzy && endsWith(word, tail);
-    }
-
-    // ---- The flags
-
-    bool readFlag(char flag) {
-        switch (flag) {
-        case '$':
-        case '%':
-        case '*':
-        case '?':
-            afterNumber_ = false;
-            return input_.take(flag);
-        case 'Y':
-            return readNumber(fields_.year, 4, lowestYear, highestYear, false);
-        case 'm':
-        case 'N':
-            return readNumber(fields_.month, 2, 1, 12, lenient_);
-        case 'd':
-        case 'e':
-            return readNumber(fields_.day, 2, 1, 31, lenient_);
-        case 'j':
-            afterNumber_ = false; // It takes what digits there are also right behind another number.
-            return readNumber(fields_.ordinal, 3, 1, 366, lenient_);
-        case 'H':
-        case 'k':
-            return readNumber(fields_.hours, 2, 0, 23, lenient_);
-        case 'I':
-        case 'l':
-            return readNumber(fields_.hours, 2, 1, 12, false);
-        case 'M':
-            return readNumber(fields_.minutes, 2, 0, 59, lenient_);
-        case 'S':
-            return readSeconds();
-        case 'b':
-            return readShortMonth();
-        case 'B':
-            return readFullMonth();
-        case 'p':
-            return readMeridiem();
-        case 's':
-            return readEpochSeconds("%s");
-        case 'z':
-            return readOffset();
-        default:
-            return failByUnknownFlag(2);
-        }
-    }
-
-    bool failByUnknownFlag(std::size_t length) {
-        return fail(ParseUnknownFlag{std::string(wholeCharacters(format_.substr(at_), length))});
-    }
-
-    // Up to `width` digits, or exactly that many; none where there are too few.
-    std::optional<std::int64_t> readDigits(std::size_t width, bool exactWidth) {
-        const std::string_view digits = input_.takeWhile(isDigit, width);
-        if (digits.empty() || (exactWidth && digits.size() < width)) {
-            return std::nullopt;
-        }
-        return static_cast<std::int64_t>(digitsValue(digits));
-    }
-
-    // Directly behind another number a field takes its whole width, as in "%Y%m%d".
-    bool readNumber(std::optional<std::int64_t>& field, std::size_t width, std::int64_t lowest,
-                    std::int64_t highest, bool isUnbounded) {
-        field = readDigits(width, afterNumber_);
-        afterNumber_ = true;
-        return field && *field >= lowest && (isUnbounded || *field <= highest);
-    }
-
-    bool readSeconds() {
-        std::optional<std::int64_t> whole;
-        if (!readNumber(whole, 2, 0, 59, lenient_)) {
-            return false;
-        }
-        const std::string_view fraction = input_.take('.') ? input_.takeWhile(isDigit) : std::string_view();
-        if (fields_.epochFlag.empty()) {
-            fields_.seconds = *whole;
-            fields_.nanoseconds = nanosecondsOf(fraction);
-        }
-        fields_.hasSeconds = true;
-        return true;
-    }
-
-    // An unknown name leaves the month as it was; whether that will do is seen at the end.
-    bool readShortMonth() {
-        afterNumber_ = false;
-        const std::string_view name = input_.takeBytes(shortNameLength);
-        if (name.size() < shortNameLength) {
-            return false;
-        }
-        if (const auto month = monthOf(name, shortNameLength)) {
-            fields_.month = month;
-        }
-        return true;
-    }
-
-    bool readFullMonth() {
-        afterNumber_ = false;
-        fields_.month = monthOf(input_.takeWhile(isLetter), std::string_view::npos);
-        return fields_.month.has_value();
-    }
-
-    bool readMeridiem() {
-        afterNumber_ = false;
-        const std::string_view text = input_.takeBytes(2);
-        if (text.size() < 2 || lowered(text[1]) != 'm' ||
-            (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
-            return false;
-        }
-        fields_.meridiem = lowered(text[0]);
-        return true;
-    }
-
-    // Seconds since 1970: an optional "-", digits, and a fraction. They make the fields of the value superfluous.
-    bool readEpochSeconds(std::string_view flag) {
-        fields_.epochFlag = flag;
-        fields_.hasSeconds = true;
-        afterNumber_ = true;
-        const bool isNegative = input_.take('-');
-        const std::string_view whole = input_.takeWhile(isDigit);
-        const bool hasPoint = input_.take('.');
-        const std::string_view fraction = hasPoint ? input_.takeWhile(isDigit) : std::string_view();
-        const auto text = [&] {
-            return std::string(isNegative ? "-" : "")
-                .append(whole)
-                .append(hasPoint ? "." : "")
-                .append(fraction);
-        };
-        if (whole.empty()) {
-            return false;
-        }
-        if (whole.size() + (isNegative ? 1 : 0) > longestSeconds) {
-            return fail(ParseEpochTimeRange{text()});
-        }
-        // The fraction has the sign of the whole seconds, which "-0" does not have.
-        const std::int64_t seconds = static_cast<std::int64_t>(digitsValue(whole)) * (isNegative ? -1 : 1);
-        const std::int64_t nanoseconds = seconds < 0 ? -nanosecondsOf(fraction) : nanosecondsOf(fraction);
-        if (!isInRange(seconds, nanoseconds)) {
-            return fail(ParseEpochTimeRange{text()});
-        }
-        fields_.seconds = seconds;
-        fields_.nanoseconds = nanoseconds;
-        return true;
-    }
-
-    bool readOffset() {
-        fields_.hasOffset = true;
-        afterNumber_ = true;
-        if (input_.take('Z')) {
-            fields_.offsetMinutes = 0;
-            return true;
-        }
-        const bool isNegative = input_.nextIs('-');
-        if (!isNegative && !input_.nextIs('+')) {
-            return false;
-        }
-        input_.takeBytes(1);
-        const auto hours = readDigits(2, true);
-        if (!hours) {
-            return false;
-        }
-        const bool hasColon = input_.take(':');
-        std::optional<std::int64_t> minutes = 0;
-        if (hasColon || input_.nextIsDigit()) {
-            minutes = readDigits(2, true);
-        }
-        if (!minutes) {
-            return false;
-        }
-        fields_.offsetMinutes = static_cast<std::int32_t>((*hours * 60 + *minutes) * (isNegative ? -1 : 1));
-        return true;
-    }
-
-    bool fail(Failure failure) {
-        failure_ = std::move(failure);
+// Directly behind another number a field takes its whole width, as in "%Y%m%d".
+inline bool PatternReader::readNumber(const ReadRule& rule, bool isInRow) {
+    const std::int32_t number = takeNumber(rule.width, isInRow && rule.isExactInRow);
+    if (number < 0) {
         return false;
     }
+    if (number < rule.lowest || (number > rule.highest && !(lenient_ && rule.lenientLifts))) {
+        return stop(StopReason::OutOfBounds);
+    }
+    fields_.set(rule.field, number);
+    return true;
+}
 
-    Input input_;
-    std::string_view format_;
-    bool wantsOffset_;
-    bool lenient_;
-    std::size_t at_ = 0;
-    bool afterNumber_ = false;
-    PatternFields fields_;
-    std::optional<Failure> failure_;
-};
+// ---- The pass over the format
 
-} // namespace
+inline bool PatternReader::read(const PatternRow& row) {
+    const bool wasAfterNumber = afterNumber_;
+    afterNumber_ = isNumeric(row.reads.reading);
+    switch (row.reads.reading) {
+    case Reading::Number:
+        return readNumber(row.reads, wasAfterNumber);
+    case Reading::Seconds:
+        return readSeconds(row.reads, wasAfterNumber);
+    case Reading::Time:
+        return readTime(wasAfterNumber);
+    case Reading::ShortMonth:
+        return readShortMonth();
+    case Reading::FullMonth:
+        return readFullMonth();
+    case Reading::Meridiem:
+        return readMeridiem();
+    case Reading::EpochSeconds:
+        return readEpochSeconds(row.element);
+    case Reading::Offset:
+        return readOffset();
+    default: // the character itself
+        hidesFlags_ = true;
+        return take(row.element.back()) || stopAtCharacter();
+    }
+}
 
-Outcome<PatternReading> readFields(std::string_view value, std::string_view format, bool wantsOffset,
-                                   bool lenient) {
-    return PatternReader(value, format, wantsOffset, lenient).run();
+bool PatternReader::readNext() {
+    const char c = *next_;
+    if (c == '%') {
+        const bool isModified = formatEnd_ - next_ > 1 && next_[1] == 'E';
+        const std::ptrdiff_t length = isModified ? 3 : 2;
+        const PatternRow* const row =
+            formatEnd_ - next_ >= length ? rowOfFlag(next_[length - 1], isModified) : nullptr;
+        if (row == nullptr || row->reads.reading == Reading::Unknown) {
+            culprit_ = restOfFormat().substr(0, static_cast<std::size_t>(length));
+            return stop(StopReason::UnknownFlag);
+        }
+        if (!read(*row)) {
+            return false;
+        }
+        parts_ = parts_ | row->reads.gives;
+        next_ += length;
+        return true;
+    }
+    if (const PatternRow* const row = rowOfCharacter(c)) {
+        return readSpecial(*row);
+    }
+    if (!take(c)) {
+        return stopAtCharacter();
+    }
+    afterNumber_ = false;
+    ++next_;
+    return true;
+}
+
+Outcome<PatternReading, PatternFailure> readFields(std::string_view value, std::string_view format,
+                                                   bool lenient) {
+    return PatternReader(value, format, lenient).readAll();
+}
+
+Outcome<PatternReading, PatternFailure> PatternReader::readAll() {
+    while (!isDone()) {
+        if (!readNext()) {
+            return failure();
+        }
+    }
+    return readingOf(fields_, parts(), lenient_);
+}
+
+bool PatternReader::goOnBy(std::string_view format) noexcept {
+    const std::size_t place = formatPlace();
+    if (stopReason_ != StopReason::ValueGoesOn ||
+        format.substr(0, place) != std::string_view(formatBegin_, place)) {
+        return false;
+    }
+    formatBegin_ = format.data();
+    formatEnd_ = formatBegin_ + format.size();
+    next_ = formatBegin_ + place;
+    stopReason_ = StopReason::None;
+    return true;
+}
+
+bool PatternReader::readSpecial(const PatternRow& row) {
+    std::size_t length = 1;
+    switch (row.reads.reading) {
+    case Reading::End:
+        if (!isAtEnd()) {
+            return stop(StopReason::ValueGoesOn);
+        }
+        if (formatEnd_ - next_ > 1) {
+            return stop(StopReason::FormatGoesOn);
+        }
+        break;
+    case Reading::Word: {
+        const std::string_view tail = tailOf(restOfFormat().substr(1));
+        if (!readWord(tail)) {
+            return false;
+        }
+        hidesFlags_ = true;
+        length += coveredLength(tail);
+        break;
+    }
+    default: // any character
+        if (takeBytes(1).empty()) {
+            return stop(StopReason::EndOfValue);
+        }
+    }
+    afterNumber_ = false;
+    next_ += length;
+    return true;
+}
+
+// One word of the value, which has to end in what the format says comes next; a flag that is not a character reads what
+// stands behind the word. Two words of unknown length cannot be told apart.
+bool PatternReader::readWord(std::string_view tail) {
+    const std::string_view word = takeWhile([](char c) { return !isSpace(c); });
+    if (word.empty()) {
+        return stopAtCharacter();
+    }
+    if (isFlag(tail)) {
+        return !isLiteralFlag(tail) || endsWith(word, tail.substr(1)) || stop(StopReason::WordEndsOtherwise);
+    }
+    if (!tail.empty() && (tail.front() == '*' || tail.front() == '?')) {
+        return stop(StopReason::NextIsFuzzyToo);
+    }
+    return endsWith(word, tail) || stop(StopReason::WordEndsOtherwise);
+}
+
+PatternFailure PatternReader::failure() const {
+    if (stopReason_ == StopReason::UnknownFlag) {
+        return ParseUnknownFlag{culprit_};
+    }
+    if (stopReason_ == StopReason::SecondsOutOfRange) {
+        return ParseEpochTimeRange{culprit_};
+    }
+    // Where two flags exclude each other it is the format that is wrong, whatever the value.
+    if (fields_.isEpoch() && fields_.hasOffset) {
+        return FormatStringBadCombo{fields_.epochFlag, "%z"};
+    }
+    return ParseMismatch{formatPlace()};
+}
+
+Parts PatternReader::parts() const noexcept {
+    return hidesFlags_ ? partsOf({formatBegin_, formatPlace()}) : parts_;
+}
+
+// ---- The flags
+
+// With seconds since 1970 in the format, those of the minute do not count.
+bool PatternReader::readSeconds(const ReadRule& rule, bool isInRow) {
+    if (!readNumber(rule, isInRow)) {
+        return false;
+    }
+    const std::int64_t nanoseconds = takeFraction();
+    if (!fields_.isEpoch()) {
+        fields_.nanoseconds = nanoseconds;
+    }
+    return true;
+}
+
+// A failure within the expansion is one of the element "%T".
+bool PatternReader::readTime(bool isInRow) {
+    afterNumber_ = isInRow;
+    for (std::string_view rest = timeExpansion; !rest.empty();) {
+        const std::string_view element = elementOf(rest);
+        const PatternRow* const row = rowOfElement(element);
+        if (row != nullptr ? !read(*row) : !take(element.front())) {
+            return row != nullptr ? false : stopAtCharacter();
+        }
+        afterNumber_ = row != nullptr;
+        rest.remove_prefix(element.size());
+    }
+    return true;
+}
+
+// An unknown name leaves the month as it was; whether that will do is seen at the end.
+bool PatternReader::readShortMonth() {
+    const std::string_view name = takeBytes(shortNameLength);
+    if (name.size() < shortNameLength) {
+        return stop(StopReason::EndOfValue);
+    }
+    if (const auto month = monthOf(name, shortNameLength)) {
+        fields_.set(Field::Month, *month);
+    }
+    return true;
+}
+
+bool PatternReader::readFullMonth() {
+    const auto month = monthOf(takeWhile(isLetter), std::string_view::npos);
+    if (!month) {
+        return stop(StopReason::UnknownName);
+    }
+    fields_.set(Field::Month, *month);
+    return true;
+}
+
+bool PatternReader::readMeridiem() {
+    const std::string_view text = takeBytes(2);
+    if (text.size() < 2 || lowered(text[1]) != 'm' || (lowered(text[0]) != 'a' && lowered(text[0]) != 'p')) {
+        return stop(text.size() < 2 ? StopReason::EndOfValue : StopReason::UnknownName);
+    }
+    fields_.meridiem = lowered(text[0]);
+    return true;
+}
+
+// Seconds since 1970: an optional "-", digits, and a fraction. They make the fields of the value superfluous.
+bool PatternReader::readEpochSeconds(std::string_view flag) {
+    fields_.epochFlag = flag;
+    const char* const begin = at_;
+    const bool isNegative = take('-');
+    const std::string_view whole = takeWhile(isDigit);
+    const std::int64_t fraction = takeFraction();
+    if (whole.empty()) {
+        return stop(StopReason::NotANumber);
+    }
+    culprit_ = {begin, static_cast<std::size_t>(at_ - begin)};
+    if (whole.size() + (isNegative ? 1 : 0) > longestSeconds) {
+        return stop(StopReason::SecondsOutOfRange);
+    }
+    // The fraction has the sign of the whole seconds, which "-0" does not have.
+    const std::int64_t seconds = static_cast<std::int64_t>(digitsValue(whole)) * (isNegative ? -1 : 1);
+    const std::int64_t nanoseconds = seconds < 0 ? -fraction : fraction;
+    if (!isInRange(seconds, nanoseconds)) {
+        return stop(StopReason::SecondsOutOfRange);
+    }
+    fields_.epochSeconds = seconds;
+    fields_.nanoseconds = nanoseconds;
+    return true;
+}
+
+bool PatternReader::readOffset() {
+    fields_.hasOffset = true;
+    if (take('Z')) {
+        fields_.offsetMinutes = 0;
+        return true;
+    }
+    const bool isNegative = take('-');
+    if (!isNegative && !take('+')) {
+        return stop(StopReason::NotAnOffset);
+    }
+    const std::int32_t hours = takeNumber(2, true);
+    if (hours < 0) {
+        return false;
+    }
+    const bool hasMinutes = take(':') || (!isAtEnd() && isDigit(*at_));
+    const std::int32_t minutes = hasMinutes ? takeNumber(2, true) : 0;
+    if (minutes < 0) {
+        return false;
+    }
+    fields_.offsetMinutes = (hours * 60 + minutes) * (isNegative ? -1 : 1);
+    return true;
 }
 
 } // namespace kvt::ex::datetime::detail

@@ -1,56 +1,26 @@
-// The pattern writer: one pass over the format, and a few digits for each flag. Names are English, as in the "C"
-// locale.
+// The pattern writer: one pass over the format, and a few digits for each flag, by its row in the table. Names are
+// English, as in the "C" locale.
 #include <kvt/datetime/detail/pattern_writer.h>
 
 #include <kvt/datetime/detail/calendar.h>
+#include <kvt/datetime/detail/nano_count.h>
+#include <kvt/datetime/detail/pattern_table.h>
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
-#include <array>
-#include <cstring>
 
 namespace kvt::ex::datetime::detail {
 
 namespace {
 
-constexpr std::array<std::string_view, 12> monthNames = {"January",   "February", "March",    "April",
-                                                         "May",       "June",     "July",     "August",
-                                                         "September", "October",  "November", "December"};
-constexpr std::array<std::string_view, 7> weekdayNames = {"Sunday",   "Monday", "Tuesday", "Wednesday",
-                                                          "Thursday", "Friday", "Saturday"};
-constexpr std::size_t shortNameLength = 3;
 constexpr std::int64_t daysPerWeek = 7;
-
-/// A wall clock in the numbers that flags show.
-struct Fields {
-    explicit Fields(const NanoCount& count) {
-        const FloorQuotient days = floorDivide(count, nanosPerDay);
-        date = civilFromDays(days.quotient);
-        yearDay = days.quotient - daysFromCivil(date.year, 1, 1);
-        // 1970-01-01 was a Thursday.
-        weekday = ((days.quotient + 4) % daysPerWeek + daysPerWeek) % daysPerWeek;
-        const std::int64_t seconds = days.remainder / nanosPerSecond;
-        nanosecond = static_cast<std::uint64_t>(days.remainder % nanosPerSecond);
-        hour = static_cast<unsigned>(seconds / secondsPerHour);
-        minute = static_cast<unsigned>(seconds / secondsPerMinute % 60);
-        second = static_cast<unsigned>(seconds % secondsPerMinute);
-    }
-
-    CivilDate date{};
-    std::int64_t yearDay; ///< from 0
-    std::int64_t weekday; ///< 0 is Sunday
-    unsigned hour;
-    unsigned minute;
-    unsigned second;
-    std::uint64_t nanosecond;
-};
 
 class PatternWriter {
 public:
-    PatternWriter(PatternText& out, const NanoCount& count, std::optional<std::int32_t> offsetMinutes)
-        : out_(out), count_(count), offsetMinutes_(offsetMinutes), fields_(count) {}
+    PatternWriter(TextBuffer& out, const DateTimeFields& fields, std::optional<std::int32_t> offsetMinutes)
+        : out_(out), fields_(fields), offsetMinutes_(offsetMinutes) {}
 
-    std::optional<Failure> run(std::string_view format) {
+    std::optional<PatternFailure> run(std::string_view format) {
         while (!format.empty()) {
             const std::size_t literal = std::min(format.find('%'), format.size());
             out_.put(format.substr(0, literal));
@@ -60,7 +30,9 @@ public:
                 break;
             }
             const bool isModified = format[1] == 'E' && format.size() > 2;
-            write(format[isModified ? 2 : 1], isModified);
+            if (const PatternRow* const row = rowOfFlag(format[isModified ? 2 : 1], isModified)) {
+                write(row->writes);
+            }
             if (failure_) {
                 return *failure_;
             }
@@ -73,132 +45,120 @@ public:
     }
 
 private:
-    void write(char flag, bool isModified) {
-        const auto month = monthNames[fields_.date.month - 1];
-        const auto weekday = weekdayNames[static_cast<std::size_t>(fields_.weekday)];
-        switch (flag) {
-        case 'Y':
-            return number(fields_.date.year, 4);
-        case 'y':
-            return number(fields_.date.year % 100, 2);
-        case 'm':
-            return number(fields_.date.month, 2);
-        case 'N':
-            return number(fields_.date.month, 1);
-        case 'b':
-            return text(month.substr(0, shortNameLength));
-        case 'B':
-            return text(month);
-        case 'd':
-            return number(fields_.date.day, 2);
-        case 'e':
-            return number(fields_.date.day, 1);
-        case 'j':
-            return number(fields_.yearDay + 1, 3);
-        case 'a':
-            return text(weekday.substr(0, shortNameLength));
-        case 'A':
-            return text(weekday);
-        case 'u':
-            return number(fields_.weekday == 0 ? daysPerWeek : fields_.weekday, 1);
-        case 'w':
-            return number(fields_.weekday, 1);
-        case 'U':
-            return number((fields_.yearDay + daysPerWeek - fields_.weekday) / daysPerWeek, 2);
-        case 'W':
-            return number((fields_.yearDay + daysPerWeek - (fields_.weekday + 6) % daysPerWeek) / daysPerWeek,
-                          2);
+    void write(const WriteRule& rule) {
+        switch (rule.writing) {
+        case Writing::Year:
+            return number(fields_.year, rule.width);
+        case Writing::YearOfCentury:
+            return number(fields_.year % 100, rule.width);
+        case Writing::Month:
+            return number(fields_.month, rule.width);
+        case Writing::ShortMonth:
+            return out_.put(monthName().substr(0, shortNameLength));
+        case Writing::FullMonth:
+            return out_.put(monthName());
+        case Writing::Day:
+            return number(fields_.day, rule.width);
+        case Writing::YearDay:
+            return number(yearDay() + 1, rule.width);
+        case Writing::ShortWeekday:
+            return out_.put(weekdayName().substr(0, shortNameLength));
+        case Writing::FullWeekday:
+            return out_.put(weekdayName());
+        case Writing::WeekdayFromMonday:
+            return number(weekday() == 0 ? daysPerWeek : weekday(), rule.width);
+        case Writing::WeekdayFromSunday:
+            return number(weekday(), rule.width);
+        case Writing::WeekFromSunday:
+            return number((yearDay() + daysPerWeek - weekday()) / daysPerWeek, rule.width);
+        case Writing::WeekFromMonday:
+            return number((yearDay() + daysPerWeek - (weekday() + 6) % daysPerWeek) / daysPerWeek,
+                          rule.width);
         default:
-            return writeTimeFlag(flag, isModified);
+            return writeOfTime(rule);
         }
     }
 
-    void writeTimeFlag(char flag, bool isModified) {
-        switch (flag) {
-        case 'H':
-            return number(fields_.hour, 2);
-        case 'k':
-            return number(fields_.hour, 1);
-        case 'I':
-            return number(hourOfHalfDay(), 2);
-        case 'l':
-            return number(hourOfHalfDay(), 1);
-        case 'p':
-            return text(fields_.hour < 12 ? "AM" : "PM");
-        case 'M':
-            return number(fields_.minute, 2);
-        case 'S':
-            return secondsWithFraction();
-        case 'T':
-            number(fields_.hour, 2);
-            text(":");
-            number(fields_.minute, 2);
-            text(":");
-            return secondsWithFraction();
-        case 's':
-            return epochSeconds(isModified);
-        case 'z':
-            return offset(isModified);
-        default:
-            out_.put(flag); // "%%"
-        }
-    }
-
-    unsigned hourOfHalfDay() const { return fields_.hour % 12 == 0 ? 12 : fields_.hour % 12; }
-
-    void text(std::string_view characters) { out_.put(characters); }
-
-    void number(std::int64_t value, unsigned width) {
-        out_.putNumber(static_cast<std::uint64_t>(value), width);
-    }
-
-    void secondsWithFraction() {
-        out_.putNumber(fields_.second, 2);
-        if (fields_.nanosecond != 0) {
-            TextBuffer digits;
-            digits.putFraction(fields_.nanosecond);
-            out_.put(digits.view());
-        }
-    }
-
-    // From UTC, or with `isLocal` from the wall clock as it stands.
-    void epochSeconds(bool isLocal) {
-        if (isLocal == offsetMinutes_.has_value()) {
-            failure_ = isLocal ? FormatFlag::EpochWithOffset : FormatFlag::EpochWithoutOffset;
+    void writeOfTime(const WriteRule& rule) {
+        switch (rule.writing) {
+        case Writing::Hour:
+            return number(fields_.hours, rule.width);
+        case Writing::HalfDayHour:
+            return number(fields_.hours % 12 == 0 ? 12 : fields_.hours % 12, rule.width);
+        case Writing::Meridiem:
+            return out_.put(fields_.hours < 12 ? "AM" : "PM");
+        case Writing::Minute:
+            return number(fields_.minutes, rule.width);
+        case Writing::Seconds:
+            number(fields_.seconds, rule.width);
+            return out_.putFraction(static_cast<std::uint64_t>(fields_.nanoseconds));
+        case Writing::Time:
+            (void)run(timeExpansion);
             return;
+        case Writing::EpochSeconds:
+            return offsetMinutes_ ? epochSeconds(*offsetMinutes_) : fail("%s");
+        case Writing::LocalEpochSeconds:
+            return offsetMinutes_ ? fail("%Es") : epochSeconds(0);
+        case Writing::Offset:
+            return offset(false);
+        case Writing::OffsetOrZ:
+            return offset(true);
+        default:
+            out_.put('%');
         }
+    }
+
+    // ---- Of the date
+
+    std::int64_t days() const {
+        return daysFromCivil(fields_.year, static_cast<unsigned>(fields_.month),
+                             static_cast<unsigned>(fields_.day));
+    }
+    // From 0.
+    std::int64_t yearDay() const { return days() - daysFromCivil(fields_.year, 1, 1); }
+    // From Sunday, which is 0; 1970-01-01 was a Thursday.
+    std::int64_t weekday() const { return ((days() + 4) % daysPerWeek + daysPerWeek) % daysPerWeek; }
+    std::string_view monthName() const { return monthNames[fields_.month - 1]; }
+    std::string_view weekdayName() const { return weekdayNames[static_cast<std::size_t>(weekday())]; }
+
+    // ---- Of the time
+
+    // The seconds and nanoseconds are of one sign in the text.
+    void epochSeconds(std::int64_t offsetMinutes) {
         hasEpoch_ = true;
-        NanoCount count = count_ - NanoCount(std::int64_t{offsetMinutes_.value_or(0)} * nanosPerMinute);
-        TextBuffer digits;
-        if (count < 0) {
-            digits.put('-');
-            count = -count;
+        std::int64_t seconds = days() * secondsPerDay + fields_.hours * secondsPerHour +
+                               (fields_.minutes - offsetMinutes) * secondsPerMinute + fields_.seconds;
+        std::int64_t nanoseconds = fields_.nanoseconds;
+        if (seconds < 0) {
+            out_.put('-');
+            seconds = -seconds - (nanoseconds != 0 ? 1 : 0);
+            nanoseconds = nanoseconds != 0 ? nanosPerSecond - nanoseconds : 0;
         }
-        const FloorQuotient seconds = floorDivide(count, nanosPerSecond);
-        digits.putNumber(static_cast<std::uint64_t>(seconds.quotient));
-        digits.putFraction(static_cast<std::uint64_t>(seconds.remainder));
-        out_.put(digits.view());
+        out_.putNumber(static_cast<std::uint64_t>(seconds));
+        out_.putFraction(static_cast<std::uint64_t>(nanoseconds));
     }
 
     void offset(bool zeroIsZ) {
         if (!offsetMinutes_) {
-            failure_ = FormatFlag::OffsetMissing;
-            return;
+            return fail("%z");
         }
         hasOffset_ = true;
         if (zeroIsZ && *offsetMinutes_ == 0) {
-            out_.put('Z');
-            return;
+            return out_.put('Z');
         }
-        TextBuffer digits;
-        writeOffset(digits, *offsetMinutes_);
-        out_.put(digits.view());
+        writeOffset(out_, *offsetMinutes_);
     }
 
-    PatternText& out_;
-    NanoCount count_;
+    void number(std::uint64_t value, unsigned width) {
+        width == 2 ? out_.putPair(static_cast<unsigned>(value)) : out_.putNumber(value, width);
+    }
+    void number(std::int64_t value, unsigned width) { number(static_cast<std::uint64_t>(value), width); }
+
+    void fail(std::string_view flag) { failure_ = FormatFlag{flag}; }
+
+    TextBuffer& out_;
+    const DateTimeFields& fields_;
     std::optional<std::int32_t> offsetMinutes_;
-    Fields fields_;
     std::optional<FormatFlag> failure_;
     bool hasEpoch_ = false;
     bool hasOffset_ = false;
@@ -206,34 +166,10 @@ private:
 
 } // namespace
 
-void PatternText::put(std::string_view text) {
-    if (long_.empty() && size_ + text.size() <= short_.size()) {
-        std::memcpy(short_.data() + size_, text.data(), text.size());
-        size_ += text.size();
-        return;
-    }
-    if (long_.empty()) {
-        long_.assign(short_.data(), size_);
-    }
-    long_ += text;
-}
-
-void PatternText::putNumber(std::uint64_t number, unsigned width) {
-    std::array<char, 20> digits;
-    std::size_t first = digits.size();
-    do {
-        digits[--first] = static_cast<char>('0' + number % 10);
-        number /= 10;
-    } while (number != 0);
-    while (digits.size() - first < width) {
-        digits[--first] = '0';
-    }
-    put({digits.data() + first, digits.size() - first});
-}
-
-std::optional<Failure> renderFields(PatternText& out, std::string_view format, const NanoCount& count,
-                                    std::optional<std::int32_t> offsetMinutes) {
-    return PatternWriter(out, count, offsetMinutes).run(format);
+std::optional<PatternFailure> renderFields(TextBuffer& out, std::string_view format,
+                                           const DateTimeFields& fields,
+                                           std::optional<std::int32_t> offsetMinutes) {
+    return PatternWriter(out, fields, offsetMinutes).run(format);
 }
 
 } // namespace kvt::ex::datetime::detail

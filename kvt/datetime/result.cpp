@@ -32,15 +32,6 @@ std::optional<LogMessageInfo> messageOf(const Failure& failure) {
         return message(message_number::partOutOfRange,
                        {range->value.view(), range->part, range->lowest, range->highest});
     }
-    if (const auto* mismatch = std::get_if<ParseMismatch>(&failure)) {
-        return message(message_number::formatMismatch, {mismatch->matched, mismatch->rest});
-    }
-    if (const auto* epoch = std::get_if<ParseEpochTimeRange>(&failure)) {
-        return message(message_number::epochTimeOutOfRange, {epoch->seconds});
-    }
-    if (const auto* flags = std::get_if<FormatStringBadCombo>(&failure)) {
-        return message(message_number::flagsExcludeEachOther, {flags->first, flags->second});
-    }
     return std::nullopt;
 }
 

@@ -34,8 +34,8 @@ bool isContinuation(char c) {
 
 SystemBytes::SystemBytes(std::string_view text) : view_(text) {
     if (!isSameInBoth(text)) {
-        converted_ = UString<27>(UString<0>(UStringView<0>(text)));
-        view_ = {converted_.rawData(), converted_.size()};
+        converted_.emplace(UString<0>(UStringView<0>(text)));
+        view_ = {converted_->rawData(), converted_->size()};
     }
 }
 
@@ -52,6 +52,14 @@ UString<0> readableSystemBytes(std::string_view bytes) {
     }
 }
 
+void appendReadable(UStringArray<0>& parameters, std::string_view bytes) {
+    if (isSameInBoth(bytes)) {
+        parameters.emplace_back(UStringView<0>(bytes));
+    } else {
+        parameters.push_back(readableSystemBytes(bytes));
+    }
+}
+
 std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
     if (isSystemUtf8() && length <= bytes.size() && !isAscii(bytes.substr(length - 1, 1))) {
         while (length < bytes.size() && isContinuation(bytes[length])) {
@@ -61,15 +69,14 @@ std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
     return bytes.substr(0, length);
 }
 
-void cutBetweenCharacters(std::string& front, std::string& back) {
-    if (!isSystemUtf8()) {
-        return;
+std::size_t placeBetweenCharacters(std::string_view bytes, std::size_t place) noexcept {
+    if (isSystemUtf8()) {
+        while (place > 0 && place < bytes.size() && isContinuation(bytes[place]) &&
+               !isAscii(bytes.substr(place - 1, 1))) {
+            --place;
+        }
     }
-    while (!front.empty() && !back.empty() && isContinuation(back.front()) &&
-           !isAscii(front.substr(front.size() - 1))) {
-        back.insert(back.begin(), front.back());
-        front.pop_back();
-    }
+    return place;
 }
 
 } // namespace kvt::ex::datetime::detail

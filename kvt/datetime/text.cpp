@@ -17,9 +17,10 @@ constexpr double powersOfTen[] = {1e0, 1e1, 1e2,  1e3,  1e4,  1e5,  1e6,  1e7,
                                   1e8, 1e9, 1e10, 1e11, 1e12, 1e13, 1e14, 1e15};
 constexpr std::size_t exactDigits = 15; // 10^15 is below 2^53
 
-constexpr bool isSpace(char c) noexcept {
-    return c == ' ' || (c >= '\t' && c <= '\r');
-}
+constexpr std::size_t nanosecondDigits = 9;
+// What makes nanoseconds of a fraction with so many digits.
+constexpr std::uint64_t scaleOfDigits[] = {1'000'000'000, 100'000'000, 10'000'000, 1'000'000, 100'000,
+                                           10'000,        1'000,       100,        10,        1};
 
 // "." and more digits than the short way takes. What decides between two doubles from 2^-34 on, below which there is
 // not half a nanosecond, is known after 34 + 53 digits, but for whether anything follows.
@@ -37,16 +38,6 @@ double longFraction(std::string_view digits) noexcept {
 }
 
 } // namespace
-
-std::string_view trimmed(std::string_view text) noexcept {
-    while (!text.empty() && isSpace(text.front())) {
-        text.remove_prefix(1);
-    }
-    while (!text.empty() && isSpace(text.back())) {
-        text.remove_suffix(1);
-    }
-    return text;
-}
 
 bool allDigits(std::string_view text) noexcept {
     for (const char c : text) {
@@ -79,6 +70,10 @@ double decimalValue(std::string_view digits) noexcept {
 }
 
 std::uint64_t fractionNanoseconds(std::string_view digits) noexcept {
+    // Up to nine digits are whole nanoseconds, and the double below would be off by far less than half of one.
+    if (digits.size() <= nanosecondDigits) {
+        return digitsValue(digits) * scaleOfDigits[digits.size()];
+    }
     const double fraction = digits.size() <= exactDigits
                                 ? static_cast<double>(digitsValue(digits)) / powersOfTen[digits.size()]
                                 : longFraction(digits);
@@ -115,26 +110,27 @@ char* writeFixed(char* first, char* last, double value) noexcept {
     return end;
 }
 
-void TextBuffer::put(std::string_view text) noexcept {
-    std::memcpy(data_.data() + size_, text.data(), text.size());
-    size_ += text.size();
+void TextBuffer::grow(std::size_t count) {
+    const std::size_t capacity = 2 * (size_ + count);
+    std::unique_ptr<char[]> larger(new char[capacity]);
+    std::memcpy(larger.get(), data_, size_);
+    long_ = std::move(larger);
+    data_ = long_.get();
+    capacity_ = capacity;
 }
 
-void TextBuffer::putNumber(std::uint64_t number, unsigned width) noexcept {
-    std::array<char, 20> digits;
-    auto first = digits.end();
-    do {
-        *--first = static_cast<char>('0' + number % 10);
-        number /= 10;
-    } while (number != 0);
-    const auto count = static_cast<unsigned>(digits.end() - first);
-    for (unsigned i = count; i < width; ++i) {
-        put('0');
+void TextBuffer::putNumber(std::uint64_t number, unsigned width) {
+    unsigned count = 1;
+    for (std::uint64_t rest = number / 10; rest != 0 || count < width; rest /= 10) {
+        ++count;
     }
-    put(std::string_view(&*first, count));
+    char* const first = room(count);
+    for (char* place = first + count; place != first; number /= 10) {
+        *--place = static_cast<char>('0' + number % 10);
+    }
 }
 
-void TextBuffer::putSigned(std::int64_t number, unsigned width) noexcept {
+void TextBuffer::putSigned(std::int64_t number, unsigned width) {
     if (number < 0) {
         put('-');
         putNumber(0 - static_cast<std::uint64_t>(number), width - (width > 0 ? 1 : 0));
@@ -143,18 +139,18 @@ void TextBuffer::putSigned(std::int64_t number, unsigned width) noexcept {
     }
 }
 
-void TextBuffer::putFraction(std::uint64_t nanoseconds) noexcept {
+void TextBuffer::putFraction(std::uint64_t nanoseconds) {
     if (nanoseconds == 0) {
         return;
     }
     put('.');
-    for (std::uint64_t unit = nanosPerSecond / 10; nanoseconds != 0; unit /= 10) {
-        put(static_cast<char>('0' + nanoseconds / unit));
-        nanoseconds %= unit;
+    putNumber(nanoseconds, nanosecondDigits);
+    while (data_[size_ - 1] == '0') {
+        --size_;
     }
 }
 
-void TextBuffer::putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds) noexcept {
+void TextBuffer::putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds) {
     // Up to here the sum as a double is off by less than half of the ninth decimal, so that its digits are exact.
     constexpr std::uint64_t exactSeconds = 1 << 20;
     if (seconds < exactSeconds && nanoseconds < nanosPerSecond) {
@@ -166,12 +162,12 @@ void TextBuffer::putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds) no
     if (nanoseconds != 0) {
         value += static_cast<double>(nanoseconds) / 1e9;
     }
-    char* const first = data_.data() + size_;
-    size_ = static_cast<std::size_t>(writeFixed(first, data_.data() + data_.size(), value) - data_.data());
+    std::array<char, longestFixedDouble> digits;
+    const char* const end = writeFixed(digits.data(), digits.data() + digits.size(), value);
+    put(std::string_view(digits.data(), static_cast<std::size_t>(end - digits.data())));
 }
 
-void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day,
-               bool extended) noexcept {
+void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day, bool extended) {
     text.putSigned(year, 4);
     if (extended) {
         text.put('-');
@@ -184,7 +180,7 @@ void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::ui
 }
 
 void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
-               std::uint64_t nanoseconds, bool extended) noexcept {
+               std::uint64_t nanoseconds, bool extended) {
     text.putNumber(hours, 2);
     if (extended) {
         text.put(':');
@@ -199,7 +195,7 @@ void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std
     text.putSeconds(seconds, nanoseconds);
 }
 
-void writeOffset(TextBuffer& text, std::int32_t minutes) noexcept {
+void writeOffset(TextBuffer& text, std::int32_t minutes) {
     const std::int64_t magnitude = minutes < 0 ? -std::int64_t{minutes} : std::int64_t{minutes};
     text.put(minutes < 0 ? '-' : '+');
     text.putNumber(static_cast<std::uint64_t>(magnitude / 60), 2);

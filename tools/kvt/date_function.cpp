@@ -34,7 +34,7 @@ void ValueFunction::declare(CLI::App& parent) {
     app_->add_option("-P", negativeInterval_)->group("");
     declareOptions(*app_);
     app_->add_flag("--json", json_, "Print a JSON object on a line for each value, failures included");
-    setHelp(*app_, words_.examples, valueNotes);
+    setHelp(*app_, words_.examples, ownNotes() + valueNotes);
 }
 
 int ValueFunction::run(Diagnostics& diagnostics) {

@@ -50,6 +50,8 @@ public:
 
 protected:
     virtual void declareOptions(CLI::App&) {}
+    /// What the help says about the function alone, behind the options.
+    virtual std::string ownNotes() const { return {}; }
     /// Looks at the operand and the options once, before all values. Throws Failure.
     virtual void prepare(const std::string& operand) = 0;
     virtual DateOutcome apply(const kvt::ex::UString<0>& value) = 0;

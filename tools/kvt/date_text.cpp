@@ -2,8 +2,11 @@
 
 #include "date_function.h"
 
+#include "table.h"
+
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/message_numbers.h>
+#include <kvt/datetime/pattern_trace.h>
 
 #include <limits>
 
@@ -28,6 +31,17 @@ std::size_t howWellItFits(const DateOutcome& failure) {
                : std::numeric_limits<std::size_t>::max();
 }
 
+// The language of patterns as one of the two functions knows it, for its help.
+std::string patternHelp(const char* heading, UString<0> datetime::PatternElement::*words) {
+    std::vector<std::vector<std::string>> rows;
+    for (const datetime::PatternElement& row : datetime::patternElements()) {
+        if (!(row.*words).isEmpty()) {
+            rows.push_back({" ", row.element.toStdString(), (row.*words).toStdString()});
+        }
+    }
+    return std::string(heading) + "\n" + formatTable({Align::Left, Align::Left, Align::Left}, rows) + "\n";
+}
+
 class ParseFunction : public ValueFunction {
 public:
     ParseFunction()
@@ -48,6 +62,10 @@ private:
             ->allow_extra_args(false); // one FORMAT for each --or, however many stand behind it
         app.add_flag("--lenient", lenient_,
                      "Let parts run over into the next larger one: 30 February is in March");
+    }
+    std::string ownNotes() const override {
+        return patternHelp("What a pattern reads; --lenient lifts a bound in brackets:",
+                           &datetime::PatternElement::reads);
     }
     void prepare(const std::string& operand) override {
         formats_ = {toUString(operand)};
@@ -84,6 +102,9 @@ kvt date format 20200131123000+01:00 ISO)",
                          "VALUE", "FORMAT", "A pattern such as '%d.%m.%Y', or the keyword ZQT or ISO"}) {}
 
 private:
+    std::string ownNotes() const override {
+        return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
+    }
     void prepare(const std::string& operand) override { format_ = toUString(operand); }
     DateOutcome apply(const UString<0>& value) override {
         DateOutcome outcome = outcomeOf(datetime::format(value, format_));

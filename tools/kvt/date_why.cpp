@@ -1,9 +1,15 @@
-#include "date_why.h"
+// `kvt date why`: how a value was read, as a table of steps.
 
 #include "date_function.h"
 
+#include "command.h"
+#include "exit_status.h"
+#include "output.h"
+#include "table.h"
+#include "text.h"
+
 #include <kvt/datetime/datetime.h>
-#include <kvt/datetime/message_numbers.h>
+#include <kvt/datetime/pattern_trace.h>
 
 #include <algorithm>
 
@@ -11,448 +17,213 @@ namespace host {
 
 namespace {
 
-namespace datetime = kvt::ex::datetime;
-namespace message_number = kvt::ex::datetime::message_number;
+using kvt::ex::datetime::PatternStep;
+using kvt::ex::datetime::PatternStepState;
+using kvt::ex::datetime::PatternTrace;
+using Traces = kvt::ex::vector<PatternTrace>;
 
-constexpr std::string_view blanks = " \t\r\n\f\v";
+constexpr const char* examples = R"(kvt date why 2020-13-01 '%Y-%m-%d'
+kvt date why 2020-01-02T03:04 ISO)";
 
-bool isBlank(char c) {
-    return blanks.find(c) != std::string_view::npos;
+constexpr const char* notes =
+    R"(For each element of the format: what it reads, and what it took from the value
+or where it stopped. "not known" stands where an element took a part of a
+character. For keywords: each form that they stand for, and how far it got.
+
+Exit status:
+  0  done, whether or not the value fits the format
+  2  not done: the value or the format is no UTF-8)";
+
+std::string inQuotes(std::string_view text) {
+    return "\"" + printable(text) + "\"";
 }
-
-bool isInsideCharacter(char byte) {
-    return (static_cast<unsigned char>(byte) & 0xC0u) == 0x80u;
-}
-
-// ---- The elements of a pattern
-
-struct NumberFlag {
-    char flag;
-    const char* what;
-    const char* width;
-    const char* bounds;
-    const char* lenientBounds;
-};
-
-constexpr NumberFlag numberFlags[] = {
-    {'Y', "year", "4", "1000 to 9999", "1000 to 9999"},
-    {'m', "month", "2", "1 to 12", "from 1"},
-    {'N', "month", "2", "1 to 12", "from 1"},
-    {'d', "day of the month", "2", "1 to 31", "from 1"},
-    {'e', "day of the month", "2", "1 to 31", "from 1"},
-    {'j', "day of the year", "3", "1 to 366", "from 1"},
-    {'H', "hour", "2", "0 to 23", "from 0"},
-    {'k', "hour", "2", "0 to 23", "from 0"},
-    {'I', "hour", "2", "1 to 12", "1 to 12"},
-    {'l', "hour", "2", "1 to 12", "1 to 12"},
-    {'M', "minute", "2", "0 to 59", "from 0"},
-    {'S', "second", "2", "0 to 59", "from 0"},
-};
-
-struct OtherFlag {
-    const char* flag;
-    const char* meaning;
-};
-
-constexpr OtherFlag otherFlags[] = {
-    {"%b", "month by three letters; an unknown one leaves it open"},
-    {"%B", "month by its whole name"},
-    {"%p", "am or pm"},
-    {"%T", "time, as %H:%M:%S"},
-    {"%s", "seconds since 1970 in UTC"},
-    {"%Es", "seconds since 1970 as a local time"},
-    {"%z", "offset: Z, +hh, +hhmm or +hh:mm"},
-    {"%Ez", "offset: Z, +hh, +hhmm or +hh:mm"},
-    {"%%", "the character itself"},
-    {"%$", "the character itself"},
-    {"%*", "the character itself"},
-    {"%?", "the character itself"},
-};
-
-const NumberFlag* numberFlagOf(std::string_view element) {
-    const auto* const found =
-        std::find_if(std::begin(numberFlags), std::end(numberFlags), [&](const NumberFlag& row) {
-            return element.size() == 2 && element[0] == '%' && element[1] == row.flag;
-        });
-    return found == std::end(numberFlags) ? nullptr : found;
-}
-
-bool isEpochOrOffset(std::string_view element) {
-    return element == "%s" || element == "%Es" || element == "%z" || element == "%Ez";
-}
-
-// Whether a number right behind this element has to take its whole width.
-bool endsInNumber(std::string_view element) {
-    return numberFlagOf(element) != nullptr || element == "%T" || isEpochOrOffset(element);
-}
-
-std::string meaningOf(std::string_view element, bool afterNumber, bool lenient) {
-    if (const NumberFlag* row = numberFlagOf(element)) {
-        const bool exact = afterNumber && row->flag != 'j';
-        return std::string(row->what) + ": " + (exact ? "exactly " : "up to ") + row->width + " digits, " +
-               (lenient ? row->lenientBounds : row->bounds) + (row->flag == 'S' ? ", and a fraction" : "");
-    }
-    for (const OtherFlag& row : otherFlags) {
-        if (element == row.flag) {
-            return row.meaning;
-        }
-    }
-    switch (element.front()) {
-    case '%':
-        return "no known flag";
-    case '*':
-        return element.size() == 1 ? "one word, up to a blank"
-                                   : "one word, up to a blank, that ends in what follows";
-    case '?':
-        return "any one character";
-    case '$':
-        return "the end of the value, as the end of the format";
-    default:
-        return "itself";
-    }
-}
-
-// The length of the element at the start of `format`.
-std::size_t elementLength(std::string_view format) {
-    const auto upTo = [&](std::size_t end) { return std::min(end, format.size()); };
-    const auto wholeCharacter = [&](std::size_t end) {
-        while (end < format.size() && isInsideCharacter(format[end])) {
-            ++end;
-        }
-        return upTo(end);
-    };
-    switch (format.front()) {
-    case '%':
-        return format.substr(0, 2) == "%E" ? wholeCharacter(3) : wholeCharacter(2);
-    case '?':
-    case '$':
-        return 1;
-    case '*': {
-        // What the word has to end in belongs to the "*".
-        if (format.substr(1, 1) == "%") {
-            const bool isLiteral =
-                format.size() > 2 && std::string_view("%*?").find(format[2]) != std::string_view::npos;
-            return isLiteral ? 3 : 1;
-        }
-        return upTo(format.find_first_of(std::string(blanks) + "$", 1));
-    }
-    default:
-        return upTo(format.find_first_of("%?$*"));
-    }
-}
-
-struct Element {
-    std::size_t begin;
-    std::size_t end;
-};
-
-// `cut` is a place where an element ends in any case: a failure may lie inside a run of ordinary characters.
-std::vector<Element> elementsOf(std::string_view format, std::size_t cut) {
-    std::vector<Element> elements;
-    for (std::size_t begin = 0; begin < format.size();) {
-        std::size_t end = begin + elementLength(format.substr(begin));
-        if (begin < cut && cut < end) {
-            end = cut;
-        }
-        elements.push_back({begin, end});
-        begin = end;
-    }
-    return elements;
-}
-
-// A part of a format as a message tells it once it has matched: with what stands behind each "%T".
-std::string expanded(std::string_view format) {
-    std::string text;
-    for (const Element& element : elementsOf(format, 0)) {
-        const std::string_view one = format.substr(element.begin, element.end - element.begin);
-        text += one == "%T" ? std::string_view("%H:%M:%S") : one;
-    }
-    return text;
-}
-
-// ---- Questions
-
-enum class Answer { Fits, DoesNotFit, BadElement, NotKnown };
-
-// Whether all elements found what they read. What is wrong with the fields as a whole is seen only after that.
-Answer answerOf(const DateOutcome& outcome) {
-    using namespace message_number;
-    if (outcome.isGood()) {
-        return Answer::Fits;
-    }
-    if (!outcome.message) {
-        return Answer::NotKnown;
-    }
-    switch (outcome.message->number) {
-    case formatMismatch:
-        return Answer::DoesNotFit;
-    case unknownFlag:
-    case epochTimeOutOfRange:
-        return Answer::BadElement;
-    case ordinalWithoutYear:
-    case dateIncomplete:
-    case flagsExcludeEachOther:
-    case offsetWithoutTime:
-    case timeIncomplete:
-    case nothingGiven:
-    case hourNotForMeridiem:
-    case ordinalPastYearEnd:
-    case noSuchDate:
-    case resultYearOutOfRange:
-        return Answer::Fits;
-    default:
-        return Answer::NotKnown;
-    }
-}
-
-DateOutcome parsed(const std::string& value, const std::string& format, bool lenient) {
-    return outcomeOf(datetime::parse(toUString(value), toUString(format), lenient));
-}
-
-// A control character, none of the blanks, that `value` does not hold.
-std::optional<char> unusedCharacter(std::string_view value) {
-    for (char c = '\x01'; c < ' '; ++c) {
-        if (!isBlank(c) && value.find(c) == std::string_view::npos) {
-            return c;
-        }
-    }
-    return std::nullopt;
-}
-
-class Explanation {
-public:
-    Explanation(const std::string& value, const std::string& format, bool lenient)
-        : lenient_(lenient), reading_{withoutBlanks(value),
-                                      withoutBlanks(format),
-                                      {},
-                                      std::nullopt,
-                                      parsed(value, format, lenient)} {
-        reading_.outcome.withoutMessage = "The value is empty.";
-        unused_ = unusedCharacter(reading_.value);
-    }
-
-    WhyReading run() {
-        const std::optional<std::size_t> failing = failingPlace();
-        hasStopped_ = reading_.value.empty();
-        bool afterNumber = false;
-        for (const Element& element : elementsOf(reading_.format, failing.value_or(0))) {
-            const std::string text = reading_.format.substr(element.begin, element.end - element.begin);
-            reading_.steps.push_back(
-                {text, meaningOf(text, afterNumber, lenient_), StepState::Unknown, std::nullopt, ""});
-            afterNumber = endsInNumber(text);
-            walk(element, reading_.steps.back(), failing);
-        }
-        if (!hasStopped_ && isCertain_) {
-            reading_.end = position_;
-        }
-        return std::move(reading_);
-    }
-
-private:
-    // Where in the format it failed; its end where no element did. None where a failure says nothing about places.
-    std::optional<std::size_t> failingPlace() {
-        switch (answerOf(reading_.outcome)) {
-        case Answer::Fits:
-        case Answer::BadElement: // which one is found on the way
-            return reading_.format.size();
-        case Answer::DoesNotFit:
-            break;
-        case Answer::NotKnown:
-            return std::nullopt;
-        }
-        const std::vector<std::string>& parts = reading_.outcome.message->parameters;
-        if (parts.size() != 2) {
-            return std::nullopt;
-        }
-        // Where the format did not survive the system's encoding, there is no place in it either.
-        if (!reading_.format.ends_with(parts[1])) {
-            return std::nullopt;
-        }
-        const std::size_t place = reading_.format.size() - parts[1].size();
-        return parts[0] == expanded(reading_.format.substr(0, place)) ? std::optional(place) : std::nullopt;
-    }
-
-    void walk(const Element& element, WhyStep& step, std::optional<std::size_t> failing) {
-        if (hasStopped_) {
-            step.state = StepState::NotReached;
-        } else if (!failing) {
-            isCertain_ = false;
-        } else if (element.begin == *failing || isBad(element)) {
-            stop(step);
-        } else if (step.element == "$" && !isEndAt(element)) {
-            stop(step); // which goes unsaid, as flags that exclude each other are told first
-        } else if (step.element == "$") {
-            step.state = StepState::Read;
-            step.at = position_ = reading_.value.size();
-            isCertain_ = true;
-        } else {
-            findEnd(element, step);
-        }
-    }
-
-    // Whether a "$" may be the end of both, as far as that is known.
-    bool isEndAt(const Element& element) const {
-        return element.end == reading_.format.size() && (!isCertain_ || position_ == reading_.value.size());
-    }
-
-    bool flagsExcludeEachOther() const {
-        return reading_.outcome.message &&
-               reading_.outcome.message->number == message_number::flagsExcludeEachOther;
-    }
-
-    bool isAsciiFrom(std::size_t place) const {
-        return std::all_of(reading_.value.begin() + static_cast<std::ptrdiff_t>(place), reading_.value.end(),
-                           [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-    }
-
-    void stop(WhyStep& step) {
-        hasStopped_ = true;
-        step.state = StepState::Stopped;
-        step.at = knownPosition();
-    }
-
-    bool isBad(const Element& element) const {
-        return answerOf(reading_.outcome) == Answer::BadElement && canAsk_ &&
-               ask(element, reading_.value.size()) == Answer::BadElement;
-    }
-
-    void findEnd(const Element& element, WhyStep& step) {
-        const bool isWord = step.element.front() == '*';
-        for (std::size_t end = reading_.value.size() + 1; canAsk_ && end-- > position_;) {
-            const bool isWhole = end == reading_.value.size() || !isInsideCharacter(reading_.value[end]);
-            if (isWhole && ask(element, end) == Answer::Fits) {
-                take(step, end);
-                // Two flags that exclude each other would hide whether all else fits.
-                if (isWord || isEpochOrOffset(step.element)) {
-                    askFromFormat_ = element.end;
-                    askFromValue_ = end;
-                }
-                return;
-            }
-        }
-        if (isCertain_ && flagsExcludeEachOther() && isAsciiFrom(position_)) {
-            stop(step); // which goes unsaid, as the flags are told first
-            return;
-        }
-        // The element was read, but not up to a whole character.
-        step.at = knownPosition();
-        isCertain_ = false;
-        canAsk_ = canAsk_ && !isWord;
-    }
-
-    void take(WhyStep& step, std::size_t end) {
-        step.at = knownPosition();
-        if (isCertain_) {
-            step.state = StepState::Read;
-            step.taken = reading_.value.substr(position_, end - position_);
-        }
-        position_ = end;
-        isCertain_ = true;
-    }
-
-    std::optional<std::size_t> knownPosition() const {
-        return isCertain_ ? std::optional(position_) : std::nullopt;
-    }
-
-    // Do the elements up to this one take the value up to `end`?
-    Answer ask(const Element& element, std::size_t end) const {
-        const bool isWord = reading_.format[element.begin] == '*';
-        const std::size_t formatEnd = isWord ? element.begin + 1 : element.end;
-        std::string value = "%" + reading_.value.substr(askFromValue_, end - askFromValue_);
-        std::string format = "%%" + reading_.format.substr(askFromFormat_, formatEnd - askFromFormat_);
-        if (isBlank(value.back())) {
-            if (!unused_) {
-                return Answer::NotKnown;
-            }
-            value += *unused_;
-            format += *unused_;
-        }
-        // A "%" that ends the format would make a flag of the "$".
-        const bool isLonePercent = reading_.format.substr(element.begin) == "%";
-        return answerOf(parsed(value, format + (isLonePercent ? "" : "$"), lenient_));
-    }
-
-    bool lenient_;
-    WhyReading reading_;
-    std::optional<char> unused_;
-    std::size_t position_ = 0; ///< what the elements so far took of the value, as far as that is known
-    bool isCertain_ = true;    ///< whether it is
-    bool canAsk_ = true;       ///< whether anything can be found out about further elements
-    bool hasStopped_ = false;
-    std::size_t askFromValue_ = 0; ///< where questions begin: at the start, or behind a later element
-    std::size_t askFromFormat_ = 0;
-};
-
-constexpr const char* isoPatterns[] = {"%Y-%m-%d$", "%Y-%m-%dT%H:%M:%S$", "%Y-%m-%dT%H:%M:%S%Ez$",
-                                       "%H:%M:%S$", "%H:%M:%S%Ez$"};
-
-std::string upperCased(std::string text) {
-    for (char& c : text) {
-        c = c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
-    }
-    return text;
-}
-
-} // namespace
 
 std::string withoutBlanks(std::string_view text) {
+    constexpr std::string_view blanks = " \t\r\n\f\v";
     const std::size_t begin = std::min(text.find_first_not_of(blanks), text.size());
     const std::size_t end = text.find_last_not_of(blanks) + 1;
     return std::string(text.substr(begin, std::max(end, begin) - begin));
 }
 
-bool isPattern(std::string_view format) {
-    return format.find('%') != std::string_view::npos;
-}
-
-WhyReading whyByPattern(const std::string& value, const std::string& format, bool lenient) {
-    return Explanation(value, format, lenient).run();
-}
-
-std::vector<WhyTry> whyByKeywords(const std::string& value, const std::string& format, bool lenient) {
-    std::vector<WhyTry> tries;
-    bool isOver = false;
-    for (std::size_t begin = 0; begin <= format.size();) {
-        const std::size_t end = std::min(format.find('|', begin), format.size());
-        const std::string keyword = withoutBlanks(format.substr(begin, end - begin));
-        begin = end + 1;
-        if (upperCased(keyword) == "ZQT") {
-            WhyTry& made =
-                tries.emplace_back(WhyTry{keyword, "the canonical form", !isOver, std::nullopt, false});
-            if (made.wasTried) {
-                const DateOutcome outcome = parsed(value, "ZQT", lenient);
-                made.fits = outcome.isGood();
-                // A part that is out of range ends it all; only what is no such form goes on to the next keyword.
-                isOver = made.fits || !outcome.message ||
-                         outcome.message->number != message_number::noKeywordMatched;
-            }
-        } else if (upperCased(keyword) == "ISO") {
-            for (const char* pattern : isoPatterns) {
-                WhyTry& made = tries.emplace_back(WhyTry{keyword, pattern, !isOver, std::nullopt, false});
-                if (made.wasTried) {
-                    made.reading = whyByPattern(value, pattern, lenient);
-                    made.fits = isOver = made.reading->outcome.isGood();
-                }
-            }
-        } else {
-            tries.push_back({keyword, "no known keyword", false, std::nullopt, false});
-        }
-    }
-    return tries;
-}
-
-const char* stepStateName(StepState state) {
+const char* stateName(PatternStepState state) {
     switch (state) {
-    case StepState::Read:
+    case PatternStepState::Read:
         return "read";
-    case StepState::Stopped:
+    case PatternStepState::Stopped:
         return "stopped";
-    case StepState::NotReached:
+    case PatternStepState::NotReached:
         return "not reached";
-    case StepState::Unknown:
+    case PatternStepState::Unknown:
         break;
     }
     return "not known";
+}
+
+DateOutcome outcomeOfTrace(const PatternTrace& trace) {
+    DateOutcome outcome = outcomeOf(trace.result);
+    outcome.withoutMessage = "The value is empty.";
+    return outcome;
+}
+
+// ---- As text
+
+// What stands where an element stopped.
+std::string restOf(const std::string& value, std::size_t at) {
+    return at == value.size() ? "the end of the value" : inQuotes(value.substr(at));
+}
+
+std::string whatHappened(const std::string& value, const PatternStep& step) {
+    switch (step.state) {
+    case PatternStepState::Read:
+        return step.taken.isEmpty() ? "nothing" : inQuotes(step.taken.toStdString());
+    case PatternStepState::Stopped:
+        return step.at ? "stopped at " + restOf(value, *step.at) : "stopped; where is not known";
+    case PatternStepState::NotReached:
+    case PatternStepState::Unknown:
+        break;
+    }
+    return stateName(step.state);
+}
+
+std::string shownOutcome(const DateOutcome& outcome) {
+    if (outcome.isGood()) {
+        return "result: " + resultText(outcome) + "\n";
+    }
+    std::string text = "no result: " + failureText(outcome) + "\n";
+    for (const std::string& line : markedFormat(outcome)) {
+        text += "     " + line + "\n";
+    }
+    return text;
+}
+
+std::string shown(const std::string& value, const PatternTrace& trace) {
+    std::vector<std::vector<std::string>> rows = {{"element", "reads", "took"}};
+    for (const PatternStep& step : trace.steps) {
+        rows.push_back(
+            {inQuotes(step.element.toStdString()), step.reads.toStdString(), whatHappened(value, step)});
+    }
+    std::string text = formatTable({Align::Left, Align::Left, Align::Left}, rows);
+    if (trace.end && *trace.end < value.size()) {
+        text += "not looked at: " + inQuotes(value.substr(*trace.end)) + "\n";
+    }
+    return text + shownOutcome(outcomeOfTrace(trace));
+}
+
+// How far one form got, in a few words.
+std::string howFar(const std::string& value, const PatternTrace& trace) {
+    if (!trace.wasTried) {
+        return trace.isKnown ? "not tried" : "passed over";
+    }
+    const DateOutcome outcome = outcomeOfTrace(trace);
+    if (outcome.isGood()) {
+        return "fits";
+    }
+    if (!trace.isPattern) {
+        return "does not fit";
+    }
+    for (const PatternStep& step : trace.steps) {
+        if (step.state == PatternStepState::Stopped) {
+            return inQuotes(step.element.toStdString()) + " " + whatHappened(value, step);
+        }
+    }
+    return failureText(outcome);
+}
+
+std::string shown(const std::string& value, const Traces& traces) {
+    std::vector<std::vector<std::string>> rows = {{"keyword", "form", "result"}};
+    for (const PatternTrace& trace : traces) {
+        rows.push_back(
+            {printable(trace.keyword.toStdString()), trace.form.toStdString(), howFar(value, trace)});
+    }
+    return formatTable({Align::Left, Align::Left, Align::Left}, rows);
+}
+
+// ---- As JSON
+
+nlohmann::ordered_json jsonOf(const PatternTrace& trace) {
+    nlohmann::ordered_json steps = nlohmann::ordered_json::array();
+    for (const PatternStep& step : trace.steps) {
+        nlohmann::ordered_json object;
+        object["element"] = step.element.toStdString();
+        object["reads"] = step.reads.toStdString();
+        object["state"] = stateName(step.state);
+        object["offset"] = step.at ? nlohmann::ordered_json(*step.at) : nullptr;
+        object["taken"] =
+            step.state == PatternStepState::Read ? nlohmann::ordered_json(step.taken.toStdString()) : nullptr;
+        object["why"] = step.state == PatternStepState::Stopped
+                            ? nlohmann::ordered_json(step.why.toStdString())
+                            : nullptr;
+        steps.push_back(std::move(object));
+    }
+    return steps;
+}
+
+nlohmann::ordered_json jsonOf(const Traces& traces) {
+    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    for (const PatternTrace& trace : traces) {
+        nlohmann::ordered_json object;
+        object["keyword"] = trace.keyword.toStdString();
+        object["form"] = trace.form.toStdString();
+        object["tried"] = trace.wasTried;
+        object["fits"] = trace.wasTried && outcomeOfTrace(trace).isGood();
+        if (trace.isPattern && trace.wasTried) {
+            object["steps"] = jsonOf(trace);
+        }
+        list.push_back(std::move(object));
+    }
+    return list;
+}
+
+class WhyFunction : public DateFunction {
+public:
+    void declare(CLI::App& parent) override {
+        app_ = parent.add_subcommand("why", "Tell step by step how 'parse' reads a value");
+        app_->add_option("VALUE", value_, "The value")->type_name("")->required();
+        app_->add_option("FORMAT", format_, "A pattern or keywords, as for 'parse'")
+            ->type_name("")
+            ->required();
+        app_->add_flag("--lenient", lenient_, "Let parts run over into the next larger one, as for 'parse'");
+        app_->add_flag("--json", json_, "Print a JSON object on a line");
+        setHelp(*app_, examples, notes);
+    }
+    bool isChosen() const override { return app_->parsed(); }
+
+    int run(Diagnostics&) override {
+        const auto value = toUString(value_);
+        const auto format = toUString(format_);
+        const std::string shownValue = withoutBlanks(value_);
+        const Traces traces = kvt::ex::datetime::traceParse(value, format, lenient_);
+        nlohmann::ordered_json object;
+        object["value"] = shownValue;
+        object["format"] = withoutBlanks(format_);
+        if (traces.front().isPattern && traces.front().keyword.isEmpty()) {
+            const PatternTrace& trace = traces.front();
+            object["steps"] = jsonOf(trace);
+            object["end"] = trace.end ? nlohmann::ordered_json(*trace.end) : nullptr;
+            addTo(object, outcomeOfTrace(trace));
+            print(json_ ? jsonLine(object) : shown(shownValue, trace));
+        } else {
+            DateOutcome outcome = outcomeOf(kvt::ex::datetime::parse(value, format, lenient_));
+            outcome.withoutMessage = "The value is empty.";
+            object["tries"] = jsonOf(traces);
+            addTo(object, outcome);
+            print(json_ ? jsonLine(object) : shown(shownValue, traces) + shownOutcome(outcome));
+        }
+        return Done;
+    }
+
+private:
+    CLI::App* app_ = nullptr;
+    std::string value_;
+    std::string format_;
+    bool lenient_ = false;
+    bool json_ = false;
+};
+
+} // namespace
+
+void addWhyFunction(DateFunctions& functions) {
+    functions.push_back(std::make_unique<WhyFunction>());
 }
 
 } // namespace host

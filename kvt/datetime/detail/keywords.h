@@ -34,23 +34,28 @@ inline std::optional<Keyword> keywordOf(std::string_view item) noexcept {
                                  : std::nullopt;
 }
 
+/// Calls `use` with each item of a list, in order, until it answers true.
+template <typename Use>
+void forEachItem(std::string_view list, Use use) {
+    while (true) {
+        const std::size_t end = std::min(list.find('|'), list.size());
+        if (use(list.substr(0, end)) || end == list.size()) {
+            return;
+        }
+        list.remove_prefix(end + 1);
+    }
+}
+
 /// Calls `use` with each known keyword of a list, in order, until it answers true; whether any was known.
 template <typename Use>
 bool forEachKeyword(std::string_view list, Use use) {
     bool anyKnown = false;
-    while (true) {
-        const std::size_t end = std::min(list.find('|'), list.size());
-        if (const auto keyword = keywordOf(list.substr(0, end))) {
-            anyKnown = true;
-            if (use(*keyword)) {
-                return true;
-            }
-        }
-        if (end == list.size()) {
-            return anyKnown;
-        }
-        list.remove_prefix(end + 1);
-    }
+    forEachItem(list, [&](std::string_view item) {
+        const std::optional<Keyword> keyword = keywordOf(item);
+        anyKnown |= keyword.has_value();
+        return keyword && use(*keyword);
+    });
+    return anyKnown;
 }
 
 } // namespace kvt::ex::datetime::detail

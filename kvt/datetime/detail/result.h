@@ -19,6 +19,7 @@
 #include <optional>
 #include <string_view>
 #include <tuple>
+#include <type_traits>
 #include <utility>
 
 namespace kvt::ex::datetime::detail {
@@ -55,7 +56,7 @@ Result<Value> failed(std::uint32_t number, std::initializer_list<std::string_vie
 }
 
 /// The message of a failure whose words depend on nothing but the failure: ValueUnsupported (933063),
-/// IntervalUnreadable (933064), KindsNotComparable (933059), DatePartRange (933065), ParseMismatch (933067), ParseEpochTimeRange (933093) and FormatStringBadCombo (933083). None for the others.
+/// IntervalUnreadable (933064), KindsNotComparable (933059) and DatePartRange (933065). None for the others.
 std::optional<LogMessageInfo> messageOf(const Failure& failure);
 
 /// What a function answers where there are no words.
@@ -77,16 +78,21 @@ Result<Value> lastAnswer(LastResort resort) noexcept {
     return result;
 }
 
-/// Runs `work`, which returns Outcome<Result<Value>>; `words` returns std::optional<LogMessageInfo> for a Failure.
+/// Runs `work`, which returns Outcome<Result<Value>>; `words` returns std::optional<LogMessageInfo> for a Failure. Work that
+/// words its failures itself returns Result<Value>.
 template <typename Value, typename Work, typename Words>
 Result<Value> guarded(Work&& work, LastResort resort, Words&& words) {
     try {
-        Outcome<Result<Value>> outcome = work();
-        if (outcome) {
-            return std::move(*outcome);
-        }
-        if (std::optional<LogMessageInfo> info = words(outcome.failure())) {
-            return makeDateTimeResult(ReturnState::Failure, Value(), std::move(*info));
+        if constexpr (std::is_same_v<std::invoke_result_t<Work>, Result<Value>>) {
+            return work();
+        } else {
+            Outcome<Result<Value>> outcome = work();
+            if (outcome) {
+                return std::move(*outcome);
+            }
+            if (std::optional<LogMessageInfo> info = words(outcome.failure())) {
+                return makeDateTimeResult(ReturnState::Failure, Value(), std::move(*info));
+            }
         }
     } catch (...) {
         // Whatever it was, the host gets the last resort below.

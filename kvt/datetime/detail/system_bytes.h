@@ -2,9 +2,10 @@
 #pragma once
 
 #include <kvt/string/ustring.h>
+#include <kvt/string/ustring_array.h>
 
 #include <cstddef>
-#include <string>
+#include <optional>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
@@ -24,7 +25,7 @@ public:
     std::string_view view() const noexcept { return view_; }
 
 private:
-    UString<27> converted_;
+    std::optional<UString<27>> converted_;
     std::string_view view_;
 };
 
@@ -34,11 +35,14 @@ UString<0> textOfSystemBytes(std::string_view bytes);
 /// The same for messages: what a cut through a character has left of it is substituted.
 UString<0> readableSystemBytes(std::string_view bytes);
 
+/// Adds that to the parameters of a message.
+void appendReadable(UStringArray<0>& parameters, std::string_view bytes);
+
 /// The first `length` bytes, and where the system's encoding is UTF-8, the rest of the character that they end in.
 std::string_view wholeCharacters(std::string_view bytes, std::size_t length);
 
-/// A text was cut in two: where the system's encoding is UTF-8 and the cut goes through a character, gives all of that
-/// character to `back`.
-void cutBetweenCharacters(std::string& front, std::string& back);
+/// Where to cut a text in two at `place`: where the system's encoding is UTF-8 and `place` is inside a character, in front
+/// of that character.
+std::size_t placeBetweenCharacters(std::string_view bytes, std::size_t place) noexcept;
 
 } // namespace kvt::ex::datetime::detail

@@ -7,6 +7,8 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
+#include <memory>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
@@ -15,8 +17,21 @@ inline std::string_view viewOf(const UString<0>& text) noexcept {
     return {text.rawData(), text.size()};
 }
 
-/// The text without the white space at both ends: space, tab, carriage return, line feed, form feed, vertical tab.
-std::string_view trimmed(std::string_view text) noexcept;
+/// Space, tab, carriage return, line feed, form feed, vertical tab.
+constexpr bool isSpace(char c) noexcept {
+    return c == ' ' || (c >= '\t' && c <= '\r');
+}
+
+/// The text without the white space at both ends.
+constexpr std::string_view trimmed(std::string_view text) noexcept {
+    while (!text.empty() && isSpace(text.front())) {
+        text.remove_prefix(1);
+    }
+    while (!text.empty() && isSpace(text.back())) {
+        text.remove_suffix(1);
+    }
+    return text;
+}
 
 constexpr bool isDigit(char c) noexcept {
     return c >= '0' && c <= '9';
@@ -62,44 +77,65 @@ private:
     std::uint8_t size_ = 0;
 };
 
-/// Text in the making, in place. The capacity suffices for each field of a value or an interval with 20 digits, and
-/// the caller writes no more than that.
+/// Text in the making: in place as long as it is short, as it is for every value and interval and for nearly every
+/// pattern. Only what outgrows that throws std::bad_alloc.
 class TextBuffer {
 public:
-    void put(char c) noexcept { data_[size_++] = c; }
-    void put(std::string_view text) noexcept;
+    TextBuffer() = default;
+    TextBuffer(const TextBuffer&) = delete;
+    TextBuffer& operator=(const TextBuffer&) = delete;
+
+    void put(char c) { *room(1) = c; }
+    void put(std::string_view text) {
+        if (text.size() == 1) {
+            return put(text.front());
+        }
+        std::memcpy(room(text.size()), text.data(), text.size());
+    }
     /// In decimal, with leading zeros up to `width`.
-    void putNumber(std::uint64_t number, unsigned width = 1) noexcept;
+    void putNumber(std::uint64_t number, unsigned width = 1);
     /// Two digits; the number is below 100.
-    void putPair(unsigned number) noexcept {
-        data_[size_] = static_cast<char>('0' + number / 10);
-        data_[size_ + 1] = static_cast<char>('0' + number % 10);
-        size_ += 2;
+    void putPair(unsigned number) {
+        char* const place = room(2);
+        place[0] = static_cast<char>('0' + number / 10);
+        place[1] = static_cast<char>('0' + number % 10);
     }
     /// The same with "-" in front of a negative number, which counts as one of the `width`.
-    void putSigned(std::int64_t number, unsigned width = 1) noexcept;
+    void putSigned(std::int64_t number, unsigned width = 1);
     /// "." and nine digits without the zeros at their end; nothing for zero. Below 1,000,000,000.
-    void putFraction(std::uint64_t nanoseconds) noexcept;
+    void putFraction(std::uint64_t nanoseconds);
     /// Seconds and fraction as secondsFractionalToString(double) words their sum as a double.
-    void putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds) noexcept;
+    void putSeconds(std::uint64_t seconds, std::uint64_t nanoseconds);
 
-    std::string_view view() const noexcept { return {data_.data(), size_}; }
+    std::string_view view() const noexcept { return {data_, size_}; }
     UString<0> toString() const { return UString<0>(UStringView<0>(view())); }
 
 private:
-    std::array<char, 224> data_;
+    /// Place for so many chars, which are part of the text then.
+    char* room(std::size_t count) {
+        if (count > capacity_ - size_) {
+            grow(count);
+        }
+        size_ += count;
+        return data_ + size_ - count;
+    }
+    void grow(std::size_t count);
+
+    std::array<char, 224> short_;
+    std::unique_ptr<char[]> long_;
+    char* data_ = short_.data();
+    std::size_t capacity_ = short_.size();
     std::size_t size_ = 0;
 };
 
 /// Writes "20200102", or "2020-01-02" in extended form.
-void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day,
-               bool extended) noexcept;
+void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::uint64_t day, bool extended);
 
 /// Writes "030405.25", or "03:04:05.25" in extended form.
 void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
-               std::uint64_t nanoseconds, bool extended) noexcept;
+               std::uint64_t nanoseconds, bool extended);
 
 /// Writes "+01:00" for 60.
-void writeOffset(TextBuffer& text, std::int32_t minutes) noexcept;
+void writeOffset(TextBuffer& text, std::int32_t minutes);
 
 } // namespace kvt::ex::datetime::detail

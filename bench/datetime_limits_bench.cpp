@@ -1,0 +1,229 @@
+// What the date and time functions may cost beside the C library's, each as a ratio with its limit.
+//
+// All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
+// falls on all of them alike. A row is the median of the ratios of its two ways within a round. A row above its limit
+// is marked, and the exit status is then 1.
+//
+// The C library's strptime and strftime know no fraction of a second. Beside a value that has one stands what reads or
+// writes all of it by that library: strptime, strtod and strptime again for the offset, then timegm; strftime and
+// snprintf. What strptime alone takes for the part that it knows is shown without a limit.
+
+#include <kvt/datetime/datetime.h>
+
+#include <benchmark/benchmark.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <ctime>
+#include <functional>
+#include <map>
+#include <regex>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace kvt::ex::datetime;
+using kvt::ex::UString;
+
+constexpr int rounds = 101;
+constexpr int callsInRound = 2'000;
+
+/// One way to do some work: calls it so many times.
+using Way = std::function<void(int)>;
+
+template <typename Function>
+Way way(Function function) {
+    return [function](int calls) {
+        for (int i = 0; i < calls; ++i) {
+            auto result = function();
+            benchmark::DoNotOptimize(&result);
+        }
+    };
+}
+
+Way parsing(const char* value, const char* format) {
+    return way(
+        [value = UString<0>(value), format = UString<0>(format)] { return parse(value, format, false); });
+}
+
+Way formatting(const char* value, const char* pattern) {
+    return way([value = UString<0>(value), pattern = UString<0>(pattern)] { return format(value, pattern); });
+}
+
+Way strptimeWay(const char* value, const char* pattern) {
+    return way([value, pattern] {
+        std::tm time{};
+        benchmark::DoNotOptimize(value);
+        benchmark::DoNotOptimize(pattern);
+        return ::strptime(value, pattern, &time) != nullptr ? time.tm_mday : 0;
+    });
+}
+
+// All of a value with fraction and offset.
+Way strptimeOffsetWay() {
+    return way([] {
+        std::tm time{};
+        const char* value = "2020-01-02T03:04:05.123456789+01:00";
+        benchmark::DoNotOptimize(value);
+        char* rest = ::strptime(value, "%Y-%m-%dT%H:%M:%S", &time);
+        const double fraction = std::strtod(rest, &rest);
+        rest = ::strptime(rest, "%z", &time);
+        const long offset = time.tm_gmtoff;
+        return static_cast<double>(::timegm(&time) - offset) + fraction;
+    });
+}
+
+std::tm someTime() {
+    std::tm time{};
+    time.tm_year = 2020 - 1900;
+    time.tm_mday = 2;
+    time.tm_hour = 3;
+    time.tm_min = 4;
+    time.tm_sec = 5;
+    return time;
+}
+
+Way strftimeWay(const char* pattern) {
+    return way([time = someTime(), pattern] {
+        char text[64];
+        benchmark::DoNotOptimize(pattern);
+        return std::string(text, std::strftime(text, sizeof text, pattern, &time));
+    });
+}
+
+// All of a value with fraction and offset.
+Way strftimeOffsetWay() {
+    return way([time = someTime()] {
+        char text[64];
+        long nanoseconds = 123456789;
+        benchmark::DoNotOptimize(nanoseconds);
+        std::size_t size = std::strftime(text, sizeof text, "%Y-%m-%dT%H:%M:%S", &time);
+        size +=
+            static_cast<std::size_t>(std::snprintf(text + size, sizeof text - size, ".%09ld", nanoseconds));
+        size += std::strftime(text + size, sizeof text - size, "%z", &time);
+        return std::string(text, size);
+    });
+}
+
+const std::map<std::string, Way>& ways() {
+    static const std::map<std::string, Way> all = {
+        {"parse date", parsing("2020-01-02", "%Y-%m-%d")},
+        {"parse offset", parsing("2020-01-02T03:04:05.123456789+01:00", "%Y-%m-%dT%H:%M:%S%Ez")},
+        {"parse ISO", parsing("2020-01-02T03:04:05.123456789+01:00", "ISO")},
+        {"parse name", parsing("02/Jan/2020 13:14:15", "%d/%b/%Y %H:%M:%S")},
+        {"parse date fails", parsing("2020-01-x2", "%Y-%m-%d")},
+        {"parse offset fails", parsing("2020-01-02T03:04:05.123456789*01:00", "%Y-%m-%dT%H:%M:%S%Ez")},
+        {"parse name fails", parsing("02/Jan/2020 13:14:x5", "%d/%b/%Y %H:%M:%S")},
+        {"format date", formatting("20200102", "%Y-%m-%d")},
+        {"format offset", formatting("20200102030405.123456789+01:00", "%Y-%m-%dT%H:%M:%S%Ez")},
+        {"format name", formatting("20200102131415", "%d/%b/%Y %H:%M:%S")},
+        {"strptime and timegm date", way([] {
+             std::tm time{};
+             const char* value = "2020-01-02";
+             const char* pattern = "%Y-%m-%d";
+             benchmark::DoNotOptimize(value);
+             benchmark::DoNotOptimize(pattern);
+             return ::strptime(value, pattern, &time) != nullptr ? ::timegm(&time) : 0;
+         })},
+        {"strptime offset", strptimeOffsetWay()},
+        {"strptime datetime", strptimeWay("2020-01-02T03:04:05", "%Y-%m-%dT%H:%M:%S")},
+        {"strptime name", strptimeWay("02/Jan/2020 13:14:15", "%d/%b/%Y %H:%M:%S")},
+        {"strftime date", strftimeWay("%Y-%m-%d")},
+        {"strftime offset", strftimeOffsetWay()},
+        {"strftime datetime", strftimeWay("%Y-%m-%dT%H:%M:%S")},
+        {"strftime name", strftimeWay("%d/%b/%Y %H:%M:%S")},
+    };
+    return all;
+}
+
+struct Row {
+    const char* work;
+    const char* beside;
+    double limit; ///< 0 for none
+};
+
+constexpr Row rows[] = {
+    {"parse date", "strptime and timegm date", 0.6}, {"parse offset", "strptime offset", 0.6},
+    {"parse offset", "strptime datetime", 0},        {"parse ISO", "parse offset", 1.7},
+    {"parse name", "strptime name", 0.15},           {"parse date fails", "parse date", 1.5},
+    {"parse offset fails", "parse offset", 1.5},     {"parse name fails", "parse name", 1.5},
+    {"format date", "strftime date", 1.0},           {"format offset", "strftime offset", 0.65},
+    {"format offset", "strftime datetime", 0},       {"format name", "strftime name", 1.0},
+};
+
+double nanosecondsOf(const Way& measured) {
+    const auto begin = std::chrono::steady_clock::now();
+    measured(callsInRound);
+    const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - begin;
+    return taken.count() / callsInRound;
+}
+
+double median(std::vector<double> numbers) {
+    const auto middle = numbers.begin() + static_cast<std::ptrdiff_t>(numbers.size() / 2);
+    std::nth_element(numbers.begin(), middle, numbers.end());
+    return *middle;
+}
+
+/// The nanoseconds of each way, in each round.
+using Times = std::map<std::string, std::vector<double>>;
+
+Times measureAll() {
+    Times times;
+    for (int round = 0; round < rounds; ++round) {
+        for (const auto& [name, measured] : ways()) {
+            times[name].push_back(nanosecondsOf(measured));
+        }
+    }
+    return times;
+}
+
+bool isWithinLimit(const Row& row, const Times& times) {
+    const std::vector<double>& work = times.at(row.work);
+    const std::vector<double>& beside = times.at(row.beside);
+    std::vector<double> ratios;
+    for (std::size_t round = 0; round < work.size(); ++round) {
+        ratios.push_back(work[round] / beside[round]);
+    }
+    const double ratio = median(ratios);
+    const bool isWithin = row.limit == 0 || ratio <= row.limit;
+    std::printf("%-22s %6.1f ns   %-26s %6.1f ns   ratio %5.2f", row.work, median(work), row.beside,
+                median(beside), ratio);
+    if (row.limit != 0) {
+        std::printf("   at most %4.2f%s", row.limit, isWithin ? "" : "   MISSED");
+    }
+    std::printf("\n");
+    return isWithin;
+}
+
+/// What --benchmark_filter names, as the other programs take it; everything without it.
+std::regex filterOf(int count, char** arguments) {
+    constexpr std::string_view option = "--benchmark_filter=";
+    for (int i = 1; i < count; ++i) {
+        const std::string_view argument = arguments[i];
+        if (argument.substr(0, option.size()) == option) {
+            return std::regex(std::string(argument.substr(option.size())));
+        }
+    }
+    return std::regex(".*");
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    const std::regex filter = filterOf(argc, argv);
+    std::vector<Row> chosen;
+    std::copy_if(std::begin(rows), std::end(rows), std::back_inserter(chosen),
+                 [&](const Row& row) { return std::regex_search(row.work, filter); });
+    if (chosen.empty()) {
+        return 0;
+    }
+    const Times times = measureAll();
+    bool areAllWithin = true;
+    for (const Row& row : chosen) {
+        areAllWithin = isWithinLimit(row, times) && areAllWithin;
+    }
+    return areAllWithin ? 0 : 1;
+}
