@@ -221,7 +221,7 @@ void openInIcu(benchmark::State& state) {
 
 void openInIconv(benchmark::State& state) {
     for (auto _ : state) {
-        const iconv_t descriptor = iconv_open("WINDOWS-1252", "SHIFT_JIS");
+        iconv_t descriptor = iconv_open("WINDOWS-1252", "SHIFT_JIS");
         benchmark::DoNotOptimize(descriptor);
         iconv_close(descriptor);
     }
