@@ -4,6 +4,7 @@
 
 #include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/nano_count.h>
+#include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/pattern_table.h>
 #include <kvt/datetime/detail/text.h>
 
@@ -146,7 +147,7 @@ private:
         if (zeroIsZ && *offsetMinutes_ == 0) {
             return out_.put('Z');
         }
-        writeOffset(out_, *offsetMinutes_);
+        out_.put(offsetOfMinutes(*offsetMinutes_)->view());
     }
 
     void number(std::uint64_t value, unsigned width) {

@@ -195,12 +195,4 @@ void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std
     text.putSeconds(seconds, nanoseconds);
 }
 
-void writeOffset(TextBuffer& text, std::int32_t minutes) {
-    const std::int64_t magnitude = minutes < 0 ? -std::int64_t{minutes} : std::int64_t{minutes};
-    text.put(minutes < 0 ? '-' : '+');
-    text.putNumber(static_cast<std::uint64_t>(magnitude / 60), 2);
-    text.put(':');
-    text.putNumber(static_cast<std::uint64_t>(magnitude % 60), 2);
-}
-
 } // namespace kvt::ex::datetime::detail

@@ -3,6 +3,7 @@
 #include <kvt/datetime/detail/apply_offset.h>
 #include <kvt/datetime/detail/arithmetic.h>
 #include <kvt/datetime/detail/instant.h>
+#include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/record.h>
 
 #include <gtest/gtest.h>
@@ -150,6 +151,22 @@ TEST(ApplyOffsetText, ReplacesOrConverts) {
 TEST(AddInterval, ChecksTheYearItStartsFrom) {
     EXPECT_EQ(rangeOf(addInterval(timeCountOfSeconds(-40'000'000'000, 0), IntervalParts())),
               "702,year,1000,9999");
+}
+
+TEST(OffsetOfMinutes, HasASignAndTwoPairs) {
+    const struct {
+        std::int32_t minutes;
+        const char* text;
+    } rows[] = {{0, "+00:00"},    {60, "+01:00"},   {-1, "-00:01"},
+                {-210, "-03:30"}, {5999, "+99:59"}, {675, "+11:15"}};
+    for (const auto& row : rows) {
+        const std::optional<OffsetForm> offset = offsetOfMinutes(row.minutes);
+        ASSERT_TRUE(offset.has_value());
+        EXPECT_EQ(offset->view(), row.text);
+        EXPECT_EQ(offset->minutes, row.minutes);
+    }
+    EXPECT_FALSE(offsetOfMinutes(6000).has_value());
+    EXPECT_FALSE(offsetOfMinutes(-6000).has_value());
 }
 
 } // namespace

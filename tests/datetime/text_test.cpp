@@ -109,17 +109,4 @@ TEST(TextBuffer, WritesFractionsWithoutZerosAtTheEnd) {
     }
 }
 
-TEST(WriteOffset, HasASignAndTwoPairs) {
-    const struct {
-        std::int32_t minutes;
-        const char* text;
-    } rows[] = {{0, "+00:00"},    {60, "+01:00"},   {-1, "-00:01"},
-                {-210, "-03:30"}, {5999, "+99:59"}, {675, "+11:15"}};
-    for (const auto& row : rows) {
-        TextBuffer text;
-        writeOffset(text, row.minutes);
-        EXPECT_EQ(text.view(), row.text);
-    }
-}
-
 } // namespace

@@ -309,7 +309,7 @@ TEST_F(LoadedZones, HaveTheOffsetsOfTheCompiledZoneFiles) {
             const std::int64_t offset =
                 zone.get_info(date::sys_seconds(std::chrono::seconds(moment))).offset.count();
             const kvt::ex::datetime::detail::TemporalInstant instant = {
-                kvt::ex::datetime::detail::nanosOf(moment, 0), 0};
+                kvt::ex::datetime::detail::timeCountOfSeconds(moment, 0), 0};
             const std::int64_t minutes = kvt::ex::datetime::detail::localOffsetMinutes(instant);
             if (offset != expected || minutes != expected / 60) {
                 wrong.push_back(name + " at " + std::to_string(moment) + ": " + std::to_string(offset) +

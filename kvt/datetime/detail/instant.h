@@ -57,10 +57,6 @@ Outcome<TimeCount> countFromFields(const DateTimeFields& fields, bool lenient);
 
 /// The numbers of a count. The year may be any; the others are within their bounds.
 DateTimeFields fieldsFromCount(const TimeCount& count);
-inline DateTimeFields fieldsFromCount(const NanoCount& count) {
-    const FloorQuotient days = floorDivide(count, nanosPerDay);
-    return fieldsFromCount(TimeCount{days.quotient, days.remainder});
-}
 
 /// The parts of a kind with these numbers. `offset` is canonical or empty.
 DateTimeParts partsOf(TemporalType type, const DateTimeFields& fields, std::string_view offset);

@@ -19,29 +19,6 @@ inline constexpr std::int64_t secondsPerDay = 86'400;
 inline constexpr std::int64_t nanosPerMinute = secondsPerMinute * nanosPerSecond;
 inline constexpr std::int64_t nanosPerDay = secondsPerDay * nanosPerSecond;
 
-/// The count of whole seconds and nanoseconds together.
-inline NanoCount nanosOf(std::int64_t seconds, std::int64_t nanoseconds) {
-    return NanoCount(seconds) * nanosPerSecond + nanoseconds;
-}
-
-struct FloorQuotient {
-    std::int64_t quotient;
-    std::int64_t remainder; ///< 0 and above, below the divisor
-};
-
-/// Division towards minus infinity. The divisor is positive and the quotient fits 64 bits.
-inline FloorQuotient floorDivide(const NanoCount& count, std::int64_t divisor) {
-    NanoCount quotient;
-    NanoCount remainder;
-    divide_qr(count, NanoCount(divisor), quotient, remainder);
-    FloorQuotient result = {static_cast<std::int64_t>(quotient), static_cast<std::int64_t>(remainder)};
-    if (result.remainder < 0) {
-        result.remainder += divisor;
-        --result.quotient;
-    }
-    return result;
-}
-
 /// The nearest double.
 inline double toDouble(const NanoCount& count) {
     return count.convert_to<double>();

@@ -135,7 +135,4 @@ void writeDate(TextBuffer& text, std::int64_t year, std::uint64_t month, std::ui
 void writeTime(TextBuffer& text, std::uint64_t hours, std::uint64_t minutes, std::uint64_t seconds,
                std::uint64_t nanoseconds, bool extended);
 
-/// Writes "+01:00" for 60.
-void writeOffset(TextBuffer& text, std::int32_t minutes);
-
 } // namespace kvt::ex::datetime::detail

@@ -44,18 +44,13 @@ constexpr std::int64_t wholeSeconds(const TimeCount& count) noexcept {
     return count.days * secondsPerDay + count.nanoseconds / nanosPerSecond;
 }
 
-/// All of it in nanoseconds.
-inline NanoCount nanosOf(const TimeCount& count) {
-    return NanoCount(count.days) * nanosPerDay + count.nanoseconds;
-}
-
-/// The same as the nearest double.
+/// All of it in nanoseconds, as the nearest double.
 inline double nanosecondsAsDouble(const TimeCount& count) {
     constexpr std::int64_t daysIn64Bits = 106'000; // some 290 years
     if (count.days > -daysIn64Bits && count.days < daysIn64Bits) {
         return static_cast<double>(count.days * nanosPerDay + count.nanoseconds);
     }
-    return toDouble(nanosOf(count));
+    return toDouble(NanoCount(count.days) * nanosPerDay + count.nanoseconds);
 }
 
 } // namespace kvt::ex::datetime::detail
