@@ -22,6 +22,7 @@ set(KVT_BOOST_VERSION 1.76)
 kvt_find(NAME "the Boost headers, ${KVT_BOOST_VERSION} or later" INSTALL "libboost1.81-dev (or libboost-dev)"
     PACKAGE Boost ${KVT_BOOST_VERSION} CONFIG)
 kvt_find(NAME "double-conversion" INSTALL "libdouble-conversion-dev" PACKAGE double-conversion CONFIG)
+kvt_find(NAME "Highway" INSTALL "libhwy-dev" PACKAGE hwy CONFIG)
 kvt_find(NAME "the headers of the date library" INSTALL "libhowardhinnant-date-dev" PACKAGE date CONFIG)
 
 if(KVT_BUILD_TOOLS)

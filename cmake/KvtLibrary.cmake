@@ -12,7 +12,7 @@ add_library(kvt_objects OBJECT)
 target_compile_features(kvt_objects PUBLIC cxx_std_20)
 target_include_directories(kvt_objects PUBLIC "${PROJECT_SOURCE_DIR}")
 target_link_libraries(kvt_objects PRIVATE
-    ICU::uc Boost::headers double-conversion::double-conversion kvt_date_headers Threads::Threads)
+    ICU::uc Boost::headers double-conversion::double-conversion hwy::hwy kvt_date_headers Threads::Threads)
 set_target_properties(kvt_objects PROPERTIES
     POSITION_INDEPENDENT_CODE ON
     CXX_VISIBILITY_PRESET hidden
@@ -40,6 +40,13 @@ function(kvt_sources)
     target_sources(kvt_objects PRIVATE ${ARGN})
 endfunction()
 
+# Names sources of one folder that write into strings without filling them first, where the standard library of C++23
+# lets them. They compile without that, too.
+function(kvt_in_place_sources)
+    list(TRANSFORM ARGN PREPEND "${CMAKE_CURRENT_SOURCE_DIR}/")
+    set_source_files_properties(${ARGN} TARGET_DIRECTORY kvt_objects PROPERTIES COMPILE_OPTIONS "-std=c++2b")
+endfunction()
+
 # Names the public headers of one folder, relative to it.
 function(kvt_public_headers)
     list(TRANSFORM ARGN PREPEND "${CMAKE_CURRENT_SOURCE_DIR}/")
@@ -64,7 +71,7 @@ function(kvt_finish_library)
     foreach(library IN ITEMS kvt kvt_static)
         target_sources(${library} PRIVATE $<TARGET_OBJECTS:kvt_objects> $<TARGET_OBJECTS:kvt_date>)
         target_link_libraries(${library} PRIVATE
-            ICU::uc double-conversion::double-conversion Threads::Threads)
+            ICU::uc double-conversion::double-conversion hwy::hwy Threads::Threads)
         set_target_properties(${library} PROPERTIES LINKER_LANGUAGE CXX)
     endforeach()
     # Boost's headers show in the public ones of kvt/mmap.

@@ -1,10 +1,10 @@
 // The shorter ways around ICU (see detail/shortcut.h).
 //
-// A form is a small class that knows how its units lie in bytes and how to read and write one character. One loop,
-// convertRun(), is compiled for each pair of forms: it moves blocks of ASCII without a look at single characters,
-// and other characters one by one. It stops where its input is not well-formed, is cut off, or is more than the
-// target's form can say, and ICU sees the text from there on. So this code decides nothing about substitutions.
-// The single-byte encodings share two forms; what sets them apart is a table.
+// A conversion is measured first: how much of the input is well-formed and complete, and how long the result will be.
+// Then the result is made in one piece. Between UTF-8, UTF-16 and UTF-32 in the machine's byte order, that is one step
+// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the single-byte
+// encodings by their tables, the forms in the other byte order by swapping. What is not well-formed, is cut off, or is
+// more than the target's form can say, is left to ICU, so this code decides nothing about substitutions.
 //
 // What ICU does with the text that is taken here, and so must hold for these ways to be the same ones:
 //
@@ -16,365 +16,31 @@
 #include <kvt/encoding/detail/shortcut.h>
 
 #include <kvt/encoding/detail/single_byte_table.h>
+#include <kvt/encoding/detail/unicode_vectors.h>
+#include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/utf.h>
 
+#include <algorithm>
 #include <array>
 #include <bit>
 #include <cstring>
-#include <utility>
 
 namespace kvt::ex::detail {
 namespace {
 
-constexpr std::size_t chunkBytes = 8192;
-constexpr std::size_t blockLength = 16;     // characters; a multiple of what a vector register holds
-constexpr std::size_t longestCharacter = 4; // bytes, in every form, as in UTF-8
-static_assert(longestCharacter == longestUtf8);
-constexpr std::size_t blockBytes = blockLength * longestCharacter;
+using vectors::Extent;
 
-constexpr bool swappedIfLittle = std::endian::native != std::endian::little;
-constexpr bool swappedIfBig = std::endian::native != std::endian::big;
+constexpr std::size_t pivotUnits = 2048;
+using Pivot = std::array<char16_t, pivotUnits>;
 
-/// A code point and the bytes that it took; none where there is no well-formed character.
-struct Character {
-    char32_t codePoint;
-    std::size_t length;
-};
-constexpr Character noCharacter{0, 0};
+// The bytes that are tried first where the target may lack a character, so that a text with many such characters is not
+// measured to its end after each of them. As long as all goes well, pieces become longer by the factor.
+constexpr std::size_t firstPiece = 512;
+constexpr std::size_t pieceFactor = 8;
 
-/// How units of type `Unit` lie in memory. Text comes as bytes of any alignment.
-template <typename U, bool Swapped>
-struct Units {
-    using Unit = U;
-    /// Whether each ASCII character is one unit with its own number.
-    static constexpr bool keepsAscii = true;
-
-    static Unit load(const char* p) {
-        Unit unit;
-        std::memcpy(&unit, p, sizeof unit);
-        return swap(unit);
-    }
-    static void store(char* p, Unit unit) {
-        unit = swap(unit);
-        std::memcpy(p, &unit, sizeof unit);
-    }
-
-private:
-    static constexpr Unit swap(Unit unit) {
-        if constexpr (!Swapped) {
-            return unit;
-        } else if constexpr (sizeof(Unit) == 2) {
-            return __builtin_bswap16(unit);
-        } else {
-            return __builtin_bswap32(unit);
-        }
-    }
-};
-
-// A form is made from the table of its side, which most have no use for. Its write() returns the bytes written, 0 where
-// the form lacks the character.
-
-struct Ascii : Units<std::uint8_t, false> {
-    explicit Ascii(SingleByteTable*) {}
-
-    static bool isAscii(char byte) { return load(&byte) < 0x80; }
-
-    static Character read(const char* p, const char*) {
-        return isAscii(*p) ? Character{load(p), 1} : noCharacter;
-    }
-    static std::size_t write(char* p, char32_t c) {
-        if (c >= 0x80) {
-            return 0;
-        }
-        store(p, static_cast<Unit>(c));
-        return 1;
-    }
-};
-
-template <bool KeepsAscii>
-class SingleByte : public Units<std::uint8_t, false> {
-public:
-    static constexpr bool keepsAscii = KeepsAscii;
-
-    /// The pointers are kept, since a write of bytes could change the table for all that the compiler knows.
-    explicit SingleByte(SingleByteTable* table)
-        : units_(table->tables().units.data()), utf8_(table->tables().utf8.data()),
-          pageOf_(table->tables().pageOf.data()), pages_(table->tables().pages.data()) {}
-
-    Character read(const char* p, const char*) const {
-        const char32_t unit = units_[load(p)];
-        return unit != SingleByteTable::noUnit ? Character{unit, 1} : noCharacter;
-    }
-    std::size_t write(char* p, char32_t c) const {
-        constexpr auto pageSize = static_cast<char32_t>(SingleByteTable::pageSize);
-        return c < 0x10000 ? writeFrom(c / pageSize, c % pageSize, p) : 0;
-    }
-    /// The same for the unit at a place in a page, the first six bits of which are left out.
-    std::size_t writeFrom(char32_t page, char32_t place, char* p) const {
-        const unsigned entry = pages_[pageOf_[page] + place];
-        store(p, static_cast<Unit>(entry));
-        return entry >> 8;
-    }
-    /// The character as UTF-8, for which the output has room for four bytes; 0 where read() would find none.
-    std::size_t copyUtf8(const char* p, char* q) const {
-        const SingleByteTable::Utf8 character = utf8_[load(p)];
-        std::memcpy(q, &character, sizeof character);
-        return character.length;
-    }
-
-private:
-    const char16_t* units_;
-    const SingleByteTable::Utf8* utf8_;
-    const std::uint16_t* pageOf_;
-    const std::uint16_t* pages_;
-};
-
-struct Utf8 : Units<std::uint8_t, false> {
-    explicit Utf8(SingleByteTable*) {}
-
-    static Character read(const char* p, const char* end) {
-        const char32_t lead = load(p);
-        if (lead < 0x80) {
-            return {lead, 1};
-        }
-        if (lead < 0xC2) {
-            return noCharacter;
-        }
-        const auto available = static_cast<std::size_t>(end - p);
-        if (lead < 0xE0) {
-            if (available < 2 || !isContinuation(p[1])) {
-                return noCharacter;
-            }
-            return {(lead & 0x1F) << 6 | continuationBits(p[1]), 2};
-        }
-        if (lead < 0xF0) {
-            if (available < 3 || !isContinuation(p[1]) || !isContinuation(p[2])) {
-                return noCharacter;
-            }
-            const char32_t c = (lead & 0x0F) << 12 | continuationBits(p[1]) << 6 | continuationBits(p[2]);
-            return c >= 0x800 && !isSurrogate(c) ? Character{c, 3} : noCharacter;
-        }
-        if (lead > 0xF4 || available < 4 || !isContinuation(p[1]) || !isContinuation(p[2]) ||
-            !isContinuation(p[3])) {
-            return noCharacter;
-        }
-        const char32_t c = (lead & 0x07) << 18 | continuationBits(p[1]) << 12 | continuationBits(p[2]) << 6 |
-                           continuationBits(p[3]);
-        return c >= firstSupplementary && c <= lastCodePoint ? Character{c, 4} : noCharacter;
-    }
-
-    static std::size_t write(char* p, char32_t c) { return encodeUtf8(c, p); }
-
-    /// Whether a well-formed character of two bytes begins at `p`, where two bytes can be read.
-    static bool hasTwoBytes(const char* p) {
-        const auto lead = static_cast<unsigned char>(p[0]);
-        return lead >= 0xC2 && lead < 0xE0 && isContinuation(p[1]);
-    }
-};
-
-template <bool Swapped>
-struct Utf16 : Units<std::uint16_t, Swapped> {
-    using Base = Units<std::uint16_t, Swapped>;
-    using typename Base::Unit;
-
-    explicit Utf16(SingleByteTable*) {}
-
-    static Character read(const char* p, const char* end) {
-        const auto available = static_cast<std::size_t>(end - p);
-        if (available < 2) {
-            return noCharacter;
-        }
-        const char32_t unit = Base::load(p);
-        if (!isSurrogate(unit)) {
-            return {unit, 2};
-        }
-        if (isLowSurrogate(unit) || available < 4) {
-            return noCharacter;
-        }
-        const Unit low = Base::load(p + 2);
-        if (!isLowSurrogate(low)) {
-            return noCharacter;
-        }
-        return {codePointOf(static_cast<char16_t>(unit), low), 4};
-    }
-
-    static std::size_t write(char* p, char32_t c) {
-        if (c < firstSupplementary) {
-            Base::store(p, static_cast<Unit>(c));
-            return 2;
-        }
-        Base::store(p, highSurrogate(c));
-        Base::store(p + 2, lowSurrogate(c));
-        return 4;
-    }
-};
-
-template <bool Swapped>
-struct Utf32 : Units<std::uint32_t, Swapped> {
-    using Base = Units<std::uint32_t, Swapped>;
-
-    explicit Utf32(SingleByteTable*) {}
-
-    static Character read(const char* p, const char* end) {
-        if (end - p < 4) {
-            return noCharacter;
-        }
-        const char32_t c = Base::load(p);
-        return c <= lastCodePoint && !isSurrogate(c) ? Character{c, 4} : noCharacter;
-    }
-    static std::size_t write(char* p, char32_t c) {
-        Base::store(p, c);
-        return 4;
-    }
-};
-
-/// Fixed trip counts and no early exit: the compiler makes vector code of these two.
-template <typename From>
-bool isAsciiBlock(const char* p) {
-    typename From::Unit all = 0;
-    for (std::size_t i = 0; i < blockLength; ++i) {
-        all = static_cast<typename From::Unit>(all | From::load(p + i * sizeof all));
-    }
-    return all < 0x80;
-}
-
-template <typename From, typename To>
-void copyAsciiBlock(const char* p, char* q) {
-    for (std::size_t i = 0; i < blockLength; ++i) {
-        To::store(q + i * sizeof(typename To::Unit),
-                  static_cast<typename To::Unit>(From::load(p + i * sizeof(typename From::Unit))));
-    }
-}
-
-/// Where a run ended, and whether it ended because there was nothing more to take.
-struct Run {
-    const char* p;
-    char* q;
-    bool ended;
-};
-
-/// Moves one character; returns whether there was one to take. `end` is that of the input or a nearer place behind the
-/// character: where it is a fixed distance away, no comparisons with it are left in the code.
-template <typename From, typename To>
-bool moveCharacter(const From& from, const To& to, const char*& p, const char* end, char*& q) {
-    const Character character = from.read(p, end);
-    if (character.length == 0) {
-        return false;
-    }
-    const std::size_t written = to.write(q, character.codePoint);
-    if (written == 0) {
-        return false;
-    }
-    p += character.length;
-    q += written;
-    return true;
-}
-
-/// From single bytes to UTF-8 a character is copied out of the table, without a branch for its length.
-template <bool KeepsAscii>
-bool moveCharacter(const SingleByte<KeepsAscii>& from, const Utf8&, const char*& p, const char*, char*& q) {
-    const std::size_t length = from.copyUtf8(p, q);
-    p += length != 0 ? 1 : 0;
-    q += length;
-    return length != 0;
-}
-
-/// Moves characters of which the input has `blockBytes` bytes and the output has room for as many.
-template <typename From, typename To>
-Run moveBlock(const From& from, const To& to, const char* p, char* q) {
-    for (std::size_t i = 0; i < blockLength; ++i) {
-        if (!moveCharacter(from, to, p, p + longestCharacter, q)) {
-            return {p, q, true};
-        }
-    }
-    return {p, q, false};
-}
-
-/// How many of the first seven bytes of eight stand before one that is not ASCII.
-unsigned leadingAscii(const char* p) {
-    std::uint64_t bytes;
-    std::memcpy(&bytes, p, sizeof bytes);
-    constexpr bool isLittle = std::endian::native == std::endian::little;
-    // The mark at the eighth byte is there so that the count needs no case for none.
-    const std::uint64_t others = (bytes & 0x8080808080808080) | (isLittle ? std::uint64_t{1} << 63 : 0x80);
-    return static_cast<unsigned>(isLittle ? std::countr_zero(others) : std::countl_zero(others)) / 8;
-}
-
-/// From UTF-8 to single bytes: ASCII between other characters goes by words, and the two bytes of most other characters
-/// are the place in the tables as they stand.
-Run moveBlock(const Utf8& from, const SingleByte<true>& to, const char* p, char* q) {
-    constexpr std::size_t wordBytes = sizeof(std::uint64_t);
-    const char* const last = p + blockBytes - wordBytes;
-    while (p <= last) {
-        std::memcpy(q, p, wordBytes);
-        const unsigned ascii = leadingAscii(p);
-        p += ascii;
-        q += ascii;
-        while (p <= last && !Ascii::isAscii(*p)) {
-            if (!Utf8::hasTwoBytes(p)) {
-                if (!moveCharacter(from, to, p, p + longestCharacter, q)) {
-                    return {p, q, true};
-                }
-                continue;
-            }
-            if (to.writeFrom(p[0] & 0x1F, p[1] & 0x3F, q) == 0) {
-                return {p, q, true};
-            }
-            p += 2;
-            ++q;
-        }
-    }
-    return {p, q, false};
-}
-
-/// Converts from `p` on until the input ends, the output has no room for another block, or ICU has to look.
-template <typename From, typename To>
-Run convertRun(SingleByteTable* fromTable, SingleByteTable* toTable, const char* p, const char* end, char* q,
-               const char* outEnd) {
-    constexpr std::size_t fromBlock = blockLength * sizeof(typename From::Unit);
-    constexpr std::size_t toBlock = blockLength * sizeof(typename To::Unit);
-    constexpr bool keepAscii = From::keepsAscii && To::keepsAscii;
-    const From from(fromTable);
-    const To to(toTable);
-    while (static_cast<std::size_t>(outEnd - q) >= blockBytes) {
-        const auto left = static_cast<std::size_t>(end - p);
-        if (keepAscii && left >= fromBlock && isAsciiBlock<From>(p)) {
-            copyAsciiBlock<From, To>(p, q);
-            p += fromBlock;
-            q += toBlock;
-        } else if (left >= blockBytes) {
-            const Run run = moveBlock(from, to, p, q);
-            if (run.ended) {
-                return run;
-            }
-            p = run.p;
-            q = run.q;
-        } else {
-            for (std::size_t i = 0; i < blockLength; ++i) {
-                if (p == end || !moveCharacter(from, to, p, end, q)) {
-                    return {p, q, true};
-                }
-            }
-        }
-    }
-    return {p, q, false};
-}
-
-using RunFunction = Run (*)(SingleByteTable*, SingleByteTable*, const char*, const char*, char*, const char*);
-
-/// The forms with a way of their own, in the order of Form from asciiCompatible on, as sources and as targets.
-template <typename... Forms>
-struct FormList {
-    static constexpr std::size_t size = sizeof...(Forms);
-
-    template <typename From>
-    static constexpr std::array<RunFunction, size> row = {&convertRun<From, Forms>...};
-
-    static constexpr std::array<std::array<RunFunction, size>, size> table = {row<Forms>...};
-};
-using AllForms = FormList<Ascii, SingleByte<true>, SingleByte<false>, Utf8, Utf16<swappedIfLittle>,
-                          Utf16<swappedIfBig>, Utf32<swappedIfLittle>, Utf32<swappedIfBig>>;
-static_assert(static_cast<std::size_t>(Form::utf32be) == AllForms::size, "a row for each form but `other`");
+constexpr bool isLittle = std::endian::native == std::endian::little;
+constexpr Form nativeUtf16 = isLittle ? Form::utf16le : Form::utf16be;
+constexpr Form nativeUtf32 = isLittle ? Form::utf32le : Form::utf32be;
 
 std::size_t unitBytes(Form form) {
     switch (form) {
@@ -389,17 +55,16 @@ std::size_t unitBytes(Form form) {
     }
 }
 
-/// ASCII to ASCII needs no other buffer than the input itself.
-std::size_t asciiLength(std::string_view in) {
-    const char* p = in.data();
-    const char* const end = p + in.size();
-    while (static_cast<std::size_t>(end - p) >= blockLength && isAsciiBlock<Ascii>(p)) {
-        p += blockLength;
-    }
-    while (p != end && Ascii::isAscii(*p)) {
-        ++p;
-    }
-    return static_cast<std::size_t>(p - in.data());
+bool hasTable(Form form) {
+    return form == Form::asciiSingleByte || form == Form::singleByte;
+}
+
+bool isUtf16(Form form) {
+    return form == Form::utf16le || form == Form::utf16be;
+}
+
+bool isUtf32(Form form) {
+    return form == Form::utf32le || form == Form::utf32be;
 }
 
 bool keepsAscii(Form form) {
@@ -411,31 +76,331 @@ bool isAsciiBytes(Form form) {
     return keepsAscii(form) && unitBytes(form) == 1;
 }
 
+/// Whether the target can say every character.
+bool isUnicode(Form form) {
+    return form >= Form::utf8;
+}
+
+/// Copies units with their bytes reversed. The loop is one that compilers make vector code of.
+template <typename Unit>
+void copySwapped(const char* from, char* to, std::size_t units) {
+    for (std::size_t i = 0; i < units; ++i) {
+        Unit unit;
+        std::memcpy(&unit, from + i * sizeof unit, sizeof unit);
+        if constexpr (sizeof unit == 2) {
+            unit = __builtin_bswap16(unit);
+        } else {
+            unit = __builtin_bswap32(unit);
+        }
+        std::memcpy(to + i * sizeof unit, &unit, sizeof unit);
+    }
+}
+
+// ---- How much there is to convert --------------------------------------------------------------------------------
+
+void add(Extent& sum, const Extent& extent) {
+    sum.taken += extent.taken;
+    sum.utf8 += extent.utf8;
+    sum.utf16 += extent.utf16;
+    sum.utf32 += extent.utf32;
+}
+
+template <typename Unit>
+Extent measureSwapped(std::string_view in, Extent (*measure)(const char*, std::size_t)) {
+    Extent sum;
+    char swapped[sizeof(Pivot)];
+    for (bool ended = false; !ended;) {
+        const std::size_t units =
+            std::min(in.size() / sizeof(Unit) - sum.taken, sizeof swapped / sizeof(Unit));
+        copySwapped<Unit>(in.data() + sum.taken * sizeof(Unit), swapped, units);
+        const Extent extent = measure(swapped, units);
+        add(sum, extent);
+        // A piece may have been cut in the middle of a character, and then the next one begins with it.
+        ended = extent.taken == 0 || extent.taken + 1 < units;
+    }
+    return sum;
+}
+
+/// Single bytes, as far as the table goes. Each is one unit of UTF-16.
+Extent measureSingleBytes(const SingleByteTable::Tables& tables, std::string_view in) {
+    constexpr std::size_t blockBytes = 32;
+    const auto* const begin = reinterpret_cast<const unsigned char*>(in.data());
+    const unsigned char* const end = begin + in.size();
+    const unsigned char* p = begin;
+    std::size_t utf8 = 0;
+    const auto measureBlock = [&](std::size_t length) {
+        std::uint32_t sum = 0;
+        for (std::size_t i = 0; i < length; ++i) {
+            sum += tables.weights[p[i]];
+        }
+        if (sum >= SingleByteTable::noCharacter) {
+            return false;
+        }
+        utf8 += sum;
+        p += length;
+        return true;
+    };
+    while (static_cast<std::size_t>(end - p) >= blockBytes && measureBlock(blockBytes)) {
+    }
+    while (p != end && measureBlock(1)) {
+    }
+    const auto taken = static_cast<std::size_t>(p - begin);
+    return {taken, utf8, taken, taken};
+}
+
+Extent measure(Side from, std::string_view in) {
+    switch (from.form) {
+    case Form::asciiCompatible: {
+        const std::size_t ascii = vectors::asciiPrefix(in.data(), in.size());
+        return {ascii, ascii, ascii, ascii};
+    }
+    case Form::asciiSingleByte:
+    case Form::singleByte:
+        return measureSingleBytes(from.table->tables(), in);
+    case Form::utf8:
+        return vectors::measureUtf8(in.data(), in.size());
+    case nativeUtf16:
+        return vectors::measureUtf16(in.data(), in.size() / 2);
+    case nativeUtf32:
+        return vectors::measureUtf32(in.data(), in.size() / 4);
+    default:
+        return isUtf16(from.form) ? measureSwapped<std::uint16_t>(in, vectors::measureUtf16)
+                                  : measureSwapped<std::uint32_t>(in, vectors::measureUtf32);
+    }
+}
+
+/// The bytes of a text in the target's form, if the target has all its characters.
+std::size_t bytesOf(const Extent& extent, Form form) {
+    return isUtf16(form)        ? extent.utf16 * 2
+           : isUtf32(form)      ? extent.utf32 * 4
+           : form == Form::utf8 ? extent.utf8
+                                : extent.utf32;
+}
+
+// ---- By way of UTF-16 --------------------------------------------------------------------------------------------
+
+/// Reads well-formed text up to a character border, until the pivot is full. Returns the units; `in` is moved on.
+std::size_t decode(Side from, std::string_view& in, Pivot& pivot) {
+    auto* const out = reinterpret_cast<char*>(pivot.data());
+    std::size_t bytes = std::min(in.size(), pivotUnits * unitBytes(from.form));
+    std::size_t units = 0;
+    switch (from.form) {
+    case Form::asciiCompatible:
+        units = vectors::widenAscii(in.data(), bytes, out);
+        break;
+    case Form::asciiSingleByte:
+    case Form::singleByte: {
+        const auto& table = from.table->tables().units;
+        for (; units < bytes; ++units) {
+            pivot[units] = table[static_cast<unsigned char>(in[units])];
+        }
+        break;
+    }
+    case Form::utf8:
+        while (bytes < in.size() && isContinuation(in[bytes])) {
+            --bytes;
+        }
+        units = vectors::utf8ToUtf16(in.data(), bytes, out, pivotUnits);
+        break;
+    case Form::utf16le:
+    case Form::utf16be:
+        units = bytes / 2;
+        if (from.form == nativeUtf16) {
+            std::memcpy(out, in.data(), bytes);
+        } else {
+            copySwapped<std::uint16_t>(in.data(), out, units);
+        }
+        if (bytes < in.size() && isHighSurrogate(pivot[units - 1])) {
+            --units;
+            bytes -= 2;
+        }
+        break;
+    default: {
+        // Each character may take two units.
+        bytes = std::min(in.size(), pivotUnits / 2 * sizeof(char32_t));
+        std::array<char32_t, pivotUnits / 2> swapped;
+        const char* source = in.data();
+        if (from.form != nativeUtf32) {
+            copySwapped<std::uint32_t>(source, reinterpret_cast<char*>(swapped.data()), bytes / 4);
+            source = reinterpret_cast<const char*>(swapped.data());
+        }
+        units = vectors::utf32ToUtf16(source, bytes / 4, out, pivotUnits);
+        break;
+    }
+    }
+    in.remove_prefix(bytes);
+    return units;
+}
+
+/// Where writing ended: the units taken and the bytes written.
+struct Written {
+    std::size_t units;
+    std::size_t bytes;
+};
+
+Written encodeSingleBytes(const SingleByteTable::Tables& tables, bool hasAscii, const char16_t* units,
+                          std::size_t count, char* out) {
+    constexpr std::size_t blockUnits = 16;
+    const auto put = [&](std::size_t i) {
+        const char16_t unit = units[i];
+        const unsigned entry =
+            tables.pages[tables.pageOf[unit / SingleByteTable::pageSize] + unit % SingleByteTable::pageSize];
+        out[i] = static_cast<char>(entry);
+        return entry >> 8;
+    };
+    std::size_t i = 0;
+    while (i + blockUnits <= count) {
+        if (hasAscii && units[i] < 0x80) {
+            i += vectors::narrowAscii(reinterpret_cast<const char*>(units + i), count - i, out + i);
+        }
+        unsigned found = 1;
+        for (const std::size_t end = std::min(i + blockUnits, count); i < end; ++i) {
+            found &= put(i);
+        }
+        if (found == 0) {
+            i -= std::min(i, blockUnits);
+            break;
+        }
+    }
+    while (i < count && put(i) != 0) {
+        ++i;
+    }
+    return {i, i};
+}
+
+/// Writes well-formed UTF-16, as far as the target has its characters. `out` has room for all of it.
+Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::size_t room) {
+    const auto* const in = reinterpret_cast<const char*>(pivot.data());
+    switch (to.form) {
+    case Form::asciiCompatible: {
+        const std::size_t ascii = vectors::narrowAscii(in, units, out);
+        return {ascii, ascii};
+    }
+    case Form::asciiSingleByte:
+    case Form::singleByte:
+        // Room for each character: where there are fewer than units, one of them is beyond U+FFFF, and not in the table.
+        return encodeSingleBytes(to.table->tables(), keepsAscii(to.form), pivot.data(), std::min(units, room),
+                                 out);
+    case Form::utf8:
+        return {units, vectors::utf16ToUtf8(in, units, out, room)};
+    case nativeUtf16:
+        std::memcpy(out, in, units * 2);
+        return {units, units * 2};
+    case nativeUtf32:
+        return {units, vectors::utf16ToUtf32(in, units, out, room / 4) * 4};
+    default:
+        if (isUtf16(to.form)) {
+            copySwapped<std::uint16_t>(in, out, units);
+            return {units, units * 2};
+        }
+        std::array<char32_t, pivotUnits> wide;
+        auto* const wideBytes = reinterpret_cast<char*>(wide.data());
+        const std::size_t characters = vectors::utf16ToUtf32(in, units, wideBytes, wide.size());
+        copySwapped<std::uint32_t>(wideBytes, out, characters);
+        return {units, characters * 4};
+    }
+}
+
+/// The bytes of `in` that the first `units` units of UTF-16 come from.
+std::size_t sourceOf(Form form, std::string_view in, std::size_t units) {
+    if (form != Form::utf8 && !isUtf32(form)) {
+        return units * unitBytes(form);
+    }
+    std::size_t bytes = 0;
+    while (units > 0) {
+        std::size_t length = 4;
+        bool isPair = false;
+        if (form == Form::utf8) {
+            const auto lead = static_cast<unsigned char>(in[bytes]);
+            length = lead < 0x80 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : 4;
+            isPair = length == 4;
+        } else {
+            // The third lowest byte of the number says whether it is beyond U+FFFF.
+            isPair = in[bytes + (form == Form::utf32le ? 2 : 1)] != 0;
+        }
+        bytes += length;
+        units -= isPair ? 2 : 1;
+    }
+    return bytes;
+}
+
+/// How far a conversion came, in bytes.
+struct Progress {
+    std::size_t taken;
+    std::size_t written;
+};
+
+Progress convertByPivot(Side from, Side to, std::string_view in, char* out, std::size_t room) {
+    Progress progress{0, 0};
+    Pivot pivot;
+    for (std::string_view rest = in; !rest.empty();) {
+        const std::string_view before = rest;
+        const std::size_t units = decode(from, rest, pivot);
+        const Written written = encode(to, pivot, units, out + progress.written, room - progress.written);
+        progress.written += written.bytes;
+        if (written.units < units) {
+            progress.taken += sourceOf(from.form, before, written.units);
+            break;
+        }
+        progress.taken += before.size() - rest.size();
+    }
+    return progress;
+}
+
+/// Converts text that is well-formed in the source, as far as the target has its characters.
+Progress convertWellFormed(Side from, Side to, std::string_view in, char* out, std::size_t room) {
+    using Convert = std::size_t (*)(const char*, std::size_t, char*, std::size_t);
+    Convert convert = nullptr;
+    if (from.form == Form::utf8) {
+        convert = to.form == nativeUtf16   ? vectors::utf8ToUtf16
+                  : to.form == nativeUtf32 ? vectors::utf8ToUtf32
+                                           : nullptr;
+    } else if (from.form == nativeUtf16) {
+        convert = to.form == Form::utf8    ? vectors::utf16ToUtf8
+                  : to.form == nativeUtf32 ? vectors::utf16ToUtf32
+                                           : nullptr;
+    } else if (from.form == nativeUtf32) {
+        convert = to.form == Form::utf8    ? vectors::utf32ToUtf8
+                  : to.form == nativeUtf16 ? vectors::utf32ToUtf16
+                                           : nullptr;
+    }
+    if (convert == nullptr) {
+        return convertByPivot(from, to, in, out, room);
+    }
+    const std::size_t unit = unitBytes(to.form);
+    return {in.size(), convert(in.data(), in.size() / unitBytes(from.form), out, room / unit) * unit};
+}
+
 /// A side in which only ASCII can be read and written, and no table is needed for it.
 Side asciiOnly(Side side) {
     return side.form == Form::asciiSingleByte ? Side{Form::asciiCompatible, nullptr} : side;
 }
 
 bool lacksTable(Side side) {
-    const bool needsOne = side.form == Form::asciiSingleByte || side.form == Form::singleByte;
-    return needsOne && !side.table->isBuilt();
+    return hasTable(side.form) && !side.table->isBuilt();
 }
 
 template <typename CharOut>
 std::size_t convertBy(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
-    const RunFunction convert =
-        AllForms::table[static_cast<std::size_t>(from.form) - 1][static_cast<std::size_t>(to.form) - 1];
-    const char* p = in.data();
-    const char* const end = p + in.size();
-    CharOut chunk[chunkBytes / sizeof(CharOut)];
-    char* const start = reinterpret_cast<char*>(chunk);
-    for (bool ended = false; !ended;) {
-        const Run run = convert(from.table, to.table, p, end, start, start + chunkBytes);
-        out.append(chunk, static_cast<std::size_t>(run.q - start) / sizeof(CharOut));
-        p = run.p;
-        ended = run.ended;
+    std::size_t taken = 0;
+    std::size_t pieceBytes = isUnicode(to.form) ? in.size() : firstPiece;
+    for (bool ended = false; !ended && taken < in.size(); pieceBytes *= pieceFactor) {
+        std::string_view piece = in.substr(taken, pieceBytes);
+        const Extent extent = measure(from, piece);
+        const std::size_t wellFormed = extent.taken * unitBytes(from.form);
+        const std::size_t room = bytesOf(extent, to.form);
+        // A piece may have been cut in the middle of a character.
+        ended = wellFormed + longestUtf8 <= piece.size() || wellFormed == 0;
+        piece = piece.substr(0, wellFormed);
+        appendInPlace(out, room / sizeof(CharOut), [&](CharOut* units) {
+            const Progress progress =
+                convertWellFormed(from, to, piece, reinterpret_cast<char*>(units), room);
+            taken += progress.taken;
+            ended = ended || progress.taken < piece.size();
+            return progress.written / sizeof(CharOut);
+        });
     }
-    return static_cast<std::size_t>(p - in.data());
+    return taken;
 }
 
 } // namespace
@@ -448,8 +413,9 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
     }
     std::size_t taken = 0;
     if constexpr (sizeof(CharOut) == 1) {
+        // ASCII to ASCII needs no other buffer than the input itself.
         if (isAsciiBytes(from.form) && isAsciiBytes(to.form)) {
-            taken = asciiLength(in);
+            taken = vectors::asciiPrefix(in.data(), in.size());
             out.append(in.data(), taken);
             if (taken == in.size() || from.form == Form::asciiCompatible ||
                 to.form == Form::asciiCompatible) {

@@ -69,14 +69,11 @@ private:
     bool isQuiet_ = true;
 };
 
-SingleByteTable::Utf8 utf8Of(char16_t unit) {
-    if (unit == SingleByteTable::noUnit) {
-        return {{}, 0};
-    }
-    // No single unit of UTF-16 takes more bytes than there are here.
-    SingleByteTable::Utf8 character{};
-    character.length = static_cast<std::uint8_t>(encodeUtf8(unit, character.bytes.data()));
-    return character;
+std::uint32_t weightOf(char16_t unit) {
+    return unit == SingleByteTable::noUnit ? SingleByteTable::noCharacter
+           : unit < 0x80                   ? 1
+           : unit < 0x800                  ? 2
+                                           : 3;
 }
 
 std::unique_ptr<const SingleByteTable::Tables> build(Encoding encoding) {
@@ -99,7 +96,7 @@ std::unique_ptr<const SingleByteTable::Tables> build(Encoding encoding) {
         tables->pages[page + unit % SingleByteTable::pageSize] = static_cast<std::uint16_t>(0x100 | byte);
     }
     for (std::size_t i = 0; i < tables->units.size(); ++i) {
-        tables->utf8[i] = utf8Of(tables->units[i]);
+        tables->weights[i] = weightOf(tables->units[i]);
     }
     return tables;
 }

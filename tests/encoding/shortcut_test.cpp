@@ -87,6 +87,14 @@ public:
         return longest;
     }
 
+    /// The same for `ascii` ASCII characters in front of characters beyond U+FFFF, of which there is none or all.
+    std::string longestQuietPrefixOf(std::size_t ascii, const std::string& bytes) const {
+        if (convertWithIcu(from().name, to().name, bytes).calls == 0) {
+            return bytes;
+        }
+        return longestQuietPrefix(std::string_view(bytes).substr(0, ascii * from().unit));
+    }
+
     void check(std::string_view bytes) const {
         const std::string expected = longestQuietPrefix(bytes);
         std::string out = "before";
@@ -215,6 +223,24 @@ TEST_P(ShortcutPair, FillsUnitsOfTheWidthOfTheTargetAndNoOthers) {
               to().unit == 2 ? hex(expected, 1000) : "");
     EXPECT_EQ(hex({reinterpret_cast<const char*>(out32.data()), out32.size() * 4}, 1000),
               to().unit == 4 ? hex(expected, 1000) : "");
+}
+
+// More units of UTF-16 than characters; a write behind the room for these is seen by the address sanitizer.
+TEST_P(ShortcutPair, CharactersOfTwoUnitsTakeOneRoom) {
+    for (const std::size_t pairs : {1U, 15U, 16U, 17U, 40U, 700U, 3000U}) {
+        std::u16string text;
+        for (std::size_t i = 0; i < pairs; ++i) {
+            text += u"\U0001F600";
+        }
+        for (const std::u16string& before : {std::u16string(), std::u16string(u"abc")}) {
+            const std::string bytes = encodeWithIcu(from().name, before + text);
+            const std::string expected = longestQuietPrefixOf(before.size(), bytes);
+            std::string out;
+            const std::size_t taken = convertPrefix(from().side(), to().side(), bytes, out);
+            EXPECT_EQ(taken, expected.size()) << pairs;
+            EXPECT_EQ(hex(out), hex(convertWithIcu(from().name, to().name, expected).bytes)) << pairs;
+        }
+    }
 }
 
 TEST(Shortcut, OtherFormsHaveNone) {

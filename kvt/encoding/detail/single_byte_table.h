@@ -17,19 +17,17 @@ namespace kvt::ex::detail {
 /// Costs next to nothing until it is built, which takes ICU some microseconds. For one thread.
 class SingleByteTable {
 public:
-    /// A character as UTF-8, with its length beside it so that both come in one load.
-    struct Utf8 {
-        std::array<char, 3> bytes;
-        std::uint8_t length; ///< 0 for "ask ICU"
-    };
     static constexpr char16_t noUnit = 0xFFFF;
+    /// More than any number of lengths of UTF-8 that are added up.
+    static constexpr std::uint32_t noCharacter = 0x10000;
     /// Units of one page: as many as the last byte of UTF-8 tells apart.
     static constexpr std::size_t pageSize = 64;
 
     struct Tables {
         /// The UTF-16 of each byte; `noUnit` for "ask ICU".
         std::array<char16_t, 256> units;
-        std::array<Utf8, 256> utf8;
+        /// The bytes of its UTF-8; `noCharacter` for "ask ICU".
+        std::array<std::uint32_t, 256> weights;
         /// For a UTF-16 unit without its last six bits the place where its page begins. The first page is empty.
         std::array<std::uint16_t, 0x10000 / pageSize> pageOf{};
         /// The pages. An entry is the byte with 0x100 added, or 0 for "ask ICU".

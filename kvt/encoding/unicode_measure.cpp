@@ -1,0 +1,342 @@
+// How much of a text is well-formed, and what it measures in other forms (see detail/unicode_vectors.h): one source,
+// compiled for each instruction set that Highway knows for this processor family, and chosen when it is first called.
+//
+// UTF-8 is checked as J. Keiser and D. Lemire do it in "Validating UTF-8 In Less Than One Instruction Per Byte" (2020): by
+// three look-ups by half bytes of each byte and its predecessor, whose common bits are the errors.
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "kvt/encoding/unicode_measure.cpp"
+#include <hwy/foreach_target.h> // must come before highway.h
+
+#include <kvt/encoding/detail/unicode_characters-inl.h>
+#include <kvt/encoding/detail/unicode_vectors.h>
+
+#include <hwy/highway.h>
+
+HWY_BEFORE_NAMESPACE();
+namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
+
+#if KVT_HAS_VECTORS
+/// The three tables of the check, by the upper and the lower half of a byte and the upper half of the next.
+struct Utf8Check {
+    static constexpr std::uint8_t tooShort = 1 << 0;
+    static constexpr std::uint8_t tooLong = 1 << 1;
+    static constexpr std::uint8_t overlong3 = 1 << 2;
+    static constexpr std::uint8_t tooLarge = 1 << 3;
+    static constexpr std::uint8_t surrogate = 1 << 4;
+    static constexpr std::uint8_t overlong2 = 1 << 5;
+    static constexpr std::uint8_t tooLarge1000 = 1 << 6;
+    static constexpr std::uint8_t overlong4 = 1 << 6;
+    static constexpr std::uint8_t twoTrails = 1 << 7;
+    static constexpr std::uint8_t carry = tooShort | tooLong | twoTrails;
+
+    alignas(16) static constexpr std::uint8_t firstHigh[16] = {tooLong,
+                                                               tooLong,
+                                                               tooLong,
+                                                               tooLong,
+                                                               tooLong,
+                                                               tooLong,
+                                                               tooLong,
+                                                               tooLong, // ASCII
+                                                               twoTrails,
+                                                               twoTrails,
+                                                               twoTrails,
+                                                               twoTrails, // trail bytes
+                                                               tooShort | overlong2,
+                                                               tooShort,
+                                                               tooShort | overlong3 | surrogate,
+                                                               tooShort | tooLarge | tooLarge1000 |
+                                                                   overlong4};
+    alignas(16) static constexpr std::uint8_t firstLow[16] = {carry | overlong3 | overlong2 | overlong4,
+                                                              carry | overlong2,
+                                                              carry,
+                                                              carry,
+                                                              carry | tooLarge,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000 | surrogate,
+                                                              carry | tooLarge | tooLarge1000,
+                                                              carry | tooLarge | tooLarge1000};
+    alignas(16) static constexpr std::uint8_t secondHigh[16] = {
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort, // ASCII
+        tooLong | overlong2 | twoTrails | overlong3 | tooLarge1000 | overlong4,
+        tooLong | overlong2 | twoTrails | overlong3 | tooLarge,
+        tooLong | overlong2 | twoTrails | surrogate | tooLarge,
+        tooLong | overlong2 | twoTrails | surrogate | tooLarge,
+        tooShort,
+        tooShort,
+        tooShort,
+        tooShort};
+
+    /// Not zero where a byte does not fit what stands before it. Three bytes before `p` can be read.
+    static HWY_INLINE hn::Vec<Bytes> errors(const std::uint8_t* p, hn::Vec<Bytes> bytes) {
+        using V = hn::Vec<Bytes>;
+        const Bytes d;
+        const V table1 = hn::LoadDup128(d, firstHigh);
+        const V table2 = hn::LoadDup128(d, firstLow);
+        const V table3 = hn::LoadDup128(d, secondHigh);
+        const V low = hn::Set(d, 0x0F);
+        const V before1 = hn::LoadU(d, p - 1);
+        const V before2 = hn::LoadU(d, p - 2);
+        const V before3 = hn::LoadU(d, p - 3);
+        const V special = hn::And(hn::And(hn::TableLookupBytes(table1, hn::ShiftRight<4>(before1)),
+                                          hn::TableLookupBytes(table2, hn::And(before1, low))),
+                                  hn::TableLookupBytes(table3, hn::ShiftRight<4>(bytes)));
+        // 0x80 where the byte must be the third or fourth of a character.
+        const V third = hn::SaturatedSub(before2, hn::Set(d, 0xE0 - 0x80));
+        const V fourth = hn::SaturatedSub(before3, hn::Set(d, 0xF0 - 0x80));
+        const V must = hn::And(hn::Or(third, fourth), hn::Set(d, 0x80));
+        return hn::Xor(must, special);
+    }
+};
+
+#endif
+/// Adds the characters of one more byte each up to `end` or the first that is not well-formed.
+HWY_INLINE const std::uint8_t* measureUtf8Singly(const std::uint8_t* p, const std::uint8_t* stop,
+                                                 const std::uint8_t* end, Extent& extent, bool& ended) {
+    while (p < stop) {
+        const std::size_t length = wellFormedLength(p, end);
+        if (length == 0) {
+            ended = true;
+            return p;
+        }
+        p += length;
+        extent.utf32 += 1;
+        extent.utf16 += length == 4 ? 2 : 1;
+    }
+    return p;
+}
+
+Extent measureUtf8(const char* text, std::size_t bytes) {
+    const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
+    const std::uint8_t* const end = begin + bytes;
+    const std::uint8_t* p = begin;
+    Extent extent;
+    bool ended = false;
+#if KVT_HAS_VECTORS
+    const Bytes d;
+    const hn::RebindToSigned<Bytes> dSigned;
+    const std::size_t N = hn::Lanes(d);
+    constexpr std::size_t unrolled = 4;
+    if (bytes >= 3 + N) {
+        p = measureUtf8Singly(p, begin + 3, end, extent, ended);
+        const bool hasBegun = !ended;
+        const auto high = hn::Set(d, 0x80);
+        while (!ended && static_cast<std::size_t>(end - p) >= N) {
+            // Blocks of nothing but ASCII, behind a complete character.
+            while (static_cast<std::size_t>(end - p) >= unrolled * N) {
+                const auto v0 = hn::LoadU(d, p);
+                const auto v1 = hn::LoadU(d, p + N);
+                const auto v2 = hn::LoadU(d, p + 2 * N);
+                const auto v3 = hn::LoadU(d, p + 3 * N);
+                const auto any = hn::And(hn::Or(hn::Or(v0, v1), hn::Or(v2, v3)), high);
+                if (!hn::AllTrue(d, hn::Eq(any, hn::Zero(d))) || p[-1] >= 0xC0 || p[-2] >= 0xE0 ||
+                    p[-3] >= 0xF0) {
+                    break;
+                }
+                p += unrolled * N;
+                extent.utf32 += unrolled * N;
+                extent.utf16 += unrolled * N;
+            }
+            if (static_cast<std::size_t>(end - p) < N) {
+                break;
+            }
+            const auto v = hn::LoadU(d, p);
+            if (!hn::AllTrue(d, hn::Eq(Utf8Check::errors(p, v), hn::Zero(d)))) {
+                ended = true;
+                break;
+            }
+            const std::size_t leads =
+                hn::CountTrue(dSigned, hn::Gt(hn::BitCast(dSigned, v), hn::Set(dSigned, -65)));
+            const std::size_t fours = hn::CountTrue(d, hn::Eq(hn::Max(v, hn::Set(d, 0xF0)), v));
+            extent.utf32 += leads;
+            extent.utf16 += leads + fours;
+            p += N;
+        }
+        // The last character may reach beyond what was looked at.
+        for (std::size_t back = 1; hasBegun && back <= 3; ++back) {
+            if (p[-static_cast<std::ptrdiff_t>(back)] >= 0xC0) {
+                const std::uint8_t lead = p[-static_cast<std::ptrdiff_t>(back)];
+                const std::size_t length = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : 2;
+                if (length > back) {
+                    p -= back;
+                    extent.utf32 -= 1;
+                    extent.utf16 -= length == 4 ? 2 : 1;
+                }
+                break;
+            }
+        }
+        ended = !hasBegun;
+    }
+#endif
+    if (!ended) {
+        p = measureUtf8Singly(p, end, end, extent, ended);
+    }
+    extent.taken = static_cast<std::size_t>(p - begin);
+    extent.utf8 = extent.taken;
+    return extent;
+}
+
+Extent measureUtf16(const char* text, std::size_t units) {
+    const auto* const begin = reinterpret_cast<const std::uint16_t*>(text);
+    const std::uint16_t* const end = begin + units;
+    const std::uint16_t* p = begin;
+    Extent extent;
+    std::size_t beyondAscii = 0; // units from U+0080 and from U+0800
+    std::size_t surrogates = 0;
+#if KVT_HAS_VECTORS
+    const Units16 d;
+    const std::size_t N = hn::Lanes(d);
+    const auto surrogateMask = hn::Set(d, 0xF800);
+    const auto half = hn::Set(d, 0xFC00);
+    while (static_cast<std::size_t>(end - p) >= N) {
+        const auto v = hn::LoadU(d, p);
+        beyondAscii += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F)));
+        beyondAscii += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7FF)));
+        const auto isSurrogate = hn::Eq(hn::And(v, surrogateMask), hn::Set(d, 0xD800));
+        if (HWY_UNLIKELY(!hn::AllFalse(d, isSurrogate) ||
+                         (p != begin && (loadUnit(p - 1) & 0xFC00) == 0xD800))) {
+            // What stands before the first unit cannot be a high half: a block of its own is made for it.
+            alignas(64) std::uint16_t before[HWY_MAX_BYTES / 2];
+            if (p == begin) {
+                before[0] = 0;
+                std::memcpy(before + 1, p, (N - 1) * sizeof *p);
+            } else {
+                std::memcpy(before, p - 1, N * sizeof *p);
+            }
+            const auto isLow = hn::Eq(hn::And(v, half), hn::Set(d, 0xDC00));
+            const auto followsHigh = hn::Eq(hn::And(hn::Load(d, before), half), hn::Set(d, 0xD800));
+            if (!hn::AllFalse(d, hn::Xor(isLow, followsHigh))) {
+                beyondAscii -= hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F)));
+                beyondAscii -= hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7FF)));
+                break;
+            }
+            surrogates += hn::CountTrue(d, isSurrogate);
+            extent.utf32 -= hn::CountTrue(d, isLow);
+        }
+        p += N;
+    }
+#endif
+    std::size_t taken = static_cast<std::size_t>(p - begin);
+    extent.utf32 += taken;
+    extent.utf8 = taken + beyondAscii - surrogates;
+    if (taken != 0 && (loadUnit(p - 1) & 0xFC00) == 0xD800) {
+        --p;
+        extent.utf32 -= 1;
+        extent.utf8 -= 2;
+    }
+    while (p < end) {
+        const std::uint32_t unit = loadUnit(p);
+        if (isSurrogate(unit)) {
+            if (isLowSurrogate(unit) || end - p < 2 || !isLowSurrogate(loadUnit(p + 1))) {
+                break;
+            }
+            p += 2;
+            extent.utf8 += 4;
+        } else {
+            p += 1;
+            extent.utf8 += unit < 0x80 ? 1 : unit < 0x800 ? 2 : 3;
+        }
+        extent.utf32 += 1;
+    }
+    extent.taken = static_cast<std::size_t>(p - begin);
+    extent.utf16 = extent.taken;
+    return extent;
+}
+
+Extent measureUtf32(const char* text, std::size_t units) {
+    const auto* const begin = reinterpret_cast<const std::uint32_t*>(text);
+    const std::uint32_t* const end = begin + units;
+    const std::uint32_t* p = begin;
+    std::size_t longer2 = 0;
+    std::size_t longer3 = 0;
+    std::size_t longer4 = 0;
+#if KVT_HAS_VECTORS
+    const Units32 d;
+    const std::size_t N = hn::Lanes(d);
+    while (static_cast<std::size_t>(end - p) >= N) {
+        const auto v = hn::LoadU(d, p);
+        const auto isBad = hn::Or(hn::Gt(v, hn::Set(d, 0x10FFFF)),
+                                  hn::Eq(hn::And(v, hn::Set(d, 0xFFFFF800)), hn::Set(d, 0xD800)));
+        if (HWY_UNLIKELY(!hn::AllFalse(d, isBad))) {
+            break;
+        }
+        longer2 += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F)));
+        longer3 += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7FF)));
+        longer4 += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0xFFFF)));
+        p += N;
+    }
+#endif
+    for (; p < end; ++p) {
+        const std::uint32_t c = loadUnit(p);
+        if (c > lastCodePoint || isSurrogate(c)) {
+            break;
+        }
+        longer2 += c > 0x7F ? 1 : 0;
+        longer3 += c > 0x7FF ? 1 : 0;
+        longer4 += c > 0xFFFF ? 1 : 0;
+    }
+    const auto taken = static_cast<std::size_t>(p - begin);
+    return {taken, taken + longer2 + longer3 + longer4, taken + longer4, taken};
+}
+
+std::size_t asciiPrefix(const char* text, std::size_t bytes) {
+    const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
+    const std::uint8_t* const end = begin + bytes;
+    const std::uint8_t* p = begin;
+#if KVT_HAS_VECTORS
+    const Bytes d;
+    const std::size_t N = hn::Lanes(d);
+    while (static_cast<std::size_t>(end - p) >= 4 * N) {
+        const auto any = hn::Or(hn::Or(hn::LoadU(d, p), hn::LoadU(d, p + N)),
+                                hn::Or(hn::LoadU(d, p + 2 * N), hn::LoadU(d, p + 3 * N)));
+        if (!hn::AllTrue(d, hn::Lt(any, hn::Set(d, 0x80)))) {
+            break;
+        }
+        p += 4 * N;
+    }
+#endif
+    while (p < end && *p < 0x80) {
+        ++p;
+    }
+    return static_cast<std::size_t>(p - begin);
+}
+
+} // namespace kvt::ex::detail::vectors::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+namespace kvt::ex::detail::vectors {
+
+HWY_EXPORT(measureUtf8);
+HWY_EXPORT(measureUtf16);
+HWY_EXPORT(measureUtf32);
+HWY_EXPORT(asciiPrefix);
+
+Extent measureUtf8(const char* text, std::size_t bytes) {
+    return HWY_DYNAMIC_DISPATCH(measureUtf8)(text, bytes);
+}
+Extent measureUtf16(const char* text, std::size_t units) {
+    return HWY_DYNAMIC_DISPATCH(measureUtf16)(text, units);
+}
+Extent measureUtf32(const char* text, std::size_t units) {
+    return HWY_DYNAMIC_DISPATCH(measureUtf32)(text, units);
+}
+std::size_t asciiPrefix(const char* text, std::size_t bytes) {
+    return HWY_DYNAMIC_DISPATCH(asciiPrefix)(text, bytes);
+}
+
+} // namespace kvt::ex::detail::vectors
+#endif // HWY_ONCE

@@ -1,0 +1,318 @@
+// The Unicode forms in vector registers, for each instruction set that this machine has and without any: the same
+// results as a plain loop over characters, at all lengths around those of the registers, from any address, with nothing
+// read or written outside of what is given.
+#include <kvt/encoding/detail/unicode_vectors.h>
+
+#include <reference/icu_reference.h>
+#include <support/guarded_memory.h>
+
+#define HWY_WANT_AVX3_DL // as the library is compiled
+#include <hwy/targets.h>
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <random>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace kvt::test {
+namespace {
+
+namespace vectors = kvt::ex::detail::vectors;
+using vectors::Extent;
+
+// ---- The plain way, on code points -------------------------------------------------------------------------------
+
+struct Decoded {
+    std::u32string text;
+    std::size_t taken = 0; ///< units
+};
+
+Decoded decodeUtf8(std::string_view bytes) {
+    Decoded decoded;
+    while (decoded.taken < bytes.size()) {
+        const auto byte = [&](std::size_t i) -> char32_t {
+            return decoded.taken + i < bytes.size() ? static_cast<unsigned char>(bytes[decoded.taken + i])
+                                                    : 0;
+        };
+        const char32_t lead = byte(0);
+        const std::size_t length = lead < 0x80             ? 1
+                                   : (lead & 0xE0) == 0xC0 ? 2
+                                   : (lead & 0xF0) == 0xE0 ? 3
+                                   : (lead & 0xF8) == 0xF0 ? 4
+                                                           : 0;
+        if (length == 0) {
+            break;
+        }
+        char32_t c = length == 1 ? lead : lead & (0x7FU >> length);
+        bool isGood = true;
+        for (std::size_t i = 1; i < length; ++i) {
+            isGood = isGood && (byte(i) & 0xC0) == 0x80;
+            c = c << 6 | (byte(i) & 0x3F);
+        }
+        const char32_t least[] = {0, 0, 0x80, 0x800, 0x10000};
+        if (!isGood || c < least[length] || c > 0x10FFFF || (c >= 0xD800 && c < 0xE000)) {
+            break;
+        }
+        decoded.text += c;
+        decoded.taken += length;
+    }
+    return decoded;
+}
+
+Decoded decodeUtf16(std::u16string_view units) {
+    Decoded decoded;
+    while (decoded.taken < units.size()) {
+        const char16_t unit = units[decoded.taken];
+        if (unit < 0xD800 || unit >= 0xE000) {
+            decoded.text += unit;
+            ++decoded.taken;
+            continue;
+        }
+        if (unit >= 0xDC00 || decoded.taken + 1 == units.size() || units[decoded.taken + 1] < 0xDC00 ||
+            units[decoded.taken + 1] >= 0xE000) {
+            break;
+        }
+        decoded.text += 0x10000 + (unit - 0xD800U) * 0x400 + (units[decoded.taken + 1] - 0xDC00U);
+        decoded.taken += 2;
+    }
+    return decoded;
+}
+
+Decoded decodeUtf32(std::u32string_view units) {
+    Decoded decoded;
+    for (const char32_t c : units) {
+        if (c > 0x10FFFF || (c >= 0xD800 && c < 0xE000)) {
+            break;
+        }
+        decoded.text += c;
+        ++decoded.taken;
+    }
+    return decoded;
+}
+
+std::string encodeUtf8(std::u32string_view text) {
+    std::string bytes;
+    for (const char32_t c : text) {
+        const auto put = [&](char32_t byte) { bytes += static_cast<char>(byte); };
+        if (c < 0x80) {
+            put(c);
+        } else if (c < 0x800) {
+            put(0xC0 + c / 64);
+            put(0x80 + c % 64);
+        } else if (c < 0x10000) {
+            put(0xE0 + c / 4096);
+            put(0x80 + c / 64 % 64);
+            put(0x80 + c % 64);
+        } else {
+            put(0xF0 + c / 262144);
+            put(0x80 + c / 4096 % 64);
+            put(0x80 + c / 64 % 64);
+            put(0x80 + c % 64);
+        }
+    }
+    return bytes;
+}
+
+std::u16string encodeUtf16(std::u32string_view text) {
+    std::u16string units;
+    for (const char32_t c : text) {
+        if (c < 0x10000) {
+            units += static_cast<char16_t>(c);
+        } else {
+            units += static_cast<char16_t>(0xD800 + (c - 0x10000) / 0x400);
+            units += static_cast<char16_t>(0xDC00 + (c - 0x10000) % 0x400);
+        }
+    }
+    return units;
+}
+
+template <typename Unit>
+std::string_view bytesOf(const std::basic_string<Unit>& units) {
+    return {reinterpret_cast<const char*>(units.data()), units.size() * sizeof(Unit)};
+}
+
+// ---- Each instruction set ----------------------------------------------------------------------------------------
+
+class UnicodeVectors : public testing::TestWithParam<std::int64_t> {
+protected:
+    void SetUp() override {
+        hwy::SetSupportedTargetsForTest(GetParam());
+        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
+    }
+    void TearDown() override {
+        hwy::SetSupportedTargetsForTest(0);
+        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
+    }
+
+    // Text and result stand at the end of memory that can be touched, so that a step beyond it ends the test.
+    template <typename Unit, typename Convert>
+    void checkConversion(std::string_view from, std::size_t units, const std::basic_string<Unit>& expected,
+                         Convert convert) {
+        char* const in = input_.end() - from.size();
+        std::memcpy(in, from.data(), from.size());
+        const std::string_view wanted = bytesOf(expected);
+        char* const out = output_.end() - wanted.size();
+        std::memset(out, '#', wanted.size());
+        const std::size_t written = convert(in, units, out, expected.size());
+        ASSERT_EQ(written, expected.size()) << hex(from);
+        ASSERT_TRUE(std::string_view(out, wanted.size()) == wanted) << hex(from, 400);
+    }
+
+    static void checkExtent(const Extent& extent, const Decoded& decoded, std::string_view from) {
+        ASSERT_EQ(extent.taken, decoded.taken) << hex(from, 400);
+        ASSERT_EQ(extent.utf8, encodeUtf8(decoded.text).size()) << hex(from, 400);
+        ASSERT_EQ(extent.utf16, encodeUtf16(decoded.text).size()) << hex(from, 400);
+        ASSERT_EQ(extent.utf32, decoded.text.size()) << hex(from, 400);
+    }
+
+    void checkUtf8(std::string_view text) {
+        char* const in = input_.end() - text.size();
+        std::memcpy(in, text.data(), text.size());
+        const Decoded decoded = decodeUtf8(text);
+        checkExtent(vectors::measureUtf8(in, text.size()), decoded, text);
+        const std::string_view good = text.substr(0, decoded.taken);
+        checkConversion(good, good.size(), encodeUtf16(decoded.text), vectors::utf8ToUtf16);
+        checkConversion(good, good.size(), decoded.text, vectors::utf8ToUtf32);
+    }
+
+    void checkUtf16(const std::u16string& text) {
+        const std::string_view bytes = bytesOf(text);
+        char* const in = input_.end() - bytes.size();
+        std::memcpy(in, bytes.data(), bytes.size());
+        const Decoded decoded = decodeUtf16(text);
+        checkExtent(vectors::measureUtf16(in, text.size()), decoded, bytes);
+        const std::string_view good = bytes.substr(0, decoded.taken * 2);
+        checkConversion(good, decoded.taken, encodeUtf8(decoded.text), vectors::utf16ToUtf8);
+        checkConversion(good, decoded.taken, decoded.text, vectors::utf16ToUtf32);
+    }
+
+    void checkUtf32(const std::u32string& text) {
+        const std::string_view bytes = bytesOf(text);
+        char* const in = input_.end() - bytes.size();
+        std::memcpy(in, bytes.data(), bytes.size());
+        const Decoded decoded = decodeUtf32(text);
+        checkExtent(vectors::measureUtf32(in, text.size()), decoded, bytes);
+        const std::string_view good = bytes.substr(0, decoded.taken * 4);
+        checkConversion(good, decoded.taken, encodeUtf8(decoded.text), vectors::utf32ToUtf8);
+        checkConversion(good, decoded.taken, encodeUtf16(decoded.text), vectors::utf32ToUtf16);
+    }
+
+    void checkAll(const std::u32string& text) {
+        checkUtf8(encodeUtf8(text));
+        checkUtf16(encodeUtf16(text));
+        checkUtf32(text);
+    }
+
+private:
+    GuardedMemory input_{1 << 16};
+    GuardedMemory output_{1 << 17};
+};
+
+INSTANTIATE_TEST_SUITE_P(Each, UnicodeVectors, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
+                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+
+// Characters of one to four bytes, at the borders of each length.
+constexpr char32_t samples[] = {0,      'a',    0x7F,   0x80,   0xE9,    0x7FF,   0x800,   0x3042,
+                                0xD7FF, 0xE000, 0xFFFD, 0xFFFF, 0x10000, 0x1F600, 0x10FFFF};
+
+std::u32string randomText(std::mt19937_64& random, std::size_t length) {
+    // Runs of a kind, as texts have them, of any length.
+    std::u32string text;
+    while (text.size() < length) {
+        const std::size_t kinds[][2] = {{0, 3}, {3, 6}, {6, 12}, {12, 15}, {0, 15}, {0, 6}};
+        const auto& kind = kinds[random() % std::size(kinds)];
+        for (std::size_t run = random() % 70; run-- > 0 && text.size() < length;) {
+            text += samples[kind[0] + random() % (kind[1] - kind[0])];
+        }
+    }
+    return text;
+}
+
+TEST_P(UnicodeVectors, EachCharacterAtEachPlaceOfEachLength) {
+    for (const char32_t c : samples) {
+        for (const char32_t filler : {U'a', U'\u00E9', U'\u3042', U'\U0001F600'}) {
+            for (std::size_t length = 0; length <= 140; length += length < 70 ? 1 : 7) {
+                std::u32string text(length, filler);
+                for (std::size_t place = 0; place < length; place += 1 + length / 20) {
+                    text[place] = c;
+                    checkAll(text);
+                    text[place] = filler;
+                }
+            }
+        }
+    }
+}
+
+TEST_P(UnicodeVectors, AllCodePoints) {
+    std::u32string text;
+    for (char32_t c = 0; c <= 0x10FFFF; ++c) {
+        if (c < 0xD800 || c > 0xDFFF) {
+            text += c;
+        }
+        if (text.size() == 4000) {
+            checkAll(text);
+            text.clear();
+        }
+    }
+    checkAll(text);
+}
+
+TEST_P(UnicodeVectors, RandomText) {
+    std::mt19937_64 random(20);
+    for (int round = 0; round < 4000; ++round) {
+        checkAll(randomText(random, random() % 300));
+    }
+}
+
+TEST_P(UnicodeVectors, UnitsThatAreNotWellFormedEndTheText) {
+    std::mt19937_64 random(21);
+    const std::string_view bytes("\x80\xBF\xC0\xC1\xC2\xDF\xE0\xED\xEF\xF0\xF4\xF5\xFF\x41\x9F\xA0\x8F\x90");
+    const char16_t units[] = {0xD800, 0xDBFF, 0xDC00, 0xDFFF};
+    const char32_t numbers[] = {0xD800, 0xDFFF, 0x110000, 0x7FFFFFFF, 0xFFFFFFFF};
+    for (int round = 0; round < 6000; ++round) {
+        const std::u32string text = randomText(random, 1 + random() % 200);
+        std::string utf8 = encodeUtf8(text);
+        std::u16string utf16 = encodeUtf16(text);
+        std::u32string utf32 = text;
+        for (std::size_t faults = 1 + random() % 2; faults-- > 0;) {
+            utf8[random() % utf8.size()] = bytes[random() % bytes.size()];
+            utf16[random() % utf16.size()] = units[random() % std::size(units)];
+            utf32[random() % utf32.size()] = numbers[random() % std::size(numbers)];
+        }
+        checkUtf8(utf8);
+        checkUtf8(std::string_view(utf8).substr(0, random() % utf8.size()));
+        checkUtf16(utf16);
+        checkUtf32(utf32);
+    }
+}
+
+TEST_P(UnicodeVectors, AsciiEndsWhereItEnds) {
+    std::mt19937_64 random(22);
+    GuardedMemory in(4096);
+    GuardedMemory out(8192);
+    for (std::size_t length = 0; length <= 300; ++length) {
+        for (const std::size_t ascii : {std::size_t{0}, length / 3, random() % (length + 1), length}) {
+            std::string text(length, 'x');
+            std::u16string wide(length, u'x');
+            if (ascii < length) {
+                text[ascii] = '\x80';
+                wide[ascii] = u'\x80';
+            }
+            char* const bytes = in.end() - length;
+            std::memcpy(bytes, text.data(), length);
+            EXPECT_EQ(vectors::asciiPrefix(bytes, length), ascii);
+            char* const widened = out.end() - 2 * length;
+            EXPECT_EQ(vectors::widenAscii(bytes, length, widened), ascii);
+            EXPECT_TRUE(std::memcmp(widened, wide.data(), 2 * ascii) == 0);
+            std::memcpy(widened, wide.data(), 2 * length);
+            EXPECT_EQ(vectors::narrowAscii(widened, length, bytes), ascii);
+            EXPECT_TRUE(std::memcmp(bytes, text.data(), ascii) == 0);
+        }
+    }
+}
+
+} // namespace
+} // namespace kvt::test
