@@ -14,11 +14,6 @@
 namespace kvt::ex::detail::icu {
 namespace {
 
-bool isUnicodeForm(Encoding encoding) {
-    const std::uint32_t id = encoding.evaluate();
-    return id == Encoding::Utf8 || (id >= Encoding::Utf16LE && id <= Encoding::Utf32BE);
-}
-
 // Reset, close and clone reach the callbacks too, and are not losses.
 bool isLoss(UConverterCallbackReason reason) {
     return reason == UCNV_UNASSIGNED || reason == UCNV_ILLEGAL || reason == UCNV_IRREGULAR;
@@ -219,7 +214,7 @@ Converter::Converter(Encoding encoding) : encoding_(encoding) {
     UErrorCode error = U_ZERO_ERROR;
     converter_.reset(ucnv_open(name.data(), &error));
     // Compound text is left with ICU's own substitution: once another is set, ucnv_close frees what is not its own.
-    if (converter_ == nullptr || isUnicodeForm(encoding) ||
+    if (converter_ == nullptr || unicodeForm(encoding) != Form::other ||
         ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {
         return;
     }
@@ -266,19 +261,8 @@ std::string Converter::substitution() const {
 }
 
 Form Converter::form() {
-    switch (encoding_.evaluate()) {
-    case Encoding::Utf8:
-        return Form::utf8;
-    case Encoding::Utf16LE:
-        return Form::utf16le;
-    case Encoding::Utf16BE:
-        return Form::utf16be;
-    case Encoding::Utf32LE:
-        return Form::utf32le;
-    case Encoding::Utf32BE:
-        return Form::utf32be;
-    default:
-        break;
+    if (const Form unicode = unicodeForm(encoding_); unicode != Form::other) {
+        return unicode;
     }
     if (!isOpen()) {
         return Form::other;

@@ -7,6 +7,8 @@
 #include <kvt/foundation/throwable.h>
 #include <kvt/string/detail/convert_chars.h>
 
+#include <algorithm>
+
 namespace kvt::ex {
 namespace {
 
@@ -15,6 +17,11 @@ using detail::TranscoderHelper;
 // ICU counts bytes of one call in 31 bits; a longer text is handed over in pieces of this size.
 constexpr std::size_t largestPiece = std::size_t{1} << 30;
 constexpr std::size_t outputUnits = 4096;
+
+// The bytes for which ICU is asked where the short way ends: those of one character at first, and twice as many each time
+// that the short way found nothing to take behind them.
+constexpr std::size_t firstLook = 4;
+constexpr std::size_t longestLook = 1024;
 
 template <typename CharT>
 std::string_view bytesOf(std::basic_string_view<CharT> units) {
@@ -31,31 +38,52 @@ Losses takeLosses(TranscoderHelper& from, TranscoderHelper& to) {
     return badInput ? Losses::badInput : notRepresentable ? Losses::notRepresentable : Losses::none;
 }
 
-// Converts all of `bytes`, what needs no ICU first, and returns what was lost. The text of the two
-// encodings differs.
+// Converts `length` bytes of `text` by ICU and takes them from it; and further ones, where `untilSettled`, as long as one of
+// the converters holds the beginning of something. Returns false when ICU gave up.
 template <typename CharOut>
-Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
-                  std::string_view bytes, std::basic_string<CharOut>& out) {
-    out.clear();
-    if (bytes.empty()) {
-        return Losses::none;
-    }
-    bytes.remove_prefix(detail::convertPrefix(from.side(), to.side(), bytes, out));
+bool convertByIcu(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
+                  std::string_view& text, std::size_t length, bool untilSettled, bool& reset,
+                  std::basic_string<CharOut>& out) {
     CharOut buffer[outputUnits];
-    bool reset = true;
-    while (!bytes.empty()) {
-        std::string_view piece = bytes.substr(0, largestPiece);
-        const bool last = piece.size() == bytes.size();
-        bytes.remove_prefix(piece.size());
+    do {
+        std::string_view piece = text.substr(0, length);
+        const bool last = piece.size() == text.size();
+        text.remove_prefix(piece.size());
         ICUTranscoder::Status status = ICUTranscoder::OutputFull;
         while (status == ICUTranscoder::OutputFull) {
             std::basic_string_view<CharOut> written(buffer, outputUnits);
             status = transcoder.transcodeStream(piece, written, last, reset);
             reset = false;
             if (status == ICUTranscoder::Failed) {
-                return takeLosses(from, to);
+                return false;
             }
             out.append(written);
+        }
+        length = 1;
+    } while (untilSettled && !text.empty() &&
+             (from.converter().heldBytes() != 0 || to.converter().holdsUnits()));
+    return true;
+}
+
+// Converts all of `bytes` and returns what was lost. The text of the two encodings differs. What needs no ICU goes the
+// short way, and where ICU had to look and neither encoding has a state, the short way goes on behind that.
+template <typename CharOut>
+Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
+                  std::string_view bytes, std::basic_string<CharOut>& out) {
+    out.clear();
+    const bool canResume = from.side().form != detail::Form::other && to.side().form != detail::Form::other;
+    std::size_t length = firstLook;
+    bool reset = true;
+    while (!bytes.empty()) {
+        const std::size_t taken = detail::convertPrefix(from.side(), to.side(), bytes, out);
+        bytes.remove_prefix(taken);
+        if (bytes.empty()) {
+            break;
+        }
+        length = taken != 0 ? firstLook : std::min(2 * length, longestLook);
+        if (!convertByIcu(transcoder, from, to, bytes, canResume ? length : largestPiece, canResume, reset,
+                          out)) {
+            break;
         }
     }
     return takeLosses(from, to);

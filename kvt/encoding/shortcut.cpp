@@ -35,7 +35,7 @@ using Pivot = std::array<char16_t, pivotUnits>;
 
 // The bytes that are tried first where the target may lack a character, so that a text with many such characters is not
 // measured to its end after each of them. As long as all goes well, pieces become longer by the factor.
-constexpr std::size_t firstPiece = 512;
+constexpr std::size_t firstPiece = 128;
 constexpr std::size_t pieceFactor = 8;
 
 constexpr bool isLittle = std::endian::native == std::endian::little;

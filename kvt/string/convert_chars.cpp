@@ -2,6 +2,7 @@
 #include <kvt/string/detail/convert_chars.h>
 
 #include <kvt/codec/wwjd.h>
+#include <kvt/encoding/detail/shortcut.h>
 #include <kvt/encoding/icu_transcoder.h>
 #include <kvt/foundation/throwable.h>
 #include <kvt/string/detail/ascii_check.h>
@@ -22,8 +23,21 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     }
 }
 
+// A short text in two Unicode forms is converted before anything is asked about converters, which would cost more than
+// the text. One that is not well-formed is done again from its beginning.
 template <typename CharOut>
 void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    constexpr std::size_t shortText = 1024;
+    if (bytes.size() <= shortText) {
+        const Side source{unicodeForm(from)};
+        const Side target{unicodeForm(to)};
+        if (source.form != Form::other && target.form != Form::other && source.form != target.form) {
+            out.clear();
+            if (convertPrefix(source, target, bytes, out) == bytes.size()) {
+                return;
+            }
+        }
+    }
     ICUTranscoder(from, to).transcode(bytes, out);
 }
 

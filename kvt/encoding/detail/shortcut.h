@@ -11,6 +11,8 @@
 // character boundary in the initial state of both converters, so ICU can go on from there.
 #pragma once
 
+#include <kvt/encoding/encoding.h>
+
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -30,6 +32,25 @@ enum class Form : std::uint8_t {
     utf32le,
     utf32be,
 };
+
+/// The form of UTF-8, UTF-16 and UTF-32 with a stated byte order, which their numbers tell; `other` for all encodings whose
+/// converter has to be asked.
+inline Form unicodeForm(Encoding encoding) {
+    switch (encoding.evaluate()) {
+    case Encoding::Utf8:
+        return Form::utf8;
+    case Encoding::Utf16LE:
+        return Form::utf16le;
+    case Encoding::Utf16BE:
+        return Form::utf16be;
+    case Encoding::Utf32LE:
+        return Form::utf32le;
+    case Encoding::Utf32BE:
+        return Form::utf32be;
+    default:
+        return Form::other;
+    }
+}
 
 class SingleByteTable;
 
