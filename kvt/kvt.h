@@ -33,4 +33,5 @@
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
 #include <kvt/string/ustring_format.h>
+#include <kvt/string/ustring_operators.h>
 #include <kvt/string/ustring_view.h>

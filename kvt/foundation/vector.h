@@ -36,6 +36,11 @@ class KVT_EXPORT vector : public TypedAllocator<T> {
     using RequireInput =
         std::enable_if_t<std::is_convertible_v<typename std::iterator_traits<Iterator>::iterator_category,
                                                std::input_iterator_tag>>;
+    // Two arrays are not the ends of one range. They would come from literals in braces, {"a", "b"}.
+    template <typename First, typename Last>
+    using RequireRange = std::enable_if_t<std::is_same_v<std::decay_t<First>, std::decay_t<Last>> &&
+                                          !(std::is_array_v<std::remove_reference_t<First>> &&
+                                            std::is_array_v<std::remove_reference_t<Last>>)>;
 
 public:
     using value_type = T;
@@ -54,9 +59,11 @@ public:
     explicit vector(size_type count) : vector() { resize(count); }
     vector(size_type count, const T& value) : vector() { resize(count, value); }
     vector(std::initializer_list<T> values) : vector(values.begin(), values.end()) {}
-    template <typename Iterator, typename = RequireInput<Iterator>>
-    vector(Iterator first, Iterator last) : vector() {
-        append(first, last);
+    /// The elements from `first` up to `last`, two input iterators of one type.
+    template <typename First, typename Last, typename = RequireInput<std::decay_t<First>>,
+              typename = RequireRange<First, Last>>
+    vector(First&& first, Last&& last) : vector() {
+        append<std::decay_t<First>>(first, last);
     }
     vector(const vector& other) : vector(other.begin(), other.end()) {}
     /// Takes the array and its deleter; the source is left empty, without an array.

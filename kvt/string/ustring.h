@@ -20,11 +20,15 @@
 #include <kvt/encoding/encoding.h>
 #include <kvt/foundation/export.h>
 #include <kvt/foundation/optional.h>
+#include <kvt/foundation/vector.h>
+#include <kvt/string/ustring_operators.h>
 #include <kvt/string/ustring_view.h>
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <initializer_list>
 #include <iosfwd>
 #include <limits>
 #include <string>
@@ -89,8 +93,6 @@ KVT_EXPORT std::size_t actualUStringSize() noexcept;
 
 template <std::uint32_t N>
 class UStringArray;
-template <typename T>
-class vector;
 
 template <std::uint32_t N>
 class KVT_EXPORT UString : private detail::UStringFields<N> {
@@ -106,6 +108,9 @@ class KVT_EXPORT UString : private detail::UStringFields<N> {
     using OnlyWide = std::enable_if_t<sizeof(detail::CodeUnit<M>) != 1, int>;
     template <std::uint32_t M>
     using OnlyNarrow = std::enable_if_t<sizeof(detail::CodeUnit<M>) == 1, int>;
+    // Nothing else becomes a unit on the way.
+    template <typename Unit>
+    using OnlyUnit = std::enable_if_t<std::is_same_v<Unit, detail::CodeUnit<N>>, int>;
 
 public:
     /// The code unit.
@@ -131,6 +136,9 @@ public:
     /// From zero-terminated UTF-8. A UString<28> takes the bytes, a UString<30> takes them labelled `Utf8`. Fails as
     /// the next constructor.
     UString(const char* text) : UString(text, std::char_traits<char>::length(text), Encoding::Utf8) {}
+    template <typename Unit, detail::OnlyUtf8<Unit> = 0>
+    UString(const Unit* text) : UString(reinterpret_cast<const char*>(text)) {}
+    UString(std::nullptr_t) = delete;
 
     /// From `byteLength` bytes of text in `from`, which are copied without a look at them when that is this
     /// string's own encoding (an incomplete last unit is dropped), and converted otherwise. A UString<28> takes the
@@ -155,10 +163,15 @@ public:
         this->encoding_ = encoding;
     }
 
-    /// From `count` units of the same encoding, which are copied as they are. Only for UTF-16 and UTF-32.
+    /// From `count` units of the same encoding, or from those up to a terminating zero, which are copied as they are.
+    /// Only for UTF-16 and UTF-32.
     template <std::uint32_t M = N, OnlyWide<M> = 0>
     UString(const value_type* units, std::size_t count) {
         this->storage_.assign(units, count);
+    }
+    template <std::uint32_t M = N, OnlyWide<M> = 0>
+    UString(const value_type* text) {
+        this->storage_.assign(text);
     }
 
     /// Empty, in the given encoding. Only for UString<30>.
@@ -259,6 +272,18 @@ public:
     bool contains(UStringView<N> needle, detail::case_insensitive_t tag) const {
         return find(needle, 0, tag) != npos;
     }
+    template <typename Unit, OnlyUnit<Unit> = 0>
+    bool beginsWith(Unit unit) const noexcept {
+        return !isEmpty() && front() == unit;
+    }
+    template <typename Unit, OnlyUnit<Unit> = 0>
+    bool endsWith(Unit unit) const noexcept {
+        return !isEmpty() && back() == unit;
+    }
+    template <typename Unit, OnlyUnit<Unit> = 0>
+    bool contains(Unit unit) const noexcept {
+        return find(unit) != npos;
+    }
 
     /// The first position at or after `pos` where the needle begins, else npos. An empty needle is found at `pos`
     /// itself up to the size.
@@ -283,6 +308,27 @@ public:
     /// The last position *below* `pos` where any of the strings begins, else npos. `pos` itself is not looked at,
     /// unlike with a set of units; the match may run on past it.
     std::uint64_t findLastOf(const UStringArray<N>& needles, std::uint64_t pos = npos) const noexcept;
+
+    /// The same for units and texts in braces, {',', ';'} and {"and", "or"}, which would fit more than one of these.
+    template <typename = void>
+    std::uint64_t findFirstOf(std::initializer_list<value_type> set, std::uint64_t pos = 0) const noexcept {
+        return firstOfAll(set, pos);
+    }
+    template <typename = void>
+    std::uint64_t findLastOf(std::initializer_list<value_type> set, std::uint64_t pos = npos) const noexcept {
+        return lastOfAll(set, pos);
+    }
+    template <typename = void>
+    std::uint64_t findFirstOf(std::initializer_list<UStringView<N>> needles,
+                              std::uint64_t pos = 0) const noexcept {
+        return pos < size() ? firstOfAll(needles, pos) : npos;
+    }
+    template <typename = void>
+    std::uint64_t findLastOf(std::initializer_list<UStringView<N>> needles,
+                             std::uint64_t pos = npos) const noexcept {
+        const std::uint64_t end = std::min<std::uint64_t>(pos, size());
+        return end != 0 ? lastOfAll(needles, end - 1) : npos;
+    }
 
     /// Comparisons of the units alone: the encoding of a UString<30> takes no part.
     bool operator==(const UString& other) const noexcept { return compare(other) == 0; }
@@ -386,6 +432,21 @@ public:
                           std::uint64_t maxCount = npos) const;
     UStringArray<N> split(const UStringArray<N>& delimiters, SplitBehaviour behaviour = KeepEmptyParts,
                           std::uint64_t maxCount = npos) const;
+    /// The same for units and texts in braces.
+    template <typename = void>
+    UStringArray<N> split(std::initializer_list<value_type> delimiters,
+                          SplitBehaviour behaviour = KeepEmptyParts, std::uint64_t maxCount = npos) const {
+        return split(vector<value_type>(delimiters), behaviour, maxCount);
+    }
+    template <typename = void>
+    UStringArray<N> split(std::initializer_list<UStringView<N>> delimiters,
+                          SplitBehaviour behaviour = KeepEmptyParts, std::uint64_t maxCount = npos) const {
+        UStringArray<N> strings;
+        for (const UStringView<N> delimiter : delimiters) {
+            strings.emplace_back().append(delimiter);
+        }
+        return split(strings, behaviour, maxCount);
+    }
 
     // ---- Numbers
 
@@ -435,6 +496,24 @@ protected:
     void init(const UString<M>& other);
 
 private:
+    // The first or last place that find() or rfind() has for any of the needles.
+    template <typename Needle>
+    std::uint64_t firstOfAll(std::initializer_list<Needle> needles, std::uint64_t pos) const noexcept {
+        std::uint64_t first = npos;
+        for (const Needle needle : needles) {
+            first = std::min(first, find(needle, pos));
+        }
+        return first;
+    }
+    template <typename Needle>
+    std::uint64_t lastOfAll(std::initializer_list<Needle> needles, std::uint64_t pos) const noexcept {
+        std::uint64_t behindLast = 0; // one more than the place, so that npos is the smallest
+        for (const Needle needle : needles) {
+            behindLast = std::max(behindLast, rfind(needle, pos) + 1);
+        }
+        return behindLast - 1;
+    }
+
     static UString fromNumber_helper(std::int64_t number);
     static UString fromNumber_helper(std::uint64_t number);
     static UString fromNumber_helper(double number);

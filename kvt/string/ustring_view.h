@@ -21,6 +21,12 @@ template <std::uint32_t N>
 using CodeUnit = std::conditional_t<N == Encoding::Utf16LE, char16_t,
                                     std::conditional_t<N == Encoding::Utf32LE, char32_t, char>>;
 
+/// The unit of a literal u8"", which is a type of its own since C++20.
+using Utf8Unit = std::remove_const_t<std::remove_reference_t<decltype(u8""[0])>>;
+template <typename Unit, typename Stored = char>
+using OnlyUtf8 = std::enable_if_t<
+    std::is_same_v<Unit, Utf8Unit> && !std::is_same_v<Unit, char> && std::is_same_v<Stored, char>, int>;
+
 } // namespace detail
 
 /// Views text of encoding `N`. It does not keep the string alive, is not zero-terminated in general, and has no
@@ -37,6 +43,10 @@ public:
     /// Up to the terminating zero, which is not part of the view.
     constexpr UStringView(const value_type* text)
         : UStringView(kvt::future::basic_string_view<value_type>(text)) {}
+    UStringView(std::nullptr_t) = delete;
+    /// The same for a literal u8"", when the units have 8 bits.
+    template <typename Unit, detail::OnlyUtf8<Unit, value_type> = 0>
+    UStringView(const Unit* text) : UStringView(reinterpret_cast<const char*>(text)) {}
     constexpr UStringView(kvt::future::basic_string_view<value_type> view) noexcept
         : data_(view.data()), size_(view.size()) {}
     UStringView(const std::basic_string<value_type>& string) noexcept

@@ -314,4 +314,27 @@ TEST(UStringGetAsEncoding, OfBinaryFailsEvenForBinary) {
               binaryFailure("\x01\xE9"));
 }
 
+/// What a failed assign() leaves: the substituted text where one was made, else the text that was there.
+template <std::uint32_t N, std::uint32_t M>
+void expectAfterFailure(UString<N> target, const UString<M>& source, std::string_view left) {
+    EXPECT_ANY_THROW(target.assign(source));
+    EXPECT_EQ(bytesOf(target), left) << N << " from " << M;
+}
+
+TEST(UStringAssign, FailureLeavesTheSubstitutedTextOnlyWhereOneWasMade) {
+    const UString<0> bad("a\xFF", 2);
+    expectAfterFailure(UString<1>("old"), bad, "a\x1A");
+    expectAfterFailure(UString<30>("old", 3, Encoding::Windows1252), bad, "a?");
+    expectAfterFailure(UString<1>("old"), UString<29>("\u00e9"), "?");
+    expectAfterFailure(UString<1>("old"), UString<2>(u"\u00e9"), "?");
+
+    expectAfterFailure(UString<29>("old"), bad, "old");
+    expectAfterFailure(UString<30>("old", 3, Encoding::Wwjd), bad, "old");
+    expectAfterFailure(UString<30>("old", 3, Encoding::Unknown), bad, "old");
+    expectAfterFailure(UString<0>("old"), UString<28>("x"), "old");
+    expectAfterFailure(UString<1>("old"), UString<29>("a\xFF", 2, Encoding::Wwjd), "old");
+    expectAfterFailure(UString<0>("old"), UString<29>("<uzzzz>", 7, Encoding::Wwjd), "old");
+    expectAfterFailure(UString<0>("old"), UString<30>("x", 1, Encoding::Unknown), "old");
+}
+
 } // namespace
