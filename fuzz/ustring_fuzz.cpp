@@ -1,7 +1,8 @@
 // Strings of each type made from bytes in any encoding, against ICU alone; and from each of them to all others,
 // which must end in a string or in one of the stated failures, whatever the bytes are.
 //
-// Input: encoding, then the bytes.
+// Input: encoding, what is checked, then the bytes. The replay checks everything on each input. libFuzzer, which counts its
+// runs, checks one thing in each: nearly all of the time goes into failures, and there are a hundred for one input of noise.
 #include <fuzzing.h>
 #include <reference/wwjd_reference.h>
 #include <support/outcome.h>
@@ -91,34 +92,55 @@ void convertToAll(const UString<N>& source) {
 }
 
 template <std::uint32_t N>
-void convertBytesLabelled(std::string_view bytes) {
+void convertBytesLabelled(const std::string&, std::string_view bytes) {
     convertToAll(UString<N>(bytes.data(), bytes.size(), static_cast<Encoding::Type>(N)));
 }
+
+using Check = void (*)(const std::string& from, std::string_view bytes);
+
+constexpr Check checks[] = {
+    [](const std::string& from, std::string_view bytes) { checkConstruction<0>(from, "UTF-8", bytes); },
+    [](const std::string& from, std::string_view bytes) { checkConstruction<1>(from, "US-ASCII", bytes); },
+    [](const std::string& from, std::string_view bytes) { checkConstruction<2>(from, "UTF-16LE", bytes); },
+    [](const std::string& from, std::string_view bytes) { checkConstruction<3>(from, "UTF-32LE", bytes); },
+    [](const std::string& from, std::string_view bytes) {
+        checkConstruction<27>(from, std::string(Encoding(Encoding::System).getName()), bytes);
+    },
+    checkWwjd,
+    [](const std::string& from, std::string_view bytes) {
+        requireEqual(construct<28>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<28>");
+        requireEqual(construct<30>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<30>");
+    },
+    convertBytesLabelled<0>,
+    convertBytesLabelled<1>,
+    convertBytesLabelled<2>,
+    convertBytesLabelled<3>,
+    convertBytesLabelled<27>,
+    convertBytesLabelled<28>,
+    convertBytesLabelled<29>,
+    convertBytesLabelled<30>,
+    [](const std::string& from, std::string_view bytes) {
+        convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding(from)));
+    },
+    [](const std::string&, std::string_view bytes) {
+        convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding::Wwjd));
+    },
+};
 
 } // namespace
 
 int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     Input input(data, size);
     const std::string from = input.pick(encodings);
+    const Check chosen = input.pick(checks);
     const std::string_view bytes = input.rest();
-    checkConstruction<0>(from, "UTF-8", bytes);
-    checkConstruction<1>(from, "US-ASCII", bytes);
-    checkConstruction<2>(from, "UTF-16LE", bytes);
-    checkConstruction<3>(from, "UTF-32LE", bytes);
-    checkConstruction<27>(from, std::string(Encoding(Encoding::System).getName()), bytes);
-    checkWwjd(from, bytes);
-    requireEqual(construct<28>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<28>");
-    requireEqual(construct<30>(bytes, from), (Outcome{std::string(bytes), 0, {}, {}}), "UString<30>");
-
-    convertBytesLabelled<0>(bytes);
-    convertBytesLabelled<1>(bytes);
-    convertBytesLabelled<2>(bytes);
-    convertBytesLabelled<3>(bytes);
-    convertBytesLabelled<27>(bytes);
-    convertBytesLabelled<28>(bytes);
-    convertBytesLabelled<29>(bytes);
-    convertBytesLabelled<30>(bytes);
-    convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding(from)));
-    convertToAll(UString<30>(bytes.data(), bytes.size(), Encoding::Wwjd));
+#ifdef KVT_REPLAY
+    static_cast<void>(chosen);
+    for (const Check check : checks) {
+        check(from, bytes);
+    }
+#else
+    chosen(from, bytes);
+#endif
     return 0;
 }
