@@ -1,8 +1,9 @@
-// An option that takes one of a few words.
+// An option or operand that takes one of a few words.
 #pragma once
 
 #include "failure.h"
 #include "suggest.h"
+#include "text.h"
 
 #include <string>
 #include <utility>
@@ -14,9 +15,10 @@ namespace host {
 template <typename Value>
 using Choices = std::vector<std::pair<std::string, Value>>;
 
-/// Throws Failure when `typed` is not one of the words. The failure suggests the nearest.
+/// The value of the word `typed`, given for `what`. Throws Failure when it is not one of the words; the failure suggests
+/// the nearest.
 template <typename Value>
-Value choose(const std::string& option, const std::string& typed, const Choices<Value>& choices) {
+Value choose(const std::string& what, const std::string& typed, const Choices<Value>& choices) {
     std::vector<std::string> names;
     std::string list;
     for (const auto& [name, value] : choices) {
@@ -26,7 +28,8 @@ Value choose(const std::string& option, const std::string& typed, const Choices<
         names.push_back(name);
         list += (list.empty() ? "" : ", ") + name;
     }
-    throw Failure(option + " takes one of " + list + ", not '" + typed + "'." + didYouMean(typed, names));
+    throw Failure(what + " takes one of " + list + ", not '" + printable(typed) + "'." +
+                  didYouMean(typed, names));
 }
 
 } // namespace host

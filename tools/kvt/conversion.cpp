@@ -5,6 +5,7 @@
 #include "loss_report.h"
 #include "messages.h"
 #include "text.h"
+#include "text_units.h"
 
 #include <filesystem>
 #include <unistd.h>
@@ -20,7 +21,7 @@ using kvt::ex::Loss;
 std::string escaped(std::string_view bytes) {
     std::string text;
     for (const char byte : bytes) {
-        text += byte >= 32 && (byte & 0x80) == 0 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
+        text += byte >= 32 && isAscii(byte) ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
     }
     return text;
 }

@@ -4,12 +4,9 @@
 #include "date_lines.h"
 #include "exit_status.h"
 #include "failure.h"
-#include "suggest.h"
 #include "text.h"
 
 #include <kvt/datetime/datetime.h>
-
-#include <algorithm>
 
 namespace host {
 
@@ -93,20 +90,6 @@ void ZoneDatabaseOption::use() const {
     if (!folder_.empty()) {
         kvt::ex::datetime::setInstallPathWrapper(folder_);
     }
-}
-
-std::size_t indexOfChoice(const std::string& what, const std::string& typed,
-                          const std::vector<std::string>& names) {
-    const auto found = std::find(names.begin(), names.end(), typed);
-    if (found != names.end()) {
-        return static_cast<std::size_t>(found - names.begin());
-    }
-    std::string list;
-    for (const std::string& name : names) {
-        list += (list.empty() ? "" : ", ") + name;
-    }
-    throw Failure(what + " is one of " + list + ", not '" + printable(typed) + "'." +
-                  didYouMean(typed, names));
 }
 
 kvt::ex::UString<0> toUString(const std::string& utf8) {

@@ -96,23 +96,6 @@ private:
     std::string folder_;
 };
 
-/// The words that an option or operand may be.
-template <typename Value>
-using Choices = std::vector<std::pair<std::string, Value>>;
-
-/// Throws Failure for a word that is none of `names`, with suggestions; gives its place else.
-std::size_t indexOfChoice(const std::string& what, const std::string& typed,
-                          const std::vector<std::string>& names);
-
-template <typename Value>
-Value choose(const std::string& what, const std::string& typed, const Choices<Value>& choices) {
-    std::vector<std::string> names;
-    for (const auto& [name, value] : choices) {
-        names.push_back(name);
-    }
-    return choices[indexOfChoice(what, typed, names)].second;
-}
-
 /// The text of an argument. Throws what the library throws where it is no UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
 

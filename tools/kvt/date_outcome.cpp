@@ -2,6 +2,7 @@
 
 #include "messages.h"
 #include "text.h"
+#include "text_units.h"
 
 #include <kvt/datetime/message_numbers.h>
 
@@ -18,8 +19,7 @@ namespace message_number = kvt::ex::datetime::message_number;
 // The library reads bytes, and may have found the difference inside a character. It then is that character which did
 // not fit.
 void splitAtCharacter(std::string& matched, std::string& rest) {
-    const auto isInside = [](char byte) { return (static_cast<unsigned char>(byte) & 0xC0u) == 0x80u; };
-    while (!matched.empty() && !rest.empty() && isInside(rest.front())) {
+    while (!matched.empty() && !rest.empty() && isContinuation(rest.front())) {
         rest.insert(rest.begin(), matched.back());
         matched.pop_back();
     }

@@ -2,6 +2,7 @@
 
 #include "date_function.h"
 
+#include "choices.h"
 #include "table.h"
 
 #include <kvt/datetime/datetime.h>

@@ -2,6 +2,7 @@
 
 #include "date_function.h"
 
+#include "choices.h"
 #include "command.h"
 #include "date_lines.h"
 #include "exit_status.h"

@@ -2,6 +2,7 @@
 
 #include "line_reader.h"
 #include "text_operation.h"
+#include "text_units.h"
 
 #include <algorithm>
 
@@ -11,18 +12,13 @@ namespace {
 
 using kvt::ex::Encoding;
 
-bool isAscii(std::string_view text) {
-    return std::all_of(text.begin(), text.end(), [](char byte) { return (byte & 0x80) == 0; });
-}
-
 // The folded form of a piece of valid UTF-8.
 void fold(std::string_view text, std::string& out) {
-    if (!isAscii(text)) {
+    if (!std::all_of(text.begin(), text.end(), isAscii)) {
         appendFolded(text, out);
         return;
     }
-    const auto lower = [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c; };
-    std::transform(text.begin(), text.end(), std::back_inserter(out), lower);
+    std::transform(text.begin(), text.end(), std::back_inserter(out), asciiLower);
 }
 
 // Bytes at the front of `text` that are whole characters, at most `most` of them.
@@ -31,7 +27,7 @@ std::size_t wholeCharacters(std::string_view text, std::size_t most) {
         return text.size();
     }
     std::size_t size = most;
-    while ((text[size] & 0xC0) == 0x80) {
+    while (isContinuation(text[size])) {
         --size;
     }
     return size;

@@ -1,5 +1,7 @@
 #include "suggest.h"
 
+#include "text_units.h"
+
 #include <algorithm>
 #include <tuple>
 
@@ -12,10 +14,8 @@ constexpr std::size_t mostSuggestions = 3;
 std::string folded(std::string_view word) {
     std::string out;
     for (const char letter : word) {
-        if (letter >= 'A' && letter <= 'Z') {
-            out += static_cast<char>(letter - 'A' + 'a');
-        } else if (letter != '-' && letter != '_' && letter != ' ') {
-            out += letter;
+        if (letter != '-' && letter != '_' && letter != ' ') {
+            out += asciiLower(letter);
         }
     }
     return out;

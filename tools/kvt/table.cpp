@@ -1,5 +1,7 @@
 #include "table.h"
 
+#include "text_units.h"
+
 #include <algorithm>
 
 namespace host {
@@ -8,7 +10,7 @@ namespace {
 
 std::size_t widthOf(const std::string& utf8) {
     return static_cast<std::size_t>(
-        std::count_if(utf8.begin(), utf8.end(), [](char byte) { return (byte & 0xC0) != 0x80; }));
+        std::count_if(utf8.begin(), utf8.end(), [](char byte) { return !isContinuation(byte); }));
 }
 
 } // namespace

@@ -1,5 +1,7 @@
 #include "wwjd_stream.h"
 
+#include "text_units.h"
+
 #include <kvt/codec/wwjd.h>
 #include <kvt/foundation/throwable.h>
 #include <kvt/string/ustring.h>
@@ -89,7 +91,7 @@ void WwjdDecoder::decodePiece(std::string_view piece, std::string& out) {
     } catch (const kvt::ex::UStringBadEncodingException&) {
         // The token cannot be at fault for a byte that is not ASCII, so that the first one stands before it.
         const auto foreign =
-            std::find_if(piece.begin(), piece.end(), [](char byte) { return (byte & 0x80) != 0; });
+            std::find_if_not(piece.begin(), piece.end(), isAscii);
         const auto index = static_cast<std::size_t>(foreign - piece.begin());
         throw Loss{Loss::BadInput, offset_ + index, std::string(1, *foreign), U'\uFFFD'};
     } catch (const std::logic_error&) {

@@ -1,5 +1,7 @@
 #include "zone_database.h"
 
+#include "text_units.h"
+
 #include <kvt/datetime/zone_folder.h>
 
 #include <algorithm>
@@ -50,17 +52,13 @@ std::string fileOf(std::string_view zone) {
     return "etcetera";
 }
 
-char lower(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
-}
-
 // Whether `word` is the beginning of `name` or all of it, in any case.
 bool abbreviates(std::string_view word, std::string_view name) {
     if (word.empty() || word.size() > name.size()) {
         return false;
     }
     for (std::size_t i = 0; i < word.size(); ++i) {
-        if (lower(word[i]) != lower(name[i])) {
+        if (asciiLower(word[i]) != asciiLower(name[i])) {
             return false;
         }
     }
@@ -311,7 +309,7 @@ private:
 
     std::string year(std::string_view word) const {
         if (abbreviates(word, "only") || abbreviates(word, "maximum") || abbreviates(word, "minimum")) {
-            if (word.size() == 1 && lower(word[0]) == 'm') {
+            if (word.size() == 1 && asciiLower(word[0]) == 'm') {
                 fail("\"m\" may be minimum or maximum");
             }
             return abbreviates(word, "only") ? "only" : abbreviates(word, "maximum") ? "max" : "min";
@@ -365,7 +363,7 @@ private:
     // clock, which goes without saying.
     static std::string timeOfDay(std::string_view word) {
         std::string text(word == "-" ? "0" : word);
-        switch (lower(text.back())) {
+        switch (asciiLower(text.back())) {
         case 'w':
             text.pop_back();
             break;
