@@ -13,6 +13,7 @@
 
 #include <algorithm>
 #include <array>
+#include <atomic>
 #include <memory>
 
 namespace kvt::ex {
@@ -21,19 +22,34 @@ namespace {
 /// The mappings, as indexes of the tables below.
 enum class Mapping { upper, lower, folded };
 
-// Opened at first use and only read after that; when it cannot be opened, the next use tries again. It is never closed:
-// destructors of static objects map text, too.
+using CaseMap = std::unique_ptr<UCaseMap, decltype(&ucasemap_close)>;
+
+CaseMap openCaseMap() {
+    UErrorCode status = U_ZERO_ERROR;
+    CaseMap opened(ucasemap_open("", 0, &status), &ucasemap_close);
+    if (status != U_ZERO_ERROR) {
+        throw UStringException("Unable to open an ICU case map for the default locale.");
+    }
+    return opened;
+}
+
+/// Closes the map of the process at its exit.
+struct ProcessCaseMap {
+    ~ProcessCaseMap() { isClosed = true; }
+
+    const CaseMap map = openCaseMap();
+    static inline std::atomic<bool> isClosed{false};
+};
+
+// Opened at first use and only read after that; when it cannot be opened, the next use tries again. Destructors of static
+// objects may map text when it is closed already: they get another one, which stays open.
 const UCaseMap* defaultCaseMap() {
-    static const UCaseMap* const map = [] {
-        UErrorCode status = U_ZERO_ERROR;
-        std::unique_ptr<UCaseMap, decltype(&ucasemap_close)> opened(ucasemap_open("", 0, &status),
-                                                                    &ucasemap_close);
-        if (status != U_ZERO_ERROR) {
-            throw UStringException("Unable to open an ICU case map for the default locale.");
-        }
-        return opened.release();
-    }();
-    return map;
+    if (ProcessCaseMap::isClosed) {
+        static const UCaseMap* const late = openCaseMap().release();
+        return late;
+    }
+    static const ProcessCaseMap process;
+    return process.map.get();
 }
 
 // Whether ICU has written the text, or would have with more room.
@@ -109,7 +125,7 @@ constexpr std::array utf16Contexts = {
     "UString<Encoding::Utf16>::toFoldedCase() failed on ",
 };
 
-// Runs `action`; a failure that leaves it says what text it was about, and one of a foreign kind becomes fatal.
+// Runs `action`; a failure that leaves it carries a line with the text, and one of a foreign kind becomes fatal.
 template <typename Action>
 auto guarded(const char* context, std::string_view bytes, Encoding encoding, Action action) {
     const auto addContext = [&](Throwable& failure) {

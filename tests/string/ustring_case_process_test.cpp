@@ -126,6 +126,23 @@ TEST_F(UStringCaseProcess, TheMapIsClosedAtExit) {
     EXPECT_EXIT(mapAndLeave(), ::testing::ExitedWithCode(7), "case map closed");
 }
 
+[[noreturn]] void mapInADestructorThatRunsLate() {
+    static const struct Late {
+        ~Late() {
+            finish({{std::to_string(closedCaseMaps()), "1"},
+                    {upperOr("straße"), "STRASSE"},
+                    {upperOr("é"), "É"},
+                    {std::to_string(openedCaseMaps()), "2"}});
+        }
+    } madeBeforeTheMap;
+    upperOr("a");
+    std::exit(1);
+}
+
+TEST_F(UStringCaseProcess, ADestructorThatRunsLaterMapsWithAMapOfItsOwn) {
+    EXPECT_EXIT(mapInADestructorThatRunsLate(), ::testing::ExitedWithCode(0), "");
+}
+
 // y with diaeresis has its capital outside Latin-1.
 [[noreturn]] void mapInLatin1() {
     setenv("LC_ALL", "C.UTF-8", 1);
