@@ -26,17 +26,19 @@ bool hasTimeParts(const IntervalParts& interval) noexcept {
            interval.nanoseconds() > 0;
 }
 
-// The text of a sum, of the kind of the value that it began with. What is beyond the years of a value is a part out
-// of range as long as it could be written in four digits, and else no text at all.
-Outcome<UString<0>> sumText(TemporalType kind, const TemporalInstant& sum) {
-    const std::int64_t year = detail::civilFromDays(sum.count.days).year;
-    if (year < 0 || year > detail::highestYear) {
-        return UString<0>();
+// A sum as the answer, of the kind of the value that it began with. What is beyond the years of a value is a part out of
+// range as long as it could be written in four digits, and else no text at all.
+Outcome<TextResult> answerOf(TemporalType kind, const TemporalInstant& sum, ReturnState state) {
+    static const std::int64_t firstDay = detail::daysFromCivil(detail::lowestYear, 1, 1);
+    static const std::int64_t endDay = detail::daysFromCivil(detail::highestYear + 1, 1, 1);
+    if (sum.count.days >= firstDay && sum.count.days < endDay) {
+        return TextResult(state, detail::canonicalText(kind, sum), std::nullopt);
     }
-    if (year < detail::lowestYear) {
+    const std::int64_t year = detail::civilFromDays(sum.count.days).year;
+    if (year >= 0 && year < detail::lowestYear) {
         return detail::yearOutOfRange(year);
     }
-    return detail::canonicalText(kind, sum);
+    return TextResult(state, UString<0>(), std::nullopt);
 }
 
 Outcome<TextResult> addTo(const CanonicalRecord& record, const IntervalParts& interval) {
@@ -46,10 +48,7 @@ Outcome<TextResult> addTo(const CanonicalRecord& record, const IntervalParts& in
     TemporalInstant instant = detail::instantWithOffset(record);
     return detail::addInterval(instant.count, interval).andThen([&](const detail::TimeCount& sum) {
         instant.count = sum;
-        return sumText(kind, instant).andThen([&](UString<0>& text) {
-            return detail::makeDateTimeResult(
-                record.offsetRepaired ? ReturnState::Repaired : ReturnState::Success, std::move(text));
-        });
+        return answerOf(kind, instant, record.offsetRepaired ? ReturnState::Repaired : ReturnState::Success);
     });
 }
 

@@ -23,13 +23,9 @@ constexpr std::int64_t wrappingNegation(std::int64_t number) noexcept {
     return static_cast<std::int64_t>(0 - static_cast<std::uint64_t>(number));
 }
 
-// The date of a count whose year a value can have.
-Outcome<CivilDate> dateInRange(const TimeCount& count) {
-    const CivilDate date = civilFromDays(count.days);
-    if (date.year < lowestYear || date.year > highestYear) {
-        return yearOutOfRange(date.year);
-    }
-    return date;
+// A calendar step begins in a year that a value can have.
+bool isInRange(const CivilDate& date) noexcept {
+    return date.year >= lowestYear && date.year <= highestYear;
 }
 
 // The day after so many years and then months; it is cut to the length of the month reached.
@@ -44,20 +40,22 @@ std::int64_t daysAfter(const CivilDate& date, std::int64_t years, std::int64_t m
 } // namespace
 
 Outcome<TimeCount> addInterval(const TimeCount& count, const IntervalParts& interval) {
-    return dateInRange(count).andThen([&](const CivilDate& date) {
-        const auto signedPart = [&](std::int64_t magnitude) {
-            return interval.negative() ? wrappingNegation(magnitude) : magnitude;
-        };
-        const std::int64_t days =
-            wrappingSum(daysAfter(date, signedPart(interval.years()), signedPart(interval.months())),
-                        signedPart(interval.days()));
-        std::int64_t seconds = wrappingSum(wrappingProduct(days, 24), signedPart(interval.hours()));
-        seconds = wrappingProduct(seconds, secondsPerHour);
-        seconds = wrappingSum(seconds, wrappingProduct(signedPart(interval.minutes()), secondsPerMinute));
-        seconds = wrappingSum(seconds, signedPart(interval.seconds()));
-        // The time of day joins as the nanoseconds that it is.
-        return timeCountOfSeconds(seconds, count.nanoseconds + signedPart(interval.nanoseconds()));
-    });
+    const CivilDate date = civilFromDays(count.days);
+    if (!isInRange(date)) {
+        return yearOutOfRange(date.year);
+    }
+    const auto signedPart = [&](std::int64_t magnitude) {
+        return interval.negative() ? wrappingNegation(magnitude) : magnitude;
+    };
+    const std::int64_t days =
+        wrappingSum(daysAfter(date, signedPart(interval.years()), signedPart(interval.months())),
+                    signedPart(interval.days()));
+    std::int64_t seconds = wrappingSum(wrappingProduct(days, 24), signedPart(interval.hours()));
+    seconds = wrappingProduct(seconds, secondsPerHour);
+    seconds = wrappingSum(seconds, wrappingProduct(signedPart(interval.minutes()), secondsPerMinute));
+    seconds = wrappingSum(seconds, signedPart(interval.seconds()));
+    // The time of day joins as the nanoseconds that it is.
+    return timeCountOfSeconds(seconds, count.nanoseconds + signedPart(interval.nanoseconds()));
 }
 
 // ---- Difference
@@ -80,36 +78,36 @@ struct Walk {
     std::int64_t steps; ///< how many of them; negative on the way back
 };
 
-// So many steps of one kind from `start` towards `target` or, if those pass it, one fewer.
-Outcome<Walk> walkTowards(const TimeCount& start, const TimeCount& target, std::int64_t steps,
-                          CalendarStep daysAfterSteps) {
+// So many steps of one kind from `start`, whose date is `date`, towards `target` or, if those pass it, one fewer.
+Outcome<Walk> walkTowards(const TimeCount& start, const CivilDate& date, const TimeCount& target,
+                          std::int64_t steps, CalendarStep daysAfterSteps) {
     if (steps == 0) {
         return Walk{start, 0};
     }
-    return dateInRange(start).andThen([&](const CivilDate& date) {
-        const bool backwards = target < start;
-        TimeCount reached = {daysAfterSteps(date, steps), start.nanoseconds};
-        if (backwards ? reached < target : reached > target) {
-            steps += backwards ? 1 : -1;
-            reached.days = daysAfterSteps(date, steps);
-        }
-        return Walk{reached, steps};
-    });
+    if (!isInRange(date)) {
+        return yearOutOfRange(date.year);
+    }
+    const bool backwards = target < start;
+    TimeCount reached = {daysAfterSteps(date, steps), start.nanoseconds};
+    if (backwards ? reached < target : reached > target) {
+        steps += backwards ? 1 : -1;
+        reached.days = daysAfterSteps(date, steps);
+    }
+    return Walk{reached, steps};
 }
 
-Outcome<Walk> walkYears(const TimeCount& start, const TimeCount& target) {
-    const std::int64_t apart = civilFromDays(target.days).year - civilFromDays(start.days).year;
-    return walkTowards(start, target, apart, daysAfterYears);
+Outcome<Walk> walkYears(const TimeCount& start, const TimeCount& target, const CivilDate& to) {
+    const CivilDate from = civilFromDays(start.days);
+    return walkTowards(start, from, target, to.year - from.year, daysAfterYears);
 }
 
-Outcome<Walk> walkMonths(const TimeCount& start, const TimeCount& target) {
-    const CivilDate to = civilFromDays(target.days);
+Outcome<Walk> walkMonths(const TimeCount& start, const TimeCount& target, const CivilDate& to) {
     const CivilDate from = civilFromDays(start.days);
     std::int64_t apart = std::int64_t{to.month} - std::int64_t{from.month};
     if (to.year != from.year) {
         apart += to.year > from.year ? 12 : -12;
     }
-    return walkTowards(start, target, apart, daysAfterMonths);
+    return walkTowards(start, from, target, apart, daysAfterMonths);
 }
 
 // Sets days to nanoseconds.
@@ -152,8 +150,9 @@ Outcome<Difference> diffParts(const TimeCount& first, const TimeCount& second, b
     if (!byCalendar) {
         return differenceOf(0, 0, second, first, backwards);
     }
-    return walkYears(second, first).andThen([&](const Walk& years) {
-        return walkMonths(years.at, first).andThen([&](const Walk& months) {
+    const CivilDate to = civilFromDays(first.days);
+    return walkYears(second, first, to).andThen([&](const Walk& years) {
+        return walkMonths(years.at, first, to).andThen([&](const Walk& months) {
             return differenceOf(std::abs(years.steps), std::abs(months.steps), months.at, first, backwards);
         });
     });

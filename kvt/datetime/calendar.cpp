@@ -1,6 +1,9 @@
+// Days and dates, for any year of 64 bits that a sum may reach.
 #include <kvt/datetime/detail/calendar.h>
 
 #include <date/date.h>
+
+#include <iterator>
 
 namespace kvt::ex::datetime::detail {
 
@@ -33,8 +36,12 @@ CivilDate civilFromDays(std::int64_t days) noexcept {
 }
 
 unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept {
+    constexpr unsigned lengths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    if (month - 1 >= std::size(lengths)) {
+        return 29;
+    }
     const auto inCycle = static_cast<int>(year - floorOf(year, yearsPerCycle) * yearsPerCycle);
-    return static_cast<unsigned>((date::year(inCycle) / date::month(month) / date::last).day());
+    return month == 2 && date::year(inCycle).is_leap() ? 29 : lengths[month - 1];
 }
 
 std::string_view lastDayText(unsigned lastDay) noexcept {

@@ -1,8 +1,10 @@
 // One pass over the digits, the fraction and the offset of a text. The number of digits alone says what they are.
 #include <kvt/datetime/detail/record.h>
 
+#include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/text.h>
 
+#include <array>
 #include <optional>
 
 namespace kvt::ex::datetime::detail {
@@ -60,7 +62,7 @@ bool split(std::string_view text, CanonicalRecord& record) noexcept {
             return false;
         }
         record.offset = *offset;
-        record.offsetRepaired = offset->view() != text;
+        record.offsetRepaired = text.size() != offset->view().size(); // of that size there is one form
     }
     record.type = typeOf(digits.size(), hasPoint, isOffset);
     if (record.type == TemporalType::Unsupported) {
@@ -104,20 +106,20 @@ Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
         return outcome;
     }
     readNumbers(record);
-    const Outcome<TimeCount> count = countFromFields(record.fields, lenient);
-    if (!count) {
-        return count.failure();
+    if (const Outcome<TimeCount> count = countFromFields(record.fields, lenient)) {
+        record.count = *count;
+    } else {
+        outcome = count.failure();
     }
-    record.count = *count;
     return outcome;
 }
 
 Outcome<CanonicalRecord> readValue(std::string_view text) {
-    Outcome<CanonicalRecord> record = parseCanonical(text, false);
-    if (record && record->type == TemporalType::Unsupported) {
-        return ValueUnsupported{text};
+    Outcome<CanonicalRecord> outcome = parseCanonical(text, false);
+    if (outcome && outcome->type == TemporalType::Unsupported) {
+        outcome = ValueUnsupported{text};
     }
-    return record;
+    return outcome;
 }
 
 TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept {
@@ -131,23 +133,56 @@ DateTimeFields carriedFields(const CanonicalRecord& record) noexcept {
 
 // ---- Writing
 
+namespace {
+
+// The digits of a value, in pairs one behind the other.
+class Digits {
+public:
+    template <typename Number>
+    void put(Number number) noexcept {
+        const auto pair = static_cast<unsigned>(number);
+        *end_++ = static_cast<char>('0' + pair / 10);
+        *end_++ = static_cast<char>('0' + pair % 10);
+    }
+    std::string_view view() const noexcept {
+        return {text_.data(), static_cast<std::size_t>(end_ - text_.data())};
+    }
+
+private:
+    std::array<char, dateDigits + timeDigits> text_;
+    char* end_ = text_.data();
+};
+
+} // namespace
+
 UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset) {
     TextBuffer text;
+    Digits digits;
     if (kind == TemporalType::Unsupported) {
         return text.toString();
     }
     if (!isTimeKind(kind)) {
-        text.putSigned(fields.year, 4);
-        text.putPair(static_cast<unsigned>(fields.month));
-        text.putPair(static_cast<unsigned>(fields.day));
+        if (fields.year >= lowestYear && fields.year <= highestYear) {
+            digits.put(fields.year / 100);
+            digits.put(fields.year % 100);
+        } else {
+            text.putSigned(fields.year, 4); // of what ran over at either end
+        }
+        digits.put(fields.month);
+        digits.put(fields.day);
     }
-    if (kind != TemporalType::Date) {
-        text.putPair(static_cast<unsigned>(fields.hours));
-        text.putPair(static_cast<unsigned>(fields.minutes));
-        text.putPair(static_cast<unsigned>(fields.seconds));
+    if (kind == TemporalType::Date) {
+        text.put(digits.view());
+    } else {
+        digits.put(fields.hours);
+        digits.put(fields.minutes);
+        digits.put(fields.seconds);
+        text.put(digits.view());
         text.putFraction(static_cast<std::uint64_t>(fields.nanoseconds));
     }
-    text.put(offset);
+    if (!offset.empty()) {
+        text.put(offset);
+    }
     return text.toString();
 }
 

@@ -120,6 +120,12 @@ void TextBuffer::grow(std::size_t count) {
 }
 
 void TextBuffer::putNumber(std::uint64_t number, unsigned width) {
+    if (number < 10 && width <= 1) {
+        return put(static_cast<char>('0' + number));
+    }
+    if (number < 100 && width <= 2) {
+        return putPair(static_cast<unsigned>(number));
+    }
     unsigned count = 1;
     for (std::uint64_t rest = number / 10; rest != 0 || count < width; rest /= 10) {
         ++count;
@@ -143,8 +149,12 @@ void TextBuffer::putFraction(std::uint64_t nanoseconds) {
     if (nanoseconds == 0) {
         return;
     }
-    put('.');
-    putNumber(nanoseconds, nanosecondDigits);
+    char* const point = room(1 + nanosecondDigits);
+    *point = '.';
+    auto rest = static_cast<std::uint32_t>(nanoseconds);
+    for (char* place = point + nanosecondDigits; place != point; rest /= 10) {
+        *place-- = static_cast<char>('0' + rest % 10);
+    }
     while (data_[size_ - 1] == '0') {
         --size_;
     }
