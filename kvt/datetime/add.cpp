@@ -26,8 +26,8 @@ bool hasTimeParts(const IntervalParts& interval) noexcept {
            interval.nanoseconds() > 0;
 }
 
-// A sum as the answer, of the kind of the value that it began with. What is beyond the years of a value is a part out of
-// range as long as it could be written in four digits, and else no text at all.
+// A sum as the answer, of the kind of the value that it began with. A year out of range is a failure
+// as long as it fits four digits; beyond them the answer is an empty text.
 Outcome<TextResult> answerOf(TemporalType kind, const TemporalInstant& sum, ReturnState state) {
     static const std::int64_t firstDay = detail::daysFromCivil(detail::lowestYear, 1, 1);
     static const std::int64_t endDay = detail::daysFromCivil(detail::highestYear + 1, 1, 1);

@@ -1,3 +1,5 @@
+// The public values. Their setters check nothing, so that the texts made here have room for fields of any size; only
+// create() and the readers know bounds.
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/text.h>

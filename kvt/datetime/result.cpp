@@ -1,3 +1,4 @@
+// Messages are numbers and parameters here; the words belong to the host.
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
 #include <kvt/datetime/message_numbers.h>

@@ -1,3 +1,5 @@
+// Numbers become digits and digits numbers without streams and locales. Where doubles come in, they are part of what is
+// stated: the fraction of a second is the nearest double of its digits, and a sum of seconds is shown as one.
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>

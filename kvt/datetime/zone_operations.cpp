@@ -1,7 +1,7 @@
 // now, timezoneGet, timezoneSet, timezoneRemove: values and their offsets.
 //
-// The zone database speaks in exceptions, and here they end: now() tells what went wrong, timezoneSet() tells of wall
-// clocks that do not exist or exist twice and is silent about all else.
+// The zone database speaks in exceptions, and here they end: now() reports what went wrong; timezoneSet()
+// reports wall clocks that do not exist or exist twice, and is silent about all else.
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/detail/apply_offset.h>

@@ -24,7 +24,7 @@ std::int64_t daysFromCivil(std::int64_t year, unsigned month, unsigned day) noex
 /// The date so many days after 1970-01-01.
 CivilDate civilFromDays(std::int64_t days) noexcept;
 
-/// 28 to 31; 29 for a month that is none.
+/// 28 to 31; 29 for a month beyond the twelve.
 unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept;
 
 /// "28" to "31", for messages.

@@ -1,6 +1,6 @@
-// What can be wrong with a value or an interval, as it travels inside: in an Outcome (outcome.h), until a public function
-// words it (result.h). Patterns have failures of their own (pattern_failure.h). What does get thrown comes from outside: lack of memory, conversions, the zone
-// database.
+// What can be wrong with a value or an interval, as it travels inside: in an Outcome (outcome.h), until a public
+// function words it (result.h). Patterns have failures of their own (pattern_failure.h). What is thrown comes from
+// outside: lack of memory, conversions, the zone database.
 #pragma once
 
 #include <kvt/datetime/detail/outcome.h>
@@ -11,12 +11,12 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// A text that is no value: 933063. It stays the caller's.
+/// A text that is not a value: 933063. It stays the caller's.
 struct ValueUnsupported {
     std::string_view value;
 };
 
-/// A text that is no interval: 933064. It stays the caller's.
+/// A text that is not an interval: 933064. It stays the caller's.
 struct IntervalUnreadable {
     std::string_view interval;
 };

@@ -14,7 +14,7 @@ enum class Keyword {
     Iso, ///< the extended form of ISO 8601
 };
 
-/// A format that is no pattern names keywords.
+/// A format that is not a pattern names keywords.
 inline bool isKeywordList(std::string_view format) noexcept {
     return format.find('%') == std::string_view::npos;
 }

@@ -78,8 +78,8 @@ Result<Value> lastAnswer(LastResort resort) noexcept {
     return result;
 }
 
-/// Runs `work`, which returns Outcome<Result<Value>>; `words` returns std::optional<LogMessageInfo> for a Failure. Work that
-/// words its failures itself returns Result<Value>.
+/// Runs `work`, which returns Outcome<Result<Value>>; `words` returns std::optional<LogMessageInfo> for a Failure.
+/// Work that words its failures itself returns Result<Value>.
 template <typename Value, typename Work, typename Words>
 Result<Value> guarded(Work&& work, LastResort resort, Words&& words) {
     try {
