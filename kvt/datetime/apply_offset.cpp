@@ -4,25 +4,19 @@
 
 #include <kvt/datetime/detail/local_zone.h>
 #include <kvt/datetime/detail/offset.h>
-
-#include <algorithm>
+#include <kvt/foundation/detail/ascii.h>
 
 namespace kvt::ex::datetime::detail {
 
 namespace {
 
-// The keywords are ASCII letters, and no other character folds to one of theirs.
-bool isKeyword(std::string_view text, std::string_view keyword) noexcept {
-    return std::equal(text.begin(), text.end(), keyword.begin(), keyword.end(), [](char c, char lower) {
-        return (c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c) == lower;
-    });
-}
+using ex::detail::equalsIgnoringAsciiCase;
 
 std::optional<std::int32_t> offsetOfZone(const TemporalInstant& instant, std::string_view zone) {
     if (isLocalZone(zone)) {
         return localOffsetMinutes(instant);
     }
-    if (isKeyword(zone, "utc")) {
+    if (equalsIgnoringAsciiCase(zone, "utc")) {
         return 0;
     }
     const std::optional<OffsetForm> offset = readOffset(zone);
@@ -32,7 +26,7 @@ std::optional<std::int32_t> offsetOfZone(const TemporalInstant& instant, std::st
 } // namespace
 
 bool isLocalZone(std::string_view zone) noexcept {
-    return isKeyword(zone, "local");
+    return equalsIgnoringAsciiCase(zone, "local");
 }
 
 void applyOffsetText(TemporalInstant& instant, std::string_view zone, SetZoneMode mode) {
