@@ -34,4 +34,6 @@
 #include <kvt/string/ustring_array.h>
 #include <kvt/string/ustring_format.h>
 #include <kvt/string/ustring_operators.h>
+#include <kvt/string/ustring_output.h>
+#include <kvt/string/ustring_storage.h>
 #include <kvt/string/ustring_view.h>

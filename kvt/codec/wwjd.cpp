@@ -103,7 +103,7 @@ char16_t hexadecimalUnit(std::string_view digits) {
     return static_cast<char16_t>(value);
 }
 
-// Appends each byte as a unit, U+FFFD for one above 127; says whether there was none of these.
+// Appends each byte as a unit, U+FFFD for one above 127; returns whether there was none of these.
 bool appendAscii(std::string_view bytes, std::u16string& out) {
     bool valid = true;
     for (const char c : bytes) {

@@ -14,7 +14,7 @@ namespace {
 
 constexpr char substitute = '\x1A';
 
-// The trailing bytes that a lead byte announces; 0 for a byte that is no lead byte.
+// The trailing bytes that a lead byte announces; 0 for a byte that is not one.
 std::size_t trailingBytes(char byte) {
     const auto lead = static_cast<unsigned char>(byte);
     return (lead & 0xE0) == 0xC0   ? 1
@@ -32,7 +32,7 @@ UString<0> substitution() {
     return utf8({&substitute, 1});
 }
 
-// Appends `bytes`, which begin beyond ASCII, with each character replaced; says whether they are well-formed.
+// Appends `bytes`, which begin beyond ASCII, with each character replaced; returns whether they are well-formed.
 bool appendSubstituted(std::string_view bytes, std::string& out) {
     bool wellFormed = true;
     while (!bytes.empty()) {

@@ -22,6 +22,7 @@
 #include <kvt/foundation/optional.h>
 #include <kvt/foundation/vector.h>
 #include <kvt/string/ustring_operators.h>
+#include <kvt/string/ustring_storage.h>
 #include <kvt/string/ustring_view.h>
 
 #include <algorithm>
@@ -41,53 +42,6 @@ namespace detail {
 /// Tags that choose between the overloads of comparisons, searches and replacements.
 struct case_sensitive_t {};
 struct case_insensitive_t {};
-
-/// What every string of unit `T` is made of: the units and, by value, the table through which a host reaches them.
-/// The table of an object always stands for the storage of that object and is never copied.
-template <typename T>
-class UStringStorage {
-public:
-    UStringStorage() : adaptor_(storage_) {}
-    UStringStorage(const UStringStorage& other) : storage_(other.storage_), adaptor_(storage_) {}
-    UStringStorage(UStringStorage&& other) noexcept
-        : storage_(std::move(other.storage_)), adaptor_(storage_) {
-        other.storage_.clear();
-    }
-    UStringStorage& operator=(const UStringStorage& other) {
-        storage_ = other.storage_;
-        return *this;
-    }
-    UStringStorage& operator=(UStringStorage&& other) noexcept {
-        if (this != &other) {
-            storage_ = std::move(other.storage_);
-            other.storage_.clear();
-        }
-        return *this;
-    }
-    ~UStringStorage() = default;
-
-    std::basic_string<T> storage_;
-    IZQTUStringAdaptor<T> adaptor_;
-};
-
-/// The fields of a UString<N>: only N = 30 holds an encoding, the others have it in their type.
-template <std::uint32_t N>
-class UStringFields : public UStringStorage<CodeUnit<N>> {
-public:
-    Encoding encoding() const noexcept { return static_cast<Encoding::Type>(N); }
-};
-
-template <>
-class UStringFields<30> : public UStringStorage<char> {
-public:
-    Encoding encoding() const noexcept { return encoding_; }
-
-    Encoding encoding_ = Encoding::Unknown;
-};
-
-/// The size in bytes of a UString with a fixed encoding as the library was compiled, for a host that wants to be
-/// sure that both sides see the same object.
-KVT_EXPORT std::size_t actualUStringSize() noexcept;
 
 } // namespace detail
 
@@ -549,35 +503,6 @@ extern template class KVT_EXPORT UString<27>;
 extern template class KVT_EXPORT UString<28>;
 extern template class KVT_EXPORT UString<29>;
 extern template class KVT_EXPORT UString<30>;
-
-namespace detail {
-
-/// What operator<< and the formatters write for a string.
-template <std::uint32_t N>
-std::string outputText(const UString<N>& string);
-
-/// That text, without a copy of what is UTF-8 already: it lives as long as this object and the string.
-template <std::uint32_t N>
-class OutputText {
-public:
-    explicit OutputText(const UString<N>& string) : text_(outputText(string)) {}
-    operator kvt::future::string_view() const noexcept { return text_; }
-
-private:
-    std::string text_;
-};
-
-template <>
-class OutputText<Encoding::Utf8> {
-public:
-    explicit OutputText(const UString<0>& string) noexcept : string_(&string) {}
-    operator kvt::future::string_view() const noexcept { return *string_; }
-
-private:
-    const UString<0>* string_;
-};
-
-} // namespace detail
 
 } // namespace kvt::ex
 

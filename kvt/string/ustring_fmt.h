@@ -7,7 +7,7 @@
 // alignment, width, precision. It fails as operator<<.
 #pragma once
 
-#include <kvt/string/ustring.h>
+#include <kvt/string/ustring_output.h>
 
 #include <cstdint>
 

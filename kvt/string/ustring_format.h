@@ -6,7 +6,7 @@
 // alignment, width, precision. It fails as operator<<. With a run-time that has no <format>, this header is empty.
 #pragma once
 
-#include <kvt/string/ustring.h>
+#include <kvt/string/ustring_output.h>
 
 #if __has_include(<version>)
 #include <version>

@@ -31,7 +31,7 @@ constexpr std::uint32_t noEncoding = 0xFFFFFFFF;
 
 template <std::uint32_t N>
 std::integral_constant<std::uint32_t, N> encodingOfString(const UString<N>*);
-std::integral_constant<std::uint32_t, noEncoding> encodingOfString(const volatile void*);
+std::integral_constant<std::uint32_t, noEncoding> encodingOfString(...);
 template <typename T>
 constexpr std::uint32_t stringEncoding = decltype(encodingOfString(static_cast<T*>(nullptr)))::value;
 template <typename T>

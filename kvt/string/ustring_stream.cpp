@@ -1,5 +1,6 @@
 // Strings as text for people: the text itself, and its output to a standard stream.
 #include <kvt/string/detail/instantiate.h>
+#include <kvt/string/ustring_output.h>
 
 #include <kvt/foundation/detail/escape.h>
 

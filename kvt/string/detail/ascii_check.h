@@ -13,7 +13,7 @@ namespace kvt::ex::detail {
 /// UStringTranscodingException (910003) when anything was replaced; `out` then holds the result.
 ///
 /// The check is of structure only: a lead byte announces one to four trailing bytes, and those take up whatever
-/// follows. Over-long forms and surrogates are not told from other characters, as all of them are lost alike.
+/// follows. Over-long forms and surrogates count as characters, since all of them are lost alike.
 void utf8ToAscii(std::string_view bytes, std::string& out);
 
 /// The same for an encoding of single bytes that keeps ASCII, where each byte above 127 is one character. Throws
