@@ -1,4 +1,4 @@
-// What the date and time functions may cost beside the C library's, each as a ratio with its limit.
+// What the date and time functions may cost beside the C library's and Abseil's, each as a ratio with its limit.
 //
 // All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
 // falls on all of them alike. A row is the median of the ratios of its two ways within a round. A row above its limit
@@ -6,10 +6,13 @@
 //
 // The C library's strptime and strftime know no fraction of a second. Beside a value that has one stands what reads or
 // writes all of it by that library: strptime, strtod and strptime again for the offset, then timegm; strftime and
-// snprintf. What strptime alone takes for the part that it knows is shown without a limit.
+// snprintf. What strptime alone takes for the part that it knows is shown without a limit. Adding a month stands beside
+// Abseil's way from text to text: ParseTime, the civil calendar, FormatTime.
 
 #include <kvt/datetime/datetime.h>
 
+#include <absl/time/civil_time.h>
+#include <absl/time/time.h>
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
@@ -108,6 +111,34 @@ Way strftimeOffsetWay() {
     });
 }
 
+Way adding(const char* value, const char* interval) {
+    return way([value = UString<0>(value), interval = UString<0>(interval)] { return add(value, interval); });
+}
+
+// The same day of the next month or, where that is too short, its last one.
+absl::CivilDay monthLater(absl::CivilDay day) {
+    const absl::CivilMonth next = absl::CivilMonth(day) + 1;
+    const absl::CivilDay last = absl::CivilDay(next + 1) - 1;
+    return absl::CivilDay(next.year(), next.month(), std::min(day.day(), last.day()));
+}
+
+// A month later, from text to text, by Abseil.
+Way abslMonthWay(const char* value, const char* pattern, absl::TimeZone zone) {
+    return way([value = std::string(value), pattern = std::string(pattern), zone] {
+        absl::Time time;
+        std::string error;
+        if (!absl::ParseTime(pattern, value, &time, &error)) {
+            std::abort();
+        }
+        const absl::CivilSecond clock = absl::ToCivilSecond(time, zone);
+        const absl::Duration fraction = time - absl::FromCivil(clock, zone);
+        const absl::CivilDay day = monthLater(absl::CivilDay(clock));
+        const absl::CivilSecond later(day.year(), day.month(), day.day(), clock.hour(), clock.minute(),
+                                      clock.second());
+        return absl::FormatTime(pattern, absl::FromCivil(later, zone) + fraction, zone);
+    });
+}
+
 const std::map<std::string, Way>& ways() {
     static const std::map<std::string, Way> all = {
         {"parse date", parsing("2020-01-02", "%Y-%m-%d")},
@@ -135,6 +166,20 @@ const std::map<std::string, Way>& ways() {
         {"strftime offset", strftimeOffsetWay()},
         {"strftime datetime", strftimeWay("%Y-%m-%dT%H:%M:%S")},
         {"strftime name", strftimeWay("%d/%b/%Y %H:%M:%S")},
+        {"add date", adding("20200131", "P1M")},
+        {"add offset", adding("20200131123456.5+01:00", "P1M")},
+        {"Abseil date", abslMonthWay("2020-01-31", "%Y-%m-%d", absl::UTCTimeZone())},
+        {"Abseil offset",
+         abslMonthWay("2020-01-31T12:34:56.5+01:00", absl::RFC3339_full, absl::FixedTimeZone(3600))},
+        {"cast offset", way([value = UString<0>("20200131123456.5+01:00")] {
+             return cast(value, CastToTemporalType::Datetime);
+         })},
+        {"diff offset", way([first = UString<0>("20200131123456.5+01:00"),
+                             second = UString<0>("19991231235959.5+05:30")] { return diff(first, second); })},
+        {"compare offset",
+         way([first = UString<0>("20200131123456.5+01:00"), second = UString<0>("19991231235959.5+05:30")] {
+             return compare(first, second);
+         })},
     };
     return all;
 }
@@ -146,12 +191,23 @@ struct Row {
 };
 
 constexpr Row rows[] = {
-    {"parse date", "strptime and timegm date", 0.6}, {"parse offset", "strptime offset", 0.6},
-    {"parse offset", "strptime datetime", 0},        {"parse ISO", "parse offset", 1.7},
-    {"parse name", "strptime name", 0.15},           {"parse date fails", "parse date", 1.5},
-    {"parse offset fails", "parse offset", 1.5},     {"parse name fails", "parse name", 1.5},
-    {"format date", "strftime date", 1.0},           {"format offset", "strftime offset", 0.65},
-    {"format offset", "strftime datetime", 0},       {"format name", "strftime name", 1.0},
+    {"parse date", "strptime and timegm date", 0.6},
+    {"parse offset", "strptime offset", 0.6},
+    {"parse offset", "strptime datetime", 0},
+    {"parse ISO", "parse offset", 1.7},
+    {"parse name", "strptime name", 0.15},
+    {"parse date fails", "parse date", 1.5},
+    {"parse offset fails", "parse offset", 1.5},
+    {"parse name fails", "parse name", 1.5},
+    {"format date", "strftime date", 1.0},
+    {"format offset", "strftime offset", 0.65},
+    {"format offset", "strftime datetime", 0},
+    {"format name", "strftime name", 1.0},
+    {"add date", "Abseil date", 0.12},
+    {"add offset", "Abseil offset", 0.12},
+    {"cast offset", "parse date", 1.2},
+    {"diff offset", "parse date", 2.5},
+    {"compare offset", "parse date", 1.5},
 };
 
 double nanosecondsOf(const Way& measured) {
