@@ -1,4 +1,4 @@
-// format(): keywords, the check of a pattern against the kind of the value, and the messages.
+// format(): keywords, and the messages about a pattern that does not suit the kind of the value.
 #include <kvt/datetime/datetime.h>
 
 #include <kvt/datetime/detail/keywords.h>
@@ -57,28 +57,30 @@ TextResult unsupported(const UString<0>& value) {
     return failed<UString<0>>(message_number::valueUnsupported, {viewOf(value)});
 }
 
-TextResult failedBy(const PatternFailure& failure, TemporalType kind) {
-    if (const auto* flag = std::get_if<FormatFlag>(&failure)) {
-        return failed<UString<0>>(message_number::flagNotForKind, {flag->flag, kindWord(kind)});
-    }
-    const auto& flags = std::get<FormatStringBadCombo>(failure);
-    return failed<UString<0>>(message_number::flagsExcludeEachOther, {flags.first, flags.second});
+TextResult complained(LogMessageInfo complaint) {
+    return makeDateTimeResult(ReturnState::Failure, UString<0>(), std::move(complaint));
 }
 
 TextResult formatByPattern(const UString<0>& value, const CanonicalRecord& record, std::string_view pattern) {
     if (record.type == TemporalType::Unsupported) {
         return unsupported(value);
     }
-    if (auto complaint = complaintAbout(pattern, record.type)) {
-        return makeDateTimeResult(ReturnState::Failure, UString<0>(), std::move(*complaint));
+    // A flag that is wrong comes before a character that the system's encoding does not have.
+    if (!isSystemText(pattern)) {
+        if (auto complaint = complaintAbout(pattern, record.type)) {
+            return complained(std::move(*complaint));
+        }
     }
-    const std::optional<std::int32_t> offsetMinutes =
-        hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt;
     const SystemBytes patternBytes(pattern);
     TextBuffer text;
-    if (const std::optional<PatternFailure> failure =
-            renderFields(text, patternBytes.view(), carriedFields(record), offsetMinutes)) {
-        return failedBy(*failure, record.type);
+    switch (
+        renderFields(text, patternBytes.view(), record.type, carriedFields(record), record.offset.minutes)) {
+    case WrittenPattern::WrongFlag:
+        return complained(complaintAbout(pattern, record.type).value());
+    case WrittenPattern::EpochBesideOffset:
+        return failed<UString<0>>(message_number::flagsExcludeEachOther, {"%s", "%z"});
+    case WrittenPattern::Whole:
+        break;
     }
     return TextResult(ReturnState::Success, textOfSystemBytes(text.view()), std::nullopt);
 }

@@ -54,8 +54,8 @@ std::string expanded(std::string_view format) {
 TextResult failedByMismatch(std::string_view format, std::size_t place) {
     place = placeBetweenCharacters(format, place);
     const std::string_view matched = format.substr(0, place);
-    TextResult result(ReturnState::Failure, UString<0>(), LogMessageInfo());
-    LogMessageInfo& info = *std::get<2>(result);
+    TextResult result(ReturnState::Failure, UString<0>(), std::nullopt);
+    LogMessageInfo& info = std::get<2>(result).emplace();
     info.messageNumber = message_number::formatMismatch;
     info.parameters.reserve(2);
     appendReadable(info.parameters,
@@ -98,9 +98,9 @@ TextResult failedBy(const PatternFailure& failure, std::string_view format, std:
 // ---- The two kinds of format
 
 // By the first form of ISO 8601 that fits.
-std::optional<PatternReading> readIso(std::string_view value, bool lenient) {
+bool readIso(std::string_view value, bool lenient, PatternReading& reading) {
     if (!isAscii(value)) {
-        return std::nullopt; // all of the value has to match, and the patterns are ASCII
+        return false; // all of the value has to match, and the patterns are ASCII
     }
     const SystemBytes bytes(value);
     PatternReader reader(bytes.view(), isoReadPattern(isoOrder.front()), lenient);
@@ -110,11 +110,11 @@ std::optional<PatternReading> readIso(std::string_view value, bool lenient) {
         if (!reader.goOnBy(pattern)) {
             reader = PatternReader(bytes.view(), pattern, lenient);
         }
-        if (const auto reading = reader.readAll()) {
-            return *reading;
+        if (!reader.readAll(reading)) {
+            return true;
         }
     }
-    return std::nullopt;
+    return false;
 }
 
 // By the first keyword that fits the value.
@@ -122,8 +122,9 @@ TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bo
     std::optional<TextResult> found;
     const auto use = [&](Keyword keyword) {
         if (keyword == Keyword::Iso) {
-            if (const auto reading = readIso(trimmed(viewOf(value)), lenient)) {
-                found = resultOf(*reading);
+            PatternReading reading;
+            if (readIso(trimmed(viewOf(value)), lenient, reading)) {
+                found = resultOf(reading);
             }
         } else if (const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient); !record) {
             found = makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
@@ -143,8 +144,9 @@ TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bo
 TextResult parseByPattern(std::string_view value, std::string_view pattern, bool lenient) {
     const SystemBytes valueBytes(value);
     const SystemBytes patternBytes(pattern);
-    const auto reading = readFields(valueBytes.view(), patternBytes.view(), lenient);
-    return reading ? resultOf(*reading) : failedBy(reading.failure(), pattern, patternBytes.view());
+    PatternReading reading;
+    const auto failure = PatternReader(valueBytes.view(), patternBytes.view(), lenient).readAll(reading);
+    return failure ? failedBy(*failure, pattern, patternBytes.view()) : resultOf(reading);
 }
 
 } // namespace

@@ -81,28 +81,28 @@ Problem carryOverOrdinal(DateTimeFields& fields, std::int64_t ordinal, bool leni
 
 } // namespace
 
-Outcome<PatternReading, PatternFailure> readingOf(const PatternFields& fields, Parts parts, bool lenient) {
+std::optional<PatternFailure> makeUp(PatternReading& reading, const PatternFields& fields, bool lenient) {
     if (fields.isEpoch() && fields.hasOffset) {
-        return PatternFailure(FormatStringBadCombo{fields.epochFlag, "%z"});
+        return FormatStringBadCombo{fields.epochFlag, "%z"};
     }
-    if (const Problem problem =
-            fields.isEpoch() ? std::nullopt : incompleteness(fields, (parts & offsetPart) != 0)) {
-        return PatternFailure(*problem);
+    if (!fields.isEpoch()) {
+        if (const Problem problem = incompleteness(fields, (reading.parts & offsetPart) != 0)) {
+            return *problem;
+        }
     }
     std::int32_t hours = fields.get(Field::Hours);
     if (fields.meridiem != '\0') {
         if (hours < 1 || hours > 12) {
-            return PatternFailure(ParseValidation::HourNotForMeridiem);
+            return ParseValidation::HourNotForMeridiem;
         }
         hours = hours % 12 + (fields.meridiem == 'p' ? 12 : 0);
     }
-    Outcome<PatternReading, PatternFailure> outcome{
-        PatternReading{parts, DateTimeFields(), fields.offsetMinutes}};
-    DateTimeFields& numbers = outcome->fields;
+    reading.offsetMinutes = fields.offsetMinutes;
+    DateTimeFields& numbers = reading.fields;
     if (fields.isEpoch()) {
         // Seconds since 1970 were checked against the range of years as they were read.
         numbers = fieldsFromCount(timeCountOfSeconds(fields.epochSeconds, fields.nanoseconds));
-        return outcome;
+        return std::nullopt;
     }
     numbers.year = fields.get(Field::Year);
     numbers.month = static_cast<std::uint64_t>(fields.get(Field::Month));
@@ -111,16 +111,15 @@ Outcome<PatternReading, PatternFailure> readingOf(const PatternFields& fields, P
     numbers.minutes = fields.get(Field::Minutes);
     numbers.seconds = fields.get(Field::Seconds);
     numbers.nanoseconds = fields.nanoseconds;
-    Problem problem = fields.has(Field::Ordinal)
-                          ? carryOverOrdinal(numbers, fields.get(Field::Ordinal), lenient)
-                          : carryOverDate(numbers, lenient);
-    if (!problem && (numbers.year < lowestYear || numbers.year > highestYear)) {
-        problem = ParseValidation::ResultYearOutOfRange;
+    if (const Problem problem = fields.has(Field::Ordinal)
+                                    ? carryOverOrdinal(numbers, fields.get(Field::Ordinal), lenient)
+                                    : carryOverDate(numbers, lenient)) {
+        return *problem;
     }
-    if (problem) {
-        outcome = PatternFailure(*problem);
+    if (numbers.year < lowestYear || numbers.year > highestYear) {
+        return ParseValidation::ResultYearOutOfRange;
     }
-    return outcome;
+    return std::nullopt;
 }
 
 } // namespace kvt::ex::datetime::detail

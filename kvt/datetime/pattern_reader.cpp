@@ -136,9 +136,28 @@ std::string_view PatternReader::takeWhile(Predicate predicate) noexcept {
     return {begin, static_cast<std::size_t>(at_ - begin)};
 }
 
+// The number of two digits that both are there, or a negative one.
+inline std::int32_t pairAt(const char* digits) noexcept {
+    return isDigit(digits[0]) && isDigit(digits[1]) ? (digits[0] - '0') * 10 + (digits[1] - '0') : -1;
+}
+
 // Up to `width` digits, or exactly that many; negative where there are not.
 inline std::int32_t PatternReader::takeNumber(unsigned width, bool exactWidth) noexcept {
     const char* const begin = at_;
+    // Nearly always all the digits are there.
+    if (const std::ptrdiff_t left = valueEnd_ - begin; width == 2 && left >= 2) {
+        if (const std::int32_t pair = pairAt(begin); pair >= 0) {
+            at_ = begin + 2;
+            return pair;
+        }
+    } else if (width == 4 && left >= 4) {
+        const std::int32_t high = pairAt(begin);
+        const std::int32_t low = pairAt(begin + 2);
+        if (high >= 0 && low >= 0) {
+            at_ = begin + 4;
+            return high * 100 + low;
+        }
+    }
     const char* const end =
         valueEnd_ - begin > static_cast<std::ptrdiff_t>(width) ? begin + width : valueEnd_;
     const char* place = begin;
@@ -242,18 +261,14 @@ bool PatternReader::readNext() {
     return true;
 }
 
-Outcome<PatternReading, PatternFailure> readFields(std::string_view value, std::string_view format,
-                                                   bool lenient) {
-    return PatternReader(value, format, lenient).readAll();
-}
-
-Outcome<PatternReading, PatternFailure> PatternReader::readAll() {
+std::optional<PatternFailure> PatternReader::readAll(PatternReading& reading) {
     while (!isDone()) {
         if (!readNext()) {
             return failure();
         }
     }
-    return readingOf(fields_, parts(), lenient_);
+    reading.parts = parts();
+    return makeUp(reading, fields_, lenient_);
 }
 
 bool PatternReader::goOnBy(std::string_view format) noexcept {

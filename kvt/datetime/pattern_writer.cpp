@@ -1,5 +1,5 @@
-// The pattern writer: one pass over the format, and a few digits for each flag, by its row in the table. Names are
-// English, as in the "C" locale.
+// The pattern writer: one pass over the format, in which each flag is checked and written by its row in the table.
+// Names are English, as in the "C" locale.
 #include <kvt/datetime/detail/pattern_writer.h>
 
 #include <kvt/datetime/detail/calendar.h>
@@ -7,8 +7,6 @@
 #include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/pattern_table.h>
 #include <kvt/datetime/detail/text.h>
-
-#include <algorithm>
 
 namespace kvt::ex::datetime::detail {
 
@@ -18,31 +16,29 @@ constexpr std::int64_t daysPerWeek = 7;
 
 class PatternWriter {
 public:
-    PatternWriter(TextBuffer& out, const DateTimeFields& fields, std::optional<std::int32_t> offsetMinutes)
-        : out_(out), fields_(fields), offsetMinutes_(offsetMinutes) {}
+    PatternWriter(TextBuffer& out, TemporalType kind, const DateTimeFields& fields,
+                  std::int32_t offsetMinutes)
+        : out_(out), kind_(kind), fields_(fields), offsetMinutes_(offsetMinutes) {}
 
-    std::optional<PatternFailure> run(std::string_view format) {
-        while (!format.empty()) {
-            const std::size_t literal = std::min(format.find('%'), format.size());
-            out_.put(format.substr(0, literal));
-            format.remove_prefix(literal);
-            if (format.size() < 2) {
-                out_.put(format);
-                break;
+    WrittenPattern run(std::string_view format) {
+        const char* next = format.data();
+        const char* const end = next + format.size();
+        while (next != end) {
+            if (*next != '%') {
+                out_.put(*next++);
+                continue;
             }
-            const bool isModified = format[1] == 'E' && format.size() > 2;
-            if (const PatternRow* const row = rowOfFlag(format[isModified ? 2 : 1], isModified)) {
-                write(row->writes);
+            const bool isModified = end - next > 1 && next[1] == 'E';
+            const std::ptrdiff_t length = isModified ? 3 : 2;
+            const PatternRow* const row =
+                end - next >= length ? rowOfFlag(next[length - 1], isModified) : nullptr;
+            if (row == nullptr || row->writes.writing == Writing::Unknown || !row->writes.kinds.has(kind_)) {
+                return WrittenPattern::WrongFlag;
             }
-            if (failure_) {
-                return *failure_;
-            }
-            format.remove_prefix(isModified ? 3 : 2);
+            write(row->writes);
+            next += length;
         }
-        if (hasEpoch_ && hasOffset_) {
-            return FormatStringBadCombo{"%s", "%z"};
-        }
-        return std::nullopt;
+        return hasEpoch_ && hasOffset_ ? WrittenPattern::EpochBesideOffset : WrittenPattern::Whole;
     }
 
 private:
@@ -94,12 +90,11 @@ private:
             number(fields_.seconds, rule.width);
             return out_.putFraction(static_cast<std::uint64_t>(fields_.nanoseconds));
         case Writing::Time:
-            (void)run(timeExpansion);
-            return;
+            return time();
         case Writing::EpochSeconds:
-            return offsetMinutes_ ? epochSeconds(*offsetMinutes_) : fail("%s");
+            return epochSeconds(offsetMinutes_);
         case Writing::LocalEpochSeconds:
-            return offsetMinutes_ ? fail("%Es") : epochSeconds(0);
+            return epochSeconds(0);
         case Writing::Offset:
             return offset(false);
         case Writing::OffsetOrZ:
@@ -124,6 +119,16 @@ private:
 
     // ---- Of the time
 
+    // As `timeExpansion` says.
+    void time() {
+        out_.putPair(static_cast<unsigned>(fields_.hours));
+        out_.put(':');
+        out_.putPair(static_cast<unsigned>(fields_.minutes));
+        out_.put(':');
+        out_.putPair(static_cast<unsigned>(fields_.seconds));
+        out_.putFraction(static_cast<std::uint64_t>(fields_.nanoseconds));
+    }
+
     // The seconds and nanoseconds are of one sign in the text.
     void epochSeconds(std::int64_t offsetMinutes) {
         hasEpoch_ = true;
@@ -140,14 +145,11 @@ private:
     }
 
     void offset(bool zeroIsZ) {
-        if (!offsetMinutes_) {
-            return fail("%z");
-        }
         hasOffset_ = true;
-        if (zeroIsZ && *offsetMinutes_ == 0) {
+        if (zeroIsZ && offsetMinutes_ == 0) {
             return out_.put('Z');
         }
-        out_.put(offsetOfMinutes(*offsetMinutes_)->view());
+        out_.put(offsetOfMinutes(offsetMinutes_)->view());
     }
 
     void number(std::uint64_t value, unsigned width) {
@@ -155,22 +157,19 @@ private:
     }
     void number(std::int64_t value, unsigned width) { number(static_cast<std::uint64_t>(value), width); }
 
-    void fail(std::string_view flag) { failure_ = FormatFlag{flag}; }
-
     TextBuffer& out_;
+    TemporalType kind_;
     const DateTimeFields& fields_;
-    std::optional<std::int32_t> offsetMinutes_;
-    std::optional<FormatFlag> failure_;
+    std::int32_t offsetMinutes_;
     bool hasEpoch_ = false;
     bool hasOffset_ = false;
 };
 
 } // namespace
 
-std::optional<PatternFailure> renderFields(TextBuffer& out, std::string_view format,
-                                           const DateTimeFields& fields,
-                                           std::optional<std::int32_t> offsetMinutes) {
-    return PatternWriter(out, fields, offsetMinutes).run(format);
+WrittenPattern renderFields(TextBuffer& out, std::string_view format, TemporalType kind,
+                            const DateTimeFields& fields, std::int32_t offsetMinutes) {
+    return PatternWriter(out, kind, fields, offsetMinutes).run(format);
 }
 
 } // namespace kvt::ex::datetime::detail

@@ -5,14 +5,27 @@
 
 namespace kvt::ex::datetime::detail {
 
-LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters) {
-    LogMessageInfo info;
+namespace {
+
+void fill(LogMessageInfo& info, std::uint32_t number, std::initializer_list<std::string_view> parameters) {
     info.messageNumber = number;
     info.parameters.reserve(parameters.size());
     for (const std::string_view parameter : parameters) {
         info.parameters.emplace_back(UStringView<0>(parameter));
     }
+}
+
+} // namespace
+
+LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters) {
+    LogMessageInfo info;
+    fill(info, number, parameters);
     return info;
+}
+
+void setMessage(kvt::future::optional<LogMessageInfo>& info, std::uint32_t number,
+                std::initializer_list<std::string_view> parameters) {
+    fill(info.emplace(), number, parameters);
 }
 
 LogMessageInfo genericMessage() {

@@ -20,11 +20,6 @@ bool isSystemUtf8() {
     return isUtf8;
 }
 
-bool isSameInBoth(std::string_view text) {
-    static const bool holdsAscii = Encoding(Encoding::System).supports7BitASCII();
-    return isSystemUtf8() || (holdsAscii && isAscii(text));
-}
-
 // Of UTF-8: a byte within a character, behind its first.
 bool isContinuation(char c) {
     return (static_cast<unsigned char>(c) & 0xC0) == 0x80;
@@ -32,15 +27,21 @@ bool isContinuation(char c) {
 
 } // namespace
 
-SystemBytes::SystemBytes(std::string_view text) : view_(text) {
-    if (!isSameInBoth(text)) {
-        converted_.emplace(UString<0>(UStringView<0>(text)));
-        view_ = {converted_->rawData(), converted_->size()};
+bool isSystemText(std::string_view utf8) {
+    if (isSystemUtf8()) {
+        return true;
     }
+    static const bool holdsAscii = Encoding(Encoding::System).supports7BitASCII();
+    return holdsAscii && isAscii(utf8);
+}
+
+void SystemBytes::convert(std::string_view text) {
+    converted_.emplace(UString<0>(UStringView<0>(text)));
+    view_ = {converted_->rawData(), converted_->size()};
 }
 
 UString<0> textOfSystemBytes(std::string_view bytes) {
-    return isSameInBoth(bytes) ? UString<0>(UStringView<0>(bytes))
+    return isSystemText(bytes) ? UString<0>(UStringView<0>(bytes))
                                : UString<0>(UString<27>(UStringView<27>(bytes)));
 }
 
@@ -53,7 +54,7 @@ UString<0> readableSystemBytes(std::string_view bytes) {
 }
 
 void appendReadable(UStringArray<0>& parameters, std::string_view bytes) {
-    if (isSameInBoth(bytes)) {
+    if (isSystemText(bytes)) {
         parameters.emplace_back(UStringView<0>(bytes));
     } else {
         parameters.push_back(readableSystemBytes(bytes));

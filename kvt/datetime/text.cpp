@@ -121,7 +121,7 @@ void TextBuffer::grow(std::size_t count) {
     capacity_ = capacity;
 }
 
-void TextBuffer::putNumber(std::uint64_t number, unsigned width) {
+void TextBuffer::putDigits(std::uint64_t number, unsigned width) {
     if (number < 10 && width <= 1) {
         return put(static_cast<char>('0' + number));
     }

@@ -16,7 +16,7 @@ enum class Keyword {
 
 /// A format that is not a pattern names keywords.
 inline bool isKeywordList(std::string_view format) noexcept {
-    return format.find('%') == std::string_view::npos;
+    return std::find(format.begin(), format.end(), '%') == format.end(); // mostly the first of them
 }
 
 /// The keyword that an item of a list names, in any case, if any. Letters beyond ASCII have no part in it: those whose

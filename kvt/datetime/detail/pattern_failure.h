@@ -1,6 +1,6 @@
-// Why a value was not read or written by a pattern. A failure refers to the pattern and the value and holds no text of
-// its own, so that one that nobody words, as of a keyword that is passed over, costs nothing. parse() and format() word
-// it, while both texts are there.
+// Why a value was not read by a pattern. A failure refers to the pattern and the value and holds no text of
+// its own, so that one that nobody words, as of a keyword that is passed over, costs nothing. parse() words it, while
+// both texts are there.
 #pragma once
 
 #include <cstddef>
@@ -43,12 +43,7 @@ struct FormatStringBadCombo {
     std::string_view second;
 };
 
-/// A flag that the value has nothing for: 933078.
-struct FormatFlag {
-    std::string_view flag;
-};
-
-using PatternFailure = std::variant<ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, ParseValidation,
-                                    FormatStringBadCombo, FormatFlag>;
+using PatternFailure =
+    std::variant<ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, ParseValidation, FormatStringBadCombo>;
 
 } // namespace kvt::ex::datetime::detail

@@ -10,6 +10,7 @@
 
 #include <array>
 #include <cstdint>
+#include <optional>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
@@ -46,8 +47,8 @@ struct PatternReading {
     std::int32_t offsetMinutes = 0; ///< as `%z` or `%Ez` read it
 };
 
-/// The value of the fields, of which a pattern asks for these parts; one that is to have an offset needs a time. Fails by
-/// FormatStringBadCombo and ParseValidation.
-Outcome<PatternReading, PatternFailure> readingOf(const PatternFields& fields, Parts parts, bool lenient);
+/// Makes up the value of the fields, of which a pattern asks for the parts that `reading` has; one that is to have an
+/// offset needs a time. What is wrong, if anything is: FormatStringBadCombo or ParseValidation.
+std::optional<PatternFailure> makeUp(PatternReading& reading, const PatternFields& fields, bool lenient);
 
 } // namespace kvt::ex::datetime::detail

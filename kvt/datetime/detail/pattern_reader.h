@@ -1,8 +1,7 @@
-// The engine behind the patterns of parse(): reads a value by a pattern, on bytes, element by element. readFields()
-// reads all of it; who wants to see what each element takes goes through the elements with a PatternReader.
+// The engine behind the patterns of parse(): reads a value by a pattern, on bytes, element by element. readAll() reads
+// all of it; who wants to see what each element takes goes on by readNext().
 #pragma once
 
-#include <kvt/datetime/detail/failure.h>
 #include <kvt/datetime/detail/pattern_failure.h>
 #include <kvt/datetime/detail/pattern_fields.h>
 #include <kvt/datetime/detail/pattern_table.h>
@@ -13,11 +12,6 @@
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
-
-/// Reads `value`, as far as the format asks for it. Fails by ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange,
-/// FormatStringBadCombo and ParseValidation.
-Outcome<PatternReading, PatternFailure> readFields(std::string_view value, std::string_view format,
-                                                   bool lenient);
 
 /// The first element of a format that is not empty: a flag, a "*" with what its word has to end in, else one byte.
 std::string_view elementOf(std::string_view format) noexcept;
@@ -53,8 +47,9 @@ public:
     /// Reads the next element; false where it does not fit, and then it is still the next one.
     bool readNext();
 
-    /// All that are left, and what they make up.
-    Outcome<PatternReading, PatternFailure> readAll();
+    /// Reads all that are left, as far as the format asks for the value, and makes up `reading`; what is wrong, if
+    /// anything is: ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, FormatStringBadCombo or ParseValidation.
+    std::optional<PatternFailure> readAll(PatternReading& reading);
 
     /// Goes on by another format where a "$" has stopped this one, and both are alike up to there; else false, and nothing
     /// is done.

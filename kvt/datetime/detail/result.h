@@ -49,10 +49,16 @@ Result<Value> makeDateTimeResult(ReturnState state, Value value, WithGenericMess
     return Result<Value>(state, std::move(value), genericMessage());
 }
 
+/// Makes the message in its place: to move one takes memory.
+void setMessage(kvt::future::optional<LogMessageInfo>& info, std::uint32_t number,
+                std::initializer_list<std::string_view> parameters);
+
 /// State `Failure`, an empty value, and a message.
 template <typename Value>
 Result<Value> failed(std::uint32_t number, std::initializer_list<std::string_view> parameters = {}) {
-    return makeDateTimeResult(ReturnState::Failure, Value(), message(number, parameters));
+    Result<Value> result(ReturnState::Failure, Value(), std::nullopt);
+    setMessage(std::get<2>(result), number, parameters);
+    return result;
 }
 
 /// The message of a failure whose words depend on nothing but the failure: ValueUnsupported (933063),

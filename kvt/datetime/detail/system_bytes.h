@@ -13,18 +13,27 @@ namespace kvt::ex::datetime::detail {
 /// Whether there are only seven-bit bytes in it.
 bool isAscii(std::string_view text) noexcept;
 
+/// Whether UTF-8 text has the same bytes in the system's encoding. It is not looked at where that is UTF-8.
+bool isSystemText(std::string_view utf8);
+
 /// UTF-8 text as bytes of the system's encoding. Where these are the same bytes, the text is only referred to, and not
 /// looked at. Otherwise the constructor throws what the conversion throws, when the text is not well formed or has a
 /// character that the system's encoding has not.
 class SystemBytes {
 public:
-    explicit SystemBytes(std::string_view text);
+    explicit SystemBytes(std::string_view text) : view_(text) {
+        if (!isSystemText(text)) {
+            convert(text);
+        }
+    }
     SystemBytes(const SystemBytes&) = delete;
     SystemBytes& operator=(const SystemBytes&) = delete;
 
     std::string_view view() const noexcept { return view_; }
 
 private:
+    void convert(std::string_view text);
+
     std::optional<UString<27>> converted_;
     std::string_view view_;
 };

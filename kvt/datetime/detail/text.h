@@ -87,13 +87,21 @@ public:
 
     void put(char c) { *room(1) = c; }
     void put(std::string_view text) {
-        if (text.size() == 1) {
-            return put(text.front());
+        if (text.size() > 1) {
+            std::memcpy(room(text.size()), text.data(), text.size());
+        } else if (!text.empty()) {
+            put(text.front());
         }
-        std::memcpy(room(text.size()), text.data(), text.size());
     }
     /// In decimal, with leading zeros up to `width`.
-    void putNumber(std::uint64_t number, unsigned width = 1);
+    void putNumber(std::uint64_t number, unsigned width = 1) {
+        if (width == 4 && number < 10'000) { // a year
+            putPair(static_cast<unsigned>(number / 100));
+            putPair(static_cast<unsigned>(number % 100));
+        } else {
+            putDigits(number, width);
+        }
+    }
     /// Two digits; the number is below 100.
     void putPair(unsigned number) {
         char* const place = room(2);
@@ -120,6 +128,7 @@ private:
         return data_ + size_ - count;
     }
     void grow(std::size_t count);
+    void putDigits(std::uint64_t number, unsigned width);
 
     std::array<char, 224> short_;
     std::unique_ptr<char[]> long_;
