@@ -82,7 +82,9 @@ TextResult formatByPattern(const UString<0>& value, const CanonicalRecord& recor
     case WrittenPattern::Whole:
         break;
     }
-    return TextResult(ReturnState::Success, textOfSystemBytes(text.view()), std::nullopt);
+    return isSystemText(text.view())
+               ? TextResult(ReturnState::Success, UStringView<0>(text.view()), std::nullopt)
+               : TextResult(ReturnState::Success, textOfSystemBytes(text.view()), std::nullopt);
 }
 
 TextResult formatByKeywords(const UString<0>& value, const CanonicalRecord& record,

@@ -31,9 +31,9 @@ TextResult resultOf(const PatternReading& reading) {
     // Offsets of 100 hours and more can be read but not written; there is none then.
     const std::optional<OffsetForm> offset =
         hasTime && (reading.parts & offsetPart) != 0 ? offsetOfMinutes(reading.offsetMinutes) : std::nullopt;
-    return TextResult(ReturnState::Success,
-                      canonicalText(kind, reading.fields, offset ? offset->view() : std::string_view()),
-                      std::nullopt);
+    TextBuffer text;
+    writeCanonical(text, kind, reading.fields, offset ? offset->view() : std::string_view());
+    return TextResult(ReturnState::Success, UStringView<0>(text.view()), std::nullopt);
 }
 
 // ---- Messages
@@ -50,6 +50,13 @@ std::string expanded(std::string_view format) {
     return text;
 }
 
+// Whether there is one, or what looks like one behind "%%".
+bool hasTimeFlag(std::string_view format) {
+    return std::adjacent_find(format.begin(), format.end(), [](char first, char second) {
+               return first == '%' && second == 'T';
+           }) != format.end();
+}
+
 // Made in place, since a value that does not fit is nothing rare.
 TextResult failedByMismatch(std::string_view format, std::size_t place) {
     place = placeBetweenCharacters(format, place);
@@ -58,8 +65,11 @@ TextResult failedByMismatch(std::string_view format, std::size_t place) {
     LogMessageInfo& info = std::get<2>(result).emplace();
     info.messageNumber = message_number::formatMismatch;
     info.parameters.reserve(2);
-    appendReadable(info.parameters,
-                   matched.find("%T") == std::string_view::npos ? matched : expanded(matched));
+    if (hasTimeFlag(matched)) {
+        appendReadable(info.parameters, expanded(matched));
+    } else {
+        appendReadable(info.parameters, matched);
+    }
     appendReadable(info.parameters, format.substr(place));
     return result;
 }

@@ -208,10 +208,12 @@ inline bool PatternReader::readNumber(const ReadRule& rule, bool isInRow) {
 
 inline bool PatternReader::read(const PatternRow& row) {
     const bool wasAfterNumber = afterNumber_;
+    if (row.reads.reading == Reading::Number) { // as most of them
+        afterNumber_ = true;
+        return readNumber(row.reads, wasAfterNumber);
+    }
     afterNumber_ = isNumeric(row.reads.reading);
     switch (row.reads.reading) {
-    case Reading::Number:
-        return readNumber(row.reads, wasAfterNumber);
     case Reading::Seconds:
         return readSeconds(row.reads, wasAfterNumber);
     case Reading::Time:
@@ -330,7 +332,7 @@ bool PatternReader::readWord(std::string_view tail) {
     return endsWith(word, tail) || stop(StopReason::WordEndsOtherwise);
 }
 
-PatternFailure PatternReader::failure() const {
+std::optional<PatternFailure> PatternReader::failure() const {
     if (stopReason_ == StopReason::UnknownFlag) {
         return ParseUnknownFlag{culprit_};
     }

@@ -155,11 +155,11 @@ private:
 
 } // namespace
 
-UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset) {
-    TextBuffer text;
+void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,
+                    std::string_view offset) {
     Digits digits;
     if (kind == TemporalType::Unsupported) {
-        return text.toString();
+        return;
     }
     if (!isTimeKind(kind)) {
         if (fields.year >= lowestYear && fields.year <= highestYear) {
@@ -180,9 +180,12 @@ UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::s
         text.put(digits.view());
         text.putFraction(static_cast<std::uint64_t>(fields.nanoseconds));
     }
-    if (!offset.empty()) {
-        text.put(offset);
-    }
+    text.put(offset);
+}
+
+UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset) {
+    TextBuffer text;
+    writeCanonical(text, kind, fields, offset);
     return text.toString();
 }
 

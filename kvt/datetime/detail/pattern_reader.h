@@ -62,7 +62,6 @@ public:
 
     /// Only behind a failure.
     StopReason stopReason() const noexcept { return stopReason_; }
-    PatternFailure failure() const;
 
     const PatternFields& fields() const noexcept { return fields_; }
     /// The parts that a result has by the elements read so far.
@@ -94,6 +93,8 @@ private:
     std::int64_t takeFraction() noexcept;
 
     bool stop(StopReason reason) noexcept;
+    // Made in its place in what is returned.
+    std::optional<PatternFailure> failure() const;
     bool stopAtCharacter() noexcept;
 
     const char* at_; ///< the next byte of the value

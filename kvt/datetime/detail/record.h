@@ -9,6 +9,7 @@
 #include <kvt/datetime/detail/failure.h>
 #include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/offset.h>
+#include <kvt/datetime/detail/text.h>
 
 #include <string_view>
 
@@ -56,8 +57,12 @@ TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept;
 /// may be 10000 then.
 DateTimeFields carriedFields(const CanonicalRecord& record) noexcept;
 
-/// The numbers as canonical text: the date or the time or both, as the kind has them, and then `offset` as it is
-/// given. The numbers are within their bounds, but for the year. Empty for `Unsupported`.
+/// Writes the numbers as canonical text: the date or the time or both, as the kind has them, and then `offset` as it is
+/// given. The numbers are within their bounds, but for the year. Nothing for `Unsupported`.
+void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,
+                    std::string_view offset);
+
+/// The same as a text of its own.
 UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset);
 
 /// The record as text of its own kind. The offset is as it was written: "+10:75" stays.
