@@ -241,26 +241,22 @@ struct Written {
 Written encodeSingleBytes(const SingleByteTable::Tables& tables, bool hasAscii, const char16_t* units,
                           std::size_t count, char* out) {
     constexpr std::size_t blockUnits = 16;
-    const auto put = [&](std::size_t i) {
+    // Kept here, since a write of bytes could change the tables for all that the compiler knows.
+    const std::uint16_t* const pageOf = tables.pageOf.data();
+    const std::uint16_t* const pages = tables.pages.data();
+    const auto put = [=](std::size_t i) {
         const char16_t unit = units[i];
         const unsigned entry =
-            tables.pages[tables.pageOf[unit / SingleByteTable::pageSize] + unit % SingleByteTable::pageSize];
+            pages[pageOf[unit / SingleByteTable::pageSize] + unit % SingleByteTable::pageSize];
         out[i] = static_cast<char>(entry);
         return entry >> 8;
     };
-    std::size_t i = 0;
-    while (i + blockUnits <= count) {
-        if (hasAscii && units[i] < 0x80) {
-            i += vectors::narrowAscii(reinterpret_cast<const char*>(units + i), count - i, out + i);
+    std::size_t i = hasAscii ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
+    for (unsigned found = 1; i + blockUnits <= count && found != 0;) {
+        for (std::size_t place = 0; place < blockUnits; ++place) {
+            found &= put(i + place);
         }
-        unsigned found = 1;
-        for (const std::size_t end = std::min(i + blockUnits, count); i < end; ++i) {
-            found &= put(i);
-        }
-        if (found == 0) {
-            i -= std::min(i, blockUnits);
-            break;
-        }
+        i += found != 0 ? blockUnits : 0;
     }
     while (i < count && put(i) != 0) {
         ++i;

@@ -164,55 +164,48 @@ HWY_INLINE hn::Vec<D> unitsAt(D d, const std::uint8_t* p) {
     }
 }
 
-template <Longest longest, typename Unit>
-HWY_INLINE void putBlock(std::uint64_t mask, const std::uint8_t*& p, Unit*& q) {
-    const Units16 d;
+template <Longest longest, class D, typename Unit>
+HWY_INLINE void putBlock(D d, std::uint64_t mask, const std::uint8_t*& p, Unit*& q) {
     const std::size_t N = hn::Lanes(d);
     storeSome(d, unitsAt<longest>(d, p), mask, q);
     storeSome(d, unitsAt<longest>(d, p + N), mask >> (N - 1) >> 1, q);
     p += 2 * N;
 }
-#endif
 
-template <typename Unit>
-HWY_INLINE std::size_t fromUtf8(const char* text, std::size_t bytes, char* out, std::size_t room) {
-    const auto* const first = reinterpret_cast<const std::uint8_t*>(text);
-    const std::uint8_t* p = first;
-    const std::uint8_t* const end = p + bytes;
-    auto* const begin = reinterpret_cast<Unit*>(out);
-    Unit* q = begin;
-    const Unit* const outEnd = q + room;
-#if KVT_HAS_VECTORS
-    const Units16 d;
-    const hn::Rebind<std::uint8_t, Units16> narrow;
+/// Converts blocks of twice as many bytes as there are units in a register. A block of four-byte characters may end
+/// behind the first byte of one, of which only the high half has been written then.
+template <class D, typename Unit>
+HWY_INLINE void fromUtf8Blocks(D d, const std::uint8_t* first, const std::uint8_t*& p,
+                               const std::uint8_t* end, Unit*& q, const Unit* outEnd) {
+    const hn::Rebind<std::uint8_t, D> narrow;
+    const hn::Repartition<std::uint8_t, D> dBytes;
+    const hn::RebindToSigned<decltype(dBytes)> dSigned;
     const std::size_t N = hn::Lanes(d);
     while (static_cast<std::size_t>(end - p) >= 2 * N + 2 && static_cast<std::size_t>(outEnd - q) >= 2 * N) {
-        const Bytes dBytes;
         const auto all = hn::LoadU(dBytes, p);
         if (hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0x80)))) {
-            storeUnits(d, hn::PromoteTo(d, hn::LowerHalf(all)), q);
+            storeUnits(d, hn::PromoteTo(d, hn::LowerHalf(narrow, all)), q);
             storeUnits(d, hn::PromoteTo(d, hn::UpperHalf(narrow, all)), q + N);
             p += 2 * N;
             q += 2 * N;
             continue;
         }
-        const hn::RebindToSigned<Bytes> dSigned;
         const std::uint64_t begins =
             maskOf(dSigned, hn::Gt(hn::BitCast(dSigned, all), hn::Set(dSigned, -65)));
         const bool hasFours =
             !hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0xF0))) || (p != first && p[-1] >= 0xF0);
         if (HWY_LIKELY(!hasFours)) {
             if (hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0xE0)))) {
-                putBlock<Longest::two>(begins, p, q);
+                putBlock<Longest::two>(d, begins, p, q);
             } else {
-                putBlock<Longest::three>(begins, p, q);
+                putBlock<Longest::three>(d, begins, p, q);
             }
             continue;
         }
         if (sizeof(Unit) == 2 && p != first) {
             const auto before = hn::LoadU(dBytes, p - 1);
             const auto isFour = hn::Eq(hn::Max(before, hn::Set(dBytes, 0xF0)), before);
-            putBlock<Longest::four>(begins | maskOf(dBytes, isFour), p, q);
+            putBlock<Longest::four>(d, begins | maskOf(dBytes, isFour), p, q);
             continue;
         }
         const std::uint8_t* const stop = p + 2 * N;
@@ -224,13 +217,26 @@ HWY_INLINE std::size_t fromUtf8(const char* text, std::size_t bytes, char* out, 
             }
         }
     }
-    // The last block may have ended behind the first byte of four, of which only the high half has been written.
+}
+#endif
+
+template <typename Unit>
+HWY_INLINE std::size_t fromUtf8(const char* text, std::size_t bytes, char* out, std::size_t room) {
+    const auto* const first = reinterpret_cast<const std::uint8_t*>(text);
+    const std::uint8_t* p = first;
+    const std::uint8_t* const end = p + bytes;
+    auto* const begin = reinterpret_cast<Unit*>(out);
+    Unit* q = begin;
+#if KVT_HAS_VECTORS
+    // What the widest registers leave over is worth narrower ones.
+    fromUtf8Blocks(Units16(), first, p, end, q, begin + room);
+    fromUtf8Blocks(Eight16(), first, p, end, q, begin + room);
     if (sizeof(Unit) == 2 && p != first && p[-1] >= 0xF0) {
         --p;
         storeUnit(q++, static_cast<Unit>(lowSurrogate(takeUtf8(p))));
     }
 #else
-    static_cast<void>(outEnd);
+    static_cast<void>(room);
 #endif
     while (p < end) {
         if (isTrail(*p)) {

@@ -81,9 +81,9 @@ struct Utf8Check {
         tooShort};
 
     /// Not zero where a byte does not fit what stands before it. Three bytes before `p` can be read.
-    static HWY_INLINE hn::Vec<Bytes> errors(const std::uint8_t* p, hn::Vec<Bytes> bytes) {
-        using V = hn::Vec<Bytes>;
-        const Bytes d;
+    template <class D>
+    static HWY_INLINE hn::Vec<D> errors(D d, const std::uint8_t* p, hn::Vec<D> bytes) {
+        using V = hn::Vec<D>;
         const V table1 = hn::LoadDup128(d, firstHigh);
         const V table2 = hn::LoadDup128(d, firstLow);
         const V table3 = hn::LoadDup128(d, secondHigh);
@@ -119,6 +119,62 @@ HWY_INLINE const std::uint8_t* measureUtf8Singly(const std::uint8_t* p, const st
     return p;
 }
 
+#if KVT_HAS_VECTORS
+/// Adds whole registers of bytes, of which three can be read in front of `p`. Returns whether all was well-formed; what is
+/// not stands in the bytes from `p` on, or begins within the three before it.
+template <class D>
+HWY_INLINE bool measureUtf8Blocks(D d, const std::uint8_t*& p, const std::uint8_t* end, Extent& extent) {
+    const hn::RebindToSigned<D> dSigned;
+    const std::size_t N = hn::Lanes(d);
+    constexpr std::size_t unrolled = 4;
+    while (static_cast<std::size_t>(end - p) >= N) {
+        // Blocks of nothing but ASCII, behind a complete character.
+        while (static_cast<std::size_t>(end - p) >= unrolled * N) {
+            const auto any = hn::Or(hn::Or(hn::LoadU(d, p), hn::LoadU(d, p + N)),
+                                    hn::Or(hn::LoadU(d, p + 2 * N), hn::LoadU(d, p + 3 * N)));
+            if (!hn::AllTrue(d, hn::Lt(any, hn::Set(d, 0x80))) || p[-1] >= 0xC0 || p[-2] >= 0xE0 ||
+                p[-3] >= 0xF0) {
+                break;
+            }
+            p += unrolled * N;
+            extent.utf32 += unrolled * N;
+            extent.utf16 += unrolled * N;
+        }
+        if (static_cast<std::size_t>(end - p) < N) {
+            break;
+        }
+        const auto v = hn::LoadU(d, p);
+        if (!hn::AllTrue(d, hn::Eq(Utf8Check::errors(d, p, v), hn::Zero(d)))) {
+            return false;
+        }
+        const std::size_t leads =
+            hn::CountTrue(dSigned, hn::Gt(hn::BitCast(dSigned, v), hn::Set(dSigned, -65)));
+        const std::size_t fours = hn::CountTrue(d, hn::Eq(hn::Max(v, hn::Set(d, 0xF0)), v));
+        extent.utf32 += leads;
+        extent.utf16 += leads + fours;
+        p += N;
+    }
+    return true;
+}
+
+/// Takes back the last character before `p` where it reaches beyond that. Three bytes can be read in front of `p`.
+HWY_INLINE const std::uint8_t* withoutOpenCharacter(const std::uint8_t* p, Extent& extent) {
+    for (std::ptrdiff_t back = 1; back <= 3; ++back) {
+        const std::uint8_t lead = p[-back];
+        if (lead >= 0xC0) {
+            const std::ptrdiff_t length = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : 2;
+            if (length > back) {
+                extent.utf32 -= 1;
+                extent.utf16 -= length == 4 ? 2 : 1;
+                return p - back;
+            }
+            break;
+        }
+    }
+    return p;
+}
+#endif
+
 Extent measureUtf8(const char* text, std::size_t bytes) {
     const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
     const std::uint8_t* const end = begin + bytes;
@@ -126,59 +182,16 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
     Extent extent;
     bool ended = false;
 #if KVT_HAS_VECTORS
-    const Bytes d;
-    const hn::RebindToSigned<Bytes> dSigned;
-    const std::size_t N = hn::Lanes(d);
-    constexpr std::size_t unrolled = 4;
-    if (bytes >= 3 + N) {
+    const hn::FixedTag<std::uint8_t, 16> narrow;
+    if (bytes >= 3 + hn::Lanes(narrow)) {
         p = measureUtf8Singly(p, begin + 3, end, extent, ended);
-        const bool hasBegun = !ended;
-        const auto high = hn::Set(d, 0x80);
-        while (!ended && static_cast<std::size_t>(end - p) >= N) {
-            // Blocks of nothing but ASCII, behind a complete character.
-            while (static_cast<std::size_t>(end - p) >= unrolled * N) {
-                const auto v0 = hn::LoadU(d, p);
-                const auto v1 = hn::LoadU(d, p + N);
-                const auto v2 = hn::LoadU(d, p + 2 * N);
-                const auto v3 = hn::LoadU(d, p + 3 * N);
-                const auto any = hn::And(hn::Or(hn::Or(v0, v1), hn::Or(v2, v3)), high);
-                if (!hn::AllTrue(d, hn::Eq(any, hn::Zero(d))) || p[-1] >= 0xC0 || p[-2] >= 0xE0 ||
-                    p[-3] >= 0xF0) {
-                    break;
-                }
-                p += unrolled * N;
-                extent.utf32 += unrolled * N;
-                extent.utf16 += unrolled * N;
+        if (!ended) {
+            // What the widest registers leave over is worth narrower ones.
+            if (measureUtf8Blocks(Bytes(), p, end, extent)) {
+                measureUtf8Blocks(narrow, p, end, extent);
             }
-            if (static_cast<std::size_t>(end - p) < N) {
-                break;
-            }
-            const auto v = hn::LoadU(d, p);
-            if (!hn::AllTrue(d, hn::Eq(Utf8Check::errors(p, v), hn::Zero(d)))) {
-                ended = true;
-                break;
-            }
-            const std::size_t leads =
-                hn::CountTrue(dSigned, hn::Gt(hn::BitCast(dSigned, v), hn::Set(dSigned, -65)));
-            const std::size_t fours = hn::CountTrue(d, hn::Eq(hn::Max(v, hn::Set(d, 0xF0)), v));
-            extent.utf32 += leads;
-            extent.utf16 += leads + fours;
-            p += N;
+            p = withoutOpenCharacter(p, extent);
         }
-        // The last character may reach beyond what was looked at.
-        for (std::size_t back = 1; hasBegun && back <= 3; ++back) {
-            if (p[-static_cast<std::ptrdiff_t>(back)] >= 0xC0) {
-                const std::uint8_t lead = p[-static_cast<std::ptrdiff_t>(back)];
-                const std::size_t length = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : 2;
-                if (length > back) {
-                    p -= back;
-                    extent.utf32 -= 1;
-                    extent.utf16 -= length == 4 ? 2 : 1;
-                }
-                break;
-            }
-        }
-        ended = !hasBegun;
     }
 #endif
     if (!ended) {
