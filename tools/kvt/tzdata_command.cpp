@@ -35,7 +35,7 @@ The leap seconds come from leapseconds or leap-seconds.list beside FILE, else
 beside the system's file. Where the package unicode-cldr-core is installed, its
 windowsZones.xml, which maps names of zones on Windows, goes into the folder too.
 The library refuses a folder in which it finds a fault. The file kvt-checksums,
-in the form of cksum(1), lets it find all damage to what this command has written.
+in the form of cksum(1), lets it find all damage to what this command wrote.
 
 Exit status:
   0  done
