@@ -90,8 +90,7 @@ void WwjdDecoder::decodePiece(std::string_view piece, std::string& out) {
         units = kvt::ex::detail::wwjdToUtf16(piece);
     } catch (const kvt::ex::UStringBadEncodingException&) {
         // The token cannot be at fault for a byte that is not ASCII, so that the first one stands before it.
-        const auto foreign =
-            std::find_if_not(piece.begin(), piece.end(), isAscii);
+        const auto foreign = std::find_if_not(piece.begin(), piece.end(), isAscii);
         const auto index = static_cast<std::size_t>(foreign - piece.begin());
         throw Loss{Loss::BadInput, offset_ + index, std::string(1, *foreign), U'\uFFFD'};
     } catch (const std::logic_error&) {
