@@ -1,51 +1,33 @@
 // What the date and time functions may cost beside the C library's and Abseil's, each as a ratio with its limit.
 //
-// All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
-// falls on all of them alike. A row is the median of the ratios of its two ways within a round. A row above its limit
-// is marked, and the exit status is then 1.
-//
 // The C library's strptime and strftime know no fraction of a second. Beside a value that has one stands what reads or
 // writes all of it by that library: strptime, strtod and strptime again for the offset, then timegm; strftime and
 // snprintf. What strptime alone takes for the part that it knows is shown without a limit. Adding a month stands beside
 // Abseil's way from text to text: ParseTime, the civil calendar, FormatTime.
+#include "limits.h"
 
 #include <kvt/datetime/datetime.h>
 
 #include <absl/time/civil_time.h>
 #include <absl/time/time.h>
-#include <benchmark/benchmark.h>
 
-#include <algorithm>
-#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <ctime>
-#include <functional>
 #include <map>
-#include <regex>
 #include <string>
-#include <vector>
 
 namespace {
 
 using namespace kvt::ex::datetime;
+using kvt::bench::Bound;
+using kvt::bench::Row;
+using kvt::bench::way;
+using kvt::bench::Way;
 using kvt::ex::UString;
 
 constexpr int rounds = 101;
 constexpr int callsInRound = 2'000;
-
-/// One way to do some work: calls it so many times.
-using Way = std::function<void(int)>;
-
-template <typename Function>
-Way way(Function function) {
-    return [function](int calls) {
-        for (int i = 0; i < calls; ++i) {
-            auto result = function();
-            benchmark::DoNotOptimize(&result);
-        }
-    };
-}
 
 Way parsing(const char* value, const char* format) {
     return way(
@@ -184,102 +166,35 @@ const std::map<std::string, Way>& ways() {
     return all;
 }
 
-struct Row {
-    const char* work;
-    const char* beside;
-    double limit; ///< 0 for none
+const Row rows[] = {
+    {"parse date", "strptime and timegm date", Bound::atMost, 0.6},
+    {"parse offset", "strptime offset", Bound::atMost, 0.6},
+    {"parse offset", "strptime datetime"},
+    {"parse ISO", "parse offset", Bound::atMost, 1.7},
+    {"parse name", "strptime name", Bound::atMost, 0.15},
+    {"parse date fails", "parse date", Bound::atMost, 1.5},
+    {"parse offset fails", "parse offset", Bound::atMost, 1.5},
+    {"parse name fails", "parse name", Bound::atMost, 1.5},
+    {"format date", "strftime date", Bound::atMost, 1.0},
+    {"format offset", "strftime offset", Bound::atMost, 0.65},
+    {"format offset", "strftime datetime"},
+    {"format name", "strftime name", Bound::atMost, 1.0},
+    {"add date", "Abseil date", Bound::atMost, 0.12},
+    {"add offset", "Abseil offset", Bound::atMost, 0.12},
+    {"cast offset", "parse date", Bound::atMost, 1.2},
+    {"diff offset", "parse date", Bound::atMost, 2.5},
+    {"compare offset", "parse date", Bound::atMost, 1.5},
 };
-
-constexpr Row rows[] = {
-    {"parse date", "strptime and timegm date", 0.6},
-    {"parse offset", "strptime offset", 0.6},
-    {"parse offset", "strptime datetime", 0},
-    {"parse ISO", "parse offset", 1.7},
-    {"parse name", "strptime name", 0.15},
-    {"parse date fails", "parse date", 1.5},
-    {"parse offset fails", "parse offset", 1.5},
-    {"parse name fails", "parse name", 1.5},
-    {"format date", "strftime date", 1.0},
-    {"format offset", "strftime offset", 0.65},
-    {"format offset", "strftime datetime", 0},
-    {"format name", "strftime name", 1.0},
-    {"add date", "Abseil date", 0.12},
-    {"add offset", "Abseil offset", 0.12},
-    {"cast offset", "parse date", 1.2},
-    {"diff offset", "parse date", 2.5},
-    {"compare offset", "parse date", 1.5},
-};
-
-double nanosecondsOf(const Way& measured) {
-    const auto begin = std::chrono::steady_clock::now();
-    measured(callsInRound);
-    const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - begin;
-    return taken.count() / callsInRound;
-}
-
-double median(std::vector<double> numbers) {
-    const auto middle = numbers.begin() + static_cast<std::ptrdiff_t>(numbers.size() / 2);
-    std::nth_element(numbers.begin(), middle, numbers.end());
-    return *middle;
-}
-
-/// The nanoseconds of each way, in each round.
-using Times = std::map<std::string, std::vector<double>>;
-
-Times measureAll() {
-    Times times;
-    for (int round = 0; round < rounds; ++round) {
-        for (const auto& [name, measured] : ways()) {
-            times[name].push_back(nanosecondsOf(measured));
-        }
-    }
-    return times;
-}
-
-bool isWithinLimit(const Row& row, const Times& times) {
-    const std::vector<double>& work = times.at(row.work);
-    const std::vector<double>& beside = times.at(row.beside);
-    std::vector<double> ratios;
-    for (std::size_t round = 0; round < work.size(); ++round) {
-        ratios.push_back(work[round] / beside[round]);
-    }
-    const double ratio = median(ratios);
-    const bool isWithin = row.limit == 0 || ratio <= row.limit;
-    std::printf("%-22s %6.1f ns   %-26s %6.1f ns   ratio %5.2f", row.work, median(work), row.beside,
-                median(beside), ratio);
-    if (row.limit != 0) {
-        std::printf("   at most %4.2f%s", row.limit, isWithin ? "" : "   MISSED");
-    }
-    std::printf("\n");
-    return isWithin;
-}
-
-/// What --benchmark_filter names, as the other programs take it; everything without it.
-std::regex filterOf(int count, char** arguments) {
-    constexpr std::string_view option = "--benchmark_filter=";
-    for (int i = 1; i < count; ++i) {
-        const std::string_view argument = arguments[i];
-        if (argument.substr(0, option.size()) == option) {
-            return std::regex(std::string(argument.substr(option.size())));
-        }
-    }
-    return std::regex(".*");
-}
 
 } // namespace
 
 int main(int argc, char** argv) {
-    const std::regex filter = filterOf(argc, argv);
-    std::vector<Row> chosen;
-    std::copy_if(std::begin(rows), std::end(rows), std::back_inserter(chosen),
-                 [&](const Row& row) { return std::regex_search(row.work, filter); });
-    if (chosen.empty()) {
-        return 0;
+    kvt::bench::Limits limits(rounds, callsInRound);
+    for (const auto& [name, measured] : ways()) {
+        limits.add(name, measured);
     }
-    const Times times = measureAll();
-    bool areAllWithin = true;
-    for (const Row& row : chosen) {
-        areAllWithin = isWithinLimit(row, times) && areAllWithin;
+    for (const Row& row : rows) {
+        limits.hold(row);
     }
-    return areAllWithin ? 0 : 1;
+    return limits.run(argc, argv);
 }

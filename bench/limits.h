@@ -32,11 +32,18 @@ Way way(Function function) {
     };
 }
 
+/// What a row is held to.
+enum class Bound {
+    shown,   ///< nothing
+    atMost,  ///< the time of the work over the time of the other way
+    atLeast, ///< how many times as fast as the other way the work is
+};
+
 struct Row {
     std::string work;
     std::string beside;
-    /// How many times as fast as the other way the work has to be; 0 for a row that is only shown.
-    double limit;
+    Bound bound = Bound::shown;
+    double limit = 0;
 };
 
 class Limits {
@@ -91,14 +98,18 @@ private:
         const std::vector<double>& beside = times_.at(row.beside);
         std::vector<double> ratios;
         for (std::size_t round = 0; round < work.size(); ++round) {
-            ratios.push_back(beside[round] / work[round]);
+            ratios.push_back(row.bound == Bound::atLeast ? beside[round] / work[round]
+                                                         : work[round] / beside[round]);
         }
         const double ratio = median(ratios);
-        const bool isWithin = ratio >= row.limit;
-        std::printf("%-44s %10.0f ns   beside %-34s %10.0f ns   %6.2f times as fast", row.work.c_str(),
-                    median(work), row.beside.c_str(), median(beside), ratio);
-        if (row.limit != 0) {
-            std::printf("   at least %5.2f%s", row.limit, isWithin ? "" : "   MISSED");
+        const bool isWithin = row.bound == Bound::shown ||
+                              (row.bound == Bound::atMost ? ratio <= row.limit : ratio >= row.limit);
+        std::printf("%-36s %9.0f ns   beside %-44s %9.0f ns   %s %5.2f", row.work.c_str(), median(work),
+                    row.beside.c_str(), median(beside),
+                    row.bound == Bound::atLeast ? "times as fast" : "ratio", ratio);
+        if (row.bound != Bound::shown) {
+            std::printf("   %s %5.2f%s", row.bound == Bound::atMost ? "at most" : "at least", row.limit,
+                        isWithin ? "" : "   MISSED");
         }
         std::printf("\n");
         return isWithin;

@@ -98,7 +98,7 @@ void readNumbers(CanonicalRecord& record) noexcept {
 } // namespace
 
 Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
-    Outcome<CanonicalRecord> outcome{CanonicalRecord()};
+    Outcome<CanonicalRecord> outcome;
     CanonicalRecord& record = *outcome;
     record.lenient = lenient;
     if (!split(text, record)) {

@@ -230,7 +230,7 @@ Offences memoryKnowsNoString(const Tree& tree) {
 
 Offences publicHeadersStandAlone(const Tree& tree) {
     static const std::vector<std::string> behind = {"unicode/", "double-conversion/", "date/", "CLI/",
-                                                    "nlohmann/"};
+                                                    "hwy/",     "nlohmann/"};
     static const std::vector<std::string> forUsersOf = {"fmt/"};
     Offences offences;
     for (const Include& include : tree.includes) {
@@ -288,6 +288,10 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
         {{"unicode/"},
          {"kvt/encoding/icu.cpp", "kvt/encoding/detail/icu.h", "kvt/string/ustring_case.cpp"},
          "ICU is used in kvt/encoding/icu.cpp and its private header"},
+        {{"hwy/"},
+         {"kvt/encoding/unicode_convert.cpp", "kvt/encoding/unicode_measure.cpp",
+          "kvt/encoding/detail/unicode_characters-inl.h"},
+         "Highway is used for the Unicode forms"},
         {{"date/"},
          {"kvt/datetime/calendar.cpp", "kvt/datetime/local_zone.cpp", "kvt/datetime/zone_operations.cpp"},
          "the date library is used for the calendar and for zones"},

@@ -25,6 +25,8 @@ inline constexpr bool isOutcome<Outcome<Value, Cause>> = true;
 template <typename Value, typename Cause>
 class [[nodiscard]] Outcome {
 public:
+    /// With a value to be filled in.
+    Outcome() = default;
     Outcome(Value value) : state_(std::in_place_index<0>, std::move(value)) {}
     template <typename Given, std::enable_if_t<std::is_constructible_v<Cause, Given&&> &&
                                                    !std::is_convertible_v<Given&&, Value> &&
