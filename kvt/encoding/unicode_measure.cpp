@@ -3,6 +3,7 @@
 //
 // UTF-8 is checked as J. Keiser and D. Lemire do it in "Validating UTF-8 In Less Than One Instruction Per Byte" (2020): by
 // three look-ups by half bytes of each byte and its predecessor, whose common bits are the errors.
+#define HWY_WANT_AVX3_DL // as in unicode_convert.cpp: both index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_measure.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
