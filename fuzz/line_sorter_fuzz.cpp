@@ -6,8 +6,8 @@
 // times as long to give a segment back; and there are only so many lines that each number of levels comes about.
 #include <fuzzing.h>
 
-#include <tools/kvt/line_sorter.h>
-#include <tools/kvt/workspace.h>
+#include <sort/line_sorter.h>
+#include <sort/workspace.h>
 
 #include <algorithm>
 #include <cstdlib>

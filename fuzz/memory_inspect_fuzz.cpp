@@ -4,8 +4,8 @@
 // real files whose segments are small; damage to them is what reaches the table and the lists.
 #include <fuzzing.h>
 
-#include <tools/kvt/failure.h>
-#include <tools/kvt/memory_file.h>
+#include <base/failure.h>
+#include <memory/memory_file.h>
 
 #include <optional>
 

@@ -1,7 +1,7 @@
 // The folder with the zone database that the library reads, made from the system's own by the writer of `kvt tzdata`.
 #pragma once
 
-#include <zone_database.h>
+#include <zone/zone_database.h>
 
 #include <filesystem>
 #include <fstream>

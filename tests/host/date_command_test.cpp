@@ -287,7 +287,15 @@ TEST_F(KvtDate, WrongCommandLinesAreRefused) {
           Row{{"add"}, "INTERVAL is required"}, Row{{"add", "20200131", "P1D", "P2D"}, "P2D"},
           Row{{"add", "20200131", "P1D", "-P2D"}, "-P2D"},
           Row{{"now", "--utc", "--no-offset"}, "do not go together"},
-          Row{{"interval", "create", "--seconds=-1"}, "--negative"}, Row{{"zone"}, "'get', 'set', 'remove'"},
+          Row{{"interval", "create", "--seconds=-1"}, "--negative"},
+          Row{{"interval", "create", "--days", "-3"}, "--negative"},
+          Row{{"interval", "create", "--days", "99999999999999999999"}, "'99999999999999999999'"},
+          Row{{"interval", "create", "--days", "010"}, "'010'"},
+          Row{{"interval", "create", "--days", "0x1F"}, "'0x1F'"},
+          Row{{"interval", "create", "--days", ""}, "''"},
+          Row{{"interval", "create", "--seconds", "1e3"}, "'1e3'"},
+          Row{{"interval", "create", "--seconds", "1."}, "'1.'"},
+          Row{{"interval", "create", "--seconds", "nan"}, "'nan'"}, Row{{"zone"}, "'get', 'set', 'remove'"},
           Row{{}, "'parse', 'format'"}}) {
         const ChildResult result = date(row.arguments, "20200131\n");
         EXPECT_EQ(result.status, 2);

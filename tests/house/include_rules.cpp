@@ -8,6 +8,7 @@
 #include <regex>
 #include <sstream>
 #include <stdexcept>
+#include <string_view>
 
 namespace house {
 
@@ -80,13 +81,42 @@ const std::map<std::string, std::vector<std::string>>& neighbours() {
     return table;
 }
 
+// The same for the rooms of the command.
+const std::map<std::string, std::vector<std::string>>& neighbourRooms() {
+    static const std::map<std::string, std::vector<std::string>> table = {
+        {"base", {}},
+        {"cli", {"base/"}},
+        {"text", {"base/", "cli/"}},
+        {"convert", {"base/", "cli/", "text/"}},
+        {"date", {"base/", "cli/", "text/"}},
+        {"zone", {"base/", "cli/", "text/", "date/"}},
+        {"sort", {"base/", "cli/", "text/"}},
+        {"memory", {"base/", "cli/"}},
+    };
+    return table;
+}
+
+constexpr std::string_view rooms = "tools/kvt/";
+
+// "base/text.h" for tools/kvt/base/text.h; empty for what is not of the command.
+std::string withinRooms(const std::string& file) {
+    return file.starts_with(rooms) ? file.substr(rooms.size()) : std::string();
+}
+
+std::string roomOf(const std::string& fileWithinRooms) {
+    return fileWithinRooms.substr(0, fileWithinRooms.find('/') + 1);
+}
+
 using Graph = std::map<std::string, std::vector<const Include*>>;
 
 Graph graphOf(const Tree& tree) {
     Graph graph;
     for (const Include& include : tree.includes) {
-        if (isOwn(include.target)) {
+        const std::string room = withinRooms(include.file);
+        if (isOwn(include.file) && isOwn(include.target)) {
             graph[include.file].push_back(&include);
+        } else if (!room.empty() && !include.angled) {
+            graph[room].push_back(&include);
         }
     }
     return graph;
@@ -169,7 +199,7 @@ Offences noCycles(const Tree& tree) {
         path.pop_back();
         done.insert(file);
     };
-    for (const std::string& file : tree.files) {
+    for (const auto& [file, edges] : graph) {
         if (!done.contains(file)) {
             visit(file);
         }
@@ -283,6 +313,7 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
         std::vector<std::string> headers;
         std::vector<std::string> doors; // files, or folders that end in "/"
         std::string rule;
+        bool ofTheLibrary = true; // else of the command
     };
     static const std::vector<House> houses = {
         {{"unicode/"},
@@ -300,6 +331,10 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
          {"kvt/mmap/"},
          "Boost.Interprocess is used in kvt/mmap"},
         {{"boost/date_time/"}, {"kvt/legacy/"}, "Boost.DateTime is used in kvt/legacy"},
+        {{"CLI/"},
+         {"tools/kvt/cli/syntax.cpp", "tools/kvt/cli/command_line.cpp"},
+         "CLI11 takes long to compile; commands use cli/syntax.h",
+         false},
         {{"boost/multiprecision/"},
          {"kvt/datetime/detail/nano_count.h"},
          "NanoCount is the one large number"},
@@ -310,11 +345,8 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
     };
     Offences offences;
     for (const Include& include : tree.includes) {
-        if (!isOwn(include.file)) {
-            continue;
-        }
         for (const House& house : houses) {
-            if (beginsWithOneOf(include.target, house.headers) &&
+            if (isOwn(include.file) == house.ofTheLibrary && beginsWithOneOf(include.target, house.headers) &&
                 !beginsWithOneOf(include.file, house.doors)) {
                 offences.push_back(offence(include, house.rule));
             }
@@ -329,6 +361,28 @@ Offences toolsUsePublicHeaders(const Tree& tree) {
         if (include.file.starts_with("tools/") && isOwn(include.target) &&
             !tree.publicHeaders.contains(include.target)) {
             offences.push_back(offence(include, "the command uses public headers only"));
+        }
+    }
+    return offences;
+}
+
+Offences roomsKnowOnlyTheirNeighbours(const Tree& tree) {
+    Offences offences;
+    for (const Include& include : tree.includes) {
+        const std::string file = withinRooms(include.file);
+        if (file.empty() || include.angled) {
+            continue;
+        }
+        const std::string room = roomOf(file);
+        if (!tree.files.contains(std::string(rooms) + include.target)) {
+            offences.push_back(offence(include, "there is no such file under " + std::string(rooms)));
+        } else if (room.empty() || room == roomOf(include.target)) {
+            continue; // main.cpp knows all rooms
+        } else if (const auto allowed = neighbourRooms().find(room.substr(0, room.size() - 1));
+                   allowed == neighbourRooms().end()) {
+            offences.push_back(offence(include, "nothing is settled for the room " + room));
+        } else if (!beginsWithOneOf(include.target, allowed->second)) {
+            offences.push_back(offence(include, "not for the room " + room));
         }
     }
     return offences;

@@ -49,9 +49,11 @@ Offences memoryKnowsNoString(const Tree& tree);
 Offences publicHeadersStandAlone(const Tree& tree);
 /// Headers outside detail/ and platform/ are the public ones, and <kvt/kvt.h> includes them all but the optional ones.
 Offences everyHeaderIsPublicOrPrivate(const Tree& tree);
-/// ICU, Boost.DateTime and the operating system are touched in the files that are there for it.
+/// ICU, Boost.DateTime and the operating system are touched in the files that are there for it; in the command, CLI11.
 Offences outsideIsBehindItsDoor(const Tree& tree);
 /// The command uses the public headers only.
 Offences toolsUsePublicHeaders(const Tree& tree);
+/// Each room of the command includes, as "room/file.h", only what it may know of the other rooms.
+Offences roomsKnowOnlyTheirNeighbours(const Tree& tree);
 
 } // namespace house

@@ -64,6 +64,10 @@ TEST(Includes, ToolsUsePublicHeaders) {
     EXPECT_EQ(joined(toolsUsePublicHeaders(repository())), "");
 }
 
+TEST(Includes, RoomsKnowOnlyTheirNeighbours) {
+    EXPECT_EQ(joined(roomsKnowOnlyTheirNeighbours(repository())), "");
+}
+
 TEST(IncludesOf, FindsEachLineWithItsNumber) {
     const auto found =
         includesOf("f.h", "// head\n#include <a/b.h>\n  #  include \"c.h\" // why\n#define include <x>\n");
@@ -108,6 +112,9 @@ Tree treeWith(const std::string& file, const std::string& text) {
         {"kvt/string/ustring_fmt.h", "#include <kvt/string/ustring.h>\n"},
         {"kvt/string/detail/search.h", ""},
         {"kvt/platform/code_page.h", ""},
+        {"tools/kvt/base/text.h", ""},
+        {"tools/kvt/cli/options.h", "#include \"base/text.h\"\n"},
+        {"tools/kvt/sort/chunk.h", ""},
         {"kvt/kvt.h", "#include <kvt/foundation/export.h>\n#include <kvt/foundation/memory.h>\n"
                       "#include <kvt/foundation/pimpl.h>\n#include <kvt/foundation/vector.h>\n"
                       "#include <kvt/string/ustring.h>\n"},
@@ -215,9 +222,25 @@ const Planted plantedRows[] = {
      "kvt/string/a.h:1:"},
     {__LINE__, outsideIsBehindItsDoor, "kvt/datetime/a.cpp", "#include <boost/multiprecision/cpp_int.hpp>",
      "kvt/datetime/a.cpp:1:"},
+    {__LINE__, outsideIsBehindItsDoor, "tools/kvt/cli/syntax.cpp", "#include <CLI/CLI.hpp>", ""},
+    {__LINE__, outsideIsBehindItsDoor, "tools/kvt/sort/a.cpp", "#include <CLI/CLI.hpp>",
+     "tools/kvt/sort/a.cpp:1:"},
+    {__LINE__, outsideIsBehindItsDoor, "tools/kvt/sort/a.cpp", "#include <unistd.h>", ""},
     {__LINE__, toolsUsePublicHeaders, "tools/kvt/main.cpp", "#include <kvt/string/ustring.h>", ""},
     {__LINE__, toolsUsePublicHeaders, "tools/kvt/main.cpp", "#include <kvt/platform/code_page.h>",
      "tools/kvt/main.cpp:1:"},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/main.cpp", "#include \"sort/chunk.h\"", ""},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/sort/a.cpp", "#include \"sort/chunk.h\"", ""},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/sort/a.cpp", "#include \"cli/options.h\"", ""},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/sort/a.cpp", "#include \"chunk.h\"",
+     "tools/kvt/sort/a.cpp:1: includes chunk.h: there is no such file"},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/base/a.cpp", "\n#include \"cli/options.h\"",
+     "tools/kvt/base/a.cpp:2: includes cli/options.h: not for the room base/"},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/convert/a.cpp", "#include \"sort/chunk.h\"",
+     "tools/kvt/convert/a.cpp:1:"},
+    {__LINE__, roomsKnowOnlyTheirNeighbours, "tools/kvt/attic/a.cpp", "#include \"base/text.h\"",
+     "tools/kvt/attic/a.cpp:1: includes base/text.h: nothing is settled for the room attic/"},
+    {__LINE__, noCycles, "tools/kvt/base/text.h", "#include \"cli/options.h\"", "tools/kvt/cli/options.h:1:"},
 };
 
 INSTANTIATE_TEST_SUITE_P(Includes, PlantedOffence, testing::ValuesIn(plantedRows));

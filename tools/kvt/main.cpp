@@ -1,11 +1,11 @@
 // The kvt program. What it does stands in the *_command.cpp files; here is what becomes of a failure.
 
-#include "command_line.h"
-#include "diagnostics.h"
-#include "exit_status.h"
-#include "failure.h"
-#include "interrupt.h"
-#include "messages.h"
+#include "base/diagnostics.h"
+#include "base/failure.h"
+#include "base/interrupt.h"
+#include "base/messages.h"
+#include "cli/command_line.h"
+#include "cli/exit_status.h"
 
 #include <kvt/foundation/throwable.h>
 

@@ -1,0 +1,69 @@
+// What a command takes: its options, operands and subcommands, declared before the command line is read.
+//
+// A Syntax refers to variables of the command, into which the reading of the command line puts what was typed. Behind
+// this header, and nowhere else, is the library that reads command lines, whose own headers take long to compile.
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+class Option;
+} // namespace CLI
+
+namespace host {
+
+/// An option or operand that was declared. A copy is the same option.
+class Option {
+public:
+    Option() = default;
+    explicit Option(CLI::Option& option) : option_(&option) {}
+
+    /// It has to be given.
+    Option& required();
+    /// Help says nothing of it.
+    Option& hidden();
+    /// Whether it was declared and the command line has it.
+    bool isGiven() const;
+
+private:
+    CLI::Option* option_ = nullptr;
+};
+
+class Syntax {
+public:
+    /// `app` has to live as long.
+    explicit Syntax(CLI::App& app);
+    Syntax(const Syntax&) = delete;
+    Syntax& operator=(const Syntax&) = delete;
+    ~Syntax();
+
+    /// An option without a value. `names` are such as "-i,--ignore-case"; `help` is what the help says.
+    Option flag(const std::string& names, bool& isGiven, const std::string& help);
+    /// An option with a value, which the help calls `valueName`.
+    Option option(const std::string& names, std::string& value, const std::string& valueName,
+                  const std::string& help);
+    /// The same for one that may be given several times.
+    Option option(const std::string& names, std::vector<std::string>& values, const std::string& valueName,
+                  const std::string& help);
+    /// What stands on the command line without the name of an option.
+    Option operand(const std::string& name, std::string& value, const std::string& help);
+    /// The same for the last one, which may be there any number of times.
+    Option operand(const std::string& name, std::vector<std::string>& values, const std::string& help);
+
+    /// A command below this one, which lives as long as this one. One of them is required.
+    Syntax& subcommand(const std::string& name, const std::string& summary);
+    /// Whether the command line names it.
+    bool isChosen() const;
+
+    /// The help begins with `examples`, command lines with one on each line, and ends with `notes`.
+    void setHelp(const std::string& examples, const std::string& notes);
+
+private:
+    CLI::App& app_;
+    std::vector<std::unique_ptr<Syntax>> subcommands_;
+};
+
+} // namespace host

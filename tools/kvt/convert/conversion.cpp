@@ -1,0 +1,213 @@
+#include "convert/conversion.h"
+
+#include "base/failure.h"
+#include "base/messages.h"
+#include "base/text.h"
+#include "base/text_units.h"
+#include "cli/exit_status.h"
+#include "convert/loss_report.h"
+
+#include <filesystem>
+#include <unistd.h>
+
+namespace host {
+
+namespace {
+
+using kvt::ex::Encoding;
+using kvt::ex::Loss;
+
+// As the library shows bytes in its failures.
+std::string escaped(std::string_view bytes) {
+    std::string text;
+    for (const char byte : bytes) {
+        text += byte >= 32 && isAscii(byte) ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
+    }
+    return text;
+}
+
+// A report that replaces an input or is replaced by the output would be lost work.
+std::unique_ptr<Output> openReport(const ConvertOptions& options) {
+    if (options.report.empty()) {
+        return nullptr;
+    }
+    if (isStandardOutput(options.report)) {
+        throw Failure("the report goes to a file or, without --report, to standard error");
+    }
+    bool taken = !isStandardOutput(options.output) && isSamePlace(options.output, options.report);
+    for (const std::string& input : options.inputs) {
+        taken = taken || (input != "-" && isSamePlace(input, options.report));
+    }
+    if (taken && !std::filesystem::is_character_file(options.report)) {
+        throw Failure("the report needs a file of its own: " + printable(options.report));
+    }
+    return openOutput(options.report);
+}
+
+std::string shownCharacter(std::optional<char32_t> character) {
+    return character ? codePointName(*character) : "the end of the text";
+}
+
+} // namespace
+
+Conversion::Conversion(const ConvertOptions& options, Encoding from, Encoding to, Diagnostics& diagnostics)
+    : options_(options), to_(to), fromName_(from.getName()), toName_(to.getName()), diagnostics_(diagnostics),
+      transcoder_(from, to), onLoss_([this](const Loss& loss) { takeLoss(loss); }), from_(from), lines_(from),
+      progress_(diagnostics, totalSize(options.inputs),
+                !isStandardOutput(options.output) || ::isatty(STDOUT_FILENO) == 0) {
+    if (options.verify) {
+        roundTrip_.emplace(from, to);
+    }
+}
+
+int Conversion::run() {
+    checkMark(options_.mark, from_);
+    const std::string_view mark = byteOrderMark(to_);
+    if (options_.mark == MarkPolicy::Add && mark.empty()) {
+        throw Failure("--bom add: " + toName_ + " has no byte order mark");
+    }
+    output_ = openOutput(options_.output);
+    report_ = openReport(options_);
+    if (options_.mark == MarkPolicy::Add) {
+        output_->write(mark);
+    }
+    try {
+        for (const std::string& path : options_.inputs) {
+            convertFile(path);
+        }
+    } catch (const Stopped& stopped) {
+        explainStop(stopped);
+        return NotDone;
+    }
+    const bool same = verified();
+    if (!same && options_.onError == OnError::Stop) {
+        return NotDone;
+    }
+    output_->commit();
+    if (report_) {
+        report_->commit();
+    }
+    if (!ledger_.isEmpty()) {
+        printLedger(ledger_, fromName_, toName_, diagnostics_);
+    }
+    return same && ledger_.isEmpty() ? Done : DoneWithLosses;
+}
+
+void Conversion::convertFile(const std::string& path) {
+    source_.emplace(path, from_, options_.mark);
+    if (output_->writesInPlaceTo(source_->input().descriptor())) {
+        throw Failure(source_->input().name() + " is both input and output; use -o, which writes beside it");
+    }
+    std::string_view block = source_->next();
+    lines_.restart(source_->skipped());
+    progress_.advance(source_->skipped());
+    for (; !block.empty(); block = source_->next()) {
+        convertBlock(block);
+        progress_.advance(block.size());
+    }
+    finishFile();
+}
+
+void Conversion::convertBlock(std::string_view block) {
+    lines_.beginBlock(block);
+    transcoder_.convert(block, converted_, onLoss_);
+    lines_.endBlock();
+    if (roundTrip_) {
+        roundTrip_->addInput(block);
+    }
+    writeConverted();
+}
+
+void Conversion::finishFile() {
+    lines_.beginBlock({});
+    transcoder_.finish(converted_, onLoss_);
+    writeConverted();
+    if (roundTrip_) {
+        roundTrip_->finish();
+    }
+}
+
+void Conversion::writeConverted() {
+    if (roundTrip_) {
+        roundTrip_->addOutput(converted_);
+    }
+    output_->write(converted_);
+    converted_.clear();
+    if (!reportLines_.empty()) {
+        report_->write(reportLines_);
+        reportLines_.clear();
+    }
+}
+
+void Conversion::takeLoss(const Loss& reported) {
+    Loss loss = reported;
+    loss.offset += source_->skipped();
+    if (options_.onError == OnError::Stop) {
+        throw Stopped{loss, placeOf(loss)};
+    }
+    std::optional<Place> place;
+    if (options_.onError == OnError::Report) {
+        place = placeOf(loss);
+        if (report_) {
+            reportLines_ += lossAsJson(loss, *place, fromName_, toName_);
+        } else {
+            diagnostics_.say(describeLoss(loss, *place, fromName_, toName_));
+        }
+    }
+    ledger_.add(loss, [&] { return place ? *place : placeOf(loss); });
+}
+
+Place Conversion::placeOf(const Loss& loss) {
+    const LineCounter::Position position = lines_.at(loss.offset);
+    return {source_->input().name(), loss.offset, position.line, position.column};
+}
+
+void Conversion::explainStop(const Stopped& stopped) {
+    const Loss& loss = stopped.loss;
+    const bool bad = loss.kind == Loss::BadInput;
+    const std::string sentence =
+        bad ? describe(910002, {escaped(loss.bytes), fromName_})
+            : describe(910003, {printable(std::u32string_view(&loss.codePoint, 1)), fromName_, toName_});
+    diagnostics_.say(describe(stopped.place) + ": " + sentence);
+    diagnostics_.line("     lost:        " + describeLost(loss));
+    diagnostics_.line("     would read:  " + lossyLine());
+    if (loss.codePoint == U'\uFEFF' && loss.offset == 0) {
+        diagnostics_.line("     This is a byte order mark; '--bom strip' leaves it out.");
+    }
+    diagnostics_.line(isStandardOutput(options_.output)
+                          ? "     What was written to standard output ends before the loss."
+                          : "     Nothing was written.");
+    ledger_.add(loss, [&] { return stopped.place; });
+    printLedger(ledger_, fromName_, toName_, diagnostics_);
+}
+
+// The line around the loss as it would be in the output.
+std::string Conversion::lossyLine() {
+    const std::u32string before = lines_.textBefore();
+    std::string bytes(lines_.rest());
+    // A pipe might keep us waiting for what is only a courtesy.
+    if (bytes.size() < Input::blockSize / 2 && source_->input().remaining()) {
+        bytes += source_->next();
+    }
+    return printable(through(before + lines_.textAfter(bytes), to_));
+}
+
+bool Conversion::verified() {
+    if (!roundTrip_) {
+        return true;
+    }
+    if (const auto& difference = roundTrip_->difference()) {
+        diagnostics_.say("verify: the output does not convert back to the same text: at character " +
+                         std::to_string(difference->character + 1) + ", " +
+                         shownCharacter(difference->before) + " comes back as " +
+                         shownCharacter(difference->after));
+        return false;
+    }
+    diagnostics_.say(
+        ledger_.isEmpty()
+            ? "verify: nothing was lost: the output converts back to the same text"
+            : "verify: the output converts back to the same text, in which bad bytes were replaced");
+    return true;
+}
+
+} // namespace host

@@ -1,0 +1,121 @@
+// `kvt convert`: its options, and what goes together with what.
+
+#include "base/failure.h"
+#include "base/input.h"
+#include "cli/choices.h"
+#include "cli/command.h"
+#include "convert/conversion.h"
+#include "convert/convert_options.h"
+#include "convert/dry_run.h"
+#include "text/encoding_catalogue.h"
+
+#include <array>
+#include <utility>
+
+namespace host {
+
+namespace {
+
+constexpr const char* examples = R"(kvt convert --from Shift_JIS --to UTF-8 old.txt -o new.txt
+kvt convert --from UTF-8 --to windows-1252 --on-error report --report losses.jsonl in.txt -o out.txt
+kvt convert --from UTF-8 --dry-run --to windows-1252,ISO-8859-2,KOI8-R in.txt)";
+
+constexpr const char* notes =
+    R"(Several FILEs are converted in order, each as a text of its own, into one output;
+without any, and for '-', standard input is read. Files may have any size.
+
+An output file appears whole or not at all; until then, what was there before
+stays, so that it may be one of the inputs. To standard output the text goes
+block by block: when --on-error stop ends the conversion, blocks before the one
+with the loss have been written, and nothing of the loss or behind it.
+
+Places are the byte offset in the file, from 0, and line and column, from 1;
+columns count characters of the decoded text, lines end with LF, CR or CRLF.
+Whatever was lost is listed on standard error at the end: each character or
+bad byte sequence, how often, and where first.
+
+Byte order marks: 'keep' converts them like any other character, 'strip' drops
+the one at the start of each FILE, 'add' does so too and begins the output with
+one. Only Unicode encodings have one.
+
+Exit status:
+  0  done, nothing was lost; with --dry-run: some encoding would lose nothing
+  1  done, but something was lost; with --dry-run: every encoding would lose
+  2  not done; an output file was left as it was)";
+
+const Choices<OnError> errorChoices = {
+    {"stop", OnError::Stop}, {"replace", OnError::Replace}, {"report", OnError::Report}};
+const Choices<MarkPolicy> markChoices = {
+    {"keep", MarkPolicy::Keep}, {"strip", MarkPolicy::Strip}, {"add", MarkPolicy::Add}};
+
+class ConvertCommand : public Command {
+public:
+    void declare(Syntax& syntax) override {
+        syntax.option("--from", from_, "ENC", "Encoding of the input").required();
+        syntax
+            .option("--to", to_, "ENC",
+                    "Encoding of the output; with --dry-run, several with commas between them")
+            .required();
+        syntax.option("-o,--output", options_.output, "FILE",
+                      "Where the output goes; '-' is standard output, the default");
+        onErrorOption_ =
+            syntax.option("--on-error", onError_, "WHAT",
+                          "What a loss does: 'stop' ends the conversion without a result (default), "
+                          "'replace' puts a substitution in its place, 'report' does so too and tells "
+                          "of every loss");
+        syntax.option("--report", options_.report, "FILE",
+                      "Write the report to FILE, one JSON object on each line, instead of to standard error; "
+                      "implies --on-error report");
+        syntax.flag("--verify", options_.verify,
+                    "Convert the output back and say whether it is still the same text");
+        syntax.flag("--dry-run", dryRun_,
+                    "Write nothing; print the encodings of --to, best first, with what each "
+                    "would lose");
+        syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'keep' (default), 'strip' or 'add'");
+        syntax.operand("FILE", options_.inputs, "Files to convert; '-' is standard input, the default");
+    }
+
+    int run(Diagnostics& diagnostics) override {
+        options_.inputs = inputsOrStandardInput(options_.inputs);
+        options_.mark = choose("--bom", mark_, markChoices);
+        options_.onError = choose("--on-error", onError_, errorChoices);
+        if (!options_.report.empty()) {
+            if (onErrorOption_.isGiven() && options_.onError != OnError::Report) {
+                throw Failure("--report goes with --on-error report only");
+            }
+            options_.onError = OnError::Report;
+        }
+        const kvt::ex::Encoding from = textEncoding(from_);
+        if (!dryRun_) {
+            return Conversion(options_, from, textEncoding(to_), diagnostics).run();
+        }
+        if (!options_.output.empty() || !options_.report.empty() || options_.verify ||
+            onErrorOption_.isGiven()) {
+            throw Failure(
+                "--dry-run writes nothing and does not go with -o, --on-error, --report or --verify");
+        }
+        std::vector<kvt::ex::Encoding> targets;
+        for (const std::string& name : splitEncodings(to_)) {
+            targets.push_back(textEncoding(name));
+        }
+        return dryRun(options_, from, targets, diagnostics);
+    }
+
+private:
+    std::string from_;
+    std::string to_;
+    std::string onError_ = "stop";
+    std::string mark_ = "keep";
+    bool dryRun_ = false;
+    Option onErrorOption_;
+    ConvertOptions options_;
+};
+
+} // namespace
+
+CommandInfo convertCommand() {
+    return {"convert", "Convert text from one encoding to another", examples, notes,
+            std::make_unique<ConvertCommand>()};
+}
+
+} // namespace host

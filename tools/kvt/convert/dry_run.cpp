@@ -1,0 +1,127 @@
+#include "convert/dry_run.h"
+
+#include "base/diagnostics.h"
+#include "base/output.h"
+#include "base/progress.h"
+#include "base/table.h"
+#include "base/text.h"
+#include "base/unicode_data.h"
+#include "cli/exit_status.h"
+#include "convert/loss_ledger.h"
+#include "text/source.h"
+
+#include <kvt/encoding/stream_transcoder.h>
+
+#include <algorithm>
+#include <tuple>
+
+namespace host {
+
+namespace {
+
+using kvt::ex::Encoding;
+using kvt::ex::Loss;
+
+struct Target {
+    std::string name;
+    kvt::ex::StreamTranscoder transcoder;
+    LossLedger ledger;
+    std::uint64_t bytes = 0;
+
+    Target(Encoding from, Encoding to) : name(to.getName()), transcoder(from, to) {}
+
+    // `block` is null at the end of a file.
+    void convert(const std::string_view* block) {
+        const auto onLoss = [&](const Loss& loss) { ledger.add(loss, [] { return Place(); }); };
+        std::string converted;
+        if (block != nullptr) {
+            transcoder.convert(*block, converted, onLoss);
+        } else {
+            transcoder.finish(converted, onLoss);
+        }
+        bytes += converted.size();
+    }
+
+    auto rank() const { return std::tuple(ledger.total(), ledger.entryCount(), bytes); }
+};
+
+std::string shownLosses(const LossLedger& ledger) {
+    constexpr std::size_t mostShown = 8;
+    std::string text;
+    std::size_t shown = 0;
+    for (const LossLedger::Entry& entry : ledger.entries()) {
+        if (shown++ == mostShown) {
+            return text + " ...";
+        }
+        text += text.empty() ? "" : " ";
+        const char32_t character = entry.first.codePoint;
+        if (entry.first.kind == Loss::BadInput) {
+            text.append("<").append(hexBytes(entry.first.bytes)).append(">");
+        } else {
+            text += isPrintable(character) ? printable(std::u32string_view(&character, 1))
+                                           : codePointName(character);
+        }
+    }
+    return text;
+}
+
+std::string tableOf(const std::vector<Target>& targets) {
+    std::vector<std::vector<std::string>> rows = {{"", "encoding", "losses", "different", "bytes", "lost"}};
+    for (const Target& target : targets) {
+        const LossLedger& ledger = target.ledger;
+        rows.push_back({std::to_string(rows.size()), target.name, std::to_string(ledger.total()),
+                        std::to_string(ledger.entryCount()) + (ledger.unlisted() == 0 ? "" : "+"),
+                        std::to_string(target.bytes), shownLosses(ledger)});
+    }
+    return formatTable({Align::Right, Align::Left, Align::Right, Align::Right, Align::Right, Align::Left},
+                       rows);
+}
+
+} // namespace
+
+std::vector<std::string> splitEncodings(const std::string& list) {
+    std::vector<std::string> names;
+    for (std::size_t begin = 0; begin <= list.size();) {
+        const std::size_t end = std::min(list.find(',', begin), list.size());
+        const std::string piece = list.substr(begin, end - begin);
+        const bool isOption = piece.find('=') != std::string::npos || piece == "swaplfnl";
+        if (isOption && !names.empty()) {
+            names.back() += "," + piece;
+        } else {
+            names.push_back(piece);
+        }
+        begin = end + 1;
+    }
+    return names;
+}
+
+int dryRun(const ConvertOptions& options, Encoding from, const std::vector<Encoding>& encodings,
+           Diagnostics& diagnostics) {
+    checkMark(options.mark, from);
+    std::vector<Target> targets;
+    targets.reserve(encodings.size());
+    for (const Encoding to : encodings) {
+        targets.emplace_back(from, to);
+    }
+    {
+        Progress progress(diagnostics, totalSize(options.inputs), true);
+        for (const std::string& path : options.inputs) {
+            Source source(path, from, options.mark);
+            for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
+                for (Target& target : targets) {
+                    target.convert(&block);
+                }
+                progress.advance(block.size());
+            }
+            for (Target& target : targets) {
+                target.convert(nullptr);
+            }
+        }
+    }
+    std::stable_sort(targets.begin(), targets.end(),
+                     [](const Target& left, const Target& right) { return left.rank() < right.rank(); });
+    print(tableOf(targets));
+    return targets.front().ledger.isEmpty() ? Done : DoneWithLosses;
+}
+
+} // namespace host

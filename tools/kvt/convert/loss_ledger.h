@@ -1,0 +1,55 @@
+// What was lost, added up: each character and each sequence of bad bytes once, with its count and its first place.
+//
+// Memory stays bounded whatever is lost: beyond mostEntries different ones, losses are only counted.
+#pragma once
+
+#include "text/line_counter.h"
+
+#include <kvt/encoding/stream_transcoder.h>
+
+#include <cstdint>
+#include <functional>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace host {
+
+class Diagnostics;
+
+class LossLedger {
+public:
+    struct Entry {
+        kvt::ex::Loss first;
+        Place place;
+        std::uint64_t count = 0;
+        std::uint64_t order = 0; ///< how many entries came before it
+    };
+    static constexpr std::size_t mostEntries = 1000;
+
+    /// Adds a loss. Places cost time, so `place` is called only for a first one.
+    void add(const kvt::ex::Loss& loss, const std::function<Place()>& place);
+
+    bool isEmpty() const { return total_ == 0; }
+    /// All losses, those without an entry included.
+    std::uint64_t total() const { return total_; }
+    /// How many of them have no entry.
+    std::uint64_t unlisted() const { return unlisted_; }
+    std::size_t entryCount() const { return entries_.size(); }
+    /// The most frequent first.
+    std::vector<Entry> entries() const;
+
+private:
+    // A character is the same loss however its bytes are; a bad sequence is known by its bytes alone.
+    using Key = std::pair<char32_t, std::string>;
+    std::map<Key, Entry> entries_;
+    std::uint64_t total_ = 0;
+    std::uint64_t unlisted_ = 0;
+};
+
+/// The ledger as lines on standard error.
+void printLedger(const LossLedger& ledger, const std::string& from, const std::string& to,
+                 Diagnostics& diagnostics);
+
+} // namespace host

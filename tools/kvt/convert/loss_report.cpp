@@ -1,0 +1,55 @@
+#include "convert/loss_report.h"
+
+#include "base/text.h"
+#include "base/unicode_data.h"
+
+#include <nlohmann/json.hpp>
+
+namespace host {
+
+namespace {
+
+bool isBadInput(const kvt::ex::Loss& loss) {
+    return loss.kind == kvt::ex::Loss::BadInput;
+}
+
+} // namespace
+
+std::string describeLost(const kvt::ex::Loss& loss) {
+    if (isBadInput(loss)) {
+        return "bad bytes " + hexBytes(loss.bytes);
+    }
+    std::string text = codePointName(loss.codePoint) + " " + characterName(loss.codePoint);
+    if (isPrintable(loss.codePoint)) {
+        text += " \"" + printable(std::u32string_view(&loss.codePoint, 1)) + "\"";
+    }
+    return text + " (" + hexBytes(loss.bytes) + ")";
+}
+
+std::string describeLoss(const kvt::ex::Loss& loss, const Place& place, const std::string& from,
+                         const std::string& to) {
+    return describe(place) + ": " + describeLost(loss) +
+           (isBadInput(loss) ? " are not valid " + from : " is not in " + to);
+}
+
+std::string lossAsJson(const kvt::ex::Loss& loss, const Place& place, const std::string& from,
+                       const std::string& to) {
+    nlohmann::ordered_json object;
+    object["file"] = place.file;
+    object["offset"] = place.offset;
+    object["line"] = place.line;
+    object["column"] = place.column;
+    object["kind"] = isBadInput(loss) ? "bad-input" : "not-representable";
+    object["bytes"] = hexBytes(loss.bytes);
+    object["codePoint"] = nullptr;
+    object["name"] = nullptr;
+    if (!isBadInput(loss)) {
+        object["codePoint"] = codePointName(loss.codePoint);
+        object["name"] = characterName(loss.codePoint);
+    }
+    object["from"] = from;
+    object["to"] = to;
+    return object.dump() + "\n";
+}
+
+} // namespace host

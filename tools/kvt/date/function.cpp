@@ -1,0 +1,96 @@
+#include "date/function.h"
+
+#include "base/failure.h"
+#include "base/text.h"
+#include "cli/command.h"
+#include "cli/exit_status.h"
+#include "date/lines.h"
+
+#include <kvt/datetime/datetime.h>
+
+namespace host {
+
+const char* const valueNotes =
+    R"(Without a value, or with '-' for it, values are read from standard input, one on
+each line, and results are written as they come. A line that fails leaves an
+empty line, so that lines keep their numbers. An interval with a sign may stand
+as it is; anything else that begins with '-' and a letter needs '--' before it.
+
+Exit status:
+  0  done
+  1  done, but some lines of standard input failed
+  2  not done: the value failed, or the command line was wrong)";
+
+void ValueFunction::declare(Syntax& parent) {
+    syntax_ = &parent.subcommand(words_.name, words_.summary);
+    first_.option =
+        syntax_->operand(words_.value, first_.text, "The value; standard input without it and for '-'");
+    if (*words_.operand != '\0') {
+        second_.option = syntax_->operand(words_.operand, second_.text, words_.operandHelp);
+    }
+    // "-P1D" would be the option "-P" to the reader of the command line, and so it is.
+    negativeInterval_.option = syntax_->option("-P", negativeInterval_.text, "", "").hidden();
+    declareOptions(*syntax_);
+    syntax_->flag("--json", json_, "Print a JSON object on a line for each value, failures included");
+    syntax_->setHelp(words_.examples, ownNotes() + valueNotes);
+}
+
+int ValueFunction::run(Diagnostics& diagnostics) {
+    std::vector<std::string> arguments;
+    const bool hasOperand = *words_.operand != '\0';
+    for (const Typed* typed : {&first_, &second_}) {
+        if (typed->option.isGiven()) {
+            arguments.push_back(typed->text);
+        }
+    }
+    if (negativeInterval_.option.isGiven()) {
+        arguments.push_back("-P" + negativeInterval_.text);
+    }
+    const std::size_t most = hasOperand ? 2 : 1;
+    if (arguments.size() > most) {
+        throw Failure("unexpected argument '" + printable(arguments.back()) + "'");
+    }
+    if (hasOperand && arguments.empty()) {
+        throw Failure(std::string(words_.operand) + " is required");
+    }
+    prepare(hasOperand ? arguments.back() : std::string());
+    const bool fromInput = arguments.size() < most || arguments.front() == "-";
+    const ApplyToValue applyTo = [&](const kvt::ex::UString<0>& value) { return apply(value); };
+    return fromInput ? runLines(applyTo, json_, diagnostics)
+                     : runValue(arguments.front(), applyTo, json_, diagnostics);
+}
+
+void FunctionGroup::declare(Syntax& parent) {
+    syntax_ = &parent.subcommand(name_, summary_);
+    for (const auto& function : functions_) {
+        function->declare(*syntax_);
+    }
+    syntax_->setHelp(examples_, valueNotes);
+}
+
+int FunctionGroup::run(Diagnostics& diagnostics) {
+    for (const auto& function : functions_) {
+        if (function->isChosen()) {
+            return function->run(diagnostics);
+        }
+    }
+    return NotDone;
+}
+
+void ZoneDatabaseOption::declare(Syntax& syntax) {
+    syntax.option("--zone-database", folder_, "DIR",
+                  "Folder with the zone database, which 'kvt tzdata' writes; "
+                  "~/Downloads/tzdata without this option");
+}
+
+void ZoneDatabaseOption::use() const {
+    if (!folder_.empty()) {
+        kvt::ex::datetime::setInstallPathWrapper(folder_);
+    }
+}
+
+kvt::ex::UString<0> toUString(const std::string& utf8) {
+    return kvt::ex::UString<0>(utf8.data(), utf8.size());
+}
+
+} // namespace host

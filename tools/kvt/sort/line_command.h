@@ -1,0 +1,38 @@
+// What `kvt sort` and `kvt unique` have in common: their options, and the way of lines from files through the
+// workspace into an output.
+#pragma once
+
+#include "cli/command.h"
+#include "sort/line_sorter.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace host {
+
+class Output;
+
+class LineCommand : public Command {
+protected:
+    enum class OutputOrder { Sorted, AsRead };
+
+    void declareShared(Syntax& syntax);
+    int process(LineOrder order, OutputOrder outputOrder, bool showCounts, Diagnostics& diagnostics);
+
+private:
+    void sendThrough(Output& output, std::uint64_t memory, LineOrder order, OutputOrder outputOrder,
+                     bool showCounts, Diagnostics& diagnostics) const;
+
+    std::vector<std::string> inputs_;
+    std::string output_;
+    std::string workspace_;
+    std::string memory_ = "256M";
+    bool fold_ = false;
+    bool progress_ = false;
+};
+
+/// The end of the help of both commands.
+extern const char* const lineCommandNotes;
+
+} // namespace host

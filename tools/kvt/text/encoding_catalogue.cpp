@@ -1,0 +1,107 @@
+#include "text/encoding_catalogue.h"
+
+#include "base/failure.h"
+#include "base/messages.h"
+#include "base/text.h"
+#include "base/unicode_data.h"
+#include "cli/suggest.h"
+
+#include <algorithm>
+#include <set>
+
+namespace host {
+
+namespace {
+
+using kvt::ex::Encoding;
+
+std::string nameOf(Encoding encoding) {
+    return std::string(encoding.getUnevaluatedName());
+}
+
+// The library's own converterless encoding of text has characters of many bytes.
+bool isSingleByte(Encoding encoding) {
+    return encoding.id() != Encoding::Wwjd && encoding.isSingleByte();
+}
+
+} // namespace
+
+EncodingCatalogue::EncodingCatalogue() {
+    for (std::uint32_t id = 0; id < Encoding::Unknown; ++id) {
+        aliasesFor(static_cast<Encoding::Type>(id));
+    }
+    aliasesFor(Encoding::System) = {"ANSI", "SYSTEM", "system"};
+    aliasesFor(Encoding::Binary) = {"BINARY", "binary"};
+    for (const std::string& converter : converterNames()) {
+        std::vector<std::string> names = aliasesOf(converter);
+        names.insert(names.begin(), converter);
+        for (const std::string& name : names) {
+            // By what the library makes of each name: it may differ from ICU's view of "UTF-16", for one.
+            const Encoding encoding(name, kvt::ex::nothrow);
+            if (encoding.id() == Encoding::Unknown) {
+                continue;
+            }
+            std::vector<std::string>& aliases = aliasesFor(encoding);
+            if (name != nameOf(encoding) &&
+                std::find(aliases.begin(), aliases.end(), name) == aliases.end()) {
+                aliases.push_back(name);
+            }
+        }
+    }
+}
+
+std::vector<std::string>& EncodingCatalogue::aliasesFor(Encoding encoding) {
+    return known_.try_emplace(encoding.id(), Known{encoding, {}}).first->second.aliases;
+}
+
+EncodingEntry EncodingCatalogue::entry(Encoding encoding) const {
+    EncodingEntry entry{
+        nameOf(encoding), encoding.id(), isSingleByte(encoding), encoding.supports7BitASCII(), {}};
+    if (const auto known = known_.find(encoding.id()); known != known_.end()) {
+        entry.aliases = known->second.aliases;
+    }
+    return entry;
+}
+
+std::vector<EncodingEntry> EncodingCatalogue::all() const {
+    std::vector<EncodingEntry> entries;
+    for (const auto& [id, known] : known_) {
+        entries.push_back(entry(known.encoding));
+    }
+    // Ids above the fixed ones only say which name was asked for first.
+    const auto firstOther = std::find_if(entries.begin(), entries.end(), [](const EncodingEntry& entry) {
+        return entry.id > Encoding::Unknown;
+    });
+    std::sort(firstOther, entries.end(),
+              [](const EncodingEntry& left, const EncodingEntry& right) { return left.name < right.name; });
+    return entries;
+}
+
+std::vector<std::string> EncodingCatalogue::names() const {
+    std::set<std::string> names;
+    for (const EncodingEntry& entry : all()) {
+        names.insert(entry.name);
+        names.insert(entry.aliases.begin(), entry.aliases.end());
+    }
+    return {names.begin(), names.end()};
+}
+
+std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue) {
+    return describe(910005, {printable(name)}) + didYouMean(name, catalogue.names());
+}
+
+Encoding textEncoding(const std::string& name) {
+    const Encoding encoding(name, kvt::ex::nothrow);
+    switch (encoding.id()) {
+    case Encoding::Unknown:
+        throw Failure(unknownEncoding(name, EncodingCatalogue()));
+    case Encoding::Binary:
+        throw Failure(describe(910005, {printable(name)}) + " It stands for bytes that are no text.");
+    case Encoding::Wwjd:
+        throw Failure(describe(910005, {printable(name)}) + " For this one there is 'kvt wwjd'.");
+    default:
+        return encoding;
+    }
+}
+
+} // namespace host

@@ -1,0 +1,104 @@
+#include "text/line_reader.h"
+
+#include "base/messages.h"
+#include "text/byte_order_mark.h"
+
+#include <kvt/string/ustring.h>
+
+#include <algorithm>
+#include <sstream>
+#include <utility>
+
+namespace host {
+
+namespace {
+
+using kvt::ex::Encoding;
+
+// With everything beyond printable ASCII as "\xHH", which is how the library writes bytes that are not text.
+std::string shownBytes(const std::string& bytes) {
+    std::ostringstream out;
+    out << kvt::ex::BinaryString(bytes.data(), bytes.size());
+    return out.str();
+}
+
+} // namespace
+
+Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineCounter& places,
+                       const std::string& encodingName) {
+    const LineCounter::Position position = places.at(loss.offset);
+    const Place place{file, loss.offset, position.line, position.column};
+    return Failure(describe(place) + ": " + describe(910002, {shownBytes(loss.bytes), encodingName}));
+}
+
+LineReader::LineReader(const std::string& path, Encoding encoding)
+    : input_(path), encodingName_(encoding.getName()), decoder_(encoding, Encoding::Utf8),
+      onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }), places_(encoding) {}
+
+void LineReader::refuse(const kvt::ex::Loss& loss) {
+    throw badTextFailure(input_.name(), loss, places_, encodingName_);
+}
+
+bool LineReader::readBlock() {
+    if (ended_) {
+        return false;
+    }
+    decoded_.erase(0, taken_);
+    searched_ -= taken_;
+    taken_ = 0;
+    const std::string_view block = input_.read();
+    lastBlock_ = block.size();
+    ended_ = block.empty();
+    places_.beginBlock(block);
+    if (ended_) {
+        decoder_.finish(decoded_, onLoss_);
+    } else {
+        decoder_.convert(block, decoded_, onLoss_);
+    }
+    places_.endBlock();
+    findMark();
+    return true;
+}
+
+// The decoder gives whole characters only, so that the first one is there as soon as there is anything.
+void LineReader::findMark() {
+    if (started_ || decoded_.empty()) {
+        return;
+    }
+    started_ = true;
+    const std::string_view mark = byteOrderMark(Encoding::Utf8);
+    if (decoded_.starts_with(mark)) {
+        marked_ = true;
+        taken_ = searched_ = mark.size();
+    }
+}
+
+std::string_view LineReader::takeMark() {
+    return std::exchange(marked_, false) ? byteOrderMark(Encoding::Utf8) : std::string_view();
+}
+
+bool LineReader::next(TextLine& line) {
+    const auto isEnd = [](char byte) { return byte == '\n' || byte == '\r'; };
+    const auto from = decoded_.begin() + static_cast<std::ptrdiff_t>(searched_);
+    const auto end = static_cast<std::size_t>(std::find_if(from, decoded_.end(), isEnd) - decoded_.begin());
+    const std::string_view all = decoded_;
+    const bool openEnd = end == all.size() || (all[end] == '\r' && end + 1 == all.size());
+    if (openEnd && !ended_) {
+        // A CR may yet turn out to be the first half of a CRLF.
+        searched_ = end;
+        if (end - taken_ > longestLine) {
+            throw Failure(input_.name() + ": line " + std::to_string(number_ + 1) + " is longer than " +
+                          std::to_string(longestLine / 1024 / 1024) + " MiB");
+        }
+        return false;
+    }
+    if (taken_ == all.size()) {
+        return false;
+    }
+    const std::size_t endLength = all.substr(end, 2) == "\r\n" ? 2 : end == all.size() ? 0 : 1;
+    line = {input_.name(), ++number_, all.substr(taken_, end - taken_), all.substr(end, endLength)};
+    taken_ = searched_ = end + endLength;
+    return true;
+}
+
+} // namespace host

@@ -1,0 +1,77 @@
+// Input files as decoded lines: whatever encoding a file is in, its lines come out as UTF-8, one after the
+// other.
+//
+// A line ends with LF, CR or CRLF, as places are counted elsewhere in the program. The end is kept apart from the
+// text, so that it can be written again as it was. Bytes that are not text in the encoding end the reading with
+// their place. One block and the line that runs over its end are held, no more.
+#pragma once
+
+#include "base/failure.h"
+#include "base/input.h"
+#include "text/line_counter.h"
+
+#include <kvt/encoding/encoding.h>
+#include <kvt/encoding/stream_transcoder.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace host {
+
+/// A line in UTF-8. The views are valid until the reader reads its next block.
+struct TextLine {
+    std::string_view file; ///< its name for people
+    std::uint64_t number;  ///< from 1, in its file
+    std::string_view text; ///< without the end
+    std::string_view end;  ///< "\n", "\r", "\r\n", or nothing behind the last line
+};
+
+/// The failure of a loss in `file` when bytes that are not text must not be replaced: the place, and which bytes.
+Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineCounter& places,
+                       const std::string& encodingName);
+
+class LineReader {
+public:
+    /// Throws Failure when the file cannot be opened.
+    LineReader(const std::string& path, kvt::ex::Encoding encoding);
+
+    /// Reads a block, of which next() then gives the lines; false behind the end of the file. Throws Failure,
+    /// with the place of bytes that are not text.
+    bool readBlock();
+    /// The next line that is complete; false when there is none before the next block. Throws Failure when a
+    /// line is longer than longestLine.
+    bool next(TextLine& line);
+
+    /// The byte order mark at the start of the file, as UTF-8, for the first call. It does not belong to the
+    /// first line.
+    std::string_view takeMark();
+
+    const Input& input() const { return input_; }
+    /// Bytes of the file in the last block.
+    std::size_t lastBlock() const { return lastBlock_; }
+
+    /// Bytes of UTF-8.
+    static constexpr std::size_t longestLine = 64 * 1024 * 1024;
+
+private:
+    [[noreturn]] void refuse(const kvt::ex::Loss& loss);
+    void findMark();
+
+    Input input_;
+    std::string encodingName_;
+    kvt::ex::StreamTranscoder decoder_;
+    kvt::ex::StreamTranscoder::LossHandler onLoss_;
+    LineCounter places_;
+    std::string decoded_;
+    std::size_t taken_ = 0;    ///< up to here, decoded_ was given out
+    std::size_t searched_ = 0; ///< up to here, decoded_ holds no end of the line that begins at taken_
+    std::uint64_t number_ = 0;
+    std::size_t lastBlock_ = 0;
+    bool started_ = false;
+    bool marked_ = false;
+    bool ended_ = false;
+};
+
+} // namespace host

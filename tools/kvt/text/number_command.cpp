@@ -1,0 +1,173 @@
+// `kvt number`: the shortest text of floating-point numbers.
+
+#include "base/failure.h"
+#include "base/output.h"
+#include "base/progress.h"
+#include "base/text.h"
+#include "cli/command.h"
+#include "cli/exit_status.h"
+#include "text/line_reader.h"
+
+#include <kvt/codec/float_text.h>
+
+#include <array>
+#include <charconv>
+#include <cmath>
+#include <unistd.h>
+
+namespace host {
+
+namespace {
+
+constexpr const char* examples = R"(kvt number 0.10000000000000001 1e3
+kvt number -- -2.50e-7
+printf '1e10\nInfinity\n' | kvt number --xml)";
+
+constexpr const char* notes =
+    R"(Takes each NUMBER as the nearest double-precision number and prints the fewest
+digits that read back to that, one on a line; without any NUMBER, standard input
+is read, one number on each line. Put '--' before the numbers when one of them
+begins with '-'.
+
+A number is decimal, with or without a sign, a fraction and an exponent, or one
+of inf, infinity and nan in upper or lower case; blanks around it are passed
+over. What is printed has the forms 1500, 0.0015, 1e+20 and 1e-5.
+
+The first NUMBER or line that is none, that is too large for the precision, or
+too close to zero to be told from it, ends the command; what stands before it is
+printed.
+
+Exit status:
+  0  done
+  2  not done)";
+
+std::string_view trimmed(std::string_view text) {
+    constexpr std::string_view blanks = " \t";
+    const std::size_t first = text.find_first_not_of(blanks);
+    return first == std::string_view::npos ? std::string_view()
+                                           : text.substr(first, text.find_last_not_of(blanks) + 1 - first);
+}
+
+// Throws Failure, with the text but no place.
+template <typename Number>
+Number parsed(std::string_view text) {
+    // std::from_chars knows no plus sign, and it takes the payload of a NaN, which would be lost.
+    std::string_view unsignedText = trimmed(text);
+    const bool plus = unsignedText.starts_with('+');
+    unsignedText.remove_prefix(plus ? 1 : 0);
+    const char* const end = unsignedText.data() + unsignedText.size();
+    Number number = 0;
+    const std::from_chars_result result = std::from_chars(unsignedText.data(), end, number);
+    if (result.ec == std::errc::invalid_argument || result.ptr != end || unsignedText.ends_with(')') ||
+        (plus && unsignedText.starts_with('-'))) {
+        throw Failure("\"" + printable(text) + "\" is not a number");
+    }
+    // Not all run-times report what has become infinite or zero.
+    const std::string_view digits = unsignedText.substr(0, unsignedText.find_first_of("eE"));
+    const bool spelt = digits.find_first_of("0123456789") == std::string_view::npos;
+    const bool vanished = number == 0 && digits.find_first_of("123456789") != std::string_view::npos;
+    if (result.ec != std::errc() || vanished || (std::isinf(number) && !spelt)) {
+        throw Failure("\"" + printable(text) + "\" is outside the range of " +
+                      (sizeof(Number) == sizeof(float) ? "single" : "double") + "-precision numbers");
+    }
+    return number;
+}
+
+class NumberCommand : public Command {
+public:
+    void declare(Syntax& syntax) override {
+        syntax.flag("--xml", xml_, "Spell the special values as XML Schema does: INF, -INF and NaN");
+        syntax.flag("--single", single_, "Read and print single-precision numbers");
+        syntax.option("-o,--output", outputPath_, "FILE",
+                      "Where the output goes; '-' is standard output, the default");
+        syntax.operand("NUMBER", numbers_, "Numbers to print; those of standard input without any");
+    }
+
+    int run(Diagnostics& diagnostics) override {
+        const std::unique_ptr<Output> output = openOutput(outputPath_);
+        if (numbers_.empty()) {
+            printLines(*output, diagnostics);
+        } else {
+            printArguments(*output);
+        }
+        output->commit();
+        return Done;
+    }
+
+private:
+    void printArguments(Output& output) const {
+        std::string out;
+        for (std::size_t index = 0; index < numbers_.size(); ++index) {
+            add(
+                numbers_[index], [&] { return "argument " + std::to_string(index + 1); }, out, output);
+        }
+        output.write(out);
+    }
+
+    void printLines(Output& output, Diagnostics& diagnostics) const {
+        const std::string standardInput = inputsOrStandardInput({}).front();
+        LineReader reader(standardInput, kvt::ex::Encoding::Utf8);
+        if (output.writesInPlaceTo(reader.input().descriptor())) {
+            throw Failure(reader.input().name() +
+                          " is both input and output; use -o, which writes beside it");
+        }
+        Progress progress(diagnostics, totalSize({standardInput}),
+                          !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
+        std::string out;
+        TextLine line{};
+        while (reader.readBlock()) {
+            while (reader.next(line)) {
+                const auto place = [&] {
+                    return std::string(line.file) + ": line " + std::to_string(line.number);
+                };
+                add(line.text, place, out, output);
+            }
+            output.write(out);
+            out.clear();
+            progress.advance(reader.lastBlock());
+        }
+    }
+
+    // Appends the number to `out`. Where the text is not a number, writes what there is and then fails.
+    template <typename Place>
+    void add(std::string_view text, const Place& place, std::string& out, Output& output) const {
+        try {
+            out += shortest(text) + "\n";
+        } catch (const Failure& failure) {
+            output.write(out);
+            throw Failure(place() + ": " + failure.what());
+        }
+    }
+
+    std::string shortest(std::string_view text) const {
+        if (!single_) {
+            const auto number = parsed<double>(text);
+            return shown(xml_ ? kvt::ex::double_to_string_xml : kvt::ex::double_to_string, number);
+        }
+        const auto number = parsed<float>(text);
+        // There is no form for XML in single precision, and only values without digits would differ in it.
+        return xml_ && !std::isfinite(number)
+                   ? shown(kvt::ex::double_to_string_xml, static_cast<double>(number))
+                   : shown(kvt::ex::float_to_string, number);
+    }
+
+    template <typename Number>
+    static std::string shown(std::uint64_t (*write)(Number, char*), Number number) {
+        std::array<char, kvt::ex::floatTextBuffer> buffer;
+        return {buffer.data(), write(number, buffer.data())};
+    }
+
+    std::vector<std::string> numbers_;
+    std::string outputPath_;
+    bool xml_ = false;
+    bool single_ = false;
+};
+
+} // namespace
+
+CommandInfo numberCommand() {
+    return {"number", "Print floating-point numbers with the fewest digits", examples, notes,
+            std::make_unique<NumberCommand>()};
+}
+
+} // namespace host

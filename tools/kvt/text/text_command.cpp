@@ -1,0 +1,226 @@
+// `kvt text`: the string operations of the library on the lines of a text.
+
+#include "base/failure.h"
+#include "base/input.h"
+#include "base/output.h"
+#include "base/progress.h"
+#include "cli/command.h"
+#include "cli/exit_status.h"
+#include "text/encoding_catalogue.h"
+#include "text/line_reader.h"
+#include "text/text_operation.h"
+#include "text/text_writer.h"
+
+#include <functional>
+#include <unistd.h>
+#include <utility>
+
+namespace host {
+
+namespace {
+
+constexpr const char* examples = R"(kvt text upper --encoding windows-1252 names.txt
+kvt text find 'strasse' --ignore-case *.txt
+kvt text replace ';' ',' < in.csv > out.csv)";
+
+constexpr const char* notes =
+    R"(What is read and written is text in the encoding of --encoding; arguments are
+UTF-8 always, and what 'find' and 'hash' print is plain ASCII but for names of
+files. Several FILEs become one output; without any, and for '-', standard input
+is read. Put '--' before the arguments when one of them begins with '-'.
+
+Lines end with LF, CR or CRLF and have at most 64 MiB of UTF-8. Their ends are
+no part of what an operation sees and are written as they were; so is a byte
+order mark at the start of a FILE. Upper and lower case and folding follow
+Unicode, whatever the locale, and may change the length of a line. Only whole
+characters are found, replaced and cut at, also where one folds to several.
+
+Bytes that are no text in ENC, and characters of the result that do not exist in
+it, end the command with their place. An output file appears whole or not at
+all; to standard output, what is complete is written block by block. To repair a
+text, or to change its encoding, use 'kvt convert'.
+
+Exit status:
+  0  done, also when nothing was found
+  2  not done)";
+
+class TextCommand : public Command {
+public:
+    void declare(Syntax& syntax) override {
+        declareCase(syntax, "upper", "Every letter in upper case", CaseChange::Upper);
+        declareCase(syntax, "lower", "Every letter in lower case", CaseChange::Lower);
+        declareCase(syntax, "fold", "The form that texts share which differ in case only", CaseChange::Fold);
+        declareFind(syntax);
+        declareReplace(syntax);
+        declareSplit(syntax);
+        declareStrip(syntax);
+        declareHash(syntax);
+    }
+
+    int run(Diagnostics& diagnostics) override {
+        const kvt::ex::Encoding encoding = textEncoding(encoding_);
+        inputs_ = inputsOrStandardInput(inputs_);
+        const std::unique_ptr<TextOperation> operation = chosen();
+        const std::unique_ptr<Output> output = openOutput(outputPath_);
+        TextWriter writer(*output, encoding, operation->givesText());
+        {
+            Progress progress(diagnostics, totalSize(inputs_),
+                              !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
+            for (const std::string& path : inputs_) {
+                LineReader reader(path, encoding);
+                if (output->writesInPlaceTo(reader.input().descriptor())) {
+                    throw Failure(reader.input().name() +
+                                  " is both input and output; use -o, which writes beside it");
+                }
+                applyTo(reader, *operation, writer, progress);
+            }
+        }
+        writer.finish();
+        return Done;
+    }
+
+private:
+    using Make = std::function<std::unique_ptr<TextOperation>()>;
+
+    static void applyTo(LineReader& reader, const TextOperation& operation, TextWriter& writer,
+                        Progress& progress) {
+        TextLine line{reader.input().name(), 1, {}, {}};
+        while (reader.readBlock()) {
+            if (operation.givesText()) {
+                writer.buffer() += reader.takeMark();
+                writer.endLine(line);
+            }
+            while (reader.next(line)) {
+                operation.apply(line, writer.buffer());
+                writer.endLine(line);
+            }
+            writer.flush();
+            progress.advance(reader.lastBlock());
+        }
+    }
+
+    std::unique_ptr<TextOperation> chosen() const {
+        for (const auto& [operation, make] : operations_) {
+            if (operation->isChosen()) {
+                return make();
+            }
+        }
+        throw Failure("no operation");
+    }
+
+    CaseRule rule() const { return ignoreCase_ ? CaseRule::Ignore : CaseRule::Distinguish; }
+
+    // An operation with what all have. Its own arguments stand before the files.
+    void declareOperation(Syntax& syntax, const std::string& name, const std::string& summary,
+                          const std::string& itsExamples, const std::string& itsNotes,
+                          const std::vector<std::pair<std::string, std::string*>>& arguments,
+                          const Make& make) {
+        Syntax& operation = syntax.subcommand(name, summary);
+        for (const auto& [argument, value] : arguments) {
+            operation.operand(argument, *value, argumentMeaning(argument)).required();
+        }
+        operation.option("--encoding", encoding_, "ENC", "Encoding of the text; UTF-8 without it");
+        operation.option("-o,--output", outputPath_, "FILE",
+                         "Where the output goes; '-' is standard output, the default");
+        operation.operand("FILE", inputs_, "Files to read; '-' is standard input, the default");
+        operation.setHelp(itsExamples, itsNotes.empty() ? notes : itsNotes + "\n\n" + notes);
+        operations_.emplace_back(&operation, make);
+    }
+
+    static std::string argumentMeaning(const std::string& argument) {
+        return argument == "NEEDLE" ? "Text to look for"
+               : argument == "FROM" ? "Text to replace"
+               : argument == "TO"   ? "What to put in its place; may be empty"
+               : argument == "SET"  ? "The characters that go"
+                                    : "Text between the pieces";
+    }
+
+    void declareIgnoreCase(const std::string& meaning) {
+        operations_.back().first->flag("-i,--ignore-case", ignoreCase_, meaning);
+    }
+
+    void declareCase(Syntax& syntax, const std::string& name, const std::string& summary, CaseChange change) {
+        declareOperation(syntax, name, summary,
+                         "kvt text " + name + " names.txt\nkvt text " + name +
+                             " --encoding KOI8-R names.txt -o changed.txt",
+                         "", {}, [change] { return changeCase(change); });
+    }
+
+    void declareFind(Syntax& syntax) {
+        declareOperation(syntax, "find", "Print where a text stands", R"(kvt text find 'TODAY' notes.txt
+kvt text find --ignore-case 'straße' one.txt two.txt)",
+                         R"(Prints LINE:POSITION for each place, from the left, none within the one before;
+FILE:LINE:POSITION when there are several FILEs. Lines are counted from 1. The
+position is counted from 0 in the line, in bytes of the line as UTF-8, whatever
+ENC is; a byte order mark is not counted. Nothing is printed when nothing is
+found. With --ignore-case the position is still that in the line as it stands.)",
+                         {{"NEEDLE", &first_}},
+                         [this] { return findText(first_, rule(), inputs_.size() > 1); });
+        declareIgnoreCase("Find it in upper and lower case alike");
+    }
+
+    void declareReplace(Syntax& syntax) {
+        declareOperation(syntax, "replace", "Replace a text, everywhere",
+                         R"(kvt text replace 'colour' 'color' book.txt -o book.txt
+kvt text replace --ignore-case 'strasse' 'Str.' < addresses.txt)",
+                         "Replaces from the left and does not look again at what was put in.",
+                         {{"FROM", &first_}, {"TO", &second_}},
+                         [this] { return replaceText(first_, second_, rule()); });
+        declareIgnoreCase("Replace it in upper and lower case alike");
+    }
+
+    void declareSplit(Syntax& syntax) {
+        declareOperation(syntax, "split", "Cut each line into pieces, a line for each",
+                         R"(kvt text split ', ' list.txt
+printf 'a::b' | kvt text split --skip-empty ':')",
+                         R"(Each piece gets the end of its line, or LF where that has none. The whole
+DELIMITER goes. A line without it is one piece, be it empty.)",
+                         {{"DELIMITER", &first_}}, [this] { return splitText(first_, rule(), skipEmpty_); });
+        declareIgnoreCase("Cut at DELIMITER in upper and lower case alike");
+        operations_.back().first->flag("--skip-empty", skipEmpty_, "Leave empty pieces out");
+    }
+
+    void declareStrip(Syntax& syntax) {
+        declareOperation(
+            syntax, "strip", "Drop characters from the ends of each line",
+            R"(kvt text strip ' ' table.txt
+kvt text strip --back '.!?' titles.txt)",
+            R"(SET is a list of characters, each for itself; every one of them goes from the
+front and from the back of the line up to the first that is not in SET.)",
+            {{"SET", &first_}}, [this] {
+                return stripText(first_, front_ == back_ ? Side::Both : front_ ? Side::Front : Side::Back);
+            });
+        operations_.back().first->flag("--front", front_, "From the front only");
+        operations_.back().first->flag("--back", back_, "From the back only");
+    }
+
+    void declareHash(Syntax& syntax) {
+        declareOperation(syntax, "hash", "Print a hash of each line", R"(kvt text hash names.txt
+kvt text hash --ignore-case --encoding UTF-16LE names.txt)",
+                         R"(Prints 16 hexadecimal digits for each line: the hash that the library's UTF-8
+strings have, 64-bit FNV-1a. The same text has the same hash in every encoding.
+It is quick and not made to withstand anybody who wants two texts to agree.)",
+                         {}, [this] { return hashText(rule()); });
+        declareIgnoreCase("Give texts that differ in case only the same hash");
+    }
+
+    std::vector<std::pair<Syntax*, Make>> operations_;
+    std::string encoding_ = "UTF-8";
+    std::string outputPath_;
+    std::vector<std::string> inputs_;
+    std::string first_;
+    std::string second_;
+    bool ignoreCase_ = false;
+    bool skipEmpty_ = false;
+    bool front_ = false;
+    bool back_ = false;
+};
+
+} // namespace
+
+CommandInfo textCommand() {
+    return {"text", "Change, search and compare text line by line", examples, notes,
+            std::make_unique<TextCommand>()};
+}
+
+} // namespace host
