@@ -1,9 +1,11 @@
 // Search in sequences of code units. Nothing here knows an encoding: a position is an index of a unit, and units are
 // equal when their numbers are.
 //
-// Where the C library has a primitive for the unit's width it does the work; the others are loops over whole blocks
-// that compilers turn into vector code.
+// Where the C library has a primitive for the unit's width it does the work; sequences are sought by vector registers
+// (unit_vectors.h), and the rest are loops over whole blocks that compilers turn into vector code.
 #pragma once
+
+#include <kvt/string/detail/unit_vectors.h>
 
 #include <algorithm>
 #include <array>
@@ -49,21 +51,7 @@ bool blockHas(const Unit* block, Unit front, std::ptrdiff_t distance, Unit back)
     return found != 0;
 }
 
-/// The first place in the range where `front` stands, with `back` standing `distance` units behind it; or null.
-template <typename Unit>
-const Unit* findPair(const Unit* first, const Unit* last, Unit front, std::ptrdiff_t distance, Unit back) {
-    while (last - first >= unitBlock && !blockHas(first, front, distance, back)) {
-        first += unitBlock;
-    }
-    for (; first != last; ++first) {
-        if (*first == front && first[distance] == back) {
-            return first;
-        }
-    }
-    return nullptr;
-}
-
-/// The last such place, or null.
+/// The last place in the range where `front` stands, with `back` standing `distance` units behind it; or null.
 template <typename Unit>
 const Unit* rfindPair(const Unit* first, const Unit* last, Unit front, std::ptrdiff_t distance, Unit back) {
     while (last - first >= unitBlock && !blockHas(last - unitBlock, front, distance, back)) {
@@ -91,7 +79,8 @@ const Unit* findUnit(const Unit* first, const Unit* last, Unit unit) {
         const auto* const wide = reinterpret_cast<const wchar_t*>(first);
         return reinterpret_cast<const Unit*>(std::wmemchr(wide, static_cast<wchar_t>(unit), count));
     } else {
-        return findPair(first, last, unit, 0, unit);
+        const vectors::Place place = vectors::findSequence(first, count, &unit, 1);
+        return place.at < count ? first + place.at : nullptr;
     }
 }
 
@@ -125,27 +114,27 @@ std::size_t findUnits(Units<Unit> text, Units<Unit> needle, std::size_t pos) {
         return notFound;
     }
     // No match begins behind the last place that has room for it.
-    const Unit* const start = text.data() + pos;
     const Unit* const last = text.data() + (text.size() - needle.size() + 1);
-    const Unit* place = start;
-    for (std::ptrdiff_t inVain = 0;; ++inVain, ++place) {
-        if (sizeof(Unit) != sizeof(char16_t) && !oftenInVain(inVain, place - start)) {
-            place = findUnit(place, last, needle.front());
-        } else if constexpr (sizeof(Unit) == 1) {
-            // The C library's search for bytes, whose time does not grow with the length of the needle, does the rest.
-            const auto rest = static_cast<std::size_t>(text.data() + text.size() - place);
-            place = static_cast<const Unit*>(memmem(place, rest, needle.data(), needle.size()));
-        } else {
-            const auto distance = static_cast<std::ptrdiff_t>(needle.size() - 1);
-            place = findPair(place, last, needle.front(), distance, needle.back());
-        }
-        if (place == nullptr) {
+    const Unit* first = text.data() + pos;
+    if constexpr (sizeof(Unit) == 1) {
+        // Often the first unit is not there at all, which the C library sees faster than anything else.
+        first = findUnit(first, last, needle.front());
+        if (first == nullptr) {
             return notFound;
         }
-        if (sameUnits(place, needle.data(), needle.size())) {
-            return static_cast<std::size_t>(place - text.data());
+    }
+    const auto places = static_cast<std::size_t>(last - first);
+    const vectors::Place place = vectors::findSequence(first, places, needle.data(), needle.size());
+    first += place.at;
+    if constexpr (sizeof(Unit) == 1) {
+        if (!place.isSettled) {
+            // The C library's search, whose time does not grow with the length of the needle, does the rest.
+            const auto rest = static_cast<std::size_t>(text.data() + text.size() - first);
+            first = static_cast<const Unit*>(memmem(first, rest, needle.data(), needle.size()));
+            return first != nullptr ? static_cast<std::size_t>(first - text.data()) : notFound;
         }
     }
+    return first != last ? static_cast<std::size_t>(first - text.data()) : notFound;
 }
 
 /// The last position at or before `pos` where `needle` stands.

@@ -1,0 +1,115 @@
+// What splitting, searching, hashing and case mapping must reach beside the plain way to do each: the standard library's
+// strings, a loop over the bytes, and ICU's own calls.
+#include "limits.h"
+
+#include <kvt/string/ustring.h>
+#include <kvt/string/ustring_array.h>
+
+#include <cstring>
+#include <random>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace kvt::ex;
+using kvt::bench::Bound;
+using kvt::bench::Limits;
+using kvt::bench::way;
+
+constexpr std::size_t mebibyte = 1 << 20;
+
+UString<0> string(const std::string& text) {
+    return UString<0>(UStringView<0>(text));
+}
+
+// ---- Splitting ----------------------------------------------------------------------------------------------------
+
+std::string fields(std::size_t length) {
+    std::mt19937_64 random(1);
+    std::string text;
+    while (text.size() < mebibyte) {
+        for (std::size_t i = 0; i < length; ++i) {
+            text += static_cast<char>('a' + random() % 26);
+        }
+        text += ',';
+    }
+    return text;
+}
+
+std::vector<std::string> splitPlainly(const std::string& text) {
+    std::vector<std::string> pieces;
+    std::size_t start = 0;
+    for (std::size_t end = 0; (end = text.find(',', start)) != std::string::npos; start = end + 1) {
+        pieces.push_back(text.substr(start, end - start));
+    }
+    pieces.push_back(text.substr(start));
+    return pieces;
+}
+
+void holdSplit(Limits& limits, std::size_t length, double limit) {
+    const std::string name = "split, fields of " + std::to_string(length);
+    const std::string text = fields(length);
+    limits.add(name, way([string = string(text)] { return string.split(','); }));
+    limits.add(name + ": find and push_back", way([text] { return splitPlainly(text); }));
+    limits.hold({name, name + ": find and push_back", Bound::atLeast, limit});
+}
+
+// ---- Searching ----------------------------------------------------------------------------------------------------
+
+/// Sentences in which the first unit of a needle is frequent and the needle is not.
+std::string prose(std::size_t size) {
+    const std::string sentence =
+        "the lazy dog and the other animals looked on, zealous and amazed, as the fox came; ";
+    std::string text;
+    while (text.size() < size) {
+        text += sentence;
+    }
+    text.resize(size);
+    return text;
+}
+
+/// The first byte by the C library, and then all of them.
+std::size_t findPlainly(const std::string& text, const std::string& needle) {
+    const char* place = text.data();
+    const char* const last = text.data() + (text.size() - needle.size() + 1);
+    while (place < last) {
+        place = static_cast<const char*>(
+            std::memchr(place, needle.front(), static_cast<std::size_t>(last - place)));
+        if (place == nullptr) {
+            break;
+        }
+        if (std::memcmp(place, needle.data(), needle.size()) == 0) {
+            return static_cast<std::size_t>(place - text.data());
+        }
+        ++place;
+    }
+    return std::string::npos;
+}
+
+void holdFind(Limits& limits, const std::string& name, std::size_t size, const std::string& needle,
+              bool isPlain, Bound bound, double limit) {
+    const std::string text = prose(size);
+    limits.add(name, way([text = string(text), needle = string(needle)] { return text.find(needle); }));
+    const std::string other = name + (isPlain ? ": memchr and memcmp" : ": std::string::find");
+    limits.add(other, way([text, needle, isPlain] {
+                   return isPlain ? findPlainly(text, needle) : text.find(needle);
+               }));
+    limits.hold({name, other, bound, limit});
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    Limits large(31, 3);
+    holdSplit(large, 8, 2);
+    holdSplit(large, 32, 1.2);
+    holdFind(large, "find in 1 MiB, frequent first byte", mebibyte, "animal kingdom", true, Bound::atLeast,
+             8);
+    Limits small(101, 20'000);
+    holdFind(small, "find in 64 bytes", 64, "looked in", false, Bound::atLeast, 1);
+    holdFind(small, "find in 64 bytes, rare first byte", 64, "quick", false, Bound::atLeast, 1);
+    holdFind(small, "find in 24 bytes", 24, "anima", false, Bound::shown, 1);
+    const bool isLargeWithin = large.run(argc, argv) == 0;
+    return small.run(argc, argv) == 0 && isLargeWithin ? 0 : 1;
+}
