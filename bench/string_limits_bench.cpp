@@ -5,8 +5,12 @@
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
 
+#include <unicode/ucasemap.h>
+
 #include <cstring>
+#include <memory>
 #include <random>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -98,6 +102,83 @@ void holdFind(Limits& limits, const std::string& name, std::size_t size, const s
     limits.hold({name, other, bound, limit});
 }
 
+// ---- Case mapping -------------------------------------------------------------------------------------------------
+
+/// Words of a sentence in a random order, since a text that repeats itself flatters whatever branches on characters.
+std::string shuffled(const char* sentence) {
+    std::istringstream stream(sentence);
+    std::vector<std::string> words;
+    for (std::string word; stream >> word;) {
+        words.push_back(word + " ");
+    }
+    std::mt19937_64 random(1);
+    std::string text;
+    while (text.size() < mebibyte) {
+        text += words[random() % words.size()];
+    }
+    return text;
+}
+
+using CaseFunction = std::int32_t (*)(const UCaseMap*, char*, std::int32_t, const char*, std::int32_t,
+                                      UErrorCode*);
+
+std::string mapPlainly(CaseFunction function, const UCaseMap* map, const std::string& text) {
+    std::string result(text.size(), '\0');
+    for (;;) {
+        UErrorCode status = U_ZERO_ERROR;
+        const std::int32_t needed = function(map, result.data(), static_cast<std::int32_t>(result.size()),
+                                             text.data(), static_cast<std::int32_t>(text.size()), &status);
+        if (static_cast<std::size_t>(needed) <= result.size()) {
+            return result;
+        }
+        result.resize(static_cast<std::size_t>(needed));
+    }
+}
+
+void holdCase(Limits& limits) {
+    struct Text {
+        const char* name;
+        const char* sentence;
+        Bound bound;
+        double limit;
+    };
+    const Text texts[] = {
+        {"ASCII", "The quick brown Fox jumps over the lazy Dog, and the dog does not mind it.",
+         Bound::atLeast, 20},
+        {"Latin", "Größere Brücken führen über die Flüsse; l'été, déjà, où l'élève rêve à côté.",
+         Bound::atLeast, 6},
+        {"Japanese",
+         "いろはにほへと ちりぬるを わかよたれそ 常ならむ、 有為の奥山 今日越えて 浅き夢見じ 酔ひもせず。",
+         Bound::atLeast, 1.7},
+        {"Cyrillic", "Съешь же ещё этих мягких французских булок, да выпей чаю.", Bound::shown, 0},
+        {"Greek", "Ξεσκεπάζω την ψυχοφθόρα ΒΔΕΛΥΓΜΙΑΣ σας.", Bound::shown, 0},
+    };
+    struct Mapping {
+        const char* name;
+        CaseFunction function;
+        UString<0> (UString<0>::*member)() const;
+    };
+    const Mapping mappings[] = {
+        {"fold", ucasemap_utf8FoldCase, &UString<0>::getAsFoldedCase},
+        {"upper", ucasemap_utf8ToUpper, &UString<0>::getAsUpperCase},
+        {"lower", ucasemap_utf8ToLower, &UString<0>::getAsLowerCase},
+    };
+    UErrorCode status = U_ZERO_ERROR;
+    const std::shared_ptr<UCaseMap> map(ucasemap_open("", 0, &status), &ucasemap_close);
+    for (const Mapping& mapping : mappings) {
+        for (const Text& row : texts) {
+            const std::string name = std::string(mapping.name) + ", " + row.name;
+            const std::string text = shuffled(row.sentence);
+            limits.add(name,
+                       way([string = string(text), member = mapping.member] { return (string.*member)(); }));
+            limits.add(name + ": ucasemap", way([map, function = mapping.function, text] {
+                           return mapPlainly(function, map.get(), text);
+                       }));
+            limits.hold({name, name + ": ucasemap", row.bound, row.limit});
+        }
+    }
+}
+
 } // namespace
 
 int main(int argc, char** argv) {
@@ -106,6 +187,7 @@ int main(int argc, char** argv) {
     holdSplit(large, 32, 1.2);
     holdFind(large, "find in 1 MiB, frequent first byte", mebibyte, "animal kingdom", true, Bound::atLeast,
              8);
+    holdCase(large);
     Limits small(101, 20'000);
     holdFind(small, "find in 64 bytes", 64, "looked in", false, Bound::atLeast, 1);
     holdFind(small, "find in 64 bytes, rare first byte", 64, "quick", false, Bound::atLeast, 1);

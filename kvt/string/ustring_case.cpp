@@ -1,10 +1,13 @@
-// Case mapping. ICU maps UTF-8 and UTF-16 directly, ASCII is mapped here, and the other text goes by way of UTF-16.
+// Case mapping. ICU maps UTF-8 and UTF-16 directly, ASCII is mapped here, and the other text goes by way of UTF-16. A long
+// text of UTF-8 is mapped by tables of what ICU does to each character, which know no language, as its case map.
 //
 // A result is never shorter than its source: where the mapped text has fewer units, zero units follow it. They are
 // real units that count in size() and take part in comparisons.
+#include <kvt/string/detail/case_table.h>
 #include <kvt/string/detail/instantiate.h>
 
 #include <kvt/encoding/detail/failure_text.h>
+#include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/ascii.h>
 #include <kvt/foundation/throwable.h>
 
@@ -14,13 +17,15 @@
 #include <algorithm>
 #include <array>
 #include <atomic>
+#include <limits>
 #include <memory>
+#include <string>
+#include <string_view>
 
 namespace kvt::ex {
 namespace {
 
-/// The mappings, as indexes of the tables below.
-enum class Mapping { upper, lower, folded };
+using Mapping = detail::CaseMapping; // also indexes of the tables below
 
 using CaseMap = std::unique_ptr<UCaseMap, decltype(&ucasemap_close)>;
 
@@ -84,18 +89,111 @@ UString<N> icuStringHelper(UStringView<N> source, Map map) {
     return result;
 }
 
-UString<0> mapUtf8(Mapping mapping, UStringView<0> source) {
+/// A text of UTF-8 that is mapped by a table, and by ICU where the table does not know.
+class MappingByTable {
+public:
+    MappingByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text)
+        : table_(detail::caseTable(mapping, caseMap)), caseMap_(caseMap), text_(text) {}
+
+    bool isDone() const { return taken_ == text_.size() && left_.empty(); }
+
+    /// Writes what comes next, as far as there is room, and returns the number of bytes.
+    std::size_t write(char* out, std::size_t room) {
+        std::size_t written = 0;
+        for (;;) {
+            const std::size_t copied = std::min(left_.size(), room - written);
+            left_.copy(out + written, copied);
+            left_.erase(0, copied);
+            written += copied;
+            if (!left_.empty()) {
+                return written;
+            }
+            const detail::vectors::CaseProgress progress = detail::vectors::mapCase(
+                table_, text_.data(), text_.size(), taken_, out + written, room - written);
+            taken_ = progress.taken;
+            written += progress.written;
+            if (!progress.isLeftToIcu) {
+                return written;
+            }
+            askIcu();
+        }
+    }
+
+    /// How many bytes are still to come.
+    std::size_t measure() const {
+        MappingByTable rest(*this);
+        std::size_t bytes = 0;
+        for (std::array<char, 4096> written; !rest.isDone();) {
+            bytes += rest.write(written.data(), written.size());
+        }
+        return bytes;
+    }
+
+private:
+    // What ICU writes to `out`, which has room for it, measures.
+    std::size_t call(std::string_view text, std::string& out) const {
+        UErrorCode status = U_ZERO_ERROR;
+        const std::int32_t size = detail::caseFunction(table_.mapping)(
+            caseMap_, out.data(), static_cast<std::int32_t>(out.size()), text.data(),
+            static_cast<std::int32_t>(text.size()), &status);
+        if (!isUsable(status)) {
+            throw UStringException("icuStringHelper() failed");
+        }
+        return static_cast<std::size_t>(size);
+    }
+
+    // The next character is mapped as its neighbours have it, which none behind a blank are. So ICU sees it with all that
+    // stands between two blanks; what of that lies in front is mapped already. Where there is one such character there
+    // are more, so that ICU goes some way on.
+    void askIcu() {
+        constexpr std::size_t someWay = 256;
+        const std::size_t blank = text_.substr(0, taken_).find_last_of(' ');
+        const std::size_t begin = blank == std::string_view::npos ? 0 : blank + 1;
+        const std::size_t end = std::min(text_.find(' ', taken_ + someWay), text_.size());
+        const std::string_view asked = text_.substr(begin, end - begin);
+        left_.resize(3 * asked.size()); // as long as any mapping gets
+        left_.resize(call(asked, left_));
+        std::string before(left_.size(), '\0');
+        left_.erase(0, call(text_.substr(begin, taken_ - begin), before));
+        taken_ = end;
+    }
+
+    const detail::CaseTable& table_;
+    const UCaseMap* caseMap_;
+    std::string_view text_;
+    std::size_t taken_ = 0;
+    std::string left_; // what ICU gave and was not written yet
+};
+
+// The table repays its making after some of such texts. ICU refuses what maps to more than its lengths can say.
+constexpr std::size_t leastForTable = 1024;
+constexpr std::size_t mostForTable = std::numeric_limits<std::int32_t>::max() / 4;
+
+void mapByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text, std::string& out) {
+    MappingByTable mapped(mapping, caseMap, text);
+    detail::appendInPlace(out, text.size(), [&](char* to) { return mapped.write(to, text.size()); });
+    if (!mapped.isDone()) {
+        const std::size_t rest = mapped.measure();
+        detail::appendInPlace(out, rest, [&](char* to) { return mapped.write(to, rest); });
+    }
+    if (out.size() < text.size()) {
+        out.resize(text.size());
+    }
+}
+
+// `storage` gives the units of a string.
+template <typename Storage>
+UString<0> mapUtf8(Mapping mapping, UStringView<0> source, Storage storage) {
     const UCaseMap* const caseMap = source.isEmpty() ? nullptr : defaultCaseMap();
+    if (source.size() >= leastForTable && source.size() <= mostForTable) {
+        UString<0> result;
+        mapByTable(mapping, caseMap, {source.data(), source.size()}, storage(result));
+        return result;
+    }
+    const detail::CaseFunction function = detail::caseFunction(mapping);
     return icuStringHelper(source, [&](char* target, std::int32_t capacity, const char* text,
                                        std::int32_t length, UErrorCode* status) {
-        switch (mapping) {
-        case Mapping::upper:
-            return ucasemap_utf8ToUpper(caseMap, target, capacity, text, length, status);
-        case Mapping::lower:
-            return ucasemap_utf8ToLower(caseMap, target, capacity, text, length, status);
-        default:
-            return ucasemap_utf8FoldCase(caseMap, target, capacity, text, length, status);
-        }
+        return function(caseMap, target, capacity, text, length, status);
     });
 }
 
@@ -163,9 +261,9 @@ UString<2> mapped(const UString<2>& text) {
     }
 }
 
-// The mapped copy of a view. `name` is the member that was called.
-template <std::uint32_t N, Mapping mapping>
-UString<N> map(UStringView<N> view, const char* name) {
+// The mapped copy of a view. `name` is the member that was called; `storage` gives the units of a string.
+template <std::uint32_t N, Mapping mapping, typename Storage>
+UString<N> map(UStringView<N> view, const char* name, Storage storage) {
     constexpr auto index = static_cast<std::size_t>(mapping);
     using Unit = detail::CodeUnit<N>;
     const std::string_view bytes(reinterpret_cast<const char*>(view.data()), view.size() * sizeof(Unit));
@@ -173,7 +271,7 @@ UString<N> map(UStringView<N> view, const char* name) {
     if constexpr (N == Encoding::Binary) {
         throw UStringNotImplementedException(name);
     } else if constexpr (N == Encoding::Utf8) {
-        return guarded(utf8Contexts[index], bytes, encoding, [&] { return mapUtf8(mapping, view); });
+        return guarded(utf8Contexts[index], bytes, encoding, [&] { return mapUtf8(mapping, view, storage); });
     } else if constexpr (N == Encoding::Utf16LE) {
         return guarded(utf16Contexts[index], bytes, encoding, [&] { return mapUtf16(mapping, view); });
     } else if constexpr (N == Encoding::UsAscii) {
@@ -187,9 +285,9 @@ UString<N> map(UStringView<N> view, const char* name) {
 }
 
 // The same in place. A UString<30> converts the result into its own encoding.
-template <Mapping mapping, std::uint32_t N>
-UString<N> mapInto(const UString<N>& string, const char* name) {
-    UString<N> result = map<N, mapping>(string, name);
+template <Mapping mapping, std::uint32_t N, typename Storage>
+UString<N> mapInto(const UString<N>& string, const char* name, Storage storage) {
+    UString<N> result = map<N, mapping>(string, name, storage);
     if constexpr (N == Encoding::Unknown) {
         return result.getAsEncoding(string.encoding());
     }
@@ -200,17 +298,20 @@ UString<N> mapInto(const UString<N>& string, const char* name) {
 
 template <std::uint32_t N>
 UString<N> UString<N>::getAsUpperCase(UStringView<N> text) {
-    return map<N, Mapping::upper>(text, "getAsUpperCase");
+    return map<N, Mapping::upper>(
+        text, "getAsUpperCase", [](UString & string) -> auto& { return string.storage_; });
 }
 
 template <std::uint32_t N>
 UString<N> UString<N>::getAsLowerCase(UStringView<N> text) {
-    return map<N, Mapping::lower>(text, "getAsLowerCase");
+    return map<N, Mapping::lower>(
+        text, "getAsLowerCase", [](UString & string) -> auto& { return string.storage_; });
 }
 
 template <std::uint32_t N>
 UString<N> UString<N>::getAsFoldedCase(UStringView<N> text) {
-    return map<N, Mapping::folded>(text, "getAsFoldedCase");
+    return map<N, Mapping::folded>(
+        text, "getAsFoldedCase", [](UString & string) -> auto& { return string.storage_; });
 }
 
 template <std::uint32_t N>
@@ -234,7 +335,8 @@ void UString<N>::toUpperCase() {
         std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
                        mapAscii<Mapping::upper>);
     } else {
-        *this = mapInto<Mapping::upper>(*this, "toUpperCase");
+        *this = mapInto<Mapping::upper>(
+            *this, "toUpperCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }
 
@@ -244,7 +346,8 @@ void UString<N>::toLowerCase() {
         std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
                        mapAscii<Mapping::lower>);
     } else {
-        *this = mapInto<Mapping::lower>(*this, "toLowerCase");
+        *this = mapInto<Mapping::lower>(
+            *this, "toLowerCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }
 
@@ -253,7 +356,8 @@ void UString<N>::toFoldedCase() {
     if constexpr (N == Encoding::UsAscii) {
         toLowerCase();
     } else {
-        *this = mapInto<Mapping::folded>(*this, "toFoldedCase");
+        *this = mapInto<Mapping::folded>(
+            *this, "toFoldedCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }
 

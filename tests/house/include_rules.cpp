@@ -317,12 +317,14 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
     };
     static const std::vector<House> houses = {
         {{"unicode/"},
-         {"kvt/encoding/icu.cpp", "kvt/encoding/detail/icu.h", "kvt/string/ustring_case.cpp"},
-         "ICU is used in kvt/encoding/icu.cpp and its private header"},
+         {"kvt/encoding/icu.cpp", "kvt/encoding/detail/icu.h", "kvt/string/ustring_case.cpp",
+          "kvt/string/case_table.cpp", "kvt/string/detail/case_table.h"},
+         "ICU is used in kvt/encoding/icu.cpp and its private header, and for case"},
         {{"hwy/"},
          {"kvt/encoding/unicode_convert.cpp", "kvt/encoding/unicode_measure.cpp",
-          "kvt/encoding/detail/unicode_characters-inl.h", "kvt/string/unit_vectors.cpp"},
-         "Highway is used for the Unicode forms and for search"},
+          "kvt/encoding/detail/unicode_characters-inl.h", "kvt/string/case_vectors.cpp",
+          "kvt/string/unit_vectors.cpp"},
+         "Highway is used for the Unicode forms, for case and for search"},
         {{"date/"},
          {"kvt/datetime/calendar.cpp", "kvt/datetime/local_zone.cpp", "kvt/datetime/zone_operations.cpp"},
          "the date library is used for the calendar and for zones"},
