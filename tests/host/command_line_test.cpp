@@ -137,6 +137,16 @@ TEST_F(KvtCommandLine, UnknownWordsSuggestTheNearest) {
     }
 }
 
+TEST_F(KvtCommandLine, HelpForACommandThatThereIsNotIsRefused) {
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"nosuch", "--help"}, {"date", "nosuch", "--help"}, {"--help", "nosuch"}}) {
+        const ChildResult result = kvt(arguments);
+        EXPECT_EQ(result.out, "");
+        EXPECT_TRUE(contains(result.err, "unknown command 'nosuch'")) << result.err;
+        EXPECT_EQ(result.status, 2);
+    }
+}
+
 TEST_F(KvtCommandLine, MissingOptionsAreNamed) {
     struct Row {
         std::vector<std::string> arguments;

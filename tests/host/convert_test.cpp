@@ -99,6 +99,23 @@ TEST_F(KvtConvert, UnknownEncodingIsRefusedWithASuggestion) {
     EXPECT_EQ(convert("", "UTF-8", "").status, 2);
 }
 
+TEST_F(KvtConvert, ANameWithACommaIsRefusedWithWhatWasMeant) {
+    for (const auto& [name, part] : {std::pair{"windows-1252,KOI8-R", "'kvt convert --dry-run' only"},
+                                     {"windows-1252,foo=bar", "Did you mean 'windows-1252'?"},
+                                     {"windows-1252,", "Did you mean 'windows-1252'?"},
+                                     {"nosuch,KOI8-R", "\"nosuch,KOI8-R\""}}) {
+        const ChildResult to = convert("UTF-8", name, "a");
+        EXPECT_EQ(to.out, "") << name;
+        EXPECT_TRUE(contains(to.err, part)) << to.err;
+        EXPECT_EQ(to.status, 2) << name;
+        EXPECT_EQ(convert(name, "UTF-8", "a").status, 2) << name;
+        EXPECT_EQ(kvt({"encodings", name}).status, 2) << name;
+    }
+    EXPECT_EQ(convert("UTF-8", "windows-1252,foo=bar", "a", {"--dry-run"}).status, 2);
+    // Some names have one.
+    EXPECT_EQ(convert("UTF-8", "ibm-37_p100-1995,swaplfnl", "a").out, "\x81");
+}
+
 TEST_F(KvtConvert, EncodingsWithoutAConverterAreRefused) {
     for (const std::string name : {"binary", "zqt-binary", "zqt-wwjd"}) {
         const ChildResult result = convert("UTF-8", name, "a");

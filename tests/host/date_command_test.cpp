@@ -31,6 +31,12 @@ protected:
         write("zones/version", "2020a\n");
         return path("zones");
     }
+
+    // The rules of the system.
+    std::string systemZones() {
+        EXPECT_EQ(kvt({"tzdata", "--output", "system"}).status, 0);
+        return path("system");
+    }
 };
 
 TEST_F(KvtDate, EachFunctionGivesItsResult) {
@@ -272,6 +278,105 @@ TEST_F(KvtDate, AMissingDatabaseIsNamed) {
     EXPECT_TRUE(contains(set.err, "kvt doctor")) << set.err;
     // UTC needs none.
     EXPECT_TRUE(date({"now", "--utc", "--zone-database", path("none")}).out.ends_with("+00:00\n"));
+}
+
+TEST_F(KvtDate, AZoneHasANameAndTheOffsetOfTheMoment) {
+    const std::string zones = systemZones();
+    struct Row {
+        std::string value;
+        std::string zone;
+        std::string mode;
+        std::string result;
+    };
+    for (const Row& row : {Row{"20200131120000+02:00", "CET", "automatic", "20200131110000+01:00"},
+                           Row{"20200131120000+02:00", "EST", "automatic", "20200131050000-05:00"},
+                           Row{"20200731120000+02:00", "Europe/Berlin", "convert", "20200731120000+02:00"},
+                           Row{"20200131120000+02:00", "Europe/Berlin", "replace", "20200131120000+01:00"},
+                           Row{"20200131120000+02:00", "GMT", "automatic", "20200131100000+00:00"},
+                           Row{"20200131120000.25", "Asia/Kolkata", "automatic", "20200131120000.25+05:30"},
+                           Row{"20200701", "Europe/Berlin", "automatic", "20200701000000+02:00"},
+                           Row{"20200131120000", " UTC ", "automatic", "20200131120000+00:00"},
+                           // Across midnight, and in the hour that the clocks show twice.
+                           Row{"20200101003000+01:00", "America/New_York", "convert", "20191231183000-05:00"},
+                           Row{"20201025013000+00:00", "Europe/Berlin", "convert", "20201025023000+01:00"}}) {
+        const ChildResult result =
+            date({"zone", "set", row.value, row.zone, "--mode", row.mode, "--zone-database", zones});
+        EXPECT_EQ(result.out, row.result + "\n") << row.zone << ": " << result.err;
+        EXPECT_EQ(result.status, 0) << row.zone;
+    }
+    for (const auto& [value, number] : {std::pair{"20200329023000", "(933094)"},
+                                        {"20201025023000", "(933095)"},
+                                        {"120000", "(933096)"},
+                                        {"20200230120000", "(933065)"},
+                                        {"x", "(933063)"}}) {
+        const ChildResult result = date({"zone", "set", value, "Europe/Berlin", "--zone-database", zones});
+        EXPECT_TRUE(contains(result.err, number)) << value << ": " << result.err;
+        EXPECT_EQ(result.out, "") << value;
+        EXPECT_EQ(result.status, 2) << value;
+    }
+    EXPECT_TRUE(contains(
+        date({"zone", "set", "20200131", "UTC+1", "--mode", "convert", "--zone-database", zones}).err,
+        "neither an offset"));
+}
+
+TEST_F(KvtDate, AZoneThatThereIsNotIsFoundBeforeTheFirstLine) {
+    const std::string zones = systemZones();
+    for (const auto& [zone, part] : {std::pair{"+1", "such as +01:00"},
+                                     {"Europe/Berln", "Did you mean 'Europe/Berlin'?"},
+                                     {"", "ZONE is empty"},
+                                     {"+24:0", "such as +01:00"}}) {
+        const ChildResult result = date({"zone", "set", zone, "--zone-database", zones}, "20200131\n");
+        EXPECT_TRUE(contains(result.err, part)) << result.err;
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.status, 2);
+    }
+}
+
+TEST_F(KvtDate, LocalWorksWithoutAFolderOfTheUsersOwn) {
+    ChildSetup made = setup({"date", "zone", "set", "20200131120000", "local"});
+    made.environment = {{"HOME", folder_.string()}, {"XDG_CACHE_HOME", ""}};
+    const ChildResult first = runChild(made);
+    EXPECT_EQ(first.status, 0) << first.err;
+    EXPECT_EQ(first.err, "");
+    const std::vector<std::string> kept = names();
+    EXPECT_EQ(kept, std::vector<std::string>{".cache"});
+    const auto folder = std::filesystem::directory_iterator(folder_ / ".cache/kvt")->path();
+    const auto written = std::filesystem::last_write_time(folder / "europe");
+    EXPECT_EQ(runChild(made).out, first.out);
+    EXPECT_EQ(std::filesystem::last_write_time(folder / "europe"), written);
+    // What is damaged is made anew.
+    std::ofstream(folder / "europe") << "Zone\n";
+    EXPECT_EQ(runChild(made).out, first.out);
+    // Nowhere to keep it: as if there were no rules.
+    made.environment = {{"HOME", "/dev/null"}, {"XDG_CACHE_HOME", ""}};
+    const ChildResult nowhere = runChild(made);
+    EXPECT_TRUE(contains(nowhere.err, "kvt doctor")) << nowhere.err;
+    EXPECT_EQ(nowhere.status, 2);
+}
+
+TEST_F(KvtDate, AResultWithoutAValueIsAFailure) {
+    const ChildResult one = date({"add", "99991231", "P1D"});
+    EXPECT_EQ(one.out, "");
+    EXPECT_TRUE(contains(one.err, "outside the years")) << one.err;
+    EXPECT_EQ(one.status, 2);
+    const ChildResult lines = date({"add", "P1D"}, "99991230\n99991231\n");
+    EXPECT_EQ(lines.out, "99991231\n\n");
+    EXPECT_TRUE(contains(lines.err, "line 2")) << lines.err;
+    EXPECT_EQ(lines.status, 1);
+    const ChildResult json = date({"add", "99991231", "P1D", "--json"});
+    EXPECT_TRUE(contains(json.out, "\"state\":\"Failure\",\"result\":null")) << json.out;
+    EXPECT_EQ(json.status, 2);
+}
+
+TEST_F(KvtDate, AFormatThatWouldOnlyBeWrittenAsItStandsIsRefused) {
+    for (const char* format : {"ISO8601", "dd.mm.yyyy", "|", "ISO x"}) {
+        const ChildResult result = date({"format", format}, "20200131\n");
+        EXPECT_TRUE(contains(result.err, "neither a known keyword")) << format << ": " << result.err;
+        EXPECT_EQ(result.out, "") << format;
+        EXPECT_EQ(result.status, 2) << format;
+    }
+    EXPECT_EQ(date({"format", "20200131", "x| iso "}).out, "2020-01-31\n");
+    EXPECT_EQ(date({"format", "20200131", "%%"}).out, "%\n");
 }
 
 TEST_F(KvtDate, WrongCommandLinesAreRefused) {

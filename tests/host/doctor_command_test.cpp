@@ -65,10 +65,19 @@ TEST_F(KvtDoctor, TheZoneIsThatOfTheMachineAndNotOfTheVariable) {
 }
 
 TEST_F(KvtDoctor, TheDatabaseIsLookedForAndItsVersionCompared) {
-    const nlohmann::json byItself = finding("zone database", {{"HOME", folder_.string()}});
+    const std::vector<std::pair<std::string, std::string>> home = {{"HOME", folder_.string()},
+                                                                   {"XDG_CACHE_HOME", path("kept")}};
+    const nlohmann::json kept = finding("zone database", home);
+    EXPECT_TRUE(kept["value"].get<std::string>().starts_with(path("kept/kvt/tzdata-"))) << kept;
+    EXPECT_EQ(kept["source"], "kept by the command, made from /usr/share/zoneinfo/tzdata.zi");
+    EXPECT_TRUE(kept["warning"].is_null());
+    std::filesystem::create_directories(path("Downloads/tzdata"));
+    const nlohmann::json byItself = finding("zone database", home);
     EXPECT_EQ(byItself["value"], path("Downloads/tzdata"));
     EXPECT_EQ(byItself["source"], "where the library looks by itself");
-    EXPECT_FALSE(byItself["warning"].is_null());
+    const nlohmann::json nowhere = finding("zone database", {{"HOME", "/dev/null"}, {"XDG_CACHE_HOME", ""}});
+    EXPECT_EQ(nowhere["value"], "/dev/null/Downloads/tzdata");
+    EXPECT_FALSE(nowhere["warning"].is_null());
 
     std::filesystem::create_directory(path("zones"));
     const nlohmann::json given = finding("zone database", {}, {"--zone-database", path("zones")});

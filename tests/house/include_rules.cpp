@@ -88,8 +88,8 @@ const std::map<std::string, std::vector<std::string>>& neighbourRooms() {
         {"cli", {"base/"}},
         {"text", {"base/", "cli/"}},
         {"convert", {"base/", "cli/", "text/"}},
-        {"date", {"base/", "cli/", "text/"}},
-        {"zone", {"base/", "cli/", "text/", "date/"}},
+        {"zone", {"base/", "cli/", "text/"}},
+        {"date", {"base/", "cli/", "text/", "zone/"}},
         {"sort", {"base/", "cli/", "text/"}},
         {"memory", {"base/", "cli/"}},
     };

@@ -108,6 +108,12 @@ std::string complaint(const CLI::App& app, const CLI::ParseError& error) {
                             : "unknown command '" + printable(word) + "'." + didYouMean(word, commands);
 }
 
+int refuse(const CLI::App& app, const CLI::ParseError& error, Diagnostics& diagnostics) {
+    diagnostics.say(complaint(app, error));
+    diagnostics.line("Try '" + fullName(innermost(app)) + " --help'.");
+    return NotDone;
+}
+
 } // namespace
 
 int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) {
@@ -126,7 +132,12 @@ int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) 
     }
     try {
         app.parse(argc, argv);
-    } catch (const CLI::CallForHelp&) {
+    } catch (const CLI::CallForHelp& call) {
+        // Help for a command that there is not would be help with something else.
+        const CLI::App& place = innermost(app);
+        if (!place.get_subcommands({}).empty() && !place.remaining().empty()) {
+            return refuse(app, call, diagnostics);
+        }
         print(app.help());
         return Done;
     } catch (const CLI::ParseError& error) {
@@ -138,9 +149,7 @@ int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) 
             diagnostics.line(app.help());
             return NotDone;
         }
-        diagnostics.say(complaint(app, error));
-        diagnostics.line("Try '" + fullName(innermost(app)) + " --help'.");
-        return NotDone;
+        return refuse(app, error, diagnostics);
     }
     for (std::size_t index = 0; index < commands.size(); ++index) {
         if (syntaxes[index]->isChosen()) {

@@ -79,22 +79,6 @@ std::string tableOf(const std::vector<Target>& targets) {
 
 } // namespace
 
-std::vector<std::string> splitEncodings(const std::string& list) {
-    std::vector<std::string> names;
-    for (std::size_t begin = 0; begin <= list.size();) {
-        const std::size_t end = std::min(list.find(',', begin), list.size());
-        const std::string piece = list.substr(begin, end - begin);
-        const bool isOption = piece.find('=') != std::string::npos || piece == "swaplfnl";
-        if (isOption && !names.empty()) {
-            names.back() += "," + piece;
-        } else {
-            names.push_back(piece);
-        }
-        begin = end + 1;
-    }
-    return names;
-}
-
 int dryRun(const ConvertOptions& options, Encoding from, const std::vector<Encoding>& encodings,
            Diagnostics& diagnostics) {
     checkMark(options.mark, from);

@@ -69,7 +69,7 @@ public:
         std::vector<EncodingEntry> entries;
         int status = Done;
         for (const std::string& name : names_) {
-            const kvt::ex::Encoding encoding(name, kvt::ex::nothrow);
+            const kvt::ex::Encoding encoding = namedEncoding(name);
             if (encoding.id() == kvt::ex::Encoding::Unknown) {
                 diagnostics.say(unknownEncoding(name, catalogue));
                 status = NotDone;

@@ -2,13 +2,18 @@
 
 #include "date/function.h"
 
+#include "base/failure.h"
+#include "base/messages.h"
 #include "base/table.h"
+#include "base/text.h"
+#include "base/text_units.h"
 #include "cli/choices.h"
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/message_numbers.h>
 #include <kvt/datetime/pattern_trace.h>
 
+#include <algorithm>
 #include <limits>
 
 namespace host {
@@ -105,7 +110,27 @@ private:
     std::string ownNotes() const override {
         return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
     }
-    void prepare(const std::string& operand) override { format_ = toUString(operand); }
+    void prepare(const std::string& operand) override {
+        // The library takes such a format for text that is to be written as it stands.
+        if (operand.find('%') == std::string::npos && !withoutBlanks(operand).empty() &&
+            !hasKeyword(operand)) {
+            throw Failure(describe(datetime::message_number::noKnownKeyword, {printable(operand)}));
+        }
+        format_ = toUString(operand);
+    }
+    // Whether one of the words between "|" is a keyword, in any case.
+    static bool hasKeyword(const std::string& format) {
+        for (std::size_t begin = 0; begin <= format.size();) {
+            const std::size_t end = std::min(format.find('|', begin), format.size());
+            std::string word = withoutBlanks(std::string_view(format).substr(begin, end - begin));
+            std::transform(word.begin(), word.end(), word.begin(), asciiLower);
+            if (word == "zqt" || word == "iso") {
+                return true;
+            }
+            begin = end + 1;
+        }
+        return false;
+    }
     DateOutcome apply(const UString<0>& value) override {
         DateOutcome outcome = outcomeOf(datetime::format(value, format_));
         outcome.withoutMessage = emptyValue;

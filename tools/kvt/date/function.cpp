@@ -5,6 +5,7 @@
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "date/lines.h"
+#include "zone/zone_folder.h"
 
 #include <kvt/datetime/datetime.h>
 
@@ -78,15 +79,24 @@ int FunctionGroup::run(Diagnostics& diagnostics) {
 }
 
 void ZoneDatabaseOption::declare(Syntax& syntax) {
-    syntax.option("--zone-database", folder_, "DIR",
-                  "Folder with the zone database, which 'kvt tzdata' writes; "
-                  "~/Downloads/tzdata without this option");
+    syntax.option("--zone-database", named_, "DIR",
+                  "Folder with the zone database, as 'kvt tzdata' writes it; without this option "
+                  "~/Downloads/tzdata, or else one that the command keeps in the cache");
+}
+
+std::string ZoneDatabaseOption::folder() const {
+    return zoneFolder(named_).path;
 }
 
 void ZoneDatabaseOption::use() const {
-    if (!folder_.empty()) {
-        kvt::ex::datetime::setInstallPathWrapper(folder_);
-    }
+    kvt::ex::datetime::setInstallPathWrapper(folder());
+}
+
+std::string withoutBlanks(std::string_view text) {
+    constexpr std::string_view blanks = " \t\r\n\f\v";
+    const std::size_t begin = std::min(text.find_first_not_of(blanks), text.size());
+    const std::size_t end = text.find_last_not_of(blanks) + 1;
+    return std::string(text.substr(begin, std::max(end, begin) - begin));
 }
 
 kvt::ex::UString<0> toUString(const std::string& utf8) {

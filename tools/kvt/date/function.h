@@ -95,13 +95,18 @@ class ZoneDatabaseOption {
 public:
     void declare(Syntax& syntax);
     void use() const;
+    /// The folder, which is made where it has to be and can be.
+    std::string folder() const;
 
 private:
-    std::string folder_;
+    std::string named_;
 };
 
 /// The text of an argument. Throws what the library throws where it is no UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
+
+/// Without what the library strips from values and formats.
+std::string withoutBlanks(std::string_view text);
 
 /// What the help of every function says about input and exit statuses.
 extern const char* const valueNotes;

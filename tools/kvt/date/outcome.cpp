@@ -2,7 +2,6 @@
 
 #include "base/messages.h"
 #include "base/text.h"
-#include "base/text_units.h"
 
 #include <kvt/datetime/message_numbers.h>
 
@@ -16,15 +15,6 @@ using kvt::ex::datetime::LogMessageInfo;
 using kvt::ex::datetime::ReturnState;
 namespace message_number = kvt::ex::datetime::message_number;
 
-// The library reads bytes, and may have found the difference inside a character. It then is that character which did
-// not fit.
-void splitAtCharacter(std::string& matched, std::string& rest) {
-    while (!matched.empty() && !rest.empty() && isContinuation(rest.front())) {
-        rest.insert(rest.begin(), matched.back());
-        matched.pop_back();
-    }
-}
-
 template <typename Result>
 DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json value) {
     DateOutcome outcome{std::get<0>(result), nullptr, std::nullopt};
@@ -36,9 +26,6 @@ DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json valu
         for (const kvt::ex::UString<0>& parameter : message->parameters) {
             copy.parameters.push_back(parameter.toStdString());
         }
-        if (copy.number == message_number::formatMismatch && copy.parameters.size() == 2) {
-            splitAtCharacter(copy.parameters[0], copy.parameters[1]);
-        }
     }
     return outcome;
 }
@@ -46,6 +33,9 @@ DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json valu
 std::string sentence(const DateOutcome& outcome) {
     if (!outcome.message) {
         return outcome.withoutMessage;
+    }
+    if (!outcome.message->text.empty()) {
+        return outcome.message->text;
     }
     std::vector<std::string> shown;
     for (const std::string& parameter : outcome.message->parameters) {
@@ -57,7 +47,11 @@ std::string sentence(const DateOutcome& outcome) {
 } // namespace
 
 DateOutcome outcomeOf(const kvt::ex::datetime::TextResult& result) {
-    return outcomeWithMessage(result, std::get<1>(result).toStdString());
+    DateOutcome outcome = outcomeWithMessage(result, std::get<1>(result).toStdString());
+    // The library has no message for a result beyond the last day that a value can hold.
+    return outcome.isGood() && std::get<1>(result).isEmpty()
+               ? failedOutcome("There is no value for the result: it lies outside the years 1000 to 9999.")
+               : outcome;
 }
 
 DateOutcome outcomeOf(const kvt::ex::datetime::NumberResult& result) {

@@ -15,6 +15,7 @@ namespace host {
 struct DateMessage {
     std::uint32_t number;
     std::vector<std::string> parameters;
+    std::string text = {}; ///< in place of the sentence that the number has; empty where that fits
 };
 
 struct DateOutcome {

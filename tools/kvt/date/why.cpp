@@ -38,13 +38,6 @@ std::string inQuotes(std::string_view text) {
     return "\"" + printable(text) + "\"";
 }
 
-std::string withoutBlanks(std::string_view text) {
-    constexpr std::string_view blanks = " \t\r\n\f\v";
-    const std::size_t begin = std::min(text.find_first_not_of(blanks), text.size());
-    const std::size_t end = text.find_last_not_of(blanks) + 1;
-    return std::string(text.substr(begin, std::max(end, begin) - begin));
-}
-
 const char* stateName(PatternStepState state) {
     switch (state) {
     case PatternStepState::Read:

@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/messages.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "base/unicode_data.h"
 #include "cli/suggest.h"
 
@@ -22,6 +23,21 @@ std::string nameOf(Encoding encoding) {
 // The library's own converterless encoding of text has characters of many bytes.
 bool isSingleByte(Encoding encoding) {
     return encoding.id() != Encoding::Wwjd && encoding.isSingleByte();
+}
+
+// As ICU compares names: by letters and digits, in any case.
+std::string comparedForm(std::string_view name) {
+    std::string form;
+    for (const char byte : name) {
+        if (byte != '-' && byte != '_' && byte != ' ') {
+            form += asciiLower(byte);
+        }
+    }
+    return form;
+}
+
+bool isKnown(const std::string& name) {
+    return namedEncoding(name).id() != Encoding::Unknown;
 }
 
 } // namespace
@@ -86,12 +102,48 @@ std::vector<std::string> EncodingCatalogue::names() const {
     return {names.begin(), names.end()};
 }
 
+std::vector<std::string> splitEncodings(const std::string& list) {
+    std::vector<std::string> names;
+    for (std::size_t begin = 0; begin <= list.size();) {
+        const std::size_t end = std::min(list.find(',', begin), list.size());
+        const std::string piece = list.substr(begin, end - begin);
+        const bool isOption = piece.find('=') != std::string::npos || piece == "swaplfnl";
+        if (isOption && !names.empty()) {
+            names.back() += "," + piece;
+        } else {
+            names.push_back(piece);
+        }
+        begin = end + 1;
+    }
+    return names;
+}
+
+Encoding namedEncoding(const std::string& name) {
+    const Encoding encoding(name, kvt::ex::nothrow);
+    if (name.find(',') == std::string::npos || encoding.id() == Encoding::Unknown) {
+        return encoding;
+    }
+    const std::vector<std::string> names = EncodingCatalogue().names();
+    const bool isName = std::any_of(names.begin(), names.end(), [&](const std::string& known) {
+        return comparedForm(known) == comparedForm(name);
+    });
+    return isName ? encoding : Encoding(Encoding::Unknown);
+}
+
 std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue) {
-    return describe(910005, {printable(name)}) + didYouMean(name, catalogue.names());
+    const std::string unknown = describe(910005, {printable(name)});
+    const std::vector<std::string> pieces = splitEncodings(name);
+    if (pieces.size() > 1 && std::all_of(pieces.begin(), pieces.end(), isKnown)) {
+        return unknown + " Several encodings go with 'kvt convert --dry-run' only.";
+    }
+    const std::string first = name.substr(0, name.find(','));
+    return unknown + (first.size() < name.size() && isKnown(first)
+                          ? " Did you mean '" + printable(first) + "'?"
+                          : didYouMean(name, catalogue.names()));
 }
 
 Encoding textEncoding(const std::string& name) {
-    const Encoding encoding(name, kvt::ex::nothrow);
+    const Encoding encoding = namedEncoding(name);
     switch (encoding.id()) {
     case Encoding::Unknown:
         throw Failure(unknownEncoding(name, EncodingCatalogue()));

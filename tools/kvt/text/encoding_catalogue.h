@@ -40,10 +40,17 @@ private:
     std::map<std::uint32_t, Known> known_;
 };
 
-/// The encoding of that name, which must have a converter. Throws Failure with suggestions.
+/// The encoding of that name, which must have a converter. Throws Failure with what was probably meant.
 kvt::ex::Encoding textEncoding(const std::string& name);
 
 /// What to say about a name that nobody knows.
 std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue);
+
+/// The encoding of that name; Unknown where there is none. A comma belongs to some names, such as
+/// "ibm-37_P100-1995,swaplfnl". ICU overlooks one with anything behind it, and that is a name of no encoding here.
+kvt::ex::Encoding namedEncoding(const std::string& name);
+
+/// "windows-1252,KOI8-R" as two names, each of which may have a comma of its own.
+std::vector<std::string> splitEncodings(const std::string& list);
 
 } // namespace host

@@ -1,23 +1,26 @@
 // `kvt doctor`: what surprises people about zones and encodings, as the library finds it here.
 
+#include "base/messages.h"
 #include "base/output.h"
 #include "base/table.h"
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
-#include "date/outcome.h"
 #include "zone/machine_zone.h"
+#include "zone/zone_files.h"
+#include "zone/zone_folder.h"
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/zone_folder.h>
 #include <kvt/encoding/encoding.h>
+
+#include <nlohmann/json.hpp>
 
 #include <cerrno>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <locale.h>
-#include <pwd.h>
 #include <sys/statvfs.h>
 #include <system_error>
 #include <unistd.h>
@@ -29,7 +32,6 @@ namespace {
 namespace fs = std::filesystem;
 namespace datetime = kvt::ex::datetime;
 
-constexpr const char* distributionFile = "/usr/share/zoneinfo/tzdata.zi";
 // Below this a folder is no place for a backing file of any size.
 constexpr std::uint64_t littleSpace = std::uint64_t{1} << 30;
 
@@ -116,20 +118,21 @@ Finding zoneVariable() {
             "Most programs obey TZ; the library does not, and always takes the zone of the machine."};
 }
 
-std::string homeFolder() {
-    const std::string home = variable("HOME");
-    if (!home.empty()) {
-        return home;
+Finding databaseFolder(const ZoneFolder& folder) {
+    Finding finding{"zone database", printable(folder.path), "", ""};
+    switch (folder.origin) {
+    case ZoneFolder::Origin::Named:
+        finding.source = "--zone-database";
+        break;
+    case ZoneFolder::Origin::Usual:
+        finding.source = "where the library looks by itself";
+        break;
+    case ZoneFolder::Origin::Cached:
+        finding.source = std::string("kept by the command, made from ") + systemZoneRules;
+        break;
     }
-    const passwd* user = ::getpwuid(::getuid());
-    return user == nullptr ? std::string() : std::string(user->pw_dir);
-}
-
-Finding databaseFolder(const std::string& folder, bool isGiven) {
-    Finding finding{"zone database", printable(folder),
-                    isGiven ? "--zone-database" : "where the library looks by itself", ""};
     std::error_code error;
-    if (!fs::is_directory(folder, error)) {
+    if (!fs::is_directory(folder.path, error)) {
         finding.warning =
             "There is no such folder, and without it nothing knows what \"local\" means; 'kvt tzdata' "
             "writes one.";
@@ -139,7 +142,7 @@ Finding databaseFolder(const std::string& folder, bool isGiven) {
 
 // "# version 2025b" at the head of the distribution's file.
 std::string distributionVersion() {
-    const std::string head = firstLine(distributionFile);
+    const std::string head = firstLine(systemZoneRules);
     const std::string lead = "# version ";
     return head.starts_with(lead) ? head.substr(lead.size()) : std::string();
 }
@@ -165,7 +168,7 @@ Finding databaseVersion(const std::string& folder) {
     const std::string version = versionOf(folder);
     const std::string distribution = distributionVersion();
     Finding finding{"its version", version.empty() ? "not known" : printable(version),
-                    distribution.empty() ? std::string("no ") + distributionFile + " to compare it with"
+                    distribution.empty() ? std::string("no ") + systemZoneRules + " to compare it with"
                                          : "the distribution has " + printable(distribution),
                     ""};
     if (!version.empty() && !distribution.empty() && version != distribution) {
@@ -189,11 +192,18 @@ Finding databaseFiles(const std::string& folder) {
 }
 
 Finding localTime() {
-    const DateOutcome now = outcomeOf(datetime::now(datetime::ZoneMode::LocalWithOffset));
-    if (now.isGood()) {
-        return {"local time", resultText(now), "as the library tells it", ""};
+    const datetime::TextResult now = datetime::now(datetime::ZoneMode::LocalWithOffset);
+    const auto& message = std::get<2>(now);
+    if (!message) {
+        return {"local time", std::get<1>(now).toStdString(), "as the library reads the clock", ""};
     }
-    return {"local time", "not known", "", failureText(now)};
+    std::vector<std::string> parameters;
+    for (const kvt::ex::UString<0>& parameter : message->parameters) {
+        parameters.push_back(printable(parameter.toStdString()));
+    }
+    return {"local time", "not known", "",
+            describe(message->messageNumber, parameters) + " (" + std::to_string(message->messageNumber) +
+                ")"};
 }
 
 // ---- Space
@@ -255,26 +265,19 @@ class DoctorCommand : public Command {
 public:
     void declare(Syntax& syntax) override {
         syntax.option("--zone-database", folder_, "DIR",
-                      "Folder with the zone database; ~/Downloads/tzdata without this option");
+                      "Folder with the zone database; without this option ~/Downloads/tzdata, or else one "
+                      "that the command keeps in the cache");
         syntax.flag("--json", json_, "Print a JSON array of objects");
     }
 
     int run(Diagnostics&) override {
-        const bool isGiven = !folder_.empty();
-        const std::string folder = isGiven ? folder_ : homeFolder() + "/Downloads/tzdata";
-        if (isGiven) {
-            datetime::setInstallPathWrapper(folder);
-        }
+        const ZoneFolder zones = zoneFolder(folder_);
+        const std::string& folder = zones.path;
+        datetime::setInstallPathWrapper(folder);
         const std::vector<Finding> findings = {
-            systemEncoding(),
-            zoneOfMachine(),
-            zoneVariable(),
-            databaseFolder(folder, isGiven),
-            databaseVersion(folder),
-            databaseFiles(folder),
-            localTime(),
-            temporarySpace(),
-            freeSpace(".", "for files in this folder"),
+            systemEncoding(),      zoneOfMachine(),         zoneVariable(),
+            databaseFolder(zones), databaseVersion(folder), databaseFiles(folder),
+            localTime(),           temporarySpace(),        freeSpace(".", "for files in this folder"),
         };
         print(json_ ? asJson(findings) : asTable(findings));
         for (const Finding& finding : findings) {
