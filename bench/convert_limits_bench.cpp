@@ -97,17 +97,30 @@ private:
     std::shared_ptr<void> descriptor_;
 };
 
+struct Text {
+    const char* name;
+    const char* sentence;
+};
+
 struct Held {
     const char* from;
     const char* to;
-    const char* text;
+    Text text;
     double limit;
 };
 
-constexpr const char* ascii = "The quick brown fox jumps over the lazy dog, and the dog does not mind it. ";
-constexpr const char* latin = "Größere Brücken führen über die Flüsse; l'été, déjà, où l'élève rêve à côté. ";
-constexpr const char* japanese =
-    "いろはにほへと ちりぬるを わかよたれそ 常ならむ、 有為の奥山 今日越えて 浅き夢見じ 酔ひもせず。";
+constexpr Text ascii{"ASCII", "The quick brown fox jumps over the lazy dog, and the dog does not mind it. "};
+constexpr Text latin{"Latin",
+                     "Größere Brücken führen über die Flüsse; l'été, déjà, où l'élève rêve à côté. "};
+constexpr Text japanese{
+    "Japanese",
+    "いろはにほへと ちりぬるを わかよたれそ 常ならむ、 有為の奥山 今日越えて 浅き夢見じ 酔ひもせず。"};
+constexpr Text simplified{"Chinese",
+                          "春眠不觉晓， 处处闻啼鸟。 夜来风雨声， 花落知多少。 白日依山尽， 黄河入海流。"};
+constexpr Text traditional{"Chinese",
+                           "春眠不覺曉， 處處聞啼鳥。 夜來風雨聲， 花落知多少。 白日依山盡， 黃河入海流。"};
+constexpr Text korean{"Korean", "동해물과 백두산이 마르고 닳도록 하느님이 보우하사 우리나라 만세. "
+                                "무궁화 삼천리 화려 강산 대한 사람 대한으로 길이 보전하세."};
 
 // In the order of what is promised: the pair, and what it has to reach for each text.
 constexpr Held held[] = {
@@ -117,12 +130,14 @@ constexpr Held held[] = {
     {"UTF-8", "UTF-32LE", ascii, 12},      {"UTF-8", "UTF-32LE", latin, 6.3},
     {"UTF-8", "UTF-32LE", japanese, 8.4},  {"windows-1252", "UTF-8", ascii, 11},
     {"windows-1252", "UTF-8", latin, 3.4}, {"UTF-8", "windows-1252", ascii, 14},
-    {"UTF-8", "windows-1252", latin, 2.2},
+    {"UTF-8", "windows-1252", latin, 2.2}, {"Shift_JIS", "UTF-8", japanese, 3.2},
+    {"UTF-8", "Shift_JIS", japanese, 1.7}, {"EUC-JP", "UTF-8", japanese, 3.2},
+    {"UTF-8", "EUC-JP", japanese, 1.7},    {"GBK", "UTF-8", simplified, 3.2},
+    {"UTF-8", "GBK", simplified, 1.7},     {"GB18030", "UTF-8", simplified, 3.2},
+    {"UTF-8", "GB18030", simplified, 1.7}, {"Big5", "UTF-8", traditional, 3.2},
+    {"UTF-8", "Big5", traditional, 1.7},   {"EUC-KR", "UTF-8", korean, 3.2},
+    {"UTF-8", "EUC-KR", korean, 1.7},
 };
-
-std::string nameOf(const char* text) {
-    return text == ascii ? "ASCII" : text == latin ? "Latin" : "Japanese";
-}
 
 /// The library's own call for a pair of Unicode forms, with the string types, and for the others by an encoding.
 kvt::bench::Way libraryWay(const Held& row, const std::string& text) {
@@ -153,9 +168,8 @@ void holdConversions(Limits& limits, std::size_t bytes, const std::string& size,
         const Converter utf8("UTF-8");
         const Converter from(row.from);
         const Converter to(row.to);
-        const std::string text = convertPlainly(from, utf8, shuffled(row.text, bytes));
-        const std::string name =
-            std::string(row.from) + " to " + row.to + ", " + nameOf(row.text) + ", " + size;
+        const std::string text = convertPlainly(from, utf8, shuffled(row.text.sentence, bytes));
+        const std::string name = std::string(row.from) + " to " + row.to + ", " + row.text.name + ", " + size;
         limits.add(name, libraryWay(row, text));
         limits.add(name + ": plain", way([to, from, text] { return convertPlainly(to, from, text); }));
         limits.add(name + ": iconv",

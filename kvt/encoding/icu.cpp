@@ -4,6 +4,7 @@
 #include <unicode/ucnv.h>
 #include <unicode/ucnv_cb.h>
 #include <unicode/ucnv_err.h>
+#include <unicode/uset.h>
 #include <unicode/utypes.h>
 
 #include <algorithm>
@@ -84,6 +85,12 @@ bool keepsAscii(UConverter* converter) {
 bool isSingleByte(UConverter* converter) {
     const UConverterType type = ucnv_getType(converter);
     return (type == UCNV_SBCS || type == UCNV_LATIN_1) && ucnv_getMaxCharSize(converter) == 1;
+}
+
+// Whether the converter reads from a table in which a character is one or more bytes.
+bool hasSeveralBytes(UConverter* converter) {
+    const UConverterType type = ucnv_getType(converter);
+    return type == UCNV_MBCS || type == UCNV_DBCS;
 }
 
 /// Tries out how a converter treats characters that follow each other. They are of many scripts, since an encoding
@@ -270,12 +277,32 @@ Form Converter::form() {
     if (isSingleByte(converter_.get())) {
         return keepsAscii(converter_.get()) ? Form::asciiSingleByte : Form::singleByte;
     }
+    if (hasSeveralBytes(converter_.get()) && nature().isStateless) {
+        return keepsAscii(converter_.get()) ? Form::asciiSeveralBytes : Form::severalBytes;
+    }
     return keepsAscii(converter_.get()) ? Form::asciiCompatible : Form::other;
 }
 
 Converter::Nature Converter::nature() const {
     const Trial trial(encoding_);
     return {trial.isStateless(), trial.isBehind()};
+}
+
+std::vector<Converter::Range> Converter::characters() const {
+    const std::unique_ptr<USet, decltype(&uset_close)> set(uset_openEmpty(), &uset_close);
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_getUnicodeSet(converter_.get(), set.get(), UCNV_ROUNDTRIP_AND_FALLBACK_SET, &error);
+    std::vector<Range> ranges;
+    for (std::int32_t i = 0; U_SUCCESS(error) && i < uset_getItemCount(set.get()); ++i) {
+        UChar32 first = 0;
+        UChar32 last = 0;
+        // Behind the ranges come sequences of characters, which have a length.
+        if (uset_getItem(set.get(), i, &first, &last, nullptr, 0, &error) == 0) {
+            ranges.push_back({static_cast<char32_t>(first), static_cast<char32_t>(last)});
+        }
+        error = U_ZERO_ERROR;
+    }
+    return ranges;
 }
 
 Converter Converter::clone() const {

@@ -19,9 +19,10 @@ constexpr std::size_t largestPiece = std::size_t{1} << 30;
 constexpr std::size_t outputUnits = 4096;
 
 // The bytes for which ICU is asked where the short way ends: those of one character at first, and twice as many each time
-// that the short way found nothing to take behind them.
+// that the short way found little to take behind them.
 constexpr std::size_t firstLook = 4;
 constexpr std::size_t longestLook = 1024;
+constexpr std::size_t little = 16;
 
 template <typename CharT>
 std::string_view bytesOf(std::basic_string_view<CharT> units) {
@@ -71,20 +72,26 @@ template <typename CharOut>
 Losses convertAll(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
                   std::string_view bytes, std::basic_string<CharOut>& out) {
     out.clear();
-    const bool canResume = from.side().form != detail::Form::other && to.side().form != detail::Form::other;
-    std::size_t length = firstLook;
+    bytes.remove_prefix(detail::convertPrefix(from.side(), to.side(), bytes, out));
+    if (bytes.empty()) {
+        return takeLosses(from, to);
+    }
     bool reset = true;
-    while (!bytes.empty()) {
+    if (!detail::canGoOn(from.side(), to.side(), bytes.size())) {
+        for (bool goesOn = true; goesOn && !bytes.empty();) {
+            goesOn = convertByIcu(transcoder, from, to, bytes, largestPiece, false, reset, out);
+        }
+        return takeLosses(from, to);
+    }
+    // It may be the tables that were missing.
+    bytes.remove_prefix(detail::convertPrefix(from.side(), to.side(), bytes, out));
+    for (std::size_t length = firstLook; !bytes.empty();) {
+        if (!convertByIcu(transcoder, from, to, bytes, length, true, reset, out)) {
+            break;
+        }
         const std::size_t taken = detail::convertPrefix(from.side(), to.side(), bytes, out);
         bytes.remove_prefix(taken);
-        if (bytes.empty()) {
-            break;
-        }
-        length = taken != 0 ? firstLook : std::min(2 * length, longestLook);
-        if (!convertByIcu(transcoder, from, to, bytes, canResume ? length : largestPiece, canResume, reset,
-                          out)) {
-            break;
-        }
+        length = taken >= little ? firstLook : std::min(2 * length, longestLook);
     }
     return takeLosses(from, to);
 }

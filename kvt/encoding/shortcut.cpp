@@ -2,9 +2,10 @@
 //
 // A conversion is measured first: how much of the input is well-formed and complete, and how long the result will be.
 // Then the result is made in one piece. Between UTF-8, UTF-16 and UTF-32 in the machine's byte order, that is one step
-// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the single-byte
-// encodings by their tables, the forms in the other byte order by swapping. What is not well-formed, is cut off, or is
-// more than the target's form can say, is left to ICU, so this code decides nothing about substitutions.
+// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the code pages by
+// their tables, which are read once only, so that what they hold is measured as UTF-16; the forms in the other byte order
+// by swapping. What is not well-formed, is cut off, or is more than the target's form can say, is left to ICU, so this
+// code decides nothing about substitutions.
 //
 // What ICU does with the text that is taken here, and so must hold for these ways to be the same ones:
 //
@@ -15,7 +16,7 @@
 //   one, but none that begins with an ASCII character, and none of bytes that does; a test looks through them all.
 #include <kvt/encoding/detail/shortcut.h>
 
-#include <kvt/encoding/detail/single_byte_table.h>
+#include <kvt/encoding/detail/encoding_profile.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
 #include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/utf.h>
@@ -34,9 +35,11 @@ constexpr std::size_t pivotUnits = 2048;
 using Pivot = std::array<char16_t, pivotUnits>;
 
 // The bytes that are tried first where the target may lack a character, so that a text with many such characters is not
-// measured to its end after each of them. As long as all goes well, pieces become longer by the factor.
+// measured to its end after each of them. As long as all goes well, pieces become longer by the factor, as far as the next
+// step still finds them in the cache.
 constexpr std::size_t firstPiece = 128;
 constexpr std::size_t pieceFactor = 8;
+constexpr std::size_t longestPiece = firstPiece * pieceFactor * pieceFactor;
 
 constexpr bool isLittle = std::endian::native == std::endian::little;
 constexpr Form nativeUtf16 = isLittle ? Form::utf16le : Form::utf16be;
@@ -55,8 +58,8 @@ std::size_t unitBytes(Form form) {
     }
 }
 
-bool hasTable(Form form) {
-    return form == Form::asciiSingleByte || form == Form::singleByte;
+bool hasTables(Form form) {
+    return form >= Form::asciiSingleByte && form <= Form::severalBytes;
 }
 
 bool isUtf16(Form form) {
@@ -68,7 +71,7 @@ bool isUtf32(Form form) {
 }
 
 bool keepsAscii(Form form) {
-    return form != Form::other && form != Form::singleByte;
+    return form != Form::other && form != Form::singleByte && form != Form::severalBytes;
 }
 
 /// Whether ASCII text of the two forms is the same bytes.
@@ -121,42 +124,13 @@ Extent measureSwapped(std::string_view in, Extent (*measure)(const char*, std::s
     return sum;
 }
 
-/// Single bytes, as far as the table goes. Each is one unit of UTF-16.
-Extent measureSingleBytes(const SingleByteTable::Tables& tables, std::string_view in) {
-    constexpr std::size_t blockBytes = 32;
-    const auto* const begin = reinterpret_cast<const unsigned char*>(in.data());
-    const unsigned char* const end = begin + in.size();
-    const unsigned char* p = begin;
-    std::size_t utf8 = 0;
-    const auto measureBlock = [&](std::size_t length) {
-        std::uint32_t sum = 0;
-        for (std::size_t i = 0; i < length; ++i) {
-            sum += tables.weights[p[i]];
-        }
-        if (sum >= SingleByteTable::noCharacter) {
-            return false;
-        }
-        utf8 += sum;
-        p += length;
-        return true;
-    };
-    while (static_cast<std::size_t>(end - p) >= blockBytes && measureBlock(blockBytes)) {
-    }
-    while (p != end && measureBlock(1)) {
-    }
-    const auto taken = static_cast<std::size_t>(p - begin);
-    return {taken, utf8, taken, taken};
-}
-
-Extent measure(Side from, std::string_view in) {
-    switch (from.form) {
+/// The text of a form without tables.
+Extent measure(Form from, std::string_view in) {
+    switch (from) {
     case Form::asciiCompatible: {
         const std::size_t ascii = vectors::asciiPrefix(in.data(), in.size());
         return {ascii, ascii, ascii, ascii};
     }
-    case Form::asciiSingleByte:
-    case Form::singleByte:
-        return measureSingleBytes(from.table->tables(), in);
     case Form::utf8:
         return vectors::measureUtf8(in.data(), in.size());
     case nativeUtf16:
@@ -164,38 +138,32 @@ Extent measure(Side from, std::string_view in) {
     case nativeUtf32:
         return vectors::measureUtf32(in.data(), in.size() / 4);
     default:
-        return isUtf16(from.form) ? measureSwapped<std::uint16_t>(in, vectors::measureUtf16)
-                                  : measureSwapped<std::uint32_t>(in, vectors::measureUtf32);
+        return isUtf16(from) ? measureSwapped<std::uint16_t>(in, vectors::measureUtf16)
+                             : measureSwapped<std::uint32_t>(in, vectors::measureUtf32);
     }
 }
 
-/// The bytes of a text in the target's form, if the target has all its characters.
-std::size_t bytesOf(const Extent& extent, Form form) {
-    return isUtf16(form)        ? extent.utf16 * 2
-           : isUtf32(form)      ? extent.utf32 * 4
-           : form == Form::utf8 ? extent.utf8
-                                : extent.utf32;
+/// The bytes that suffice for a text in the target's form, if the target has all its characters.
+std::size_t roomFor(const Extent& extent, Side to) {
+    return hasTables(to.form)      ? to.profile->encoding()->roomFor(extent)
+           : isUtf16(to.form)      ? extent.utf16 * 2
+           : isUtf32(to.form)      ? extent.utf32 * 4
+           : to.form == Form::utf8 ? extent.utf8
+                                   : extent.utf32;
 }
 
 // ---- By way of UTF-16 --------------------------------------------------------------------------------------------
 
-/// Reads well-formed text up to a character border, until the pivot is full. Returns the units; `in` is moved on.
-std::size_t decode(Side from, std::string_view& in, Pivot& pivot) {
+/// Reads well-formed text of a form without tables up to a character border, until the pivot is full. Returns the units;
+/// `in` is moved on.
+std::size_t decode(Form from, std::string_view& in, Pivot& pivot) {
     auto* const out = reinterpret_cast<char*>(pivot.data());
-    std::size_t bytes = std::min(in.size(), pivotUnits * unitBytes(from.form));
+    std::size_t bytes = std::min(in.size(), pivotUnits * unitBytes(from));
     std::size_t units = 0;
-    switch (from.form) {
+    switch (from) {
     case Form::asciiCompatible:
         units = vectors::widenAscii(in.data(), bytes, out);
         break;
-    case Form::asciiSingleByte:
-    case Form::singleByte: {
-        const auto& table = from.table->tables().units;
-        for (; units < bytes; ++units) {
-            pivot[units] = table[static_cast<unsigned char>(in[units])];
-        }
-        break;
-    }
     case Form::utf8:
         while (bytes < in.size() && isContinuation(in[bytes])) {
             --bytes;
@@ -205,7 +173,7 @@ std::size_t decode(Side from, std::string_view& in, Pivot& pivot) {
     case Form::utf16le:
     case Form::utf16be:
         units = bytes / 2;
-        if (from.form == nativeUtf16) {
+        if (from == nativeUtf16) {
             std::memcpy(out, in.data(), bytes);
         } else {
             copySwapped<std::uint16_t>(in.data(), out, units);
@@ -220,7 +188,7 @@ std::size_t decode(Side from, std::string_view& in, Pivot& pivot) {
         bytes = std::min(in.size(), pivotUnits / 2 * sizeof(char32_t));
         std::array<char32_t, pivotUnits / 2> swapped;
         const char* source = in.data();
-        if (from.form != nativeUtf32) {
+        if (from != nativeUtf32) {
             copySwapped<std::uint32_t>(source, reinterpret_cast<char*>(swapped.data()), bytes / 4);
             source = reinterpret_cast<const char*>(swapped.data());
         }
@@ -232,37 +200,7 @@ std::size_t decode(Side from, std::string_view& in, Pivot& pivot) {
     return units;
 }
 
-/// Where writing ended: the units taken and the bytes written.
-struct Written {
-    std::size_t units;
-    std::size_t bytes;
-};
-
-Written encodeSingleBytes(const SingleByteTable::Tables& tables, bool hasAscii, const char16_t* units,
-                          std::size_t count, char* out) {
-    constexpr std::size_t blockUnits = 16;
-    // Kept here, since a write of bytes could change the tables for all that the compiler knows.
-    const std::uint16_t* const pageOf = tables.pageOf.data();
-    const std::uint16_t* const pages = tables.pages.data();
-    const auto put = [=](std::size_t i) {
-        const char16_t unit = units[i];
-        const unsigned entry =
-            pages[pageOf[unit / SingleByteTable::pageSize] + unit % SingleByteTable::pageSize];
-        out[i] = static_cast<char>(entry);
-        return entry >> 8;
-    };
-    std::size_t i = hasAscii ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
-    for (unsigned found = 1; i + blockUnits <= count && found != 0;) {
-        for (std::size_t place = 0; place < blockUnits; ++place) {
-            found &= put(i + place);
-        }
-        i += found != 0 ? blockUnits : 0;
-    }
-    while (i < count && put(i) != 0) {
-        ++i;
-    }
-    return {i, i};
-}
+using Written = EncodingTable::Written;
 
 /// Writes well-formed UTF-16, as far as the target has its characters. `out` has room for all of it.
 Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::size_t room) {
@@ -273,10 +211,10 @@ Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::s
         return {ascii, ascii};
     }
     case Form::asciiSingleByte:
+    case Form::asciiSeveralBytes:
     case Form::singleByte:
-        // Room for each character: where there are fewer than units, one of them is beyond U+FFFF, and not in the table.
-        return encodeSingleBytes(to.table->tables(), keepsAscii(to.form), pivot.data(), std::min(units, room),
-                                 out);
+    case Form::severalBytes:
+        return to.profile->encoding()->write(pivot.data(), units, out, room);
     case Form::utf8:
         return {units, vectors::utf16ToUtf8(in, units, out, room)};
     case nativeUtf16:
@@ -297,7 +235,7 @@ Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::s
     }
 }
 
-/// The bytes of `in` that the first `units` units of UTF-16 come from.
+/// The bytes of `in`, of a form without tables, that the first `units` units of UTF-16 come from.
 std::size_t sourceOf(Form form, std::string_view in, std::size_t units) {
     if (form != Form::utf8 && !isUtf32(form)) {
         return units * unitBytes(form);
@@ -326,7 +264,7 @@ struct Progress {
     std::size_t written;
 };
 
-Progress convertByPivot(Side from, Side to, std::string_view in, char* out, std::size_t room) {
+Progress convertByPivot(Form from, Side to, std::string_view in, char* out, std::size_t room) {
     Progress progress{0, 0};
     Pivot pivot;
     for (std::string_view rest = in; !rest.empty();) {
@@ -335,7 +273,7 @@ Progress convertByPivot(Side from, Side to, std::string_view in, char* out, std:
         const Written written = encode(to, pivot, units, out + progress.written, room - progress.written);
         progress.written += written.bytes;
         if (written.units < units) {
-            progress.taken += sourceOf(from.form, before, written.units);
+            progress.taken += sourceOf(from, before, written.units);
             break;
         }
         progress.taken += before.size() - rest.size();
@@ -343,19 +281,19 @@ Progress convertByPivot(Side from, Side to, std::string_view in, char* out, std:
     return progress;
 }
 
-/// Converts text that is well-formed in the source, as far as the target has its characters.
-Progress convertWellFormed(Side from, Side to, std::string_view in, char* out, std::size_t room) {
+/// Converts text that is well-formed in the source, which has no tables, as far as the target has its characters.
+Progress convertWellFormed(Form from, Side to, std::string_view in, char* out, std::size_t room) {
     using Convert = std::size_t (*)(const char*, std::size_t, char*, std::size_t);
     Convert convert = nullptr;
-    if (from.form == Form::utf8) {
+    if (from == Form::utf8) {
         convert = to.form == nativeUtf16   ? vectors::utf8ToUtf16
                   : to.form == nativeUtf32 ? vectors::utf8ToUtf32
                                            : nullptr;
-    } else if (from.form == nativeUtf16) {
+    } else if (from == nativeUtf16) {
         convert = to.form == Form::utf8    ? vectors::utf16ToUtf8
                   : to.form == nativeUtf32 ? vectors::utf16ToUtf32
                                            : nullptr;
-    } else if (from.form == nativeUtf32) {
+    } else if (from == nativeUtf32) {
         convert = to.form == Form::utf8    ? vectors::utf32ToUtf8
                   : to.form == nativeUtf16 ? vectors::utf32ToUtf16
                                            : nullptr;
@@ -364,27 +302,31 @@ Progress convertWellFormed(Side from, Side to, std::string_view in, char* out, s
         return convertByPivot(from, to, in, out, room);
     }
     const std::size_t unit = unitBytes(to.form);
-    return {in.size(), convert(in.data(), in.size() / unitBytes(from.form), out, room / unit) * unit};
+    return {in.size(), convert(in.data(), in.size() / unitBytes(from), out, room / unit) * unit};
 }
 
-/// A side in which only ASCII can be read and written, and no table is needed for it.
-Side asciiOnly(Side side) {
-    return side.form == Form::asciiSingleByte ? Side{Form::asciiCompatible, nullptr} : side;
-}
-
-bool lacksTable(Side side) {
-    return hasTable(side.form) && !side.table->isBuilt();
-}
-
+/// Makes room for what is likely to come of the rest of a text, by what came of its beginning, so that the result does not
+/// move with each piece that is appended. It is short of the truth or too much by little; to be exact, all of the text
+/// would have to be read through its table twice.
 template <typename CharOut>
-std::size_t convertBy(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+void reserveForRest(std::basic_string<CharOut>& out, std::size_t written, std::size_t taken,
+                    std::size_t rest) {
+    const double expected =
+        static_cast<double>(written) / static_cast<double>(taken) * static_cast<double>(rest);
+    out.reserve(out.size() + static_cast<std::size_t>(expected * 1.0625) + longestPiece / 2);
+}
+
+/// From a form without tables.
+template <typename CharOut>
+std::size_t convertMeasured(Form from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    const std::size_t before = out.size();
     std::size_t taken = 0;
     std::size_t pieceBytes = isUnicode(to.form) ? in.size() : firstPiece;
-    for (bool ended = false; !ended && taken < in.size(); pieceBytes *= pieceFactor) {
+    for (bool ended = false; !ended && taken < in.size();) {
         std::string_view piece = in.substr(taken, pieceBytes);
         const Extent extent = measure(from, piece);
-        const std::size_t wellFormed = extent.taken * unitBytes(from.form);
-        const std::size_t room = bytesOf(extent, to.form);
+        const std::size_t wellFormed = extent.taken * unitBytes(from);
+        const std::size_t room = roomFor(extent, to);
         // A piece may have been cut in the middle of a character.
         ended = wellFormed + longestUtf8 <= piece.size() || wellFormed == 0;
         piece = piece.substr(0, wellFormed);
@@ -395,8 +337,66 @@ std::size_t convertBy(Side from, Side to, std::string_view in, std::basic_string
             ended = ended || progress.taken < piece.size();
             return progress.written / sizeof(CharOut);
         });
+        if (pieceBytes < longestPiece && !ended) {
+            pieceBytes *= pieceFactor;
+            if (pieceBytes == longestPiece && in.size() - taken > longestPiece) {
+                reserveForRest(out, out.size() - before, taken, in.size() - taken);
+            }
+        }
     }
     return taken;
+}
+
+/// From a form with tables.
+template <typename CharOut>
+std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view in,
+                           std::basic_string<CharOut>& out) {
+    const std::size_t before = out.size();
+    std::size_t taken = 0;
+    Pivot pivot;
+    for (std::size_t pieceUnits = isUnicode(to.form) ? pivotUnits : firstPiece; taken < in.size();
+         pieceUnits = pivotUnits) {
+        std::string_view rest = in.substr(taken);
+        const std::size_t units = table.read(rest, pivot.data(), pieceUnits);
+        const Extent extent = vectors::measureUtf16(reinterpret_cast<const char*>(pivot.data()), units);
+        const std::size_t room = roomFor(extent, to);
+        Written written{0, 0};
+        appendInPlace(out, room / sizeof(CharOut), [&](CharOut* place) {
+            written = encode(to, pivot, units, reinterpret_cast<char*>(place), room);
+            return written.bytes / sizeof(CharOut);
+        });
+        if (written.units < units) {
+            return taken + table.bytesOf(in.substr(taken), written.units);
+        }
+        const bool isFirst = taken == 0;
+        taken = in.size() - rest.size();
+        if (units < pieceUnits) {
+            break;
+        }
+        if (isFirst && rest.size() > longestPiece) {
+            reserveForRest(out, out.size() - before, taken, rest.size());
+        }
+    }
+    return taken;
+}
+
+template <typename CharOut>
+std::size_t convertBy(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    return hasTables(from.form) ? convertDecoded(*from.profile->decoding(), to, in, out)
+                                : convertMeasured(from.form, to, in, out);
+}
+
+/// A form of which the tables are not there, as far as it needs none.
+Side withoutTables(Side side) {
+    return {keepsAscii(side.form) ? Form::asciiCompatible : Form::other};
+}
+
+bool lacksDecoding(Side side) {
+    return hasTables(side.form) && side.profile->decoding() == nullptr;
+}
+
+bool lacksEncoding(Side side) {
+    return hasTables(side.form) && side.profile->encoding() == nullptr;
 }
 
 } // namespace
@@ -407,23 +407,40 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
         (sizeof(CharOut) != 1 && sizeof(CharOut) != unitBytes(to.form))) {
         return 0;
     }
+    from = lacksDecoding(from) ? withoutTables(from) : from;
+    to = lacksEncoding(to) ? withoutTables(to) : to;
+    if (from.form == Form::other || to.form == Form::other) {
+        return 0;
+    }
     std::size_t taken = 0;
     if constexpr (sizeof(CharOut) == 1) {
         // ASCII to ASCII needs no other buffer than the input itself.
         if (isAsciiBytes(from.form) && isAsciiBytes(to.form)) {
             taken = vectors::asciiPrefix(in.data(), in.size());
             out.append(in.data(), taken);
-            if (taken == in.size() || from.form == Form::asciiCompatible ||
-                to.form == Form::asciiCompatible) {
+            if (from.form == Form::asciiCompatible || to.form == Form::asciiCompatible) {
                 return taken;
             }
         }
     }
-    // A thread that meets nothing but ASCII in an encoding never builds the table.
-    if (taken == 0 && (lacksTable(from) || lacksTable(to)) && keepsAscii(from.form) && keepsAscii(to.form)) {
-        taken = convertBy(asciiOnly(from), asciiOnly(to), in, out);
-    }
     return taken == in.size() ? taken : taken + convertBy(from, to, in.substr(taken), out);
+}
+
+Side sideOf(Encoding encoding) {
+    if (const Form form = unicodeForm(encoding); form != Form::other) {
+        return {form};
+    }
+    EncodingProfile& profile = profileOf(encoding);
+    return {profile.form(), &profile};
+}
+
+bool canGoOn(Side from, Side to, std::size_t bytes) {
+    if (from.form == Form::other || to.form == Form::other) {
+        return false;
+    }
+    const bool canRead = !hasTables(from.form) || from.profile->buildDecoding(bytes);
+    const bool canWrite = !hasTables(to.form) || to.profile->buildEncoding(bytes);
+    return canRead && canWrite;
 }
 
 template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);

@@ -11,7 +11,6 @@
 
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
-#include <kvt/encoding/detail/single_byte_table.h>
 #include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
 
@@ -19,6 +18,7 @@
 #include <array>
 #include <exception>
 #include <optional>
+#include <utility>
 #include <vector>
 
 namespace kvt::ex {
@@ -68,8 +68,8 @@ struct Unit {
 class StreamTranscoder::Impl final : private detail::icu::LossListener {
 public:
     Impl(Encoding from, Encoding to)
-        : from_(open(from)), to_(open(to)), fromForm_(from_.form()), toForm_(to_.form()), fromTable_(from),
-          toTable_(to), hasShortcut_(fromForm_ != Form::other && toForm_ != Form::other && from != to),
+        : from_(open(from)), to_(open(to)), fromSide_(detail::sideOf(from)), toSide_(detail::sideOf(to)),
+          hasShortcut_(fromSide_.form != Form::other && toSide_.form != Form::other && from != to),
           fromNature_(from_.nature()), isStateless_(fromNature_.isStateless && to_.nature().isStateless),
           countsHeldBytes_(from_.countsHeldBytes() && !fromNature_.isBehind),
           substitution_(to_.substitution()) {
@@ -80,16 +80,21 @@ public:
     Impl& operator=(const Impl&) = delete;
 
     void convert(std::string_view block, std::string& out, const LossHandler& onLoss) {
+        bool isFirst = true;
         while (!block.empty()) {
-            std::size_t taken = 0;
             if (hasShortcut_ && holdsNothing()) {
-                taken = detail::convertPrefix({fromForm_, &fromTable_}, {toForm_, &toTable_}, block, out);
-                passOver(block.substr(0, taken));
-                block.remove_prefix(taken);
+                goShortWay(block, out);
+                if (!block.empty() && std::exchange(isFirst, false) &&
+                    detail::canGoOn(fromSide_, toSide_, block.size())) {
+                    // It may be the tables that were missing.
+                    goShortWay(block, out);
+                }
+            }
+            if (block.empty()) {
+                return;
             }
             const std::string_view slice = block.substr(0, sliceBytes);
-            taken = convertFast(slice, out) ? slice.size() : convertTracing(slice, out, onLoss);
-            block.remove_prefix(taken);
+            block.remove_prefix(convertFast(slice, out) ? slice.size() : convertTracing(slice, out, onLoss));
         }
     }
 
@@ -111,6 +116,11 @@ public:
 private:
     bool holdsNothing() const { return characterBegin_ == position_ && !to_.holdsUnits(); }
 
+    void goShortWay(std::string_view& block, std::string& out) {
+        const std::size_t taken = detail::convertPrefix(fromSide_, toSide_, block, out);
+        passOver(block.substr(0, taken));
+        block.remove_prefix(taken);
+    }
     bool convertFast(std::string_view slice, std::string& out);
     std::size_t convertTracing(std::string_view slice, std::string& out, const LossHandler& onLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
@@ -135,10 +145,8 @@ private:
 
     Converter from_;
     Converter to_;
-    Form fromForm_;
-    Form toForm_;
-    detail::SingleByteTable fromTable_;
-    detail::SingleByteTable toTable_;
+    detail::Side fromSide_;
+    detail::Side toSide_;
     bool hasShortcut_;
     Converter::Nature fromNature_;
     bool isStateless_;

@@ -24,8 +24,7 @@ void TranscoderHelper::open(Encoding encoding) {
     converter_ = icu::Converter(encoding);
     if (isOpen()) {
         substitutionChars_ = converter_.substitution();
-        form_ = converter_.form();
-        table_ = SingleByteTable(encoding);
+        side_ = sideOf(encoding);
         converter_.setListener(*this);
     }
 }

@@ -10,6 +10,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <vector>
 
 struct UConverter;
 
@@ -62,6 +63,13 @@ public:
     std::string substitution() const;
     /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
     Form form();
+
+    struct Range {
+        char32_t first;
+        char32_t last;
+    };
+    /// The characters that the encoding has, and perhaps some that only resemble one of them, in order.
+    std::vector<Range> characters() const;
 
     /// What cannot be asked of ICU, found out by some conversions.
     struct Nature {

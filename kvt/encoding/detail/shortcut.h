@@ -3,8 +3,7 @@
 // This is the one place that decides. The caller converts a prefix here and gives ICU the rest:
 //
 // - between two Unicode forms, as far as the input is well-formed and complete;
-// - between a single-byte encoding and a Unicode form or another single-byte encoding, as far as the tables of
-//   detail/single_byte_table.h go;
+// - between a code page and a Unicode form or another code page, as far as the tables of detail/conversion_tables.h go;
 // - between any two encodings that keep ASCII as it is, as far as the input is ASCII.
 //
 // What is taken here is text that converts without any loss, so nothing has to be reported, and it ends at a
@@ -22,10 +21,12 @@ namespace kvt::ex::detail {
 
 /// How the bytes of an encoding can be read and written without ICU.
 enum class Form : std::uint8_t {
-    other,           ///< only by ICU
-    asciiCompatible, ///< stateless, and a byte below 128 where a character begins is that ASCII character
-    asciiSingleByte, ///< the same, and all characters have one byte
-    singleByte,      ///< all characters have one byte, and ASCII has other ones than in ASCII
+    other,             ///< only by ICU
+    asciiCompatible,   ///< stateless, and a byte below 128 where a character begins is that ASCII character
+    asciiSingleByte,   ///< the same, with tables; all characters have one byte
+    asciiSeveralBytes, ///< the same, with tables
+    singleByte, ///< stateless, with tables; all characters have one byte, and ASCII has other ones than in ASCII
+    severalBytes, ///< the same, but for the number of bytes
     utf8,
     utf16le,
     utf16be,
@@ -52,19 +53,27 @@ inline Form unicodeForm(Encoding encoding) {
     }
 }
 
-class SingleByteTable;
+class EncodingProfile;
 
 /// The source or the target of a conversion.
 struct Side {
     Form form = Form::other;
-    SingleByteTable* table = nullptr; ///< of the two single-byte forms; built when the first text needs it
+    EncodingProfile* profile = nullptr; ///< where the form is one with tables
 };
+
+/// An encoding as the source or the target of a conversion. Throws std::bad_alloc.
+Side sideOf(Encoding encoding);
 
 /// Converts the longest prefix of the bytes `in` that needs no ICU, appends it to `out`, and returns the bytes taken
 /// from `in`; 0 when there is no shorter way between the two sides. The two sides belong to different encodings.
-/// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted.
+/// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted. Where a table is not
+/// built, only ASCII is.
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
+
+/// Builds the tables that are missing between two sides where that is worth it, for a text of which convertPrefix() left
+/// `bytes`. Returns whether it can go on behind what ICU has to look at: the forms are known, and all tables are there.
+bool canGoOn(Side from, Side to, std::size_t bytes);
 
 extern template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);
 extern template std::size_t convertPrefix<char16_t>(Side, Side, std::string_view,

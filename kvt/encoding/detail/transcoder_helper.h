@@ -3,7 +3,6 @@
 
 #include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
-#include <kvt/encoding/detail/single_byte_table.h>
 #include <kvt/encoding/encoding.h>
 
 #include <cstdint>
@@ -26,7 +25,7 @@ public:
     icu::Converter& converter() { return converter_; }
     Encoding encoding() const { return encoding_; }
     /// What this encoding is in a conversion without ICU.
-    Side side() { return {form_, &table_}; }
+    Side side() const { return side_; }
     /// The bytes that the converter writes for a lost character.
     const std::string& substitutionChars() const { return substitutionChars_; }
 
@@ -41,8 +40,7 @@ private:
     std::int32_t lastError_ = 0;
     Encoding encoding_ = Encoding::Unknown;
     std::string substitutionChars_;
-    Form form_ = Form::other;
-    SingleByteTable table_;
+    Side side_;
 };
 
 /// The calling thread's helper for an encoding, opened when this is its first use. It lives as long as the thread.

@@ -1,0 +1,81 @@
+// What a code page makes of its bytes and of the characters, as tables, so that its text can be converted without ICU.
+//
+// The tables hold what ICU itself says of each character alone, and only what it converts without an objection: from one
+// byte or two to one unit of UTF-16, and back. For all else they say "ask ICU": for what is not text, for a character that
+// only resembles one of the encoding's own, for longer characters, and for whatever could be joined with the next. They are
+// for encodings without a state, do not change once they are made, and can be read by any number of threads.
+#pragma once
+
+#include <kvt/encoding/detail/unicode_vectors.h>
+#include <kvt/encoding/encoding.h>
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+#include <vector>
+
+namespace kvt::ex::detail {
+
+/// From bytes to UTF-16.
+class DecodingTable {
+public:
+    /// Asks ICU for each byte and each pair of bytes: some microseconds for an encoding of single bytes, about a
+    /// millisecond for others. Empty when ICU cannot open the encoding.
+    explicit DecodingTable(Encoding encoding);
+
+    /// Reads characters and takes them from `in`, until there are `room` units, or the table does not know the next one.
+    /// Returns the units written; none is a surrogate.
+    std::size_t read(std::string_view& in, char16_t* out, std::size_t room) const;
+
+    /// The bytes of the first `units` characters of `in`, which the table knows.
+    std::size_t bytesOf(std::string_view in, std::size_t units) const;
+
+private:
+    static constexpr char16_t noUnit = 0xFFFF; // ask ICU
+    static constexpr std::size_t pageSize = 256;
+
+    std::size_t readSingles(std::string_view& in, char16_t* out, std::size_t room) const;
+    std::size_t readPairs(std::string_view& in, char16_t* out, std::size_t room) const;
+
+    std::array<char16_t, 256> singles_; // the unit of each byte that is a character
+    // For each byte the place where the page of its second bytes begins. The first page is nobody's.
+    std::array<std::uint32_t, 256> pageOf_{};
+    std::vector<char16_t> pages_;
+    bool keepsAscii_ = true;
+};
+
+/// From UTF-16 to bytes.
+class EncodingTable {
+public:
+    /// Asks ICU for each character of the encoding; about as long as a DecodingTable.
+    explicit EncodingTable(Encoding encoding);
+
+    /// The bytes that suffice for a text.
+    std::size_t roomFor(const vectors::Extent& text) const;
+
+    struct Written {
+        std::size_t units; ///< taken
+        std::size_t bytes;
+    };
+    /// Writes characters until the table does not know one. `room` is that of the text.
+    Written write(const char16_t* units, std::size_t count, char* out, std::size_t room) const;
+
+private:
+    static constexpr std::uint16_t noCode = 0xFFFF; // ask ICU
+    static constexpr std::size_t pageSize = 64;     // as many as the last byte of UTF-8 tells apart
+
+    void add(char16_t unit, std::string_view bytes);
+    std::uint16_t codeOf(char16_t unit) const { return pages_[pageOf_[unit / pageSize] + unit % pageSize]; }
+    Written writeSingles(const char16_t* units, std::size_t count, char* out) const;
+    Written writePairs(const char16_t* units, std::size_t count, char* out) const;
+
+    // For a unit without its last six bits the place where its page begins. The first page is empty.
+    std::array<std::uint16_t, 0x10000 / pageSize> pageOf_{};
+    std::vector<std::uint16_t> pages_; // one byte as its number, two with the first one above
+    std::size_t longest_ = 1;          // bytes of a character
+    bool isWithinUtf8_ = true;         // no character is longer than in UTF-8
+    bool keepsAscii_ = true;
+};
+
+} // namespace kvt::ex::detail

@@ -1,0 +1,62 @@
+// What is known of an encoding for converting its text without ICU: its form and, for code pages, tables.
+//
+// There is one object for each encoding in the process. What it knows is found out by asking ICU once, does not change
+// after that, and is read without a lock.
+#pragma once
+
+#include <kvt/encoding/detail/conversion_tables.h>
+#include <kvt/encoding/detail/shortcut.h>
+#include <kvt/encoding/encoding.h>
+
+#include <atomic>
+#include <cstddef>
+#include <cstdint>
+#include <mutex>
+#include <optional>
+
+namespace kvt::ex::detail {
+
+class EncodingProfile {
+public:
+    EncodingProfile() = default;
+    EncodingProfile(const EncodingProfile&) = delete;
+    EncodingProfile& operator=(const EncodingProfile&) = delete;
+    ~EncodingProfile();
+
+    /// Found out at the first call; `other` when ICU cannot open the encoding.
+    Form form();
+
+    /// Null as long as they are not built.
+    const DecodingTable* decoding() const { return decoding_.table.load(std::memory_order_acquire); }
+    const EncodingTable* encoding() const { return encoding_.table.load(std::memory_order_acquire); }
+
+    /// Notes that so many bytes are left to ICU for want of a table, and builds the table when all that was left so far
+    /// would have repaid it. Returns whether there is one now. The form is one that has tables. Throws std::bad_alloc.
+    bool buildDecoding(std::size_t bytes) { return build(decoding_, bytes); }
+    bool buildEncoding(std::size_t bytes) { return build(encoding_, bytes); }
+
+private:
+    friend EncodingProfile& profileOf(Encoding encoding);
+
+    template <typename Table>
+    struct Lazy {
+        std::atomic<const Table*> table{nullptr};
+        std::atomic<std::size_t> missed{0}; // bytes that it would have converted
+    };
+    template <typename Table>
+    bool build(Lazy<Table>& lazy, std::size_t bytes);
+
+    Encoding itself() const;
+
+    // `Unknown` until the object is somebody's.
+    std::atomic<std::uint32_t> id_{Encoding::Unknown};
+    std::atomic<std::optional<Form>> form_{std::nullopt};
+    std::mutex building_;
+    Lazy<DecodingTable> decoding_;
+    Lazy<EncodingTable> encoding_;
+};
+
+/// The object of an encoding, which lives as long as the process. Throws std::bad_alloc.
+EncodingProfile& profileOf(Encoding encoding);
+
+} // namespace kvt::ex::detail
