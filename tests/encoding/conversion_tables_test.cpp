@@ -7,6 +7,7 @@
 #include <kvt/encoding/detail/shortcut.h>
 
 #include <reference/icu_reference.h>
+#include <support/guarded_memory.h>
 
 #include <unicode/ucnv.h>
 
@@ -14,6 +15,7 @@
 
 #include <memory>
 #include <optional>
+#include <random>
 #include <set>
 #include <string>
 #include <string_view>
@@ -320,6 +322,32 @@ TEST_P(ConversionTables, AgreeWithIcuOnTextsOfAllTheirCharacters) {
             }
             ASSERT_TRUE(wayOf(other, subject.side, convertWithIcu("UTF-8", form, shifted).bytes) == raw.bytes)
                 << subject.name << ' ' << form << ' ' << shift;
+        }
+    });
+}
+
+// What is a pair's second byte depends on all bytes before it, a block of them at a time; so characters of one byte and of
+// two in any order, with one that is not known somewhere, at the end of memory that can be touched.
+TEST_P(ConversionTables, FindTheCharactersOfEachLengthInAnyOrder) {
+    GuardedMemory memory(1 << 14);
+    forEachCodePage([&](Subject& subject) {
+        std::mt19937_64 random(3);
+        for (int round = 0; round < 60; ++round) {
+            std::string text = encodeWithIcu(subject.name, ownText(subject.name, random() % 400, random()));
+            if (round % 3 == 0 && !text.empty()) {
+                text[random() % text.size()] = static_cast<char>(random());
+            }
+            text.resize(text.size() - std::min<std::size_t>(text.size(), random() % 2));
+            char* const in = memory.end() - text.size();
+            text.copy(in, text.size());
+            const Taken way = take(subject.side, utf16, {in, text.size()});
+            const Raw raw =
+                convertWithIcu(subject.name, "UTF-16LE", std::string_view(text).substr(0, way.bytes));
+            ASSERT_EQ(raw.calls, 0) << subject.name << ' ' << hex(text, 1000);
+            ASSERT_EQ(hex(way.out, 2000), hex(raw.bytes, 2000)) << subject.name << ' ' << hex(text, 1000);
+            // Nothing that could be taken is left.
+            const std::string_view rest = std::string_view(text).substr(way.bytes, 2);
+            ASSERT_EQ(take(subject.side, utf16, rest).bytes, 0U) << subject.name << ' ' << hex(text, 1000);
         }
     });
 }

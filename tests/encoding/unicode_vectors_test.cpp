@@ -1,6 +1,7 @@
 // The Unicode forms in vector registers, for each instruction set that this machine has and without any: the same
 // results as a plain loop over characters, at all lengths around those of the registers, from any address, with nothing
 // read or written outside of what is given.
+#include <kvt/encoding/detail/byte_set.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
 
 #include <reference/icu_reference.h>
@@ -311,6 +312,28 @@ TEST_P(UnicodeVectors, AsciiEndsWhereItEnds) {
             EXPECT_EQ(vectors::narrowAscii(widened, length, bytes), ascii);
             EXPECT_TRUE(std::memcmp(bytes, text.data(), ascii) == 0);
         }
+    }
+}
+
+TEST_P(UnicodeVectors, SetsOfBytesKnowWhichOfABlockAreTheirs) {
+    std::mt19937_64 random(23);
+    GuardedMemory in(4096);
+    for (int round = 0; round < 300; ++round) {
+        vectors::ByteSet set;
+        std::vector<bool> isMember(256);
+        for (auto members = random() % 256; members-- > 0;) {
+            const auto byte = static_cast<std::uint8_t>(random());
+            set.add(byte);
+            isMember[byte] = true;
+        }
+        auto* const bytes =
+            reinterpret_cast<std::uint8_t*>(in.end() - vectors::ByteSet::block - random() % 3);
+        std::uint64_t expected = 0;
+        for (std::size_t i = 0; i < vectors::ByteSet::block; ++i) {
+            bytes[i] = static_cast<std::uint8_t>(round < 4 ? round * 64 + static_cast<int>(i) : random());
+            expected |= std::uint64_t{isMember[bytes[i]]} << i;
+        }
+        ASSERT_EQ(set.bitsOf(bytes), expected) << round;
     }
 }
 

@@ -6,6 +6,7 @@
 // for encodings without a state, do not change once they are made, and can be read by any number of threads.
 #pragma once
 
+#include <kvt/encoding/detail/byte_set.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
 #include <kvt/encoding/encoding.h>
 
@@ -35,13 +36,14 @@ private:
     static constexpr char16_t noUnit = 0xFFFF; // ask ICU
     static constexpr std::size_t pageSize = 256;
 
+    bool isPair(std::size_t first) const { return (pairs_[first / 64] >> first % 64 & 1) != 0; }
     std::size_t readSingles(std::string_view& in, char16_t* out, std::size_t room) const;
     std::size_t readPairs(std::string_view& in, char16_t* out, std::size_t room) const;
 
-    std::array<char16_t, 256> singles_; // the unit of each byte that is a character
-    // For each byte the place where the page of its second bytes begins. The first page is nobody's.
-    std::array<std::uint32_t, 256> pageOf_{};
-    std::vector<char16_t> pages_;
+    // Without pairs the unit of each byte, else that of each byte and the next, which for a single byte is any one.
+    std::vector<char16_t> units_;
+    std::array<std::uint64_t, 4> pairs_{}; // a bit for each byte that begins one
+    vectors::ByteSet leads_;               // the same bytes
     bool keepsAscii_ = true;
 };
 
