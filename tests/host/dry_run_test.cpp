@@ -71,7 +71,7 @@ TEST_F(KvtConvertDryRun, StrippedMarksAreNoLoss) {
     EXPECT_EQ(convert("UTF-8", "US-ASCII",
                       "\uFEFF"
                       "a",
-                      {"--dry-run"})
+                      {"--dry-run", "--bom", "keep"})
                   .status,
               1);
     EXPECT_EQ(convert("UTF-8", "US-ASCII",

@@ -70,6 +70,20 @@ TEST_F(KvtTzdata, TakesTheNamesOfWindowsFromThePackageIfItIsThere) {
     EXPECT_EQ(exists("zones/windowsZones.xml"), isThere);
 }
 
+TEST_F(KvtTzdata, RefusesWhatTheLibraryCouldNotLive) {
+    for (const auto& [text, part] :
+         {std::pair{"", "there is no zone"},
+          {"Z Etc/UTC 0 - UTC 2020 Jan 99\n", "line 1"},
+          {"Z Etc/UTC 0 - UTC 2020 Jan 99\n 0 - UTC\n", "line 1: \"99\" is not a day of that month"},
+          {"R X 1917 1318 - Jan 1 0 0 -\nZ Etc/UTC 0 X UTC\n", "line 1: the rule ends before it begins"},
+          {"Z Etc/UTC - - UTC\n", "line 1: \"-\" is not a length of time"}}) {
+        const ChildResult result = tzdata({"--from", write("mine.zi", text)});
+        EXPECT_TRUE(contains(result.err, part)) << text << result.err;
+        EXPECT_EQ(result.status, 2) << text;
+        EXPECT_FALSE(exists("zones")) << text;
+    }
+}
+
 TEST_F(KvtTzdata, WritesAnewIntoAFolderThatIsThere) {
     std::filesystem::create_directory(path("zones"));
     write("zones/version", "old");

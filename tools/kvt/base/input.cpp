@@ -65,12 +65,12 @@ std::size_t Input::readInto(std::size_t offset) {
 }
 
 std::string_view Input::read() {
-    return readAtLeast(1);
+    return {buffer_.data(), readInto(0)};
 }
 
-std::string_view Input::readAtLeast(std::size_t least) {
+std::string_view Input::readWhile(const std::function<bool(std::string_view)>& isTooShort) {
     std::size_t filled = 0;
-    while (filled < least) {
+    while (isTooShort({buffer_.data(), filled})) {
         const std::size_t count = readInto(filled);
         if (count == 0) {
             break;

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -22,8 +23,8 @@ public:
     /// The next bytes, at most blockSize of them, or none at the end. They are valid until the next call.
     /// Throws Failure.
     std::string_view read();
-    /// The same, but does not give up below `least` bytes before the end of the input.
-    std::string_view readAtLeast(std::size_t least);
+    /// The same, but goes on before the end of the input for as long as what there is `isTooShort`.
+    std::string_view readWhile(const std::function<bool(std::string_view)>& isTooShort);
 
     /// The name for messages: the path, or "standard input".
     const std::string& name() const { return name_; }

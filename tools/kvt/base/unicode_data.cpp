@@ -40,6 +40,15 @@ std::vector<std::string> converterNames() {
     return names;
 }
 
+bool leavesByteOrderOpen(const std::string& name) {
+    UErrorCode status = U_ZERO_ERROR;
+    UConverter* const converter = ucnv_open(name.c_str(), &status);
+    const std::string_view canonical = U_SUCCESS(status) ? ucnv_getName(converter, &status) : "";
+    const bool open = canonical == "UTF-16" || canonical == "UTF-32";
+    ucnv_close(converter);
+    return open;
+}
+
 std::vector<std::string> aliasesOf(const std::string& name) {
     UErrorCode status = U_ZERO_ERROR;
     const uint16_t count = ucnv_countAliases(name.c_str(), &status);

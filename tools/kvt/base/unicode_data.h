@@ -14,6 +14,9 @@ std::string characterName(char32_t character);
 bool isPrintable(char32_t character);
 
 /// ICU's own names of all its converters.
+/// Whether `name` is one of "UTF-16" or "UTF-32" that say nothing about the order of bytes.
+bool leavesByteOrderOpen(const std::string& name);
+
 std::vector<std::string> converterNames();
 
 /// All names of the converter that ICU opens under `name`.

@@ -50,13 +50,15 @@ std::string shownCharacter(std::optional<char32_t> character) {
 
 } // namespace
 
-Conversion::Conversion(const ConvertOptions& options, Encoding from, Encoding to, Diagnostics& diagnostics)
-    : options_(options), to_(to), fromName_(from.getName()), toName_(to.getName()), diagnostics_(diagnostics),
-      transcoder_(from, to), onLoss_([this](const Loss& loss) { takeLoss(loss); }), from_(from), lines_(from),
+Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, Encoding to,
+                       Diagnostics& diagnostics)
+    : options_(options), named_(from), from_(from.encoding), to_(to), fromName_(from_.getName()),
+      toName_(to.getName()), diagnostics_(diagnostics), transcoder_(from_, to),
+      onLoss_([this](const Loss& loss) { takeLoss(loss); }), lines_(from_),
       progress_(diagnostics, totalSize(options.inputs),
                 !isStandardOutput(options.output) || ::isatty(STDOUT_FILENO) == 0) {
     if (options.verify) {
-        roundTrip_.emplace(from, to);
+        roundTrip_.emplace(from_, to);
     }
 }
 
@@ -94,10 +96,11 @@ int Conversion::run() {
 }
 
 void Conversion::convertFile(const std::string& path) {
-    source_.emplace(path, from_, options_.mark);
+    source_.emplace(path, named_, options_.mark);
     if (output_->writesInPlaceTo(source_->input().descriptor())) {
         throw Failure(source_->input().name() + " is both input and output; use -o, which writes beside it");
     }
+    readIn(source_->encoding());
     std::string_view block = source_->next();
     lines_.restart(source_->skipped());
     progress_.advance(source_->skipped());
@@ -106,6 +109,20 @@ void Conversion::convertFile(const std::string& path) {
         progress_.advance(block.size());
     }
     finishFile();
+}
+
+// Files that are named alike may differ in the order of bytes.
+void Conversion::readIn(Encoding from) {
+    if (from == from_) {
+        return;
+    }
+    from_ = from;
+    fromName_ = from.getName();
+    transcoder_ = kvt::ex::StreamTranscoder(from, to_);
+    lines_ = LineCounter(from);
+    if (roundTrip_) {
+        roundTrip_->readIn(from);
+    }
 }
 
 void Conversion::convertBlock(std::string_view block) {
@@ -172,7 +189,7 @@ void Conversion::explainStop(const Stopped& stopped) {
     diagnostics_.line("     lost:        " + describeLost(loss));
     diagnostics_.line("     would read:  " + lossyLine());
     if (loss.codePoint == U'\uFEFF' && loss.offset == 0) {
-        diagnostics_.line("     This is a byte order mark; '--bom strip' leaves it out.");
+        diagnostics_.line("     This is a byte order mark, which is left out without '--bom keep'.");
     }
     diagnostics_.line(isStandardOutput(options_.output)
                           ? "     What was written to standard output ends before the loss."

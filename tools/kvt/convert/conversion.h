@@ -22,7 +22,7 @@ namespace host {
 
 class Conversion {
 public:
-    Conversion(const ConvertOptions& options, kvt::ex::Encoding from, kvt::ex::Encoding to,
+    Conversion(const ConvertOptions& options, const TextEncoding& from, kvt::ex::Encoding to,
                Diagnostics& diagnostics);
 
     /// Gives an ExitStatus; throws as a Command does.
@@ -36,6 +36,7 @@ private:
     };
 
     void convertFile(const std::string& path);
+    void readIn(kvt::ex::Encoding from);
     void convertBlock(std::string_view block);
     void finishFile();
     void writeConverted();
@@ -46,13 +47,14 @@ private:
     bool verified();
 
     const ConvertOptions& options_;
+    TextEncoding named_;
+    kvt::ex::Encoding from_; ///< the order of bytes in this file
     kvt::ex::Encoding to_;
     std::string fromName_;
     std::string toName_;
     Diagnostics& diagnostics_;
     kvt::ex::StreamTranscoder transcoder_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
-    kvt::ex::Encoding from_;
     LineCounter lines_;
     LossLedger ledger_;
     std::optional<RoundTrip> roundTrip_;

@@ -34,9 +34,11 @@ columns count characters of the decoded text, lines end with LF, CR or CRLF.
 Whatever was lost is listed on standard error at the end: each character or
 bad byte sequence, how often, and where first.
 
-Byte order marks: 'keep' converts them like any other character, 'strip' drops
-the one at the start of each FILE, 'add' does so too and begins the output with
-one. Only Unicode encodings have one.
+Byte order marks: the one at the start of each FILE is skipped. In UTF-16 and
+UTF-32 it says which order the bytes are in, which is little-endian without one;
+a mark that the name of the encoding contradicts ends the command. 'keep' converts
+marks like any other character, 'strip' refuses encodings where they cannot be cut
+off, such as UTF-7, and 'add' does so too and begins the output with one.
 
 Exit status:
   0  done, nothing was lost; with --dry-run: some encoding would lose nothing
@@ -45,8 +47,10 @@ Exit status:
 
 const Choices<OnError> errorChoices = {
     {"stop", OnError::Stop}, {"replace", OnError::Replace}, {"report", OnError::Report}};
-const Choices<MarkPolicy> markChoices = {
-    {"keep", MarkPolicy::Keep}, {"strip", MarkPolicy::Strip}, {"add", MarkPolicy::Add}};
+const Choices<MarkPolicy> markChoices = {{"skip", MarkPolicy::Skip},
+                                         {"keep", MarkPolicy::Keep},
+                                         {"strip", MarkPolicy::Strip},
+                                         {"add", MarkPolicy::Add}};
 
 class ConvertCommand : public Command {
 public:
@@ -71,7 +75,7 @@ public:
         syntax.flag("--dry-run", dryRun_,
                     "Write nothing; print the encodings of --to, best first, with what each "
                     "would lose");
-        syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'keep' (default), 'strip' or 'add'");
+        syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'skip' (default), 'keep', 'strip' or 'add'");
         syntax.operand("FILE", options_.inputs, "Files to convert; '-' is standard input, the default");
     }
 
@@ -85,7 +89,7 @@ public:
             }
             options_.onError = OnError::Report;
         }
-        const kvt::ex::Encoding from = textEncoding(from_);
+        const TextEncoding from = inputEncoding(from_);
         if (!dryRun_) {
             return Conversion(options_, from, textEncoding(to_), diagnostics).run();
         }
@@ -105,7 +109,7 @@ private:
     std::string from_;
     std::string to_;
     std::string onError_ = "stop";
-    std::string mark_ = "keep";
+    std::string mark_ = "skip";
     bool dryRun_ = false;
     Option onErrorOption_;
     ConvertOptions options_;

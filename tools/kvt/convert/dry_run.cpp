@@ -24,11 +24,22 @@ using kvt::ex::Loss;
 
 struct Target {
     std::string name;
+    Encoding from;
+    Encoding to;
     kvt::ex::StreamTranscoder transcoder;
     LossLedger ledger;
     std::uint64_t bytes = 0;
 
-    Target(Encoding from, Encoding to) : name(to.getName()), transcoder(from, to) {}
+    Target(Encoding source, Encoding target)
+        : name(target.getName()), from(source), to(target), transcoder(from, to) {}
+
+    // Files that are named alike may differ in the order of bytes.
+    void readIn(Encoding source) {
+        if (source != from) {
+            from = source;
+            transcoder = kvt::ex::StreamTranscoder(from, to);
+        }
+    }
 
     // `block` is null at the end of a file.
     void convert(const std::string_view* block) {
@@ -79,18 +90,21 @@ std::string tableOf(const std::vector<Target>& targets) {
 
 } // namespace
 
-int dryRun(const ConvertOptions& options, Encoding from, const std::vector<Encoding>& encodings,
+int dryRun(const ConvertOptions& options, const TextEncoding& from, const std::vector<Encoding>& encodings,
            Diagnostics& diagnostics) {
-    checkMark(options.mark, from);
+    checkMark(options.mark, from.encoding);
     std::vector<Target> targets;
     targets.reserve(encodings.size());
     for (const Encoding to : encodings) {
-        targets.emplace_back(from, to);
+        targets.emplace_back(from.encoding, to);
     }
     {
         Progress progress(diagnostics, totalSize(options.inputs), true);
         for (const std::string& path : options.inputs) {
             Source source(path, from, options.mark);
+            for (Target& target : targets) {
+                target.readIn(source.encoding());
+            }
             for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
                 for (Target& target : targets) {
                     target.convert(&block);

@@ -23,6 +23,10 @@ std::optional<char32_t> characterAt(const std::string& text, std::size_t index) 
 RoundTrip::RoundTrip(kvt::ex::Encoding from, kvt::ex::Encoding to)
     : decodeInput_(from, kvt::ex::Encoding::Utf32LE), decodeOutput_(to, kvt::ex::Encoding::Utf32LE) {}
 
+void RoundTrip::readIn(kvt::ex::Encoding from) {
+    decodeInput_ = kvt::ex::StreamTranscoder(from, kvt::ex::Encoding::Utf32LE);
+}
+
 void RoundTrip::addInput(std::string_view bytes) {
     if (!difference_) {
         decodeInput_.convert(bytes, input_, {});

@@ -18,6 +18,8 @@ class RoundTrip {
 public:
     RoundTrip(kvt::ex::Encoding from, kvt::ex::Encoding to);
 
+    /// The next input is in another encoding. Not within a text.
+    void readIn(kvt::ex::Encoding from);
     void addInput(std::string_view bytes);
     void addOutput(std::string_view bytes);
     /// Both texts end here; others may follow.

@@ -11,6 +11,7 @@
 #include "convert/loss_report.h"
 #include "convert/wwjd_stream.h"
 #include "text/line_counter.h"
+#include "text/source.h"
 
 #include <unistd.h>
 
@@ -80,15 +81,17 @@ private:
 
     static void convertFile(const std::string& path, WwjdStream& stream, Output& output, Progress& progress,
                             const std::string& encodingName) {
-        Input input(path);
+        Source source(path, kvt::ex::Encoding::Utf8, MarkPolicy::Skip);
+        const Input& input = source.input();
         if (output.writesInPlaceTo(input.descriptor())) {
             throw Failure(input.name() + " is both input and output; use -o, which writes beside it");
         }
         LineCounter lines(kvt::ex::Encoding::Utf8);
         std::string converted;
         try {
-            std::string_view block = input.read();
-            for (; !block.empty(); block = input.read()) {
+            std::string_view block = source.next();
+            lines.restart(source.skipped());
+            for (; !block.empty(); block = source.next()) {
                 lines.beginBlock(block);
                 stream.convert(block, converted);
                 lines.endBlock();
@@ -99,8 +102,8 @@ private:
             stream.finish(converted);
             output.write(converted);
         } catch (const kvt::ex::Loss& loss) {
-            const LineCounter::Position position = lines.at(loss.offset);
-            const Place place{input.name(), loss.offset, position.line, position.column};
+            const LineCounter::Position position = lines.at(source.skipped() + loss.offset);
+            const Place place{input.name(), source.skipped() + loss.offset, position.line, position.column};
             throw Failure(describe(place) + ": " + describe(910002, {printable(loss.bytes), encodingName}));
         }
     }

@@ -9,6 +9,7 @@
 #include "cli/sizes.h"
 #include "sort/line_feeder.h"
 #include "sort/workspace.h"
+#include "text/byte_order_mark.h"
 
 #include <algorithm>
 #include <unistd.h>
@@ -85,6 +86,9 @@ afterwards, also when the command fails or is interrupted. Without --workspace i
 is in the folder of $TMPDIR, or in /tmp. It takes up to about twice the size of
 the input.
 
+A byte order mark of UTF-8 at the start of a FILE is part of no line, and stands
+at the start of the output.
+
 All FILEs are read before anything is written. An output file appears whole or
 not at all, so that it may be one of the FILEs.
 
@@ -139,6 +143,9 @@ void LineCommand::sendThrough(Output& output, std::uint64_t memory, LineOrder or
         }
     }
     Progress writing(diagnostics, feeder.size(), show, "writing");
+    if (feeder.hasMark()) {
+        output.write(byteOrderMark(kvt::ex::Encoding::Utf8));
+    }
     LineOutput lines(output, workspace, showCounts, writing);
     if (asRead) {
         sorter.finishByPlace(lines);

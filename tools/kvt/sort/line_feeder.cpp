@@ -2,6 +2,7 @@
 
 #include "base/text_units.h"
 #include "text/line_reader.h"
+#include "text/source.h"
 #include "text/text_operation.h"
 
 #include <algorithm>
@@ -36,11 +37,15 @@ std::size_t wholeCharacters(std::string_view text, std::size_t most) {
 // Looks whether a file is UTF-8, block by block, and refuses it when it is not.
 class Utf8Check {
 public:
-    explicit Utf8Check(const std::string& file)
+    /// `skipped` bytes of the file precede what is looked at.
+    Utf8Check(const std::string& file, std::uint64_t skipped)
         : decoder_(Encoding::Utf8, Encoding::Utf8), places_(Encoding::Utf8),
-          onLoss_([this, file](const kvt::ex::Loss& loss) {
+          onLoss_([this, file, skipped](kvt::ex::Loss loss) {
+              loss.offset += skipped;
               throw badTextFailure(file, loss, places_, std::string(Encoding(Encoding::Utf8).getName()));
-          }) {}
+          }) {
+        places_.restart(skipped);
+    }
 
     void take(std::string_view block) {
         places_.beginBlock(block);
@@ -69,12 +74,13 @@ LineFeeder::LineFeeder(const FeedRule& rule, LineSorter& sorter, Workspace& work
       key_(workspace, rule.memory / 2) {}
 
 void LineFeeder::read(const std::string& path, Progress& progress) {
-    Input input(path);
+    Source source(path, Encoding::Utf8, MarkPolicy::Skip);
+    hasMark_ = hasMark_ || source.skipped() != 0;
     std::optional<Utf8Check> check;
     if (rule_.fold) {
-        check.emplace(input.name());
+        check.emplace(source.input().name(), source.skipped());
     }
-    for (std::string_view block = input.read(); !block.empty(); block = input.read()) {
+    for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
         if (check) {
             check->take(block);
         }

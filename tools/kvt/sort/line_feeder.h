@@ -4,7 +4,6 @@
 // length. Where lines are folded, files are UTF-8, and what is not is refused with its place.
 #pragma once
 
-#include "base/input.h"
 #include "base/progress.h"
 #include "sort/growing_text.h"
 #include "sort/line_sorter.h"
@@ -33,6 +32,8 @@ public:
     void read(const std::string& path, Progress& progress);
     /// Bytes of all lines, their ends included.
     std::uint64_t size() const { return size_; }
+    /// Whether a file began with a byte order mark, which belongs to no line.
+    bool hasMark() const { return hasMark_; }
 
 private:
     void takeBlock(std::string_view block);
@@ -47,6 +48,7 @@ private:
     std::string folded_;
     std::uint64_t lines_ = 0;
     std::uint64_t size_ = 0;
+    bool hasMark_ = false;
 };
 
 } // namespace host

@@ -156,4 +156,8 @@ Encoding textEncoding(const std::string& name) {
     }
 }
 
+TextEncoding inputEncoding(const std::string& name) {
+    return {textEncoding(name), leavesByteOrderOpen(name)};
+}
+
 } // namespace host

@@ -1,6 +1,8 @@
 // All encodings by name: those that the library knows by heart and every converter of ICU, with all their names.
 #pragma once
 
+#include "text/byte_order_mark.h"
+
 #include <kvt/encoding/encoding.h>
 
 #include <cstdint>
@@ -42,6 +44,9 @@ private:
 
 /// The encoding of that name, which must have a converter. Throws Failure with what was probably meant.
 kvt::ex::Encoding textEncoding(const std::string& name);
+
+/// The same for what is read: names that leave the order of bytes open are told apart.
+TextEncoding inputEncoding(const std::string& name);
 
 /// What to say about a name that nobody knows.
 std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue);

@@ -31,9 +31,10 @@ Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineC
     return Failure(describe(place) + ": " + describe(910002, {shownBytes(loss.bytes), encodingName}));
 }
 
-LineReader::LineReader(const std::string& path, Encoding encoding)
-    : input_(path), encodingName_(encoding.getName()), decoder_(encoding, Encoding::Utf8),
-      onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }), places_(encoding) {}
+LineReader::LineReader(const std::string& path, const TextEncoding& encoding)
+    : input_(path), first_(encoding.firstBlock(input_)), encoding_(encoding.of(first_, input_.name())),
+      encodingName_(encoding_.getName()), decoder_(encoding_, Encoding::Utf8),
+      onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }), places_(encoding_) {}
 
 void LineReader::refuse(const kvt::ex::Loss& loss) {
     throw badTextFailure(input_.name(), loss, places_, encodingName_);
@@ -46,7 +47,7 @@ bool LineReader::readBlock() {
     decoded_.erase(0, taken_);
     searched_ -= taken_;
     taken_ = 0;
-    const std::string_view block = input_.read();
+    const std::string_view block = std::exchange(started_, true) ? input_.read() : first_;
     lastBlock_ = block.size();
     ended_ = block.empty();
     places_.beginBlock(block);
@@ -62,10 +63,10 @@ bool LineReader::readBlock() {
 
 // The decoder gives whole characters only, so that the first one is there as soon as there is anything.
 void LineReader::findMark() {
-    if (started_ || decoded_.empty()) {
+    if (markSought_ || decoded_.empty()) {
         return;
     }
-    started_ = true;
+    markSought_ = true;
     const std::string_view mark = byteOrderMark(Encoding::Utf8);
     if (decoded_.starts_with(mark)) {
         marked_ = true;

@@ -8,6 +8,7 @@
 
 #include "base/failure.h"
 #include "base/input.h"
+#include "text/byte_order_mark.h"
 #include "text/line_counter.h"
 
 #include <kvt/encoding/encoding.h>
@@ -34,8 +35,8 @@ Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineC
 
 class LineReader {
 public:
-    /// Throws Failure when the file cannot be opened.
-    LineReader(const std::string& path, kvt::ex::Encoding encoding);
+    /// Reads the beginning. Throws Failure when the file cannot be read, or its mark is not one of the encoding.
+    LineReader(const std::string& path, const TextEncoding& encoding);
 
     /// Reads a block, of which next() then gives the lines; false behind the end of the file. Throws Failure,
     /// with the place of bytes that are not text.
@@ -49,6 +50,8 @@ public:
     std::string_view takeMark();
 
     const Input& input() const { return input_; }
+    /// In which order of bytes, too.
+    kvt::ex::Encoding encoding() const { return encoding_; }
     /// Bytes of the file in the last block.
     std::size_t lastBlock() const { return lastBlock_; }
 
@@ -60,7 +63,10 @@ private:
     void findMark();
 
     Input input_;
+    std::string_view first_; ///< the first block, until readBlock() takes it
+    kvt::ex::Encoding encoding_;
     std::string encodingName_;
+    bool started_ = false;
     kvt::ex::StreamTranscoder decoder_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
     LineCounter places_;
@@ -69,7 +75,7 @@ private:
     std::size_t searched_ = 0; ///< up to here, decoded_ holds no end of the line that begins at taken_
     std::uint64_t number_ = 0;
     std::size_t lastBlock_ = 0;
-    bool started_ = false;
+    bool markSought_ = false;
     bool marked_ = false;
     bool ended_ = false;
 };

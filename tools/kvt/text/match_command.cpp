@@ -13,6 +13,7 @@
 #include "text/line_reader.h"
 #include "text/text_writer.h"
 
+#include <optional>
 #include <stdexcept>
 #include <unistd.h>
 
@@ -89,10 +90,10 @@ public:
 
     int run(Diagnostics& diagnostics) override {
         pattern_ = compilePattern(regex_, choose("--dialect", dialect_, dialectChoices));
-        const kvt::ex::Encoding encoding = textEncoding(encoding_);
+        const TextEncoding encoding = inputEncoding(encoding_);
         inputs_ = inputsOrStandardInput(inputs_);
         const std::unique_ptr<Output> output = openOutput(outputPath_);
-        TextWriter writer(*output, encoding, !groups_);
+        std::optional<TextWriter> writer;
         {
             Progress progress(diagnostics, totalSize(inputs_),
                               !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
@@ -102,10 +103,13 @@ public:
                     throw Failure(reader.input().name() +
                                   " is both input and output; use -o, which writes beside it");
                 }
-                searchAll(reader, writer, progress);
+                if (!writer) { // in the byte order of the first
+                    writer.emplace(*output, reader.encoding(), !groups_);
+                }
+                searchAll(reader, *writer, progress);
             }
         }
-        writer.finish();
+        writer->finish();
         return Done;
     }
 

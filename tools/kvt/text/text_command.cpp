@@ -12,6 +12,7 @@
 #include "text/text_writer.h"
 
 #include <functional>
+#include <optional>
 #include <unistd.h>
 #include <utility>
 
@@ -58,11 +59,11 @@ public:
     }
 
     int run(Diagnostics& diagnostics) override {
-        const kvt::ex::Encoding encoding = textEncoding(encoding_);
+        const TextEncoding encoding = inputEncoding(encoding_);
         inputs_ = inputsOrStandardInput(inputs_);
         const std::unique_ptr<TextOperation> operation = chosen();
         const std::unique_ptr<Output> output = openOutput(outputPath_);
-        TextWriter writer(*output, encoding, operation->givesText());
+        std::optional<TextWriter> writer;
         {
             Progress progress(diagnostics, totalSize(inputs_),
                               !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
@@ -72,10 +73,13 @@ public:
                     throw Failure(reader.input().name() +
                                   " is both input and output; use -o, which writes beside it");
                 }
-                applyTo(reader, *operation, writer, progress);
+                if (!writer) { // in the byte order of the first
+                    writer.emplace(*output, reader.encoding(), operation->givesText());
+                }
+                applyTo(reader, *operation, *writer, progress);
             }
         }
-        writer.finish();
+        writer->finish();
         return Done;
     }
 
