@@ -1,15 +1,15 @@
-// ObsoleteRegexp on Boost.Regex; the dialect itself is in legacy_pattern.cpp.
+// ObsoleteRegexp on the compiled pattern; the dialect itself is in legacy_pattern.cpp.
 #include <kvt/regex/obsolete_regexp.h>
 
+#include <kvt/regex/detail/compiled_pattern.h>
 #include <kvt/regex/detail/legacy_pattern.h>
 
-#include <boost/regex.hpp>
-
 #include <cstring>
+#include <memory>
 
 class ObsoleteRegexpImpl {
 public:
-    boost::basic_regex<char> regex;
+    std::shared_ptr<const kvt::ex::detail::CompiledPattern> pattern; ///< copies share it
 };
 
 namespace kvt::ex::detail {
@@ -21,7 +21,8 @@ template class PimplBase<ObsoleteRegexpImpl>;
 ObsoleteRegexp::ObsoleteRegexp(const char* pattern) : ObsoleteRegexp(pattern, std::strlen(pattern)) {}
 
 ObsoleteRegexp::ObsoleteRegexp(const char* pattern, std::uint64_t length) {
-    d().regex.assign(kvt::ex::detail::perlPattern({pattern, length}), boost::regex_constants::normal);
+    d().pattern = std::make_shared<const kvt::ex::detail::CompiledPattern>(
+        kvt::ex::detail::perlPattern({pattern, length}));
 }
 
 ObsoleteRegexp::ObsoleteRegexp(const ObsoleteRegexp& other) = default;
@@ -37,10 +38,10 @@ ObsoleteRegexp::~ObsoleteRegexp() = default;
 std::uint64_t ObsoleteRegexp::index(const char* text, std::uint64_t length, std::uint64_t* matchLength,
                                     std::uint64_t start) const {
     boost::cmatch result;
-    if (start >= length || !boost::regex_search(text + start, text + length, result, d().regex)) {
+    if (start >= length || !d().pattern->search({text, length}, start, result)) {
         *matchLength = 0;
         return npos;
     }
     *matchLength = static_cast<std::uint64_t>(result.length());
-    return start + static_cast<std::uint64_t>(result.position());
+    return static_cast<std::uint64_t>(result[0].first - text);
 }

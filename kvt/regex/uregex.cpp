@@ -1,8 +1,8 @@
-// URegex on Boost.Regex. The engine works on bytes, so that all instantiations share the one of its code; what is
-// left for the template is to copy the subject.
+// URegex on the compiled pattern. It works on bytes, so that all instantiations share the one of its code; what is left for
+// the template is to copy the subject.
 #include <kvt/regex/uregex.h>
 
-#include <boost/regex.hpp>
+#include <kvt/regex/detail/compiled_pattern.h>
 
 #include <cstddef>
 #include <string_view>
@@ -13,8 +13,7 @@ namespace detail {
 template <std::uint32_t N>
 class URegexImpl {
 public:
-    // The regex counts references to its compiled program, so that copies are cheap.
-    boost::basic_regex<char> regex;
+    std::shared_ptr<const CompiledPattern> pattern; ///< null without one; copies share it
 };
 
 } // namespace detail
@@ -23,38 +22,27 @@ namespace {
 
 using Groups = vector<std::pair<std::uint64_t, std::uint64_t>>;
 
-bool isUsable(const boost::basic_regex<char>& regex) {
-    // Without a program the status is an error, too.
-    return regex.status() == 0;
-}
-
-// The difference of a group that took no part is -1, and wraps around when `start` is added.
-Groups groupsOf(const boost::cmatch& result, std::uint64_t start) {
+// The position of a group that took no part is one before `start`, modulo 2 to the 64th.
+Groups groupsOf(const boost::cmatch& result, std::string_view subject, std::uint64_t start) {
     Groups groups;
     groups.reserve(result.size());
-    for (int i = 0; i < static_cast<int>(result.size()); ++i) {
-        groups.emplace_back(static_cast<std::uint64_t>(result.position(static_cast<std::size_t>(i))) + start,
-                            static_cast<std::uint64_t>(result.length(i)));
+    for (const auto& group : result) {
+        groups.emplace_back(group.matched ? static_cast<std::uint64_t>(group.first - subject.data())
+                                          : start - 1,
+                            static_cast<std::uint64_t>(group.length()));
     }
     return groups;
 }
 
-Groups matchWhole(const boost::basic_regex<char>& regex, std::string_view subject) {
+Groups matchWhole(const detail::CompiledPattern* pattern, std::string_view subject) {
     boost::cmatch result;
-    if (!isUsable(regex) ||
-        !boost::regex_match(subject.data(), subject.data() + subject.size(), result, regex)) {
-        return {};
-    }
-    return groupsOf(result, 0);
+    return pattern != nullptr && pattern->match(subject, result) ? groupsOf(result, subject, 0) : Groups();
 }
 
-Groups searchFrom(const boost::basic_regex<char>& regex, std::string_view subject, std::uint64_t start) {
+Groups searchFrom(const detail::CompiledPattern* pattern, std::string_view subject, std::uint64_t start) {
     boost::cmatch result;
-    if (!isUsable(regex) ||
-        !boost::regex_search(subject.data() + start, subject.data() + subject.size(), result, regex)) {
-        return {};
-    }
-    return groupsOf(result, start);
+    return pattern != nullptr && pattern->search(subject, start, result) ? groupsOf(result, subject, start)
+                                                                         : Groups();
 }
 
 } // namespace
@@ -64,7 +52,8 @@ URegex<N>::URegex() : impl_(std::make_unique<detail::URegexImpl<N>>()) {}
 
 template <std::uint32_t N>
 URegex<N>::URegex(const UString<N>& pattern) : URegex() {
-    d().regex.assign(pattern.begin(), pattern.end(), boost::regex_constants::normal);
+    d().pattern =
+        std::make_shared<const detail::CompiledPattern>(std::string_view(pattern.rawData(), pattern.size()));
 }
 
 template <std::uint32_t N>
@@ -74,7 +63,7 @@ URegex<N>::URegex(const URegex& other)
 template <std::uint32_t N>
 URegex<N>& URegex<N>::operator=(const URegex& other) {
     if (impl_ && other.impl_) {
-        d().regex = other.d().regex;
+        d().pattern = other.d().pattern;
     } else {
         *this = URegex(other);
     }
@@ -92,17 +81,17 @@ URegex<N>::~URegex() = default;
 
 template <std::uint32_t N>
 URegex<N>::operator bool() const noexcept {
-    return !impl_ || isUsable(d().regex);
+    return !impl_ || d().pattern != nullptr;
 }
 
 template <std::uint32_t N>
 URegexMatch<N> URegex<N>::match(const UString<N>& subject) const {
-    return {subject, matchWhole(d().regex, subject)};
+    return {subject, matchWhole(d().pattern.get(), subject)};
 }
 
 template <std::uint32_t N>
 URegexMatch<N> URegex<N>::search(const UString<N>& subject, std::uint64_t start) const {
-    return {subject, searchFrom(d().regex, subject, start)};
+    return {subject, searchFrom(d().pattern.get(), subject, start)};
 }
 
 template class URegex<0>;

@@ -14,6 +14,8 @@
 namespace kvt::test {
 namespace {
 
+using ex::URegex;
+
 class Generator {
 public:
     explicit Generator(std::uint64_t seed) : random_(seed) {}
@@ -174,6 +176,105 @@ TEST(RegexDifferential, URegexDoesWhatTheEngineDoes) {
     EXPECT_GT(tally.misses, 20000u);
     EXPECT_GT(tally.withUnusedGroup, 500u);
 }
+
+// ---- Patterns that begin with what can be scanned for
+
+// A beginning of fixed width, and a text that is made of it, of parts of it and of other things.
+struct Prefixed {
+    std::string pattern;
+    std::vector<std::string> pieces;
+};
+
+const std::vector<Prefixed> prefixes = {
+    {"\\d{4}-\\d\\d-\\d\\d", {"2020-01-31", "2020-01-3", "020-01-31", "-", "2020-", "1"}},
+    {"(\\d{2}):(\\d\\d)", {"12:34", "1:34", "12:", ":", "12 34"}},
+    {"ERROR", {"ERROR", "ERRO", "RROR", "error", "E"}},
+    {"(?:ERR(OR))", {"ERROR", "ERROr", "OR"}},
+    {"\\[[A-Z]{3}\\]", {"[ABC]", "[AB]", "[", "]", "ABC]"}},
+    {"x.y", {"xay", "x\ny", "xy", "xx", "yy"}},
+    {"\u00e9[\x80-\xbf]z", {"\u00e9\x80z", "\u00e9z", "\xc3", "z"}},
+    {"[^a-y ]{3}", {"Z:1", "zzz", "z z", "a"}},
+    {"q[[:alpha:]]\\w{2,4}", {"qab1", "qabcdef", "q1", "qa"}},
+    {"[[:xdigit:]]{8}", {"9f3c0a1b", "9f3c0a1", "g"}},
+    {"\\Qa.b\\E", {"a.b", "axb", "."}},
+};
+
+TEST(RegexDifferential, APatternWithAFixedBeginningIsFoundWhereTheEngineFindsIt) {
+    Generator generate(5301);
+    Tally tally;
+    const std::vector<std::string> others = {
+        " ", "\n", "a", "b", "1", "lorem ipsum dolor ", std::string(1, '\0'), "0"};
+    for (int round = 0; round < 4000; ++round) {
+        const Prefixed& prefix = prefixes[generate.below(prefixes.size())];
+        const std::string pattern = prefix.pattern + (round % 4 == 0 ? "" : generate.pattern());
+        std::vector<std::string> subjects;
+        for (int i = 0; i < 3; ++i) {
+            std::string subject;
+            for (std::size_t piece = generate.below(30); piece > 0; --piece) {
+                subject += generate.below(3) == 0 ? prefix.pieces[generate.below(prefix.pieces.size())]
+                                                  : others[generate.below(others.size())];
+            }
+            subjects.push_back(subject.substr(0, 90));
+        }
+        SCOPED_TRACE("round " + std::to_string(round) + ", pattern " + testing::PrintToString(pattern));
+        compare<0>(pattern, subjects, tally);
+        if (HasFatalFailure()) {
+            return;
+        }
+    }
+    EXPECT_GT(tally.compiled, 2500u);
+    EXPECT_GT(tally.matches, 20000u);
+    EXPECT_GT(tally.misses, 20000u);
+}
+
+// The engine counts its steps over all places of a search. Where that makes it give up, passing over places must not help.
+TEST(RegexDifferential, GivingUpIsNotPassedOver) {
+    std::size_t givenUp = 0;
+    std::size_t ended = 0;
+    for (const char* pattern : {"ab.*x", "ab.*.*x", "ab.*.*.*x", "ab[ab]*[ab]*x", "(ab)\\w+\\s?\\w+(x|y)",
+                                "abab.{0,9}.{0,9}.{0,9}x", "ab(a|b|ab).*(a|b|ba)x", "ab.*$x"}) {
+        const boost::regex engine(pattern);
+        const URegex<0> regex(pattern);
+        for (std::size_t count = 1; count < 700; count += 1 + count / 5) {
+            for (const char* filler : {"ab", "ab...................", "ab  c"}) {
+                std::string subject;
+                for (std::size_t i = 0; i < count && subject.size() < 1200; ++i) {
+                    subject += filler;
+                }
+                const Found found = searchedByEngine(engine, subject, 0);
+                ASSERT_EQ(searchedBy(regex, subject, 0), found) << pattern << " on " << subject;
+                ++(found.error.code == -1 ? ended : givenUp);
+            }
+        }
+    }
+    EXPECT_GT(givenUp, 20u);
+    EXPECT_GT(ended, 100u);
+}
+
+TEST(RegexDifferential, LongTextsWithRareBeginnings) {
+    Generator generate(5401);
+    std::size_t found = 0;
+    for (const Prefixed& prefix : prefixes) {
+        for (const char* rest : {"", ".*z", "\\b", "$", "\\s(\\w+)?", "(?=a)a"}) {
+            const boost::regex engine(prefix.pattern + rest);
+            const URegex<0> regex(units<0>(prefix.pattern + rest));
+            for (int round = 0; round < 5; ++round) {
+                std::string subject;
+                while (subject.size() < 3000) {
+                    subject += generate.below(40) == 0 ? prefix.pieces[generate.below(prefix.pieces.size())]
+                                                       : "lorem ";
+                }
+                const std::uint64_t start = generate.below(100);
+                const Found expected = searchedByEngine(engine, subject, start);
+                ASSERT_EQ(searchedBy(regex, subject, start), expected) << prefix.pattern << rest;
+                found += expected.groups.empty() ? 0 : 1;
+            }
+        }
+    }
+    EXPECT_GT(found, 50u);
+}
+
+// ---- The old dialect
 
 // Position and length, or the failure, as the engine gives them for the pattern translated by hand.
 std::pair<Span, EngineError> indexedByEngine(const boost::regex& engine, std::string_view text,

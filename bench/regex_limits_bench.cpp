@@ -1,0 +1,137 @@
+// What searching with a URegex must reach beside the engine itself: boost::regex with a match that is used again, without
+// the copy of the subject that a URegexMatch holds. std::regex is shown.
+#include "limits.h"
+
+#include <kvt/regex/uregex.h>
+
+#include <boost/regex.hpp>
+
+#include <algorithm>
+#include <array>
+#include <memory>
+#include <random>
+#include <regex>
+#include <string>
+#include <thread>
+
+namespace {
+
+using namespace kvt::ex;
+using kvt::bench::Bound;
+using kvt::bench::Limits;
+using kvt::bench::way;
+using kvt::bench::Way;
+
+UString<0> string(const std::string& text) {
+    return UString<0>(UStringView<0>(text));
+}
+
+/// Lines of a log, without a date and without the words that are sought, but for one at the end.
+std::string logText(std::size_t size) {
+    const std::array<const char*, 6> lines = {
+        "12:03:55.120 INFO  [pool-3] request 4711 from 10.0.12.7 took 15 ms, 2048 bytes sent\n",
+        "12:03:55.121 DEBUG [pool-1] cache hit for key user/77/profile, age 35 s\n",
+        "12:03:56.007 WARN  [main] queue has 120 of 128 places taken\n",
+        "12:03:56.450 INFO  [pool-2] session 9f3c-22 opened, 3 others active\n",
+        "12:03:57.003 INFO  [pool-3] request 4712 from 10.0.12.9 took 7 ms, 512 bytes sent\n",
+        "12:03:58.999 DEBUG [gc] pause of 3 ms, 512 MB of 2048 MB in use\n",
+    };
+    std::mt19937_64 random(1);
+    std::string text;
+    while (text.size() < size) {
+        text += lines[random() % lines.size()];
+    }
+    return text + "2020-01-31 12:04:00.000 ERROR [main] disk full\n";
+}
+
+/// Sentences without digits.
+std::string prose(std::size_t size) {
+    const std::string sentence = "the lazy dog and the other animals looked on, as the fox came; ";
+    std::string text;
+    while (text.size() < size) {
+        text += sentence;
+    }
+    text.resize(size);
+    return text;
+}
+
+Way kvtWay(const std::string& pattern, const std::string& text) {
+    return way([regex = URegex<0>(string(pattern)), subject = string(text)] {
+        return regex.search(subject).groupCount();
+    });
+}
+
+Way boostWay(const std::string& pattern, const std::string& text) {
+    return way([regex = boost::regex(pattern), text, match = std::make_shared<boost::cmatch>()] {
+        return boost::regex_search(text.data(), text.data() + text.size(), *match, regex);
+    });
+}
+
+Way stdWay(const std::string& pattern, const std::string& text) {
+    return way([regex = std::regex(pattern), text, match = std::make_shared<std::cmatch>()] {
+        return std::regex_search(text.data(), text.data() + text.size(), *match, regex);
+    });
+}
+
+void hold(Limits& limits, const std::string& name, const std::string& pattern, const std::string& text,
+          Bound bound, double limit) {
+    limits.add(name, kvtWay(pattern, text));
+    limits.add(name + ": boost::regex", boostWay(pattern, text));
+    limits.hold({name, name + ": boost::regex", bound, limit});
+    if (text.size() < 10000) {
+        limits.add(name + ": std::regex", stdWay(pattern, text));
+        limits.hold({name, name + ": std::regex"});
+    }
+}
+
+/// The same work by two threads at once, with one object.
+Way onTwoThreads(const std::string& pattern, const std::string& text) {
+    return [regex = URegex<0>(string(pattern)), subject = string(text)](int calls) {
+        const auto work = [&] {
+            for (int i = 0; i < calls; ++i) {
+                benchmark::DoNotOptimize(regex.search(subject).groupCount());
+            }
+        };
+        std::thread other(work);
+        work();
+        other.join();
+    };
+}
+
+// Each of two threads does what one alone does: 1.8 times the work of one is 2 / 1.8 of its time.
+void holdThreads(Limits& limits) {
+    const std::string pattern = "(\\w+)@(\\w+)";
+    const std::string text = "mail for someone@somewhere";
+    limits.add("one thread", kvtWay(pattern, text));
+    limits.add("one thread: boost::regex", boostWay(pattern, text));
+    limits.add("two threads, each as much", onTwoThreads(pattern, text));
+    limits.hold({"two threads, each as much", "one thread", Bound::atMost, 2 / 1.8});
+    limits.hold({"one thread", "one thread: boost::regex"});
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    Limits large(31, 1);
+    const std::string log = logText(1 << 20);
+    hold(large, "1 MiB, a date", "\\d{4}-\\d\\d-\\d\\d \\d\\d:\\d\\d", log, Bound::atLeast, 30);
+    hold(large, "1 MiB, a date in groups", "(\\d{4})-(\\d\\d)-(\\d\\d)", log, Bound::atLeast, 30);
+    hold(large, "1 MiB, a literal", "ERROR \\[(\\w+)\\] (.*)", log, Bound::atLeast, 5);
+    hold(large, "1 MiB, no prefix", "\\w+ \\[main\\] disk", log, Bound::shown, 0);
+    Limits small(101, 2000);
+    hold(small, "no match in 90 bytes, a literal", "zebra", prose(90), Bound::atMost, 0.3);
+    hold(small, "no match in 90 bytes, a date", "(\\d{4})-(\\d\\d)-(\\d\\d)", prose(90), Bound::atMost, 0.3);
+    hold(small, "no match in 90 bytes, no prefix", "(\\d+)-(\\d+)-(\\d+)", prose(90), Bound::shown, 0);
+    hold(small, "a match in 90 bytes", "(\\d+)-(\\d+)-(\\d+)", prose(80) + "2020-01-31", Bound::shown, 0);
+    hold(small, "a match in 10 bytes", "(\\d+)-(\\d+)", "in 2020-01", Bound::shown, 0);
+    hold(small, "words in 4 KB", "[a-z]+ [a-z]+ zebra", prose(4000), Bound::shown, 0);
+    const std::string compiled = "(\\d{4})-(\\d\\d)-(\\d\\d)";
+    small.add("compile", way([pattern = string(compiled)] { return URegex<0>(pattern); }));
+    small.add("compile: boost::regex", way([compiled] { return boost::regex(compiled); }));
+    small.hold({"compile", "compile: boost::regex"});
+    Limits threads(101, 4000);
+    holdThreads(threads);
+    const bool isLargeWithin = large.run(argc, argv) == 0;
+    const bool isSmallWithin = small.run(argc, argv) == 0;
+    return threads.run(argc, argv) == 0 && isSmallWithin && isLargeWithin ? 0 : 1;
+}

@@ -1,0 +1,97 @@
+// A search scans for the prefix and has the engine try the pattern at such a place only. It goes back to the plain search
+// from the start where the scan does not pay, and where the engine might have given up on its way.
+#include <kvt/regex/detail/compiled_pattern.h>
+
+#include <memory>
+#include <utility>
+
+namespace kvt::ex::detail {
+namespace {
+
+// The number of the calling thread, modulo `count`.
+std::size_t numberOfThread(std::size_t count) {
+    static std::atomic<std::size_t> threads{0};
+    thread_local constinit std::size_t number = 0;
+    if (number == 0) {
+        number = threads.fetch_add(1, std::memory_order_relaxed) + 1;
+    }
+    return number % count;
+}
+
+// Whether prefixes stand so close that trying the pattern at each place costs no more.
+bool areClose(std::size_t tries, std::size_t distance) {
+    return tries > 4 && distance / tries < 64;
+}
+
+} // namespace
+
+CompiledPattern::CompiledPattern(std::string_view pattern)
+    : engine_(pattern.data(), pattern.data() + pattern.size(), boost::regex_constants::normal),
+      owner_(numberOfThread(programs)), prefix_(fixedPrefix(engine_)), scan_(std::move(prefix_.sets)) {}
+
+CompiledPattern::~CompiledPattern() {
+    for (const auto& other : others_) {
+        delete other.load(std::memory_order_relaxed);
+    }
+}
+
+const Engine& CompiledPattern::engine() const {
+    const std::size_t number = numberOfThread(programs);
+    if (number == owner_) {
+        return engine_;
+    }
+    std::atomic<const Engine*>& place = others_[number];
+    const Engine* own = place.load(std::memory_order_acquire);
+    if (own == nullptr) {
+        auto made =
+            std::make_unique<Engine>(engine_); // for its locale, which may not be the global one any more
+        made->assign(engine_.expression(), engine_.expression() + engine_.size(),
+                     boost::regex_constants::normal);
+        if (place.compare_exchange_strong(own, made.get(), std::memory_order_acq_rel)) {
+            own = made.release();
+        }
+    }
+    return *own;
+}
+
+bool CompiledPattern::match(std::string_view text, boost::cmatch& result) const {
+    return boost::regex_match(text.data(), text.data() + text.size(), result, engine());
+}
+
+bool CompiledPattern::search(std::string_view text, std::size_t start, boost::cmatch& result) const {
+    const char* const begin = text.data() + start;
+    const char* const end = text.data() + text.size();
+    if (scan_) {
+        if (const std::optional<bool> found = searchByPrefix(begin, end, result)) {
+            return *found;
+        }
+    }
+    return boost::regex_search(begin, end, result, engine());
+}
+
+std::optional<bool> CompiledPattern::searchByPrefix(const char* begin, const char* end,
+                                                    boost::cmatch& result) const {
+    const auto size = static_cast<std::size_t>(end - begin);
+    double visited = 0; // states, by the tries
+    std::size_t place = scan_.find(begin, size, 0);
+    for (std::size_t tries = 1;; ++tries) {
+        visited += place != size ? prefix_.statesOfTry({begin, size}, place) : 0;
+        if (!prefix_.isSureToEnd(engine_.size(), size, visited) || areClose(tries, place)) {
+            return {};
+        }
+        if (place == size) {
+            return false;
+        }
+        try {
+            // All that looks back sees the beginning of the search, not of the try.
+            if (boost::regex_search(begin + place, end, result, engine(), boost::match_continuous, begin)) {
+                return true;
+            }
+        } catch (const boost::regex_error&) {
+            return {};
+        }
+        place = scan_.find(begin, size, place + 1);
+    }
+}
+
+} // namespace kvt::ex::detail

@@ -1,0 +1,55 @@
+// The search for a place where each of the first bytes lies in a set of its own, by vector registers.
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+namespace kvt::ex::detail {
+
+/// A set of bytes, in rows of those that have the upper half in common.
+struct ByteSet {
+    std::array<std::uint16_t, 16> rows{};
+
+    void add(unsigned char byte) {
+        rows[byte >> 4U] = static_cast<std::uint16_t>(rows[byte >> 4U] | 1U << (byte & 0xFU));
+    }
+    bool contains(unsigned char byte) const { return (rows[byte >> 4U] >> (byte & 0xFU) & 1U) != 0; }
+    std::size_t count() const;
+};
+
+class PrefixScan {
+public:
+    /// `sets` has one set for each place; no set at all is a scan that is not there.
+    explicit PrefixScan(std::vector<ByteSet> sets);
+
+    explicit operator bool() const { return !sets_.empty(); }
+
+    /// The first place at or after `from`, which is at most `size`, where the bytes lie in their sets; `size` where there is
+    /// none.
+    std::size_t find(const char* text, std::size_t size, std::size_t from) const;
+
+    /// One place that is looked at in registers: the bytes whose halves have a bit in common in these tables are all of its
+    /// set, and may be some more.
+    struct Probe {
+        std::size_t offset = 0;
+        alignas(16) std::array<std::uint8_t, 16> low{};
+        alignas(16) std::array<std::uint8_t, 16> high{};
+    };
+    static constexpr std::size_t probeCount = 3;
+
+private:
+    bool standsAt(const char* place) const;
+
+    std::vector<ByteSet> sets_;
+    std::array<Probe, probeCount> probes_;
+};
+
+namespace vectors {
+
+/// The first of the `places` from `text` on where all probes say yes; `places` where there is none.
+std::size_t findProbes(const PrefixScan::Probe* probes, const char* text, std::size_t places);
+
+} // namespace vectors
+} // namespace kvt::ex::detail

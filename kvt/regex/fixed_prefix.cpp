@@ -1,0 +1,229 @@
+// The compiled program is read, not the pattern, so that classes and escapes are what the engine takes them for. It is a
+// chain of states in the order of the pattern. A kind of state that is not in the tables below ends the matter: then
+// nothing is passed over.
+#include <kvt/regex/detail/fixed_prefix.h>
+
+#include <algorithm>
+#include <bit>
+
+namespace kvt::ex::detail {
+namespace {
+
+namespace states = boost::BOOST_REGEX_DETAIL_NS;
+
+constexpr std::size_t longestPrefix = 16; // bytes
+
+template <typename State>
+const State& as(const states::re_syntax_base* state) {
+    return *static_cast<const State*>(state);
+}
+
+const char* textOf(const states::re_syntax_base* literal) {
+    return reinterpret_cast<const char*>(&as<states::re_literal>(literal) + 1);
+}
+
+ByteSet only(char byte) {
+    ByteSet set;
+    set.add(static_cast<unsigned char>(byte));
+    return set;
+}
+
+/// The bytes that a state of one byte takes, or that might be taken.
+ByteSet bytesOf(const states::re_syntax_base* state) {
+    ByteSet set;
+    if (state->type == states::syntax_element_literal) {
+        return only(*textOf(state));
+    }
+    if (state->type == states::syntax_element_set) {
+        const auto& map = as<states::re_set>(state)._map;
+        for (std::size_t high = 0; high < set.rows.size(); ++high) {
+            unsigned row = 0;
+            for (std::size_t low = 0; low < 16; ++low) {
+                row |= (map[high * 16 + low] != 0 ? 1U : 0U) << low;
+            }
+            set.rows[high] = static_cast<std::uint16_t>(row);
+        }
+        return set;
+    }
+    set.rows.fill(0xFFFF);
+    return set;
+}
+
+/// Reads the parts and counts the states. Returns false where the engine could visit more of them than can be told
+/// beforehand: groups that are repeated, looks ahead and behind, references and their like.
+bool readParts(const Engine& engine, FixedPrefix& prefix) {
+    double states = 0;
+    double ways = 1;
+    for (const auto* state = engine.get_first_state(); state != nullptr; state = state->next.p) {
+        ++states;
+        switch (state->type) {
+        case states::syntax_element_startmark:
+        case states::syntax_element_endmark:
+            if (as<states::re_brace>(state).index < 0) {
+                return false;
+            }
+            break;
+        case states::syntax_element_literal:
+            prefix.parts.push_back({{}, as<states::re_literal>(state).length, 0});
+            break;
+        case states::syntax_element_set:
+        case states::syntax_element_wild:
+            prefix.parts.push_back({{}, 1, 0});
+            break;
+        case states::syntax_element_dot_rep:
+        case states::syntax_element_char_rep:
+        case states::syntax_element_short_set_rep: {
+            const auto& repeat = as<states::re_repeat>(state);
+            prefix.parts.push_back({bytesOf(state->next.p), repeat.min, repeat.max});
+            state = state->next.p; // what is repeated
+            break;
+        }
+        case states::syntax_element_rep:
+            if (as<states::re_repeat>(state).max > 1) {
+                return false;
+            }
+            [[fallthrough]];
+        case states::syntax_element_alt:
+            prefix.hasAlternatives = true;
+            ways *= 2;
+            break;
+        case states::syntax_element_start_line:
+        case states::syntax_element_end_line:
+        case states::syntax_element_word_boundary:
+        case states::syntax_element_within_word:
+        case states::syntax_element_word_start:
+        case states::syntax_element_word_end:
+        case states::syntax_element_buffer_start:
+        case states::syntax_element_buffer_end:
+        case states::syntax_element_jump:
+        case states::syntax_element_match:
+            break;
+        default:
+            return false;
+        }
+    }
+    // Each way may begin with a step back.
+    prefix.statesOfWay = 2 * (states + 1) * ways;
+    return true;
+}
+
+/// Adds what comes first in the program, up to the first state that may take this or that number of bytes.
+void readPrefix(const Engine& engine, FixedPrefix& prefix) {
+    auto& sets = prefix.sets;
+    sets.reserve(longestPrefix);
+    for (const auto* state = engine.get_first_state(); sets.size() < longestPrefix;) {
+        ++prefix.statesOfPrefix;
+        switch (state->type) {
+        case states::syntax_element_startmark:
+        case states::syntax_element_endmark:
+            break;
+        case states::syntax_element_literal:
+            for (std::size_t i = 0; i < as<states::re_literal>(state).length && sets.size() < longestPrefix;
+                 ++i) {
+                sets.push_back(only(textOf(state)[i]));
+            }
+            break;
+        case states::syntax_element_set:
+        case states::syntax_element_wild:
+            sets.push_back(bytesOf(state));
+            break;
+        case states::syntax_element_dot_rep:
+        case states::syntax_element_char_rep:
+        case states::syntax_element_short_set_rep: {
+            const auto& repeat = as<states::re_repeat>(state);
+            // The engine has shorter ways with a repeat at the very beginning.
+            if (repeat.min != repeat.max && sets.empty()) {
+                return;
+            }
+            sets.insert(sets.end(), std::min(repeat.min, longestPrefix - sets.size()),
+                        bytesOf(state->next.p));
+            if (repeat.min != repeat.max) {
+                return;
+            }
+            state = repeat.alt.p;
+            continue;
+        }
+        default:
+            return;
+        }
+        state = state->next.p;
+    }
+}
+
+/// How frequent the bytes of a set are in texts, roughly: small letters and the blank have a weight.
+double frequencyOf(const ByteSet& set) {
+    constexpr double weight = 8; // where the others have 1
+    const int frequent = std::popcount(set.rows[6] & 0xFFFEU) + std::popcount(set.rows[7] & 0x07FFU) +
+                         std::popcount(set.rows[2] & 0x0001U);
+    return (static_cast<double>(set.count()) + (weight - 1) * frequent) / (256 + (weight - 1) * 27);
+}
+
+// Whether a place in so many is expected to have the prefix that looking for it pays.
+bool isRare(const std::vector<ByteSet>& sets) {
+    double frequency = 1;
+    for (const ByteSet& set : sets) {
+        frequency *= frequencyOf(set);
+    }
+    return frequency < 1.0 / 50;
+}
+
+} // namespace
+
+FixedPrefix fixedPrefix(const Engine& engine) {
+    FixedPrefix prefix;
+    if (readParts(engine, prefix)) {
+        readPrefix(engine, prefix);
+        while (!prefix.sets.empty() && prefix.sets.back().count() == 256) {
+            prefix.sets.pop_back();
+        }
+        if (!isRare(prefix.sets)) {
+            prefix.sets.clear();
+        }
+    }
+    return prefix;
+}
+
+// Each part lies between two places, the nearest and the farthest that it may get to; a repeat gives as many ways more as
+// there are places for its end.
+double FixedPrefix::statesOfTry(std::string_view text, std::size_t place) const {
+    std::size_t nearest = place;
+    std::size_t farthest = place;
+    double visited = statesOfWay;
+    for (const Part& part : parts) {
+        // At least so many bytes, which are not looked at.
+        const std::size_t begin = std::min(text.size(), farthest);
+        farthest = part.least < text.size() - begin ? begin + part.least : text.size();
+        if (part.most > part.least) {
+            // A run that goes past the farthest place so far is the one that goes on there.
+            const std::size_t more = std::min(part.most - part.least, text.size() - farthest);
+            const std::size_t end = farthest + more;
+            if (part.set.count() == 256) {
+                farthest = end;
+            } else {
+                while (farthest != end && part.set.contains(static_cast<unsigned char>(text[farthest]))) {
+                    ++farthest;
+                }
+            }
+            visited *= static_cast<double>(std::min(part.most - part.least, farthest - nearest) + 1);
+        }
+        // Of alternatives not all parts are taken.
+        nearest =
+            hasAlternatives ? place : std::min(nearest + std::min(part.least, text.size()), text.size());
+    }
+    return visited;
+}
+
+// The engine gives up when it has visited more states, in all tries together, than the greater of the two products and
+// k, of which it caps the second.
+bool FixedPrefix::isSureToEnd(std::size_t patternSize, std::size_t places, double visited) const {
+    constexpr double k = 100000;
+    const auto n = static_cast<double>(places);
+    visited += n * statesOfPrefix;
+    if (visited <= k) {
+        return true;
+    }
+    const auto size = static_cast<double>(patternSize);
+    return visited <= std::max(n * size * size, std::min<double>(n * n, BOOST_REGEX_MAX_STATE_COUNT)) + k;
+}
+
+} // namespace kvt::ex::detail
