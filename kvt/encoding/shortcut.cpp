@@ -24,6 +24,7 @@
 #include <algorithm>
 #include <array>
 #include <bit>
+#include <cstdint>
 #include <cstring>
 
 namespace kvt::ex::detail {
@@ -97,6 +98,82 @@ void copySwapped(const char* from, char* to, std::size_t units) {
         }
         std::memcpy(to + i * sizeof unit, &unit, sizeof unit);
     }
+}
+
+// ---- Short texts of ASCII ----------------------------------------------------------------------------------------
+
+// For these a call into vector code costs more than the text.
+constexpr std::size_t shortText = 64; // bytes
+
+template <typename Unit>
+bool isAscii(const char* text, std::size_t units) {
+    constexpr std::uint64_t beyond = sizeof(Unit) == 1   ? 0x8080808080808080U
+                                     : sizeof(Unit) == 2 ? 0xFF80FF80FF80FF80U
+                                                         : 0xFFFFFF80FFFFFF80U;
+    const std::size_t bytes = units * sizeof(Unit);
+    std::uint64_t all = 0;
+    std::uint64_t word = 0;
+    if (bytes < sizeof word) {
+        std::memcpy(&word, text, bytes);
+        return (word & beyond) == 0;
+    }
+    for (std::size_t i = 0; i + sizeof word < bytes; i += sizeof word) {
+        std::memcpy(&word, text + i, sizeof word);
+        all |= word;
+    }
+    // The last word overlaps the one before.
+    std::memcpy(&word, text + bytes - sizeof word, sizeof word);
+    return ((all | word) & beyond) == 0;
+}
+
+template <typename From, typename To>
+void copyAscii(const char* from, char* to, std::size_t units) {
+    constexpr std::size_t block = 8;
+    const auto copy = [=](std::size_t begin, std::size_t count) {
+        for (std::size_t i = begin; i < begin + count; ++i) {
+            From unit;
+            std::memcpy(&unit, from + i * sizeof unit, sizeof unit);
+            const auto same = static_cast<To>(unit);
+            std::memcpy(to + i * sizeof same, &same, sizeof same);
+        }
+    };
+    if (units < block) {
+        copy(0, units);
+        return;
+    }
+    for (std::size_t i = 0; i + block < units; i += block) {
+        copy(i, block);
+    }
+    copy(units - block, block);
+}
+
+template <typename From, typename CharOut>
+bool convertShortAscii(Form to, std::string_view in, std::basic_string<CharOut>& out) {
+    const std::size_t units = in.size() / sizeof(From);
+    if (in.size() % sizeof(From) != 0 || !isAscii<From>(in.data(), units)) {
+        return false;
+    }
+    const auto copy = to == nativeUtf16   ? copyAscii<From, std::uint16_t>
+                      : to == nativeUtf32 ? copyAscii<From, std::uint32_t>
+                                          : copyAscii<From, std::uint8_t>;
+    const std::size_t written = units * unitBytes(to) / sizeof(CharOut);
+    appendInPlace(out, written, [&](CharOut* place) {
+        copy(in.data(), reinterpret_cast<char*>(place), units);
+        return written;
+    });
+    return true;
+}
+
+/// Converts a short text that is nothing but ASCII; returns whether it was one, between forms that have the same units.
+template <typename CharOut>
+bool convertShortAscii(Form from, Form to, std::string_view in, std::basic_string<CharOut>& out) {
+    if (!isAsciiBytes(to) && to != nativeUtf16 && to != nativeUtf32) {
+        return false;
+    }
+    return isAsciiBytes(from)    ? convertShortAscii<std::uint8_t>(to, in, out)
+           : from == nativeUtf16 ? convertShortAscii<std::uint16_t>(to, in, out)
+           : from == nativeUtf32 ? convertShortAscii<std::uint32_t>(to, in, out)
+                                 : false;
 }
 
 // ---- How much there is to convert --------------------------------------------------------------------------------
@@ -406,6 +483,9 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
     if (from.form == Form::other || to.form == Form::other ||
         (sizeof(CharOut) != 1 && sizeof(CharOut) != unitBytes(to.form))) {
         return 0;
+    }
+    if (in.size() <= shortText && convertShortAscii(from.form, to.form, in, out)) {
+        return in.size();
     }
     from = lacksDecoding(from) ? withoutTables(from) : from;
     to = lacksEncoding(to) ? withoutTables(to) : to;

@@ -14,8 +14,10 @@
 
 #include <hwy/highway.h>
 
+#include <algorithm>
 #include <array>
 #include <bit>
+#include <iterator>
 
 // What does not depend on the instruction set.
 #ifndef KVT_UNICODE_CONVERT_ONCE
@@ -220,6 +222,36 @@ HWY_INLINE void fromUtf8Blocks(D d, const std::uint8_t* first, const std::uint8_
 }
 #endif
 
+#if KVT_HAS_VECTORS
+/// Converts the last bytes of a text, fewer than two narrow registers, as a register or two with zeros behind them. They may
+/// begin with trail bytes of a character that is done.
+template <typename Unit>
+HWY_INLINE void fromUtf8End(const std::uint8_t*& p, const std::uint8_t* end, Unit*& q) {
+    const Eight16 d;
+    constexpr std::size_t block = 16;
+    const auto left = static_cast<std::size_t>(end - p);
+    const std::size_t bytes = left <= block ? block : 2 * block;
+    std::uint8_t padded[2 * block + 2] = {};
+    std::memcpy(padded, p, left);
+    Unit units[3 * block];
+    const std::uint8_t* from = padded;
+    Unit* to = units;
+    fromUtf8Blocks(d, from, from, padded + bytes + 2, to, units + std::size(units));
+    // A character of four bytes may have taken the place of the second register.
+    while (from < padded + left) {
+        if (isTrail(*from)) {
+            ++from;
+        } else {
+            put(to, takeUtf8(from));
+        }
+    }
+    const std::size_t written = static_cast<std::size_t>((to - units) - (from - (padded + left)));
+    std::memcpy(q, units, written * sizeof(Unit));
+    p = end;
+    q += written;
+}
+#endif
+
 template <typename Unit>
 HWY_INLINE std::size_t fromUtf8(const char* text, std::size_t bytes, char* out, std::size_t room) {
     const auto* const first = reinterpret_cast<const std::uint8_t*>(text);
@@ -234,6 +266,9 @@ HWY_INLINE std::size_t fromUtf8(const char* text, std::size_t bytes, char* out, 
     if (sizeof(Unit) == 2 && p != first && p[-1] >= 0xF0) {
         --p;
         storeUnit(q++, static_cast<Unit>(lowSurrogate(takeUtf8(p))));
+    }
+    if (const auto left = static_cast<std::size_t>(end - p); left > 1 && left < 32) {
+        fromUtf8End(p, end, q);
     }
 #else
     static_cast<void>(room);
@@ -349,6 +384,27 @@ std::size_t utf16ToUtf8(const char* text, std::size_t units, char* out, std::siz
             }
         }
     }
+    // The last ones, where less room is left than a block may overwrite, by way of a buffer.
+    while (end - p > 1) {
+        const std::size_t count = std::min<std::size_t>(8, static_cast<std::size_t>(end - p));
+        std::uint16_t padded[8] = {};
+        std::memcpy(padded, p, count * sizeof *p);
+        const auto v = hn::LoadU(d, padded);
+        if (!hn::AllFalse(d, hn::Eq(hn::And(v, hn::Set(d, 0xF800)), hn::Set(d, 0xD800)))) {
+            break;
+        }
+        std::uint8_t bytes[blockRoom];
+        std::uint8_t* to = bytes;
+        if (hn::AllFalse(d, hn::Gt(v, hn::Set(d, 0x7FF)))) {
+            putEightTwos(v, to);
+        } else {
+            putEightThrees(v, to);
+        }
+        const std::size_t written = static_cast<std::size_t>(to - bytes) - (8 - count);
+        std::memcpy(q, bytes, written);
+        p += count;
+        q += written;
+    }
 #else
     static_cast<void>(outEnd);
 #endif
@@ -360,14 +416,10 @@ std::size_t utf16ToUtf8(const char* text, std::size_t units, char* out, std::siz
 
 // ---- UTF-16 and UTF-32 -------------------------------------------------------------------------------------------
 
-std::size_t utf16ToUtf32(const char* text, std::size_t units, char* out, std::size_t room) {
-    const auto* p = reinterpret_cast<const std::uint16_t*>(text);
-    const std::uint16_t* const end = p + units;
-    auto* const begin = reinterpret_cast<std::uint32_t*>(out);
-    std::uint32_t* q = begin;
-    const std::uint32_t* const outEnd = q + room;
 #if KVT_HAS_VECTORS
-    const Units16 d;
+template <class D>
+HWY_INLINE void widenUnits(D d, const std::uint16_t*& p, const std::uint16_t* end, std::uint32_t*& q,
+                           const std::uint32_t* outEnd) {
     const std::size_t N = hn::Lanes(d);
     while (static_cast<std::size_t>(end - p) >= N && static_cast<std::size_t>(outEnd - q) >= N) {
         const auto v = hn::LoadU(d, p);
@@ -382,8 +434,39 @@ std::size_t utf16ToUtf32(const char* text, std::size_t units, char* out, std::si
             putUtf32(q, takeUtf16(p));
         }
     }
+}
+
+template <class D>
+HWY_INLINE void narrowUnits(D d, const std::uint32_t*& p, const std::uint32_t* end, std::uint16_t*& q,
+                            const std::uint16_t* outEnd) {
+    const hn::Rebind<std::uint16_t, D> narrow;
+    const std::size_t N = hn::Lanes(d);
+    while (static_cast<std::size_t>(end - p) >= N && static_cast<std::size_t>(outEnd - q) >= N) {
+        const auto v = hn::LoadU(d, p);
+        if (HWY_LIKELY(hn::AllTrue(d, hn::Eq(hn::ShiftRight<16>(v), hn::Zero(d))))) {
+            hn::StoreU(hn::DemoteTo(narrow, hn::BitCast(hn::RebindToSigned<D>(), v)), narrow, q);
+            p += N;
+            q += N;
+            continue;
+        }
+        for (std::size_t i = 0; i < N; ++i) {
+            putUtf16(q, loadUnit(p++));
+        }
+    }
+}
+#endif
+
+std::size_t utf16ToUtf32(const char* text, std::size_t units, char* out, std::size_t room) {
+    const auto* p = reinterpret_cast<const std::uint16_t*>(text);
+    const std::uint16_t* const end = p + units;
+    auto* const begin = reinterpret_cast<std::uint32_t*>(out);
+    std::uint32_t* q = begin;
+#if KVT_HAS_VECTORS
+    // What the widest registers leave over is worth narrower ones.
+    widenUnits(Units16(), p, end, q, begin + room);
+    widenUnits(Eight16(), p, end, q, begin + room);
 #else
-    static_cast<void>(outEnd);
+    static_cast<void>(room);
 #endif
     while (p < end) {
         putUtf32(q, takeUtf16(p));
@@ -396,25 +479,11 @@ std::size_t utf32ToUtf16(const char* text, std::size_t units, char* out, std::si
     const std::uint32_t* const end = p + units;
     auto* const begin = reinterpret_cast<std::uint16_t*>(out);
     std::uint16_t* q = begin;
-    const std::uint16_t* const outEnd = q + room;
 #if KVT_HAS_VECTORS
-    const Units32 d;
-    const hn::Rebind<std::uint16_t, Units32> narrow;
-    const std::size_t N = hn::Lanes(d);
-    while (static_cast<std::size_t>(end - p) >= N && static_cast<std::size_t>(outEnd - q) >= N) {
-        const auto v = hn::LoadU(d, p);
-        if (HWY_LIKELY(hn::AllTrue(d, hn::Eq(hn::ShiftRight<16>(v), hn::Zero(d))))) {
-            hn::StoreU(hn::DemoteTo(narrow, hn::BitCast(hn::RebindToSigned<Units32>(), v)), narrow, q);
-            p += N;
-            q += N;
-            continue;
-        }
-        for (std::size_t i = 0; i < N; ++i) {
-            putUtf16(q, loadUnit(p++));
-        }
-    }
+    narrowUnits(Units32(), p, end, q, begin + room);
+    narrowUnits(hn::FixedTag<std::uint32_t, 4>(), p, end, q, begin + room);
 #else
-    static_cast<void>(outEnd);
+    static_cast<void>(room);
 #endif
     while (p < end) {
         putUtf16(q, loadUnit(p++));

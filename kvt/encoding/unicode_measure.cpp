@@ -176,6 +176,30 @@ HWY_INLINE const std::uint8_t* withoutOpenCharacter(const std::uint8_t* p, Exten
 }
 #endif
 
+#if KVT_HAS_VECTORS
+/// Adds the last bytes of a text, fewer than two narrow registers, as a register or two with zeros around them; or nothing,
+/// when that is not well-formed. They begin with a character.
+template <class D>
+HWY_INLINE const std::uint8_t* measureUtf8End(D narrow, const std::uint8_t* p, const std::uint8_t* end,
+                                              Extent& extent) {
+    const std::size_t N = hn::Lanes(narrow);
+    const auto left = static_cast<std::size_t>(end - p);
+    std::uint8_t padded[3 + 2 * 16] = {};
+    std::memcpy(padded + 3, p, left);
+    const std::size_t bytes = left <= N ? N : 2 * N;
+    const std::uint8_t* q = padded + 3;
+    Extent added;
+    if (!measureUtf8Blocks(narrow, q, q + bytes, added)) {
+        return p;
+    }
+    // Where zeros follow, an open character is one that is not well-formed.
+    const std::uint8_t* const behind = withoutOpenCharacter(q, added);
+    extent.utf32 += added.utf32 - (bytes - left);
+    extent.utf16 += added.utf16 - (bytes - left);
+    return end - (q - behind);
+}
+#endif
+
 Extent measureUtf8(const char* text, std::size_t bytes) {
     const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
     const std::uint8_t* const end = begin + bytes;
@@ -184,7 +208,7 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
     bool ended = false;
 #if KVT_HAS_VECTORS
     const hn::FixedTag<std::uint8_t, 16> narrow;
-    if (bytes >= 3 + hn::Lanes(narrow)) {
+    if (bytes >= 2 * hn::Lanes(narrow)) {
         p = measureUtf8Singly(p, begin + 3, end, extent, ended);
         if (!ended) {
             // What the widest registers leave over is worth narrower ones.
@@ -193,6 +217,9 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
             }
             p = withoutOpenCharacter(p, extent);
         }
+    }
+    if (!ended && end - p > 1 && static_cast<std::size_t>(end - p) < 2 * hn::Lanes(narrow)) {
+        p = measureUtf8End(narrow, p, end, extent);
     }
 #endif
     if (!ended) {
@@ -251,6 +278,20 @@ Extent measureUtf16(const char* text, std::size_t units) {
         extent.utf32 -= 1;
         extent.utf8 -= 2;
     }
+#if KVT_HAS_VECTORS
+    // What is left is a register with zeros behind it, if there is no surrogate in it.
+    if (const auto left = static_cast<std::size_t>(end - p); left > 1 && left <= N) {
+        alignas(64) std::uint16_t padded[HWY_MAX_BYTES / 2] = {};
+        std::memcpy(padded, p, left * sizeof *p);
+        const auto v = hn::Load(d, padded);
+        if (hn::AllFalse(d, hn::Eq(hn::And(v, surrogateMask), hn::Set(d, 0xD800)))) {
+            extent.utf32 += left;
+            extent.utf8 += left + hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F))) +
+                           hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7FF)));
+            p = end;
+        }
+    }
+#endif
     while (p < end) {
         const std::uint32_t unit = loadUnit(p);
         if (isSurrogate(unit)) {
@@ -322,6 +363,12 @@ std::size_t asciiPrefix(const char* text, std::size_t bytes) {
         p += 4 * N;
     }
 #endif
+    for (std::uint64_t word = 0; static_cast<std::size_t>(end - p) >= sizeof word; p += sizeof word) {
+        std::memcpy(&word, p, sizeof word);
+        if ((word & 0x8080808080808080U) != 0) {
+            break;
+        }
+    }
     while (p < end && *p < 0x80) {
         ++p;
     }

@@ -23,15 +23,15 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     }
 }
 
-// A short text in two Unicode forms is converted before anything is asked about converters, which would cost more than
-// the text. One that is not well-formed is done again from its beginning.
+// A short text is converted before anything is asked about the converters of this thread, which would cost more than the
+// text. One that needs ICU is done again from its beginning.
 template <typename CharOut>
 void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
     constexpr std::size_t shortText = 1024;
-    if (bytes.size() <= shortText) {
-        const Side source{unicodeForm(from)};
-        const Side target{unicodeForm(to)};
-        if (source.form != Form::other && target.form != Form::other && source.form != target.form) {
+    if (bytes.size() <= shortText && from != to) {
+        const Side source = sideOf(from);
+        const Side target = sideOf(to);
+        if (source.form != Form::other && target.form != Form::other) {
             out.clear();
             if (convertPrefix(source, target, bytes, out) == bytes.size()) {
                 return;
