@@ -98,7 +98,6 @@ TEST_F(KvtDate, AFailureSaysWhyWithItsNumber) {
         {{"compare", "20200101", "120000"},
          "\"20200101\" and \"120000\" are not of kinds that can be compared. (933059)"},
         {{"cast", "120000", "date"}, "A value of the kind time cannot become one of the kind date. (933052)"},
-        {{"parse", "5", "%q"}, "\"%q\" is no flag that @DateTimeParse() knows. (933079)"},
         {{"parse", " ", "%Y"}, "The value is empty."},
         {{"zone", "set", "120000", "local"},
          "\"120000\" has no date, and without one the offset of this machine's zone is not known. (933096)"},
@@ -201,9 +200,8 @@ TEST_F(KvtDate, AValueThatNoFormatFitsIsReportedByTheOneThatItFitsBest) {
             date({"parse", row.value, "%d.%m.%Y", "--or", "ISO", "--or", "%Y-%m-%d", "--or", "%d/%m"}).err,
             "kvt: " + row.error);
     }
-    // A format that is wrong in itself is said where nothing else fits.
-    EXPECT_TRUE(contains(date({"parse", "x", "%H", "--or", "%q"}).err, "(933079)"));
-    EXPECT_EQ(date({"parse", "12", "%H", "--or", "%q"}).out, "120000\n");
+    // A format that is wrong in itself is said first.
+    EXPECT_TRUE(contains(date({"parse", "12", "%H", "--or", "%q"}).err, "\"%q\" is no flag (933079)"));
     // As JSON, too.
     EXPECT_TRUE(contains(date({"parse", "30.02.2024", "ISO", "--or", "%d.%m.%Y", "--json"}).out,
                          "\"number\":933090"));
@@ -227,9 +225,68 @@ TEST_F(KvtDate, LinesThatAreNoValueDoNotEndTheRest) {
     const ChildResult result = date({"add", "P1D"}, input);
     EXPECT_EQ(result.out, "20200201\n\n\n20200301\n");
     EXPECT_TRUE(contains(result.err, "standard input: line 2: ")) << result.err;
-    EXPECT_TRUE(contains(result.err, "standard input: line 3: The line is too long for a value.\n"))
-        << result.err;
+    EXPECT_TRUE(contains(result.err, "The line is too long for a value.\n")) << result.err;
     EXPECT_EQ(result.status, 1);
+}
+
+TEST_F(KvtDate, WhatIsWrongWithTheCommandLineIsSaidOnceAndFirst) {
+    struct Row {
+        std::vector<std::string> arguments;
+        std::string part;
+    };
+    for (const Row& row :
+         {Row{{"parse", "%Y-%Q"}, "\"%Q\" is no flag (933079); there are %$ "},
+          Row{{"parse", "%\u00e9"}, "\"%\u00e9\" is no flag"}, Row{{"parse", "%Y %"}, "(933076)"},
+          Row{{"parse", ""}, "(933074)"}, Row{{"parse", "ISO|x", "--or", "x"}, "(933075)"},
+          Row{{"format", "%Y%U%*"}, "\"%*\" is no flag"}, Row{{"add", "P1"}, "Its form is [-]P[nY]"},
+          Row{{"diff", "x"}, "(933063)"}, Row{{"compare", "20200230"}, "(933065)"},
+          Row{{"parse", "%Y", "--encoding", "x"}, "\"x\" is not the name of an encoding"},
+          Row{{"parse", "%Y", "--max-errors", "-1"}, "--max-errors takes a whole number"},
+          Row{{"parse", "2020", "%Y", "--file", "x"}, "do not go together"},
+          // A value for which the other argument is missing: no waiting for lines.
+          Row{{"parse", "2020-01-01"}, "kvt date parse '2020-01-01' ISO"},
+          Row{{"parse", "31.01.2020"}, "kvt date parse '31.01.2020' '%d.%m.%Y$'"},
+          Row{{"parse", "x"}, "kvt date parse 'x' FORMAT"},
+          Row{{"format", "20200131"}, "kvt date format '20200131' ISO"},
+          Row{{"add", "20200131"}, "kvt date add '20200131' P1D"}}) {
+        const ChildResult result = date(row.arguments, "20200131\n20200131\n");
+        EXPECT_TRUE(contains(result.err, row.part)) << result.err;
+        EXPECT_EQ(result.out, "") << row.part;
+        EXPECT_EQ(result.status, 2) << row.part;
+        EXPECT_LE(std::count(result.err.begin(), result.err.end(), '\n'), 2) << result.err;
+    }
+}
+
+TEST_F(KvtDate, LinesOfFilesGoIntoAFile) {
+    write("one", "\uFEFF2020-01-31\nx\n");
+    write("two", convert("UTF-8", "UTF-16LE", "2020-02-01", {"--bom", "add"}).out);
+    const ChildResult one = date({"parse", "%Y-%m-%d", "--file", "one", "-o", "out"});
+    EXPECT_EQ(one.out, "");
+    EXPECT_EQ(read("out"), "20200131\n\n");
+    EXPECT_TRUE(one.err.starts_with("kvt: one: line 2: \"x\": The value fits")) << one.err;
+    EXPECT_EQ(one.status, 1);
+    EXPECT_EQ(date({"parse", "%Y-%m-%d", "--file", "two", "--encoding", "UTF-16"}).out, "20200201\n");
+    EXPECT_TRUE(contains(date({"parse", "%Y-%m-%d", "--file", "one", "--json"}).out,
+                         "{\"line\":1,\"value\":\"2020-01-31\""));
+}
+
+TEST_F(KvtDate, FailuresAreCountedByMessageAndFormat) {
+    std::string input;
+    for (int line = 0; line < 20; ++line) {
+        input += "2020-02-3" + std::to_string(line % 2) + "\n";
+        input += "30.02.2020\n";
+    }
+    const ChildResult result = date({"parse", "%Y-%m-%d$", "--or", "%d.%m.%Y$"}, input + "x\n");
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(contains(result.err,
+                         "kvt: 41 lines failed:\n"
+                         "      20  such as standard input: line 1: \"2020-02-30\": By the format"))
+        << result.err;
+    EXPECT_TRUE(
+        contains(result.err, "\n      20  such as standard input: line 2: \"30.02.2020\": By the format"))
+        << result.err;
+    EXPECT_TRUE(contains(result.err, "\n       1  such as standard input: line 41: \"x\"")) << result.err;
+    EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '^'), 1) << result.err;
 }
 
 TEST_F(KvtDate, JsonHasTheResultOrTheMessage) {

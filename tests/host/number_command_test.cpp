@@ -80,22 +80,60 @@ TEST_F(KvtNumber, ExtremesAreNumbersAndWhatLiesBeyondIsNot) {
     }
 }
 
-TEST_F(KvtNumber, WhatIsNoNumberEndsItWithItsLine) {
+TEST_F(KvtNumber, ALineThatIsNoNumberIsSaidAndTheRestGoesOn) {
     for (const std::string bad : {"", " ", "abc", "1x", "1 2", "1,5", "0x10", "+-1", "-+1", "--1", "++1",
                                   "1e", "e5", ".", "+", "nan(1)", "infinit", "1_000"}) {
         const ChildResult result = number({"-o", "out"}, "1\r\n2.0\n" + bad + "\n4\n");
-        EXPECT_EQ(result.status, 2) << bad;
+        EXPECT_EQ(result.status, 1) << bad;
         EXPECT_EQ(result.err, "kvt: standard input: line 3: \"" + bad + "\" is not a number\n");
-        EXPECT_TRUE(names().empty());
+        EXPECT_EQ(read("out"), "1\n2\n\n4\n");
     }
-    // To standard output goes what stands before it.
-    EXPECT_EQ(number({}, "1\r\n2.0\nbad\n4\n").out, "1\n2\n");
     const ChildResult result = number({"1", "2.0", "bad", "4"});
     EXPECT_EQ(result.out, "1\n2\n");
     EXPECT_EQ(result.err, "kvt: argument 3: \"bad\" is not a number\n");
     EXPECT_EQ(result.status, 2);
-    EXPECT_EQ(number({}, "1\n\xff\n").err,
-              "kvt: standard input: line 2, column 1, byte 2: The bytes \"\\xFF\" are not valid UTF-8.\n");
+    EXPECT_EQ(number({}, "1\n\xff\n3\n").err, "kvt: standard input: line 2: \"\\xFF\" is not a number\n");
+    EXPECT_EQ(number({"1", "--max-errors", "x"}, "").status, 0);
+    EXPECT_EQ(number({"--max-errors", "x"}, "1\n").status, 2);
+}
+
+TEST_F(KvtNumber, ManyFailuresAreCounted) {
+    std::string input;
+    for (int line = 0; line < 25; ++line) {
+        input += "x" + std::to_string(line) + "\n";
+    }
+    input += "1e999\n7\n";
+    const ChildResult result = number({"--file", write("one", input), "--file", write("two", "y\n")});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_EQ(result.out, std::string(26, '\n') + "7\n\n");
+    EXPECT_TRUE(
+        contains(result.err, "one: line 10: \"x9\" is not a number\n     More of this kind are counted.\n"))
+        << result.err;
+    EXPECT_FALSE(contains(result.err, "line 11:")) << result.err;
+    EXPECT_TRUE(contains(result.err, "kvt: 27 lines failed:\n      26  such as ")) << result.err;
+    EXPECT_TRUE(contains(result.err, "       1  such as " + path("one") + ": line 26: \"1e999\" is outside"))
+        << result.err;
+
+    const ChildResult reported = number({"--file", "one", "--report", "report"});
+    EXPECT_FALSE(contains(reported.err, "line 2:")) << reported.err;
+    const std::string report = read("report");
+    EXPECT_EQ(std::count(report.begin(), report.end(), '\n'), 26);
+    EXPECT_TRUE(report.starts_with("{\"file\":\"one\",\"line\":1,\"value\":\"x0\",\"reason\":")) << report;
+
+    const ChildResult ended = number({"--file", "one", "--max-errors", "3", "-o", "out"});
+    EXPECT_EQ(ended.status, 2);
+    EXPECT_TRUE(contains(ended.err, "more than 3 lines failed")) << ended.err;
+    EXPECT_FALSE(exists("out"));
+    EXPECT_EQ(number({"--file", "one", "--max-errors", "26"}).status, 1);
+}
+
+TEST_F(KvtNumber, LinesMayBeInAnyEncoding) {
+    const std::string text = convert("UTF-8", "UTF-16BE", "1.50\nx\n", {"--bom", "add"}).out;
+    const ChildResult result = number({"--encoding", "UTF-16", "--progress", "never"}, text);
+    EXPECT_EQ(result.out, "1.5\n\n");
+    EXPECT_TRUE(contains(result.err, "line 2: \"x\"")) << result.err;
+    EXPECT_EQ(number({"--encoding", "nosuch"}, text).status, 2);
+    EXPECT_EQ(number({"--progress", "often"}, text).status, 2);
 }
 
 TEST_F(KvtNumber, LinesAreReadToTheLastOne) {

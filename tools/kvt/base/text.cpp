@@ -4,6 +4,7 @@
 
 #include <kvt/encoding/stream_transcoder.h>
 
+#include <algorithm>
 #include <cstring>
 
 namespace host {
@@ -70,6 +71,10 @@ std::string codePointName(char32_t character) {
 }
 
 std::string printable(std::string_view utf8) {
+    // Most of what is shown is this, and converters are not quickly made.
+    if (std::all_of(utf8.begin(), utf8.end(), [](char byte) { return byte >= ' ' && byte <= '~'; })) {
+        return std::string(utf8);
+    }
     // The library reports where a loss was, and there bytes are shown instead of a character.
     std::string out;
     std::uint64_t shown = 0;

@@ -36,9 +36,9 @@ bad byte sequence, how often, and where first.
 
 Byte order marks: the one at the start of each FILE is skipped. In UTF-16 and
 UTF-32 it says which order the bytes are in, which is little-endian without one;
-a mark that the name of the encoding contradicts ends the command. 'keep' converts
-marks like any other character, 'strip' refuses encodings where they cannot be cut
-off, such as UTF-7, and 'add' does so too and begins the output with one.
+a mark that the name of the encoding contradicts ends the command. 'keep' takes
+marks for characters, 'strip' refuses encodings where they cannot be cut off, as
+UTF-7 is, and 'add' does so too and begins the output with one.
 
 Exit status:
   0  done, nothing was lost; with --dry-run: some encoding would lose nothing

@@ -20,6 +20,12 @@ namespace {
 namespace datetime = kvt::ex::datetime;
 using kvt::ex::UString;
 
+// The other one of two values.
+std::string wrongInSecond(const std::string& value) {
+    const DateOutcome read = outcomeOf(datetime::timezoneRemove(toUString(value)));
+    return read.isGood() ? "" : failureText(read);
+}
+
 class AddFunction : public ValueFunction {
 public:
     AddFunction()
@@ -28,6 +34,11 @@ kvt date add 20200131120000 -PT90M)",
                          "VALUE", "INTERVAL", "[-]P[nY][nM][nD][T[nH][nM][nS]]"}) {}
 
 private:
+    std::string whatIsWrongWith(const std::string& interval) const override {
+        const DateOutcome negated = outcomeOf(datetime::intervalNegate(toUString(interval)));
+        return negated.isGood() ? "" : failureText(negated) + " Its form is [-]P[nY][nM][nD][T[nH][nM][nS]].";
+    }
+    std::string exampleFor(const std::string& value) const override { return isValue(value) ? "P1D" : ""; }
     void prepare(const std::string& operand) override { interval_ = toUString(operand); }
     DateOutcome apply(const UString<0>& value) override { return outcomeOf(datetime::add(value, interval_)); }
 
@@ -53,6 +64,7 @@ private:
         syntax.option("--unit", unitName_, "UNIT",
                       "Print one number, in years, months, weeks, days, hours, minutes or seconds");
     }
+    std::string whatIsWrongWith(const std::string& second) const override { return wrongInSecond(second); }
     void prepare(const std::string& operand) override {
         second_ = toUString(operand);
         if (!unitName_.empty()) {
@@ -78,6 +90,7 @@ public:
                          "What it is compared with"}) {}
 
 private:
+    std::string whatIsWrongWith(const std::string& second) const override { return wrongInSecond(second); }
     void prepare(const std::string& operand) override { second_ = toUString(operand); }
     DateOutcome apply(const UString<0>& value) override {
         const int order = datetime::compare(value, second_);

@@ -21,7 +21,7 @@ constexpr const char* notes = R"(Values are in the library's canonical form:
 
 Exit status:
   0  done
-  1  done, but some lines of standard input failed
+  1  done, but some lines failed
   2  not done: the value failed, or the command line was wrong)";
 
 class DateCommand : public Command {

@@ -48,6 +48,64 @@ std::string patternHelp(const char* heading, UString<0> datetime::PatternElement
     return std::string(heading) + "\n" + formatTable({Align::Left, Align::Left, Align::Left}, rows) + "\n";
 }
 
+// Whether one of the words between "|" is a keyword, in any case.
+bool hasKeyword(const std::string& format) {
+    for (std::size_t begin = 0; begin <= format.size();) {
+        const std::size_t end = std::min(format.find('|', begin), format.size());
+        std::string word = withoutBlanks(std::string_view(format).substr(begin, end - begin));
+        std::transform(word.begin(), word.end(), word.begin(), asciiLower);
+        if (word == "zqt" || word == "iso") {
+            return true;
+        }
+        begin = end + 1;
+    }
+    return false;
+}
+
+// The first flag of a pattern that `words` does not have; what is wrong with the format, in words.
+std::string wrongInFormat(const std::string& typed, UString<0> datetime::PatternElement::*words) {
+    namespace message_number = datetime::message_number;
+    const std::string format = withoutBlanks(typed);
+    const auto saying = [](std::uint32_t number, const std::vector<std::string>& parameters) {
+        return describe(number, parameters) + " (" + std::to_string(number) + ")";
+    };
+    if (format.empty()) {
+        return saying(message_number::formatEmpty, {});
+    }
+    if (format.find('%') == std::string::npos) {
+        return hasKeyword(format) ? "" : saying(message_number::noKnownKeyword, {printable(format)});
+    }
+    std::vector<std::string> known;
+    for (const datetime::PatternElement& row : datetime::patternElements()) {
+        const std::string element = row.element.toStdString();
+        if (element.starts_with('%') && !(row.*words).isEmpty()) {
+            known.push_back(element);
+        }
+    }
+    for (std::size_t at = format.find('%'); at != std::string::npos; at = format.find('%', at)) {
+        if (at + 1 == format.size()) {
+            return saying(message_number::formatEndsInPercent, {});
+        }
+        const auto element = std::find_if(known.begin(), known.end(), [&](const std::string& flag) {
+            return format.compare(at, flag.size(), flag) == 0;
+        });
+        if (element == known.end()) {
+            std::string flags;
+            for (const std::string& flag : known) {
+                flags += " " + flag;
+            }
+            std::size_t end = at + 2;
+            while (end < format.size() && isContinuation(format[end])) {
+                ++end;
+            }
+            return "\"" + printable(format.substr(at, end - at)) + "\" is no flag (" +
+                   std::to_string(message_number::unknownFlag) + "); there are" + flags;
+        }
+        at += element->size();
+    }
+    return {};
+}
+
 class ParseFunction : public ValueFunction {
 public:
     ParseFunction()
@@ -72,10 +130,25 @@ private:
         return patternHelp("What a pattern reads; --lenient lifts a bound in brackets:",
                            &datetime::PatternElement::reads);
     }
+    std::string whatIsWrongWith(const std::string& format) const override {
+        std::string wrong = wrongInFormat(format, &datetime::PatternElement::reads);
+        for (auto other = others_.begin(); wrong.empty() && other != others_.end(); ++other) {
+            wrong = wrongInFormat(*other, &datetime::PatternElement::reads);
+        }
+        return wrong;
+    }
+    std::string exampleFor(const std::string& value) const override {
+        for (const char* format : {"ISO", "ZQT", "%d.%m.%Y$", "%m/%d/%Y$", "%d %b %Y$", "%H:%M$"}) {
+            if (outcomeOf(datetime::parse(toUString(value), format, lenient_)).isGood()) {
+                return *format == '%' ? "'" + std::string(format) + "'" : format;
+            }
+        }
+        return "FORMAT";
+    }
     void prepare(const std::string& operand) override {
-        formats_ = {toUString(operand)};
+        formats_ = {{operand, toUString(operand)}};
         for (const std::string& other : others_) {
-            formats_.push_back(toUString(other));
+            formats_.push_back({other, toUString(other)});
         }
     }
     DateOutcome apply(const UString<0>& value) override {
@@ -88,14 +161,19 @@ private:
         }
         return best;
     }
-    DateOutcome read(const UString<0>& value, const UString<0>& format) const {
-        DateOutcome outcome = outcomeOf(datetime::parse(value, format, lenient_));
+    struct Format {
+        std::string typed;
+        UString<0> text;
+    };
+    DateOutcome read(const UString<0>& value, const Format& format) const {
+        DateOutcome outcome = outcomeOf(datetime::parse(value, format.text, lenient_));
         outcome.withoutMessage = emptyValue;
+        outcome.format = format.typed;
         return outcome;
     }
 
     std::vector<std::string> others_;
-    std::vector<UString<0>> formats_;
+    std::vector<Format> formats_;
     bool lenient_ = false;
 };
 
@@ -110,27 +188,11 @@ private:
     std::string ownNotes() const override {
         return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
     }
-    void prepare(const std::string& operand) override {
-        // The library takes such a format for text that is to be written as it stands.
-        if (operand.find('%') == std::string::npos && !withoutBlanks(operand).empty() &&
-            !hasKeyword(operand)) {
-            throw Failure(describe(datetime::message_number::noKnownKeyword, {printable(operand)}));
-        }
-        format_ = toUString(operand);
+    std::string whatIsWrongWith(const std::string& format) const override {
+        return wrongInFormat(format, &datetime::PatternElement::writes);
     }
-    // Whether one of the words between "|" is a keyword, in any case.
-    static bool hasKeyword(const std::string& format) {
-        for (std::size_t begin = 0; begin <= format.size();) {
-            const std::size_t end = std::min(format.find('|', begin), format.size());
-            std::string word = withoutBlanks(std::string_view(format).substr(begin, end - begin));
-            std::transform(word.begin(), word.end(), word.begin(), asciiLower);
-            if (word == "zqt" || word == "iso") {
-                return true;
-            }
-            begin = end + 1;
-        }
-        return false;
-    }
+    std::string exampleFor(const std::string& value) const override { return isValue(value) ? "ISO" : ""; }
+    void prepare(const std::string& operand) override { format_ = toUString(operand); }
     DateOutcome apply(const UString<0>& value) override {
         DateOutcome outcome = outcomeOf(datetime::format(value, format_));
         outcome.withoutMessage = emptyValue;

@@ -12,14 +12,17 @@
 namespace host {
 
 const char* const valueNotes =
-    R"(Without a value, or with '-' for it, values are read from standard input, one on
-each line, and results are written as they come. A line that fails leaves an
-empty line, so that lines keep their numbers. An interval with a sign may stand
-as it is; anything else that begins with '-' and a letter needs '--' before it.
+    R"(Without a value, or with '-' for it, values are read from the lines of the FILEs
+of --file, or of standard input, and results are written as they come. A line
+that fails leaves an empty line, so that lines keep their numbers. The first ten
+failures of a kind are said, and then they are counted. What is wrong with the
+command line ends the command before the first line. An interval with a sign may
+stand as it is; anything else that begins with '-' and a letter needs '--' before
+it.
 
 Exit status:
   0  done
-  1  done, but some lines of standard input failed
+  1  done, but some lines failed
   2  not done: the value failed, or the command line was wrong)";
 
 void ValueFunction::declare(Syntax& parent) {
@@ -32,6 +35,7 @@ void ValueFunction::declare(Syntax& parent) {
     // "-P1D" would be the option "-P" to the reader of the command line, and so it is.
     negativeInterval_.option = syntax_->option("-P", negativeInterval_.text, "", "").hidden();
     declareOptions(*syntax_);
+    lines_.declare(*syntax_);
     syntax_->flag("--json", json_, "Print a JSON object on a line for each value, failures included");
     syntax_->setHelp(words_.examples, ownNotes() + valueNotes);
 }
@@ -54,11 +58,28 @@ int ValueFunction::run(Diagnostics& diagnostics) {
     if (hasOperand && arguments.empty()) {
         throw Failure(std::string(words_.operand) + " is required");
     }
-    prepare(hasOperand ? arguments.back() : std::string());
+    const std::string operand = hasOperand ? arguments.back() : std::string();
+    const bool isAlone = hasOperand && arguments.size() < most;
+    if (const std::string wrong = whatIsWrongWith(operand); !wrong.empty()) {
+        throw Failure(isAlone && !lines_.isAsked() ? wrong + likelyMeant(operand) : wrong);
+    }
+    prepare(operand);
     const bool fromInput = arguments.size() < most || arguments.front() == "-";
+    if (!fromInput && lines_.isAsked()) {
+        throw Failure("VALUE and the options for lines do not go together; put '-' for the value");
+    }
     const ApplyToValue applyTo = [&](const kvt::ex::UString<0>& value) { return apply(value); };
-    return fromInput ? runLines(applyTo, json_, diagnostics)
+    return fromInput ? runLines(applyTo, json_, lines_, diagnostics)
                      : runValue(arguments.front(), applyTo, json_, diagnostics);
+}
+
+// With one argument alone it is the operand. Where it is none, it was most likely meant for a value.
+std::string ValueFunction::likelyMeant(const std::string& typed) const {
+    const std::string example = exampleFor(typed);
+    return example.empty()
+               ? std::string()
+               : std::string("\n     ") + words_.operand + " is missing, unless this was meant: kvt date " +
+                     words_.name + " '" + printable(typed) + "' " + example;
 }
 
 void FunctionGroup::declare(Syntax& parent) {
@@ -97,6 +118,10 @@ std::string withoutBlanks(std::string_view text) {
     const std::size_t begin = std::min(text.find_first_not_of(blanks), text.size());
     const std::size_t end = text.find_last_not_of(blanks) + 1;
     return std::string(text.substr(begin, std::max(end, begin) - begin));
+}
+
+bool isValue(const std::string& text) {
+    return outcomeOf(kvt::ex::datetime::timezoneRemove(toUString(text))).isGood();
 }
 
 kvt::ex::UString<0> toUString(const std::string& utf8) {

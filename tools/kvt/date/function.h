@@ -8,6 +8,7 @@
 #include "base/diagnostics.h"
 #include "cli/syntax.h"
 #include "date/outcome.h"
+#include "text/value_lines.h"
 
 #include <kvt/string/ustring.h>
 
@@ -51,11 +52,17 @@ protected:
     virtual void declareOptions(Syntax&) {}
     /// What the help says about the function alone, behind the options.
     virtual std::string ownNotes() const { return {}; }
+    /// What is wrong with the operand, whatever the value is; empty where nothing is.
+    virtual std::string whatIsWrongWith(const std::string&) const { return {}; }
+    /// For a `value` that stands without an operand: one with which it would do. Empty where `value` is no value.
+    virtual std::string exampleFor(const std::string&) const { return {}; }
     /// Looks at the operand and the options once, before all values. Throws Failure.
     virtual void prepare(const std::string& operand) = 0;
     virtual DateOutcome apply(const kvt::ex::UString<0>& value) = 0;
 
 private:
+    std::string likelyMeant(const std::string& typed) const;
+
     struct Typed {
         Option option;
         std::string text;
@@ -66,6 +73,7 @@ private:
     Typed first_;
     Typed second_;
     Typed negativeInterval_;
+    ValueLines lines_;
     bool json_ = false;
 };
 
@@ -104,6 +112,9 @@ private:
 
 /// The text of an argument. Throws what the library throws where it is no UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
+
+/// Whether it is a date, a time or both in canonical form.
+bool isValue(const std::string& text);
 
 /// Without what the library strips from values and formats.
 std::string withoutBlanks(std::string_view text);

@@ -1,23 +1,24 @@
 #include "date/lines.h"
 
 #include "base/diagnostics.h"
-#include "base/input.h"
 #include "base/messages.h"
 #include "base/output.h"
-#include "base/progress.h"
 #include "base/text.h"
 #include "cli/exit_status.h"
+#include "text/line_reader.h"
+#include "text/value_lines.h"
 
 #include <kvt/foundation/throwable.h>
 
-#include <cstdint>
-#include <unistd.h>
+#include <cstddef>
+#include <memory>
+#include <utility>
 
 namespace host {
 
 namespace {
 
-// No value is nearly as long. What is beyond is not kept, so that a file without line ends does no harm.
+// No value is nearly as long.
 constexpr std::size_t longestLine = 64 * 1024;
 
 // A text that cannot be taken for a value at all fails like any other value.
@@ -36,67 +37,40 @@ void sayFailure(const DateOutcome& outcome, const std::string& place, Diagnostic
     }
 }
 
-/// Splits blocks into lines, and writes what becomes of each.
-class Lines {
+class ValueOfLine : public LineWork {
 public:
-    Lines(const ApplyToValue& apply, bool json, Diagnostics& diagnostics)
-        : apply_(apply), json_(json), diagnostics_(diagnostics) {}
+    ValueOfLine(const ApplyToValue& apply, bool json) : apply_(apply), json_(json) {}
 
-    /// Appends the results of all lines that end in `block` to `out`.
-    void add(std::string_view block, std::string& out) {
-        for (std::size_t end = block.find('\n'); end != std::string_view::npos; end = block.find('\n')) {
-            keep(block.substr(0, end));
-            finishLine(out);
-            block.remove_prefix(end + 1);
-        }
-        keep(block);
-    }
-    /// The last line need not have an end.
-    void finish(std::string& out) {
-        if (!line_.empty() || isCut_) {
-            finishLine(out);
-        }
-    }
-    bool anyFailed() const { return anyFailed_; }
-
-private:
-    void keep(std::string_view piece) {
-        const std::string_view kept = piece.substr(0, longestLine - line_.size());
-        isCut_ = isCut_ || kept.size() < piece.size();
-        line_ += kept;
-    }
-
-    void finishLine(std::string& out) {
-        ++number_;
-        if (line_.ends_with('\r')) {
-            line_.pop_back();
-        }
-        const DateOutcome outcome =
-            isCut_ ? failedOutcome("The line is too long for a value.") : outcomeFor(line_, apply_);
-        anyFailed_ = anyFailed_ || !outcome.isGood();
+    bool apply(const TextLine& line, std::string& out) override {
+        const bool isTooLong = line.text.size() > longestLine;
+        value_.assign(isTooLong ? std::string_view() : line.text);
+        outcome_ =
+            isTooLong ? failedOutcome("The line is too long for a value.") : outcomeFor(value_, apply_);
         if (json_) {
             nlohmann::ordered_json object;
-            object["line"] = number_;
-            object["value"] = isCut_ ? std::string() : line_;
-            addTo(object, outcome);
+            object["line"] = line.number;
+            object["value"] = value_;
+            addTo(object, outcome_);
             out += jsonLine(object);
         } else {
-            out += (outcome.isGood() ? resultText(outcome) : std::string()) + "\n";
-            if (!outcome.isGood()) {
-                sayFailure(outcome, "standard input: line " + std::to_string(number_) + ": ", diagnostics_);
-            }
+            out += (outcome_.isGood() ? resultText(outcome_) : std::string()) + "\n";
         }
-        line_.clear();
-        isCut_ = false;
+        if (!outcome_.isGood()) {
+            kind_ = outcome_.message ? std::to_string(outcome_.message->number) : outcome_.withoutMessage;
+            kind_.append(" ").append(outcome_.format);
+        }
+        return outcome_.isGood();
     }
+    std::string_view kind() const override { return kind_; }
+    std::string reason() const override { return failureText(outcome_); }
+    std::vector<std::string> below() const override { return markedFormat(outcome_); }
 
+private:
     const ApplyToValue& apply_;
     bool json_;
-    Diagnostics& diagnostics_;
-    std::string line_;
-    bool isCut_ = false;
-    bool anyFailed_ = false;
-    std::uint64_t number_ = 0;
+    std::string value_;
+    DateOutcome outcome_ = failedOutcome("");
+    std::string kind_;
 };
 
 } // namespace
@@ -113,23 +87,9 @@ int runValue(const std::string& value, const ApplyToValue& apply, bool json, Dia
     return outcome.isGood() ? Done : NotDone;
 }
 
-int runLines(const ApplyToValue& apply, bool json, Diagnostics& diagnostics) {
-    Input input("-");
-    const std::unique_ptr<Output> output = openOutput("");
-    Progress progress(diagnostics, input.remaining(), ::isatty(STDOUT_FILENO) == 0);
-    Lines lines(apply, json, diagnostics);
-    std::string results;
-    for (std::string_view block = input.read(); !block.empty(); block = input.read()) {
-        lines.add(block, results);
-        output->write(results);
-        results.clear();
-        diagnostics.flush();
-        progress.advance(block.size());
-    }
-    lines.finish(results);
-    output->write(results);
-    output->commit();
-    return lines.anyFailed() ? DoneWithLosses : Done;
+int runLines(const ApplyToValue& apply, bool json, ValueLines& lines, Diagnostics& diagnostics) {
+    ValueOfLine work(apply, json);
+    return lines.run(work, json, diagnostics);
 }
 
 int showOutcome(const DateOutcome& outcome, bool json, Diagnostics& diagnostics) {

@@ -1,5 +1,5 @@
-// How a date function gets its values: one from the command line, or a stream of lines from standard input, whose
-// results leave as the lines come and which may be of any length.
+// How a date function gets its values: one from the command line, or the lines of files, whose results leave as the
+// lines come.
 #pragma once
 
 #include "date/outcome.h"
@@ -12,14 +12,15 @@
 namespace host {
 
 class Diagnostics;
+class ValueLines;
 
 using ApplyToValue = std::function<DateOutcome(const kvt::ex::UString<0>&)>;
 
 /// Prints what becomes of one value; gives an ExitStatus.
 int runValue(const std::string& value, const ApplyToValue& apply, bool json, Diagnostics& diagnostics);
 
-/// The same for each line of standard input.
-int runLines(const ApplyToValue& apply, bool json, Diagnostics& diagnostics);
+/// The same for each of the lines.
+int runLines(const ApplyToValue& apply, bool json, ValueLines& lines, Diagnostics& diagnostics);
 
 /// Prints one outcome that has no value to it, as of now().
 int showOutcome(const DateOutcome& outcome, bool json, Diagnostics& diagnostics);

@@ -39,7 +39,9 @@ std::string sentence(const DateOutcome& outcome) {
     }
     std::vector<std::string> shown;
     for (const std::string& parameter : outcome.message->parameters) {
-        shown.push_back(printable(parameter));
+        shown.push_back(parameter == "@DateTimeParse()"    ? "'parse'"
+                        : parameter == "@DateTimeFormat()" ? "'format'"
+                                                           : printable(parameter));
     }
     return describe(outcome.message->number, shown);
 }
@@ -59,7 +61,7 @@ DateOutcome outcomeOf(const kvt::ex::datetime::NumberResult& result) {
 }
 
 DateOutcome failedOutcome(std::string why) {
-    return {ReturnState::Failure, nullptr, std::nullopt, std::move(why)};
+    return {ReturnState::Failure, nullptr, std::nullopt, {}, std::move(why)};
 }
 
 const char* stateName(ReturnState state) {

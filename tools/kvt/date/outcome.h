@@ -8,6 +8,7 @@
 
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace host {
@@ -22,6 +23,8 @@ struct DateOutcome {
     kvt::ex::datetime::ReturnState state;
     nlohmann::ordered_json result; ///< text or number; null where there is none
     std::optional<DateMessage> message;
+    /// The format by which a value failed, where it was read by one of several; valid as long as these.
+    std::string_view format = {};
     /// What is said about a failure for which the library has no message.
     std::string withoutMessage = "It failed, and there is no message about why.";
 

@@ -31,10 +31,12 @@ Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineC
     return Failure(describe(place) + ": " + describe(910002, {shownBytes(loss.bytes), encodingName}));
 }
 
-LineReader::LineReader(const std::string& path, const TextEncoding& encoding)
+LineReader::LineReader(const std::string& path, const TextEncoding& encoding, BadText badText)
     : input_(path), first_(encoding.firstBlock(input_)), encoding_(encoding.of(first_, input_.name())),
-      encodingName_(encoding_.getName()), decoder_(encoding_, Encoding::Utf8),
-      onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }), places_(encoding_) {}
+      encodingName_(encoding_.getName()),
+      isDecoded_(badText == BadText::EndsIt || encoding_.evaluate() != Encoding::Utf8),
+      decoder_(encoding_, Encoding::Utf8), onLoss_([this](const kvt::ex::Loss& loss) { refuse(loss); }),
+      places_(encoding_) {}
 
 void LineReader::refuse(const kvt::ex::Loss& loss) {
     throw badTextFailure(input_.name(), loss, places_, encodingName_);
@@ -50,6 +52,16 @@ bool LineReader::readBlock() {
     const std::string_view block = std::exchange(started_, true) ? input_.read() : first_;
     lastBlock_ = block.size();
     ended_ = block.empty();
+    if (isDecoded_) {
+        decode(block);
+    } else {
+        decoded_ += block;
+    }
+    findMark();
+    return true;
+}
+
+void LineReader::decode(std::string_view block) {
     places_.beginBlock(block);
     if (ended_) {
         decoder_.finish(decoded_, onLoss_);
@@ -57,11 +69,10 @@ bool LineReader::readBlock() {
         decoder_.convert(block, decoded_, onLoss_);
     }
     places_.endBlock();
-    findMark();
-    return true;
 }
 
-// The decoder gives whole characters only, so that the first one is there as soon as there is anything.
+// The first block holds a mark whole, and the decoder gives whole characters only, so that
+// it is there as soon as there is anything.
 void LineReader::findMark() {
     if (markSought_ || decoded_.empty()) {
         return;

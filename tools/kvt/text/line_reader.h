@@ -36,7 +36,9 @@ Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineC
 class LineReader {
 public:
     /// Reads the beginning. Throws Failure when the file cannot be read, or its mark is not one of the encoding.
-    LineReader(const std::string& path, const TextEncoding& encoding);
+    /// UTF-8 may pass unchecked, for who looks at each line anyway.
+    enum class BadText { EndsIt, Passes };
+    LineReader(const std::string& path, const TextEncoding& encoding, BadText badText = BadText::EndsIt);
 
     /// Reads a block, of which next() then gives the lines; false behind the end of the file. Throws Failure,
     /// with the place of bytes that are not text.
@@ -60,6 +62,7 @@ public:
 
 private:
     [[noreturn]] void refuse(const kvt::ex::Loss& loss);
+    void decode(std::string_view block);
     void findMark();
 
     Input input_;
@@ -67,6 +70,7 @@ private:
     kvt::ex::Encoding encoding_;
     std::string encodingName_;
     bool started_ = false;
+    bool isDecoded_;
     kvt::ex::StreamTranscoder decoder_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
     LineCounter places_;

@@ -2,18 +2,18 @@
 
 #include "base/failure.h"
 #include "base/output.h"
-#include "base/progress.h"
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "text/line_reader.h"
+#include "text/value_lines.h"
 
 #include <kvt/codec/float_text.h>
 
 #include <array>
 #include <charconv>
 #include <cmath>
-#include <unistd.h>
+#include <memory>
 
 namespace host {
 
@@ -33,12 +33,13 @@ A number is decimal, with or without a sign, a fraction and an exponent, or one
 of inf, infinity and nan in upper or lower case; blanks around it are passed
 over. What is printed has the forms 1500, 0.0015, 1e+20 and 1e-5.
 
-The first NUMBER or line that is none, that is too large for the precision, or
-too close to zero to be told from it, ends the command; what stands before it is
-printed.
+What is none, is too large for the precision, or too close to zero to be told
+from it, fails. A line that fails leaves an empty line, so that lines keep their
+numbers; a NUMBER that fails ends the command.
 
 Exit status:
   0  done
+  1  done, but some lines failed
   2  not done)";
 
 std::string_view trimmed(std::string_view text) {
@@ -73,71 +74,47 @@ Number parsed(std::string_view text) {
     return number;
 }
 
-class NumberCommand : public Command {
+class NumberCommand : public Command, private LineWork {
 public:
     void declare(Syntax& syntax) override {
         syntax.flag("--xml", xml_, "Spell the special values as XML Schema does: INF, -INF and NaN");
         syntax.flag("--single", single_, "Read and print single-precision numbers");
-        syntax.option("-o,--output", outputPath_, "FILE",
-                      "Where the output goes; '-' is standard output, the default");
+        lines_.declare(syntax);
         syntax.operand("NUMBER", numbers_, "Numbers to print; those of standard input without any");
     }
 
     int run(Diagnostics& diagnostics) override {
-        const std::unique_ptr<Output> output = openOutput(outputPath_);
         if (numbers_.empty()) {
-            printLines(*output, diagnostics);
-        } else {
-            printArguments(*output);
+            return lines_.run(*this, false, diagnostics);
+        }
+        const std::unique_ptr<Output> output = openOutput(lines_.output());
+        for (std::size_t index = 0; index < numbers_.size(); ++index) {
+            try {
+                output->write(shortest(numbers_[index]) + "\n");
+            } catch (const Failure& failure) {
+                throw Failure("argument " + std::to_string(index + 1) + ": " + failure.what());
+            }
         }
         output->commit();
         return Done;
     }
 
 private:
-    void printArguments(Output& output) const {
-        std::string out;
-        for (std::size_t index = 0; index < numbers_.size(); ++index) {
-            add(
-                numbers_[index], [&] { return "argument " + std::to_string(index + 1); }, out, output);
-        }
-        output.write(out);
-    }
-
-    void printLines(Output& output, Diagnostics& diagnostics) const {
-        const std::string standardInput = inputsOrStandardInput({}).front();
-        LineReader reader(standardInput, kvt::ex::Encoding::Utf8);
-        if (output.writesInPlaceTo(reader.input().descriptor())) {
-            throw Failure(reader.input().name() +
-                          " is both input and output; use -o, which writes beside it");
-        }
-        Progress progress(diagnostics, totalSize({standardInput}),
-                          !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
-        std::string out;
-        TextLine line{};
-        while (reader.readBlock()) {
-            while (reader.next(line)) {
-                const auto place = [&] {
-                    return std::string(line.file) + ": line " + std::to_string(line.number);
-                };
-                add(line.text, place, out, output);
-            }
-            output.write(out);
-            out.clear();
-            progress.advance(reader.lastBlock());
-        }
-    }
-
-    // Appends the number to `out`. Where the text is not a number, writes what there is and then fails.
-    template <typename Place>
-    void add(std::string_view text, const Place& place, std::string& out, Output& output) const {
+    // The lines of files.
+    bool apply(const TextLine& line, std::string& out) override {
         try {
-            out += shortest(text) + "\n";
+            out += shortest(line.text) + "\n";
+            return true;
         } catch (const Failure& failure) {
-            output.write(out);
-            throw Failure(place() + ": " + failure.what());
+            out += "\n";
+            reason_ = failure.what();
+            return false;
         }
     }
+    std::string_view kind() const override {
+        return reason_.ends_with("numbers") ? "outside the range" : "not a number";
+    }
+    std::string reason() const override { return reason_; }
 
     std::string shortest(std::string_view text) const {
         if (!single_) {
@@ -158,7 +135,8 @@ private:
     }
 
     std::vector<std::string> numbers_;
-    std::string outputPath_;
+    ValueLines lines_;
+    std::string reason_;
     bool xml_ = false;
     bool single_ = false;
 };
