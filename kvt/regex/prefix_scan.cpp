@@ -50,9 +50,12 @@ HWY_INLINE std::size_t findByRegisters(const PrefixScan::Probe* probes, const st
         at = at <= places - N ? at : places - N;
         const std::uint8_t* const begin = text + at;
         const auto zero = hn::Zero(d);
-        const auto yes = hn::And(hn::And(hn::Ne(ask(low0, high0, begin + probes[0].offset), zero),
-                                         hn::Ne(ask(low1, high1, begin + probes[1].offset), zero)),
-                                 hn::Ne(ask(low2, high2, begin + probes[2].offset), zero));
+        auto yes = hn::Ne(ask(low0, high0, begin + probes[0].offset), zero);
+        if (hn::AllFalse(d, yes)) {
+            continue;
+        }
+        yes = hn::And(hn::And(yes, hn::Ne(ask(low1, high1, begin + probes[1].offset), zero)),
+                      hn::Ne(ask(low2, high2, begin + probes[2].offset), zero));
         if (HWY_UNLIKELY(!hn::AllFalse(d, yes))) {
             return at + static_cast<std::size_t>(hn::FindFirstTrue(d, yes));
         }
