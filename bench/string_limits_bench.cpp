@@ -102,6 +102,23 @@ void holdFind(Limits& limits, const std::string& name, std::size_t size, const s
     limits.hold({name, other, bound, limit});
 }
 
+// ---- Hashing ------------------------------------------------------------------------------------------------------
+
+[[gnu::noinline]] std::uint64_t hashPlainly(const std::string& text) {
+    std::uint64_t hash = 0xcbf29ce484222325;
+    for (const char byte : text) {
+        hash = (hash ^ static_cast<unsigned char>(byte)) * 0x100000001b3;
+    }
+    return hash;
+}
+
+void holdHash(Limits& limits, const std::string& name, std::size_t size, double limit) {
+    const std::string text = prose(size);
+    limits.add(name, way([text = string(text)] { return text.hash(); }));
+    limits.add(name + ": a loop over the bytes", way([text] { return hashPlainly(text); }));
+    limits.hold({name, name + ": a loop over the bytes", Bound::atLeast, limit});
+}
+
 // ---- Case mapping -------------------------------------------------------------------------------------------------
 
 /// Words of a sentence in a random order, since a text that repeats itself flatters whatever branches on characters.
@@ -187,11 +204,13 @@ int main(int argc, char** argv) {
     holdSplit(large, 32, 1.2);
     holdFind(large, "find in 1 MiB, frequent first byte", mebibyte, "animal kingdom", true, Bound::atLeast,
              8);
+    holdHash(large, "hash of 1 MiB", mebibyte, 1.5);
     holdCase(large);
     Limits small(101, 20'000);
     holdFind(small, "find in 64 bytes", 64, "looked in", false, Bound::atLeast, 1);
     holdFind(small, "find in 64 bytes, rare first byte", 64, "quick", false, Bound::atLeast, 1);
     holdFind(small, "find in 24 bytes", 24, "anima", false, Bound::shown, 1);
+    holdHash(small, "hash of 16 bytes", 16, 1);
     const bool isLargeWithin = large.run(argc, argv) == 0;
     return small.run(argc, argv) == 0 && isLargeWithin ? 0 : 1;
 }

@@ -1,4 +1,5 @@
 // Comparison and hash: of the units as they are stored, never of characters.
+#include <kvt/string/detail/hash_vectors.h>
 #include <kvt/string/detail/instantiate.h>
 #include <kvt/string/detail/unit_search.h>
 
@@ -6,6 +7,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <string_view>
 
 namespace kvt::ex {
 namespace {
@@ -38,7 +40,10 @@ int UString<N>::compare(UStringView<N> other, detail::case_sensitive_t) const no
 
 template <std::uint32_t N>
 std::uint64_t UString<N>::hash() const noexcept {
-    return detail::fnv1a({reinterpret_cast<const char*>(rawData()), size() * sizeof(value_type)});
+    const std::string_view bytes(reinterpret_cast<const char*>(rawData()), size() * sizeof(value_type));
+    constexpr std::size_t few = 128; // bytes that do not repay the choice of an instruction set
+    return bytes.size() < few ? detail::fnv1a(bytes)
+                              : detail::vectors::fnv1a(detail::fnv1a({}), bytes.data(), bytes.size());
 }
 
 KVT_FOR_EACH_USTRING(KVT_INSTANTIATE_USTRING)
