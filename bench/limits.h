@@ -72,12 +72,16 @@ private:
     void measure() {
         for (int round = 0; round < rounds_; ++round) {
             for (const auto& [name, measured] : ways_) {
-                const auto isUsed = [&](const Row& row) { return row.work == name || row.beside == name; };
-                if (std::any_of(rows_.begin(), rows_.end(), isUsed)) {
+                if (isUsed(name)) {
                     times_[name].push_back(nanosecondsOf(measured));
                 }
             }
         }
+    }
+
+    bool isUsed(const std::string& name) const {
+        return std::any_of(rows_.begin(), rows_.end(),
+                           [&](const Row& row) { return row.work == name || row.beside == name; });
     }
 
     double nanosecondsOf(const Way& measured) const {

@@ -101,7 +101,7 @@ void fillAndSum(benchmark::State& state, Deque& deque) {
         benchmark::DoNotOptimize(sum);
         deque.clear();
     }
-    state.SetItemsProcessed(static_cast<std::int64_t>(state.iterations() * words));
+    state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(words));
 }
 
 void dequeInSegment(benchmark::State& state) {

@@ -17,6 +17,8 @@ set_target_properties(kvt_objects PROPERTIES
     POSITION_INDEPENDENT_CODE ON
     CXX_VISIBILITY_PRESET hidden
     VISIBILITY_INLINES_HIDDEN ON)
+# What the library exports and calls itself is not replaced by a program, and may be inlined.
+target_compile_options(kvt_objects PRIVATE -fno-semantic-interposition)
 kvt_warnings(kvt_objects)
 
 add_library(kvt SHARED)
@@ -28,6 +30,8 @@ set_target_properties(kvt PROPERTIES
     LINK_DEPENDS "${PROJECT_SOURCE_DIR}/cmake/kvt.map")
 target_link_options(kvt PRIVATE
     "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/kvt.map"
+    # What the library exports and calls itself, it calls without a detour.
+    LINKER:-Bsymbolic-functions
     # The system calls back into it at the end of each thread that has converted text.
     LINKER:-z,nodelete)
 if(NOT KVT_SANITIZE) # a sanitizer's run-time is in the program, not in its libraries

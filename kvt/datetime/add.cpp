@@ -7,15 +7,15 @@
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
-#include <kvt/datetime/message_numbers.h>
 
 namespace kvt::ex::datetime {
 
 namespace {
 
 using detail::CanonicalRecord;
+using detail::DateTimeFields;
 using detail::Outcome;
-using detail::TemporalInstant;
+using detail::ValueAnswer;
 
 bool hasDateParts(const IntervalParts& interval) noexcept {
     return interval.years() > 0 || interval.months() > 0 || interval.days() > 0;
@@ -26,29 +26,33 @@ bool hasTimeParts(const IntervalParts& interval) noexcept {
            interval.nanoseconds() > 0;
 }
 
-// A sum as the answer, of the kind of the value that it began with. A year out of range is a failure
-// as long as it fits four digits; beyond them the answer is an empty text.
-Outcome<TextResult> answerOf(TemporalType kind, const TemporalInstant& sum, ReturnState state) {
-    static const std::int64_t firstDay = detail::daysFromCivil(detail::lowestYear, 1, 1);
-    static const std::int64_t endDay = detail::daysFromCivil(detail::highestYear + 1, 1, 1);
-    if (sum.count.days >= firstDay && sum.count.days < endDay) {
-        return TextResult(state, detail::canonicalText(kind, sum), std::nullopt);
+// A sum as the answer, of the kind of the value that it began with. A year out of range is a failure as long as it fits
+// four digits; beyond them the answer is an empty text.
+Outcome<ValueAnswer> answerOfSum(ValueAnswer answer, const DateTimeFields& sum) {
+    answer.fields = sum;
+    if (sum.year < detail::lowestYear || sum.year > detail::highestYear) {
+        if (sum.year >= 0 && sum.year < detail::lowestYear) {
+            return detail::yearOutOfRange(sum.year);
+        }
+        answer.kind = TemporalType::Unsupported;
     }
-    const std::int64_t year = detail::civilFromDays(sum.count.days).year;
-    if (year >= 0 && year < detail::lowestYear) {
-        return detail::yearOutOfRange(year);
-    }
-    return TextResult(state, UString<0>(), std::nullopt);
+    return answer;
 }
 
-Outcome<TextResult> addTo(const CanonicalRecord& record, const IntervalParts& interval) {
+Outcome<ValueAnswer> addTo(const CanonicalRecord& record, const IntervalParts& interval) {
+    ValueAnswer answer = detail::answerOf(record);
     // A date to which a time is added becomes a datetime.
-    const bool gainsTime = record.type == TemporalType::Date && hasTimeParts(interval);
-    const TemporalType kind = gainsTime ? TemporalType::Datetime : record.type;
-    TemporalInstant instant = detail::instantWithOffset(record);
-    return detail::addInterval(instant.count, interval).andThen([&](const detail::TimeCount& sum) {
-        instant.count = sum;
-        return answerOf(kind, instant, record.offsetRepaired ? ReturnState::Repaired : ReturnState::Success);
+    if (record.type == TemporalType::Date && hasTimeParts(interval)) {
+        answer.kind = TemporalType::Datetime;
+    }
+    if (detail::hasOffset(record.type)) {
+        answer.offset = detail::offsetOfMinutes(record.offset.minutes);
+    }
+    if (record.offsetRepaired) {
+        answer.state = ReturnState::Repaired;
+    }
+    return detail::addInterval(answer.fields, interval).andThen([&](const DateTimeFields& sum) {
+        return answerOfSum(answer, sum);
     });
 }
 
@@ -58,10 +62,9 @@ TextResult add(const UString<0>& value, const UString<0>& interval) {
     return detail::guarded<UString<0>>([&] {
         return detail::readValue(detail::viewOf(value)).andThen([&](const CanonicalRecord& record) {
             return detail::readInterval(detail::viewOf(interval))
-                .andThen([&](const IntervalParts& parts) -> Outcome<TextResult> {
+                .andThen([&](const IntervalParts& parts) -> Outcome<ValueAnswer> {
                     if (detail::isTimeKind(record.type) && hasDateParts(parts)) {
-                        return detail::failed<UString<0>>(message_number::dateIntervalOnTime,
-                                                          {detail::viewOf(value), detail::viewOf(interval)});
+                        return detail::DateIntervalOnTime{detail::viewOf(value), detail::viewOf(interval)};
                     }
                     return addTo(record, parts);
                 });

@@ -19,7 +19,7 @@ std::optional<std::int32_t> offsetOfZone(const TemporalInstant& instant, std::st
     if (equalsIgnoringAsciiCase(zone, "utc")) {
         return 0;
     }
-    const std::optional<OffsetForm> offset = readOffset(zone);
+    const std::optional<OffsetForm> offset = offsetOfText(zone);
     return offset ? std::optional(offset->minutes) : std::nullopt;
 }
 

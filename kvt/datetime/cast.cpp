@@ -4,68 +4,68 @@
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
-#include <kvt/datetime/message_numbers.h>
+
+#include <span>
+#include <string_view>
 
 namespace kvt::ex::datetime {
 
 namespace {
 
 using detail::CanonicalRecord;
-
-TextResult impossible(std::initializer_list<std::string_view> words) {
-    return detail::failed<UString<0>>(message_number::castImpossible, words);
-}
+using detail::Outcome;
+using detail::ValueAnswer;
 
 // The state says whether the offset was repaired, if the text has it.
-TextResult castTo(TemporalType kind, const CanonicalRecord& record) {
-    const bool keepsOffset = kind != TemporalType::Date;
-    return detail::makeDateTimeResult(
-        keepsOffset && record.offsetRepaired ? ReturnState::Repaired : ReturnState::Success,
-        detail::canonicalText(kind, detail::carriedFields(record),
-                              keepsOffset ? record.offsetText() : std::string_view()));
+ValueAnswer castTo(TemporalType kind, const CanonicalRecord& record) noexcept {
+    ValueAnswer answer = detail::answerOf(record);
+    answer.kind = kind;
+    if (kind == TemporalType::Date) {
+        answer.offset.reset();
+    } else if (record.offsetRepaired) {
+        answer.state = ReturnState::Repaired;
+    }
+    return answer;
 }
 
-TextResult castDate(const CanonicalRecord& record, CastToTemporalType target) {
-    switch (target) {
-    case CastToTemporalType::Date:
-        return castTo(TemporalType::Date, record);
-    case CastToTemporalType::Time:
-        return castTo(TemporalType::Time, record);
-    case CastToTemporalType::Datetime:
-        return castTo(TemporalType::Datetime, record);
-    case CastToTemporalType::Unknown:
-        return impossible({"date", "unknown"});
+// What a message says of a value that cannot become the target: the word for its family, then the target and, for a
+// time, all the later targets that it cannot become either.
+std::span<const std::string_view> wordsOfFailure(TemporalType kind, CastToTemporalType target) noexcept {
+    static constexpr std::string_view ofDate[] = {"date", "unknown"};
+    static constexpr std::string_view ofDatetime[] = {"datetime", "unknown"};
+    static constexpr std::string_view timeToDate[] = {"time", "date", "datetime", "unknown"};
+    static constexpr std::string_view timeToDatetime[] = {"time", "datetime", "unknown"};
+    static constexpr std::string_view timeToUnknown[] = {"time", "unknown"};
+    std::span<const std::string_view> words = timeToUnknown;
+    if (kind == TemporalType::Date) {
+        words = ofDate;
+    } else if (!detail::isTimeKind(kind)) {
+        words = ofDatetime;
+    } else if (target == CastToTemporalType::Date) {
+        words = timeToDate;
+    } else if (target == CastToTemporalType::Datetime) {
+        words = timeToDatetime;
     }
-    return impossible({"date"});
+    return target > CastToTemporalType::Unknown ? words.first(1)
+                                                : words; // there is no word for such a target
 }
 
-// What a time cannot become is named with all the later targets behind it.
-TextResult castTime(const CanonicalRecord& record, CastToTemporalType target) {
+Outcome<ValueAnswer> castRecord(const CanonicalRecord& record, CastToTemporalType target) {
+    const bool isTime = detail::isTimeKind(record.type);
     switch (target) {
-    case CastToTemporalType::Date:
-        return impossible({"time", "date", "datetime", "unknown"});
     case CastToTemporalType::Time:
         return castTo(TemporalType::Time, record);
-    case CastToTemporalType::Datetime:
-        return impossible({"time", "datetime", "unknown"});
-    case CastToTemporalType::Unknown:
-        return impossible({"time", "unknown"});
-    }
-    return impossible({"time"});
-}
-
-TextResult castDatetime(const CanonicalRecord& record, CastToTemporalType target) {
-    switch (target) {
     case CastToTemporalType::Date:
-        return castTo(TemporalType::Date, record);
-    case CastToTemporalType::Time:
-        return castTo(TemporalType::Time, record);
     case CastToTemporalType::Datetime:
-        return castTo(TemporalType::Datetime, record);
+        if (!isTime) {
+            return castTo(target == CastToTemporalType::Date ? TemporalType::Date : TemporalType::Datetime,
+                          record);
+        }
+        break;
     case CastToTemporalType::Unknown:
-        return impossible({"datetime", "unknown"});
+        break;
     }
-    return impossible({"datetime"});
+    return detail::CastImpossible{wordsOfFailure(record.type, target)};
 }
 
 } // namespace
@@ -73,10 +73,7 @@ TextResult castDatetime(const CanonicalRecord& record, CastToTemporalType target
 TextResult cast(const UString<0>& value, CastToTemporalType target) {
     return detail::guarded<UString<0>>([&] {
         return detail::readValue(detail::viewOf(value)).andThen([&](const CanonicalRecord& record) {
-            if (record.type == TemporalType::Date) {
-                return castDate(record, target);
-            }
-            return detail::isTimeKind(record.type) ? castTime(record, target) : castDatetime(record, target);
+            return castRecord(record, target);
         });
     });
 }

@@ -55,13 +55,12 @@ std::optional<DatePartRange> unwritablePart(const DateTimeParts& parts) {
 
 TextResult create(const DateTimeParts& parts) {
     return detail::guarded<UString<0>>(
-        [&]() -> Outcome<TextResult> {
+        [&]() -> Outcome<detail::ValueAnswer> {
             if (std::optional<DatePartRange> unwritable = unwritablePart(parts)) {
                 return *unwritable;
             }
             return detail::instantFromParts(parts, false).andThen([](const detail::TemporalInstant& instant) {
-                return detail::makeDateTimeResult(ReturnState::Success,
-                                                  detail::canonicalText(TemporalType::Datetime, instant));
+                return detail::answerOf(TemporalType::Datetime, instant);
             });
         },
         detail::LastResort::Silence);

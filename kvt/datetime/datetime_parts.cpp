@@ -32,7 +32,7 @@ DateTimeParts::DateTimeParts(std::int64_t year, std::uint64_t month, std::uint64
 }
 
 void DateTimeParts::setOffset(const UString<0>& offset) {
-    const std::optional<detail::OffsetForm> form = detail::readOffset(detail::viewOf(offset));
+    const std::optional<detail::OffsetForm> form = detail::offsetOfText(detail::viewOf(offset));
     offset_ = form ? UString<0>(UStringView<0>(form->view())) : UString<0>();
 }
 

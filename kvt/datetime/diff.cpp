@@ -75,7 +75,7 @@ Outcome<double> numberBetween(const Pair& pair, UnitType unit) {
     }
     return detail::diffParts(pair.first, pair.second, pair.haveDates)
         .andThen([&](const detail::Difference& difference) {
-            return unit == UnitType::Years ? difference.months / 12.0 : difference.months;
+            return difference.inMonths() / (unit == UnitType::Years ? 12.0 : 1.0);
         });
 }
 
@@ -88,7 +88,7 @@ TextResult diff(const UString<0>& first, const UString<0>& second) {
                 [](const Pair& pair) { return detail::diffParts(pair.first, pair.second, pair.haveDates); })
             .andThen([](const detail::Difference& difference) {
                 return detail::makeDateTimeResult(ReturnState::Success,
-                                                  detail::intervalText(difference.parts));
+                                                  detail::intervalText(difference.parts()));
             });
     });
 }

@@ -8,6 +8,7 @@
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/system_bytes.h>
 #include <kvt/datetime/message_numbers.h>
+#include <kvt/foundation/detail/utf.h>
 
 #include <string>
 #include <string_view>
@@ -20,7 +21,7 @@ using namespace detail;
 
 std::string_view wholeCharacter(std::string_view text) {
     std::size_t length = 1;
-    while (length < text.size() && (static_cast<unsigned char>(text[length]) & 0xC0) == 0x80) {
+    while (length < text.size() && ex::detail::isContinuation(text[length])) {
         ++length;
     }
     return text.substr(0, length);
@@ -100,7 +101,7 @@ TextResult formatByKeywords(const UString<0>& value, const CanonicalRecord& reco
     if (record.type == TemporalType::Unsupported) {
         return unsupported(value);
     }
-    return *first == Keyword::Zqt ? TextResult(ReturnState::Success, canonicalText(record), std::nullopt)
+    return *first == Keyword::Zqt ? resultOf(answerOf(record))
                                   : formatByPattern(value, record, isoWritePattern(record.type));
 }
 

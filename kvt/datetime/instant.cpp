@@ -48,55 +48,60 @@ DatePartRange secondsOutOfRange(std::string_view seconds) noexcept {
     return {ShortText(seconds), "seconds", "0", "59.999999999"};
 }
 
-Outcome<std::int64_t> checkTimeOfDay(std::int64_t hours, std::int64_t minutes, std::int64_t seconds,
-                                     std::int64_t nanoseconds, bool lenient) {
-    if (hours < 0 || (!lenient && hours > 23)) {
-        return hoursOutOfRange(hours);
+std::optional<DatePartRange> timeOutOfRange(const DateTimeFields& fields, bool lenient) noexcept {
+    if (fields.hours < 0 || (!lenient && fields.hours > 23)) {
+        return hoursOutOfRange(fields.hours);
     }
-    if (minutes < 0 || (!lenient && minutes > 59)) {
-        return minutesOutOfRange(minutes);
+    if (fields.minutes < 0 || (!lenient && fields.minutes > 59)) {
+        return minutesOutOfRange(fields.minutes);
     }
-    if (seconds < 0 || (!lenient && seconds > 59)) {
-        return secondsOutOfRange(textOf(seconds).view());
+    if (fields.seconds < 0 || (!lenient && fields.seconds > 59)) {
+        return secondsOutOfRange(textOf(fields.seconds).view());
     }
-    return (hours * secondsPerHour + minutes * secondsPerMinute + seconds) * nanosPerSecond + nanoseconds;
+    return std::nullopt;
 }
 
-Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day,
-                                        bool lenient) {
-    if (year < lowestYear || year > highestYear) {
-        return yearOutOfRange(year);
+std::optional<DatePartRange> dateOutOfRange(const DateTimeFields& fields, bool lenient) noexcept {
+    if (fields.year < lowestYear || fields.year > highestYear) {
+        return yearOutOfRange(fields.year);
     }
-    if (month == 0 || (!lenient && month > 12)) {
-        return monthOutOfRange(month);
+    if (fields.month == 0 || (!lenient && fields.month > 12)) {
+        return monthOutOfRange(fields.month);
     }
     constexpr std::uint64_t inEveryMonth = 28;
-    if (day == 0 || (!lenient && day > inEveryMonth)) {
-        const unsigned lastDay = lastDayOfMonth(year, static_cast<unsigned>(month));
-        if (day == 0 || day > lastDay) {
-            return dayOutOfRange(day, lastDay);
+    if (fields.day == 0 || (!lenient && fields.day > inEveryMonth)) {
+        const unsigned lastDay = lastDayOfMonth(fields.year, static_cast<unsigned>(fields.month));
+        if (fields.day == 0 || fields.day > lastDay) {
+            return dayOutOfRange(fields.day, lastDay);
         }
     }
-    return daysFromCivil(year, static_cast<unsigned>(month), static_cast<unsigned>(day));
+    return std::nullopt;
+}
+
+TimeCount countOf(const DateTimeFields& fields) noexcept {
+    return timeCount(
+        daysFromCivil(fields.year, static_cast<unsigned>(fields.month), static_cast<unsigned>(fields.day)),
+        nanosecondsOfDay(fields));
 }
 
 Outcome<TimeCount> countFromFields(const DateTimeFields& fields, bool lenient) {
-    return checkTimeOfDay(fields.hours, fields.minutes, fields.seconds, fields.nanoseconds, lenient)
-        .andThen([&](std::int64_t timeOfDay) {
-            return checkCalendarDate(fields.year, fields.month, fields.day, lenient)
-                .andThen([&](std::int64_t days) { return timeCount(days, timeOfDay); });
-        });
+    if (const std::optional<DatePartRange> wrong = partOutOfRange(fields, lenient)) {
+        return *wrong;
+    }
+    return countOf(fields);
 }
 
 DateTimeFields fieldsFromCount(const TimeCount& count) {
     const CivilDate date = civilFromDays(count.days);
-    const std::int64_t seconds = count.nanoseconds / nanosPerSecond;
+    const auto seconds = static_cast<std::int32_t>(count.nanoseconds / nanosPerSecond);
+    constexpr std::int32_t perHour = secondsPerHour;
+    constexpr std::int32_t perMinute = secondsPerMinute;
     return {date.year,
             date.month,
             date.day,
-            seconds / secondsPerHour,
-            seconds % secondsPerHour / secondsPerMinute,
-            seconds % secondsPerMinute,
+            seconds / perHour,
+            seconds % perHour / perMinute,
+            seconds % perMinute,
             count.nanoseconds % nanosPerSecond};
 }
 
@@ -106,7 +111,7 @@ Outcome<TemporalInstant> instantFromParts(const DateTimeParts& parts, bool lenie
                            lenient)
         .andThen([&](const TimeCount& count) {
             // The text of parts is an offset or empty, never a keyword.
-            const std::optional<OffsetForm> offset = readOffset(viewOf(PartsAccess::offset(parts)));
+            const std::optional<OffsetForm> offset = offsetOfText(viewOf(PartsAccess::offset(parts)));
             return TemporalInstant{count, offset ? std::optional(offset->minutes) : std::nullopt};
         });
 }

@@ -22,7 +22,7 @@ namespace {
 using namespace detail;
 
 // What a pattern that fits gives: a date, a time or both, as it asks for them.
-TextResult resultOf(const PatternReading& reading) {
+ValueAnswer answerOf(const PatternReading& reading) noexcept {
     const bool hasTime = (reading.parts & timePart) != 0;
     const bool hasDate = (reading.parts & datePart) != 0 || !hasTime;
     const TemporalType kind = hasDate && hasTime ? TemporalType::Datetime
@@ -31,9 +31,7 @@ TextResult resultOf(const PatternReading& reading) {
     // Offsets of 100 hours and more can be read but not written; there is none then.
     const std::optional<OffsetForm> offset =
         hasTime && (reading.parts & offsetPart) != 0 ? offsetOfMinutes(reading.offsetMinutes) : std::nullopt;
-    TextBuffer text;
-    writeCanonical(text, kind, reading.fields, offset ? offset->view() : std::string_view());
-    return TextResult(ReturnState::Success, UStringView<0>(text.view()), std::nullopt);
+    return {ReturnState::Success, kind, reading.fields, offset};
 }
 
 // ---- Messages
@@ -109,7 +107,7 @@ TextResult failedBy(const PatternFailure& failure, std::string_view format, std:
 
 // By the first form of ISO 8601 that fits.
 bool readIso(std::string_view value, bool lenient, PatternReading& reading) {
-    if (!isAscii(value)) {
+    if (!ex::detail::isAllAscii(value)) {
         return false; // all of the value has to match, and the patterns are ASCII
     }
     const SystemBytes bytes(value);
@@ -134,12 +132,12 @@ TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bo
         if (keyword == Keyword::Iso) {
             PatternReading reading;
             if (readIso(trimmed(viewOf(value)), lenient, reading)) {
-                found = resultOf(reading);
+                found = resultOf(answerOf(reading));
             }
         } else if (const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient); !record) {
             found = makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
         } else if (record->type != TemporalType::Unsupported) {
-            found = TextResult(ReturnState::Success, canonicalText(*record), std::nullopt);
+            found = resultOf(answerOf(*record));
         }
         return found.has_value();
     };
@@ -156,7 +154,7 @@ TextResult parseByPattern(std::string_view value, std::string_view pattern, bool
     const SystemBytes patternBytes(pattern);
     PatternReading reading;
     const auto failure = PatternReader(valueBytes.view(), patternBytes.view(), lenient).readAll(reading);
-    return failure ? failedBy(*failure, pattern, patternBytes.view()) : resultOf(reading);
+    return failure ? failedBy(*failure, pattern, patternBytes.view()) : resultOf(answerOf(reading));
 }
 
 } // namespace

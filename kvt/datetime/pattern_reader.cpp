@@ -136,23 +136,18 @@ std::string_view PatternReader::takeWhile(Predicate predicate) noexcept {
     return {begin, static_cast<std::size_t>(at_ - begin)};
 }
 
-// The number of two digits that both are there, or a negative one.
-inline std::int32_t pairAt(const char* digits) noexcept {
-    return isDigit(digits[0]) && isDigit(digits[1]) ? (digits[0] - '0') * 10 + (digits[1] - '0') : -1;
-}
-
 // Up to `width` digits, or exactly that many; negative where there are not.
 inline std::int32_t PatternReader::takeNumber(unsigned width, bool exactWidth) noexcept {
     const char* const begin = at_;
     // Nearly always all the digits are there.
     if (const std::ptrdiff_t left = valueEnd_ - begin; width == 2 && left >= 2) {
-        if (const std::int32_t pair = pairAt(begin); pair >= 0) {
+        if (const std::int32_t pair = digitPair(begin); pair >= 0) {
             at_ = begin + 2;
             return pair;
         }
     } else if (width == 4 && left >= 4) {
-        const std::int32_t high = pairAt(begin);
-        const std::int32_t low = pairAt(begin + 2);
+        const std::int32_t high = digitPair(begin);
+        const std::int32_t low = digitPair(begin + 2);
         if (high >= 0 && low >= 0) {
             at_ = begin + 4;
             return high * 100 + low;

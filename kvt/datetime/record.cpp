@@ -4,7 +4,7 @@
 #include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/text.h>
 
-#include <array>
+#include <algorithm>
 #include <optional>
 
 namespace kvt::ex::datetime::detail {
@@ -16,12 +16,8 @@ constexpr std::size_t timeDigits = 6;
 
 // Cuts the digits off that a text begins with.
 std::string_view takeDigits(std::string_view& text) noexcept {
-    std::size_t size = 0;
-    while (size < text.size() && isDigit(text[size])) {
-        ++size;
-    }
-    const std::string_view digits = text.substr(0, size);
-    text.remove_prefix(size);
+    const std::string_view digits = text.substr(0, countDigits(text));
+    text.remove_prefix(digits.size());
     return digits;
 }
 
@@ -57,38 +53,35 @@ bool split(std::string_view text, CanonicalRecord& record) noexcept {
     }
     const bool isOffset = !text.empty();
     if (isOffset) {
-        const std::optional<OffsetForm> offset = readOffset(text);
-        if (!offset) {
+        if (!readOffset(text, record.offset)) {
             return false;
         }
-        record.offset = *offset;
-        record.offsetRepaired = text.size() != offset->view().size(); // of that size there is one form
+        record.offsetRepaired = text.size() != record.offset.view().size(); // of that size there is one form
     }
     record.type = typeOf(digits.size(), hasPoint, isOffset);
     if (record.type == TemporalType::Unsupported) {
         return false;
     }
-    const std::size_t dateSize = digits.size() == timeDigits ? 0 : dateDigits;
-    record.dateText = digits.substr(0, dateSize);
-    record.timeText = digits.substr(dateSize);
+    record.digits = digits;
     return true;
 }
 
-std::uint64_t pairAt(std::string_view digits, std::size_t position) noexcept {
-    return static_cast<std::uint64_t>((digits[position] - '0') * 10 + (digits[position + 1] - '0'));
+std::uint64_t pairAt(const char* digits) noexcept {
+    return static_cast<std::uint64_t>((digits[0] - '0') * 10 + (digits[1] - '0'));
 }
 
 void readNumbers(CanonicalRecord& record) noexcept {
     DateTimeFields& fields = record.fields;
-    if (const std::string_view date = record.dateText; !date.empty()) {
-        fields.year = static_cast<std::int64_t>(pairAt(date, 0) * 100 + pairAt(date, 2));
-        fields.month = pairAt(date, 4);
-        fields.day = pairAt(date, 6);
+    if (const char* const date = record.digits.data(); !isTimeKind(record.type)) {
+        fields.year = static_cast<std::int64_t>(pairAt(date) * 100 + pairAt(date + 2));
+        fields.month = pairAt(date + 4);
+        fields.day = pairAt(date + 6);
     }
-    if (const std::string_view time = record.timeText; !time.empty()) {
-        fields.hours = static_cast<std::int64_t>(pairAt(time, 0));
-        fields.minutes = static_cast<std::int64_t>(pairAt(time, 2));
-        fields.seconds = static_cast<std::int64_t>(pairAt(time, 4));
+    if (record.type != TemporalType::Date) {
+        const char* const time = record.digits.data() + record.digits.size() - timeDigits;
+        fields.hours = static_cast<std::int64_t>(pairAt(time));
+        fields.minutes = static_cast<std::int64_t>(pairAt(time + 2));
+        fields.seconds = static_cast<std::int64_t>(pairAt(time + 4));
     }
     if (!record.fractionText.empty()) {
         fields.nanoseconds = static_cast<std::int64_t>(fractionNanoseconds(record.fractionText));
@@ -96,6 +89,14 @@ void readNumbers(CanonicalRecord& record) noexcept {
 }
 
 } // namespace
+
+std::string_view CanonicalRecord::dateText() const noexcept {
+    return isTimeKind(type) ? std::string_view() : digits.substr(0, dateDigits);
+}
+
+std::string_view CanonicalRecord::timeText() const noexcept {
+    return isTimeKind(type) ? digits : digits.substr(std::min(dateDigits, digits.size()));
+}
 
 Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
     Outcome<CanonicalRecord> outcome;
@@ -106,10 +107,8 @@ Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
         return outcome;
     }
     readNumbers(record);
-    if (const Outcome<TimeCount> count = countFromFields(record.fields, lenient)) {
-        record.count = *count;
-    } else {
-        outcome = count.failure();
+    if (const std::optional<DatePartRange> wrong = partOutOfRange(record.fields, lenient)) {
+        outcome = *wrong;
     }
     return outcome;
 }
@@ -123,80 +122,78 @@ Outcome<CanonicalRecord> readValue(std::string_view text) {
 }
 
 TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept {
-    return {record.count, hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt};
+    return {countOf(record.fields),
+            hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt};
 }
 
 DateTimeFields carriedFields(const CanonicalRecord& record) noexcept {
     const bool mayRunOver = record.lenient || record.fields.nanoseconds >= nanosPerSecond;
-    return mayRunOver ? fieldsFromCount(record.count) : record.fields;
+    return mayRunOver ? fieldsFromCount(countOf(record.fields)) : record.fields;
 }
 
 // ---- Writing
 
+ValueAnswer answerOf(const CanonicalRecord& record) noexcept {
+    return {ReturnState::Success, record.type, carriedFields(record),
+            hasOffset(record.type) ? std::optional(record.offset) : std::nullopt};
+}
+
+ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant, ReturnState state) noexcept {
+    return {state, kind, fieldsFromCount(instant.count),
+            instant.offsetMinutes ? offsetOfMinutes(*instant.offsetMinutes) : std::nullopt};
+}
+
 namespace {
 
-// The digits of a value, in pairs one behind the other.
-class Digits {
-public:
-    template <typename Number>
-    void put(Number number) noexcept {
-        const auto pair = static_cast<unsigned>(number);
-        *end_++ = static_cast<char>('0' + pair / 10);
-        *end_++ = static_cast<char>('0' + pair % 10);
+// A year of four digits, or whatever ran over at either end.
+void writeYear(TextBuffer& text, std::int64_t year) {
+    if (year < lowestYear || year > highestYear) {
+        return text.putSigned(year, 4);
     }
-    std::string_view view() const noexcept {
-        return {text_.data(), static_cast<std::size_t>(end_ - text_.data())};
-    }
-
-private:
-    std::array<char, dateDigits + timeDigits> text_;
-    char* end_ = text_.data();
-};
+    const auto number = static_cast<unsigned>(year);
+    writePair(writePair(text.room(4), number / 100), number % 100);
+}
 
 } // namespace
 
 void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,
                     std::string_view offset) {
-    Digits digits;
     if (kind == TemporalType::Unsupported) {
         return;
     }
     if (!isTimeKind(kind)) {
-        if (fields.year >= lowestYear && fields.year <= highestYear) {
-            digits.put(fields.year / 100);
-            digits.put(fields.year % 100);
-        } else {
-            text.putSigned(fields.year, 4); // of what ran over at either end
-        }
-        digits.put(fields.month);
-        digits.put(fields.day);
+        writeYear(text, fields.year);
+        writePair(writePair(text.room(4), static_cast<unsigned>(fields.month)),
+                  static_cast<unsigned>(fields.day));
     }
-    if (kind == TemporalType::Date) {
-        text.put(digits.view());
-    } else {
-        digits.put(fields.hours);
-        digits.put(fields.minutes);
-        digits.put(fields.seconds);
-        text.put(digits.view());
+    if (kind != TemporalType::Date) {
+        char* const place = writePair(text.room(6), static_cast<unsigned>(fields.hours));
+        writePair(writePair(place, static_cast<unsigned>(fields.minutes)),
+                  static_cast<unsigned>(fields.seconds));
         text.putFraction(static_cast<std::uint64_t>(fields.nanoseconds));
     }
     text.put(offset);
 }
 
-UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset) {
+namespace {
+
+void writeAnswer(TextBuffer& text, const ValueAnswer& answer) {
+    writeCanonical(text, answer.kind, answer.fields,
+                   answer.offset ? answer.offset->view() : std::string_view());
+}
+
+} // namespace
+
+TextResult resultOf(const ValueAnswer& answer) {
     TextBuffer text;
-    writeCanonical(text, kind, fields, offset);
+    writeAnswer(text, answer);
+    return TextResult(answer.state, UStringView<0>(text.view()), std::nullopt);
+}
+
+UString<0> canonicalText(const ValueAnswer& answer) {
+    TextBuffer text;
+    writeAnswer(text, answer);
     return text.toString();
-}
-
-UString<0> canonicalText(const CanonicalRecord& record) {
-    return canonicalText(record.type, carriedFields(record), record.offsetText());
-}
-
-UString<0> canonicalText(TemporalType kind, const TemporalInstant& instant) {
-    const std::optional<OffsetForm> offset =
-        instant.offsetMinutes ? offsetOfMinutes(*instant.offsetMinutes) : std::nullopt;
-    return canonicalText(kind, fieldsFromCount(instant.count), offset ? offset->view() : std::string_view());
 }
 
 std::string_view kindWord(TemporalType type) noexcept {

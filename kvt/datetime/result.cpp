@@ -7,7 +7,7 @@ namespace kvt::ex::datetime::detail {
 
 namespace {
 
-void fill(LogMessageInfo& info, std::uint32_t number, std::initializer_list<std::string_view> parameters) {
+void fill(LogMessageInfo& info, std::uint32_t number, std::span<const std::string_view> parameters) {
     info.messageNumber = number;
     info.parameters.reserve(parameters.size());
     for (const std::string_view parameter : parameters) {
@@ -17,7 +17,7 @@ void fill(LogMessageInfo& info, std::uint32_t number, std::initializer_list<std:
 
 } // namespace
 
-LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters) {
+LogMessageInfo message(std::uint32_t number, std::span<const std::string_view> parameters) {
     LogMessageInfo info;
     fill(info, number, parameters);
     return info;
@@ -25,7 +25,7 @@ LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_v
 
 void setMessage(kvt::future::optional<LogMessageInfo>& info, std::uint32_t number,
                 std::initializer_list<std::string_view> parameters) {
-    fill(info.emplace(), number, parameters);
+    fill(info.emplace(), number, std::span(parameters.begin(), parameters.size()));
 }
 
 LogMessageInfo genericMessage() {
@@ -45,6 +45,12 @@ std::optional<LogMessageInfo> messageOf(const Failure& failure) {
     if (const auto* range = std::get_if<DatePartRange>(&failure)) {
         return message(message_number::partOutOfRange,
                        {range->value.view(), range->part, range->lowest, range->highest});
+    }
+    if (const auto* impossible = std::get_if<CastImpossible>(&failure)) {
+        return message(message_number::castImpossible, impossible->words);
+    }
+    if (const auto* onTime = std::get_if<DateIntervalOnTime>(&failure)) {
+        return message(message_number::dateIntervalOnTime, {onTime->value, onTime->interval});
     }
     return std::nullopt;
 }

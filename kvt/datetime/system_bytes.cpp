@@ -2,37 +2,17 @@
 // values are plain ASCII: there is nothing to do then.
 #include <kvt/datetime/detail/system_bytes.h>
 
+#include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
-
-#include <algorithm>
 
 namespace kvt::ex::datetime::detail {
 
-bool isAscii(std::string_view text) noexcept {
-    return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-}
+using ex::detail::isAscii;
+using ex::detail::isContinuation;
 
-namespace {
-
-// The system's encoding does not change while the program runs.
-bool isSystemUtf8() {
-    static const bool isUtf8 = Encoding(Encoding::System).evaluate() == Encoding::Utf8;
-    return isUtf8;
-}
-
-// Of UTF-8: a byte within a character, behind its first.
-bool isContinuation(char c) {
-    return (static_cast<unsigned char>(c) & 0xC0) == 0x80;
-}
-
-} // namespace
-
-bool isSystemText(std::string_view utf8) {
-    if (isSystemUtf8()) {
-        return true;
-    }
+bool isAsciiPartOfSystem() {
     static const bool holdsAscii = Encoding(Encoding::System).supports7BitASCII();
-    return holdsAscii && isAscii(utf8);
+    return holdsAscii;
 }
 
 void SystemBytes::convert(std::string_view text) {
@@ -62,7 +42,7 @@ void appendReadable(UStringArray<0>& parameters, std::string_view bytes) {
 }
 
 std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
-    if (isSystemUtf8() && length <= bytes.size() && !isAscii(bytes.substr(length - 1, 1))) {
+    if (isSystemUtf8() && length <= bytes.size() && !isAscii(bytes[length - 1])) {
         while (length < bytes.size() && isContinuation(bytes[length])) {
             ++length;
         }
@@ -73,7 +53,7 @@ std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
 std::size_t placeBetweenCharacters(std::string_view bytes, std::size_t place) noexcept {
     if (isSystemUtf8()) {
         while (place > 0 && place < bytes.size() && isContinuation(bytes[place]) &&
-               !isAscii(bytes.substr(place - 1, 1))) {
+               !isAscii(bytes[place - 1])) {
             --place;
         }
     }

@@ -3,6 +3,7 @@
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
+#include <bit>
 #include <charconv>
 #include <cstring>
 #include <limits>
@@ -41,13 +42,31 @@ double longFraction(std::string_view digits) noexcept {
 
 } // namespace
 
-bool allDigits(std::string_view text) noexcept {
-    for (const char c : text) {
-        if (!isDigit(c)) {
-            return false;
+std::size_t countDigits(std::string_view text) noexcept {
+    std::size_t count = 0;
+    // Eight bytes at once: a byte is a digit if it differs from '0' by at most 9.
+    for (; text.size() - count >= sizeof(std::uint64_t); count += sizeof(std::uint64_t)) {
+        constexpr std::uint64_t everyByte = 0x0101010101010101;
+        std::uint64_t bytes = 0;
+        std::memcpy(&bytes, text.data() + count, sizeof bytes);
+        const std::uint64_t differences = bytes ^ everyByte * '0';
+        const std::uint64_t others =
+            (differences | ((differences & everyByte * 0x7F) + everyByte * (0x7F - 9))) & everyByte * 0x80;
+        if (others != 0) {
+            if constexpr (std::endian::native == std::endian::little) {
+                return count + static_cast<std::size_t>(std::countr_zero(others)) / 8;
+            }
+            break;
         }
     }
-    return true;
+    while (count < text.size() && isDigit(text[count])) {
+        ++count;
+    }
+    return count;
+}
+
+bool allDigits(std::string_view text) noexcept {
+    return countDigits(text) == text.size();
 }
 
 std::uint64_t digitsValue(std::string_view digits) noexcept {
@@ -122,12 +141,6 @@ void TextBuffer::grow(std::size_t count) {
 }
 
 void TextBuffer::putDigits(std::uint64_t number, unsigned width) {
-    if (number < 10 && width <= 1) {
-        return put(static_cast<char>('0' + number));
-    }
-    if (number < 100 && width <= 2) {
-        return putPair(static_cast<unsigned>(number));
-    }
     unsigned count = 1;
     for (std::uint64_t rest = number / 10; rest != 0 || count < width; rest /= 10) {
         ++count;
@@ -151,12 +164,14 @@ void TextBuffer::putFraction(std::uint64_t nanoseconds) {
     if (nanoseconds == 0) {
         return;
     }
-    char* const point = room(1 + nanosecondDigits);
-    *point = '.';
-    auto rest = static_cast<std::uint32_t>(nanoseconds);
-    for (char* place = point + nanosecondDigits; place != point; rest /= 10) {
-        *place-- = static_cast<char>('0' + rest % 10);
-    }
+    char* place = room(1 + nanosecondDigits);
+    const auto number = static_cast<std::uint32_t>(nanoseconds);
+    *place++ = '.';
+    *place++ = static_cast<char>('0' + number / 100'000'000);
+    const std::uint32_t high = number % 100'000'000 / 10'000;
+    const std::uint32_t low = number % 10'000;
+    place = writePair(writePair(place, high / 100), high % 100);
+    writePair(writePair(place, low / 100), low % 100);
     while (data_[size_ - 1] == '0') {
         --size_;
     }

@@ -11,7 +11,7 @@ kvt::future::optional<ZQTDateTimeUTCOffset> ZQTDateTimeUTCOffset::repairOffset(c
     if (text.isEmpty()) {
         return ZQTDateTimeUTCOffset(0, UString<0>());
     }
-    const std::optional<detail::OffsetForm> form = detail::readOffset(detail::viewOf(text));
+    const std::optional<detail::OffsetForm> form = detail::offsetOfText(detail::viewOf(text));
     if (!form) {
         return std::nullopt;
     }

@@ -34,9 +34,12 @@ TextResult failedFor(const UString<0>& value, std::uint32_t number) {
 
 // What timezoneRemove() gives for a value.
 UString<0> withoutOffset(const UString<0>& value, const CanonicalRecord& record) {
-    return detail::hasOffset(record.type)
-               ? detail::canonicalText(record.type, detail::carriedFields(record), "")
-               : UString<0>(value);
+    if (!detail::hasOffset(record.type)) {
+        return value;
+    }
+    detail::ValueAnswer answer = detail::answerOf(record);
+    answer.offset.reset();
+    return detail::canonicalText(answer);
 }
 
 Outcome<TextResult> offsetOf(const detail::OffsetForm& offset, UTCOffsetType type) {
@@ -70,7 +73,7 @@ TextResult zoneApplied(const UString<0>& value, const CanonicalRecord& record, s
         return failedFor(withoutOffset(value, record), number);
     }
     const bool isTime = detail::isTimeKind(record.type);
-    return succeeded(detail::canonicalText(isTime ? TemporalType::Time : TemporalType::Datetime, instant));
+    return detail::resultOf(detail::answerOf(isTime ? TemporalType::Time : TemporalType::Datetime, instant));
 }
 
 TextResult zoned(const UString<0>& value, const CanonicalRecord& record, std::string_view zone,
@@ -100,7 +103,7 @@ TextResult localNow(TemporalInstant instant, bool withOffset) {
     if (!withOffset) {
         instant.offsetMinutes.reset();
     }
-    return succeeded(detail::canonicalText(TemporalType::Datetime, instant));
+    return detail::resultOf(detail::answerOf(TemporalType::Datetime, instant));
 }
 
 } // namespace
@@ -117,7 +120,7 @@ TextResult now(ZoneMode mode) {
         case ZoneMode::LocalWithOffset:
             return localNow(instant, true);
         case ZoneMode::Utc:
-            return succeeded(detail::canonicalText(TemporalType::Datetime, instant));
+            return detail::resultOf(detail::answerOf(TemporalType::Datetime, instant));
         case ZoneMode::LocalWithoutOffset:
             return localNow(instant, false);
         }

@@ -19,7 +19,9 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     } else {
         // The bytes may be those of `out`, which then keeps its size.
         out.resize(bytes.size() / sizeof(CharOut));
-        std::memmove(out.data(), bytes.data(), out.size() * sizeof(CharOut));
+        if (!bytes.empty()) { // no bytes may be a null pointer
+            std::memmove(out.data(), bytes.data(), out.size() * sizeof(CharOut));
+        }
     }
 }
 

@@ -42,7 +42,7 @@ pkg_config() {
     pkg-config --modversion kvt
     # The flags are a list of words.
     # shellcheck disable=SC2046
-    "$compiler" -std=c++17 "$source/consumer.cpp" -o "$work/pkg_config_consumer" \
+    "$compiler" ${CXXFLAGS:-} -std=c++17 "$source/consumer.cpp" -o "$work/pkg_config_consumer" \
         $(pkg-config --cflags --libs kvt)
     LD_LIBRARY_PATH=$libdir "$work/pkg_config_consumer"
 }

@@ -169,7 +169,8 @@ TEST_F(OnDisk, BlocksOfTheQueueHoldFiveVectorsAndTheirs64Words) {
     manager.restore();
     const RawFile file(path);
     std::vector<Words> expected;
-    for (const std::size_t length : {1, 0, 2, 63, 64, 65, 127, 128, 129, 640, 0, 1000, 64, 1, 5000, 3}) {
+    for (const std::size_t length : std::initializer_list<std::size_t>{1, 0, 2, 63, 64, 65, 127, 128, 129,
+                                                                       640, 0, 1000, 64, 1, 5000, 3}) {
         expected.push_back(wordsOf(length + 7, length));
         manager.save(toSave(expected.back()));
         const Header header = reference::readHeader(file);
@@ -251,7 +252,7 @@ TEST_F(OnDisk, ATemporaryFileBeginsWithItsFirstSegment) {
     memory_manager manager(path, temporaryOptions(16384));
     EXPECT_EQ(std::filesystem::file_size(path), 0U);
     Word end = 0;
-    for (const Word size : {16384, 4096, 20480}) {
+    for (const Word size : {16384U, 4096U, 20480U}) {
         mapped_region_segment segment = manager.create_segment(size);
         EXPECT_EQ(segment.offset(), static_cast<long long>(end));
         EXPECT_EQ(segment.index(), kvt::ex::mmap::k_no_index);

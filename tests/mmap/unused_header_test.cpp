@@ -54,7 +54,7 @@ TEST_F(UnusedHeader, MayBeAHoleUpToTheEndOfTheFile) {
     }
     const std::string made = contentsOf(path);
     const std::string other = scratch.file("hole");
-    for (const std::uint64_t length : {65536, 3 * 65536}) {
+    for (const std::uint64_t length : {65536U, 3 * 65536U}) {
         SCOPED_TRACE(length);
         fs::remove(other);
         write(other, "");

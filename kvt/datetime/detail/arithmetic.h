@@ -3,18 +3,27 @@
 
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/detail/failure.h>
+#include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/time_count.h>
 
 namespace kvt::ex::datetime::detail {
 
 /// Years and months by the calendar, with the day cut to the length of the month once, then the rest as exact
-/// lengths. The sum of the years is kept in 16 bits, as the calendar of the `date` library keeps it. A failure if the
-/// year of the count is out of range; that of the result may be any.
-Outcome<TimeCount> addInterval(const TimeCount& count, const IntervalParts& interval);
+/// lengths. The sum of the years is kept in 16 bits, as the calendar of the `date` library keeps it. The numbers are
+/// within their bounds. A failure if their year is out of range; that of the result may be any.
+Outcome<DateTimeFields> addInterval(const DateTimeFields& fields, const IntervalParts& interval);
 
+/// A length of time: years and months by the calendar, and what is left behind them.
 struct Difference {
-    IntervalParts parts;
-    double months = 0.0; ///< all of it as a number of months, signed
+    bool backwards = false;
+    std::int64_t years = 0;
+    std::int64_t months = 0;
+    TimeCount rest;
+    CivilDate earlier = {1970, 1, 1}; ///< the date at which the rest begins
+
+    IntervalParts parts() const noexcept;
+    /// All of it as a number of months, signed.
+    double inMonths() const;
 };
 
 /// First minus second; years and months only `byCalendar`, which values without a date have none of. A failure if the

@@ -6,6 +6,7 @@
 #include <kvt/datetime/detail/outcome.h>
 #include <kvt/datetime/detail/text.h>
 
+#include <span>
 #include <string_view>
 #include <variant>
 
@@ -35,11 +36,22 @@ struct DatePartRange {
     std::string_view highest;
 };
 
+/// A cast to what a value cannot become: 933052. The words of its message are in a table that lives for ever.
+struct CastImpossible {
+    std::span<const std::string_view> words;
+};
+
+/// An interval with years, months or days, added to a time: 933060. Both texts stay the caller's.
+struct DateIntervalOnTime {
+    std::string_view value;
+    std::string_view interval;
+};
+
 /// What nobody has words for; the public function answers with its last resort.
 struct Unexpected {};
 
-using Failure =
-    std::variant<Unexpected, ValueUnsupported, IntervalUnreadable, KindsNotComparable, DatePartRange>;
+using Failure = std::variant<Unexpected, ValueUnsupported, IntervalUnreadable, KindsNotComparable,
+                             DatePartRange, CastImpossible, DateIntervalOnTime>;
 
 template <typename Value, typename Cause = Failure>
 class Outcome;

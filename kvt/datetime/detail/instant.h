@@ -3,6 +3,7 @@
 #pragma once
 
 #include <kvt/datetime/datetime_parts.h>
+#include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/failure.h>
 #include <kvt/datetime/detail/time_count.h>
 
@@ -42,17 +43,47 @@ DatePartRange hoursOutOfRange(std::int64_t hours) noexcept;
 DatePartRange minutesOutOfRange(std::int64_t minutes) noexcept;
 DatePartRange secondsOutOfRange(std::string_view seconds) noexcept;
 
-/// The nanoseconds since midnight. Without `lenient`: hours 0 to 23, minutes and seconds 0 to 59; with it, only the
-/// lower bounds hold. Nanoseconds are taken as they are. None of the numbers is longer than a value can write it.
-Outcome<std::int64_t> checkTimeOfDay(std::int64_t hours, std::int64_t minutes, std::int64_t seconds,
-                                     std::int64_t nanoseconds, bool lenient);
+/// What is wrong with the time of day, if anything is. Without `lenient`: hours 0 to 23, minutes and seconds 0 to 59; with
+/// it, only the lower bounds hold. Nanoseconds are taken as they are. None of the numbers is longer than a value can
+/// write it.
+std::optional<DatePartRange> timeOutOfRange(const DateTimeFields& fields, bool lenient) noexcept;
 
-/// The days since 1970-01-01. Year 1000 to 9999, month and day from 1; without `lenient` up to the 12th month and the
-/// last day of the month, with it up to what daysFromCivil() takes.
-Outcome<std::int64_t> checkCalendarDate(std::int64_t year, std::uint64_t month, std::uint64_t day,
-                                        bool lenient);
+/// What is wrong with the date, if anything is. Year 1000 to 9999, month and day from 1; without `lenient` up to the 12th
+/// month and the last day of the month, with it up to what daysFromCivil() takes.
+std::optional<DatePartRange> dateOutOfRange(const DateTimeFields& fields, bool lenient) noexcept;
 
-/// Checks the numbers and gives their count, with what runs over carried.
+/// Whether all numbers are in their ranges, as they nearly always are, without a look at the length of the month.
+constexpr bool areOfEveryMonth(const DateTimeFields& fields) noexcept {
+    const auto isBelow = [](std::int64_t number, std::uint64_t end) {
+        return static_cast<std::uint64_t>(number) < end;
+    };
+    return isBelow(fields.year - lowestYear, highestYear - lowestYear + 1) && fields.month - 1 < 12 &&
+           fields.day - 1 < 28 && isBelow(fields.hours, 24) && isBelow(fields.minutes, 60) &&
+           isBelow(fields.seconds, 60);
+}
+
+/// The first number that is out of its range, if one is.
+inline std::optional<DatePartRange> partOutOfRange(const DateTimeFields& fields, bool lenient) noexcept {
+    if (areOfEveryMonth(fields)) {
+        return std::nullopt;
+    }
+    if (std::optional<DatePartRange> wrong = timeOutOfRange(fields, lenient)) {
+        return wrong;
+    }
+    return dateOutOfRange(fields, lenient);
+}
+
+/// Of hours, minutes, seconds and nanoseconds that are in their ranges; more than a day where something runs over.
+constexpr std::int64_t nanosecondsOfDay(const DateTimeFields& fields) noexcept {
+    return (fields.hours * secondsPerHour + fields.minutes * secondsPerMinute + fields.seconds) *
+               nanosPerSecond +
+           fields.nanoseconds;
+}
+
+/// The count of numbers that are in their ranges, with what runs over carried.
+TimeCount countOf(const DateTimeFields& fields) noexcept;
+
+/// Checks the numbers and gives their count.
 Outcome<TimeCount> countFromFields(const DateTimeFields& fields, bool lenient);
 
 /// The numbers of a count. The year may be any; the others are within their bounds.

@@ -1,8 +1,7 @@
 // The reader that every function begins with, and the writer that most of them end with.
 //
-// A value is read once: its kind, its numbers, their count, its offset, and the pieces of its text as they stand. What
-// comes between works on numbers. canonicalText() makes the text of the result, once, from a kind, numbers and an
-// offset.
+// A value is read once: its kind, its numbers, its offset, and the pieces of its text as they stand. What comes between
+// works on numbers, and makes a ValueAnswer of them. resultOf() makes the text of that, once.
 #pragma once
 
 #include <kvt/datetime/datetime_parts.h>
@@ -26,16 +25,21 @@ constexpr bool hasOffset(TemporalType type) noexcept {
 
 /// A value that has been read. The pieces of text are views into the text that it was read from.
 struct CanonicalRecord {
+    // Not defaulted: that would clear all of it each time a value is read.
+    CanonicalRecord() noexcept {} // NOLINT(modernize-use-equals-default)
+
     TemporalType type = TemporalType::Unsupported;
     bool offsetRepaired = false; ///< the offset was not canonical in the text
     bool lenient = false;
-    std::string_view dateText;     ///< eight digits, or empty
-    std::string_view timeText;     ///< six digits, or empty
-    std::string_view fractionText; ///< digits behind the ".", without zeros at the end
     OffsetForm offset;             ///< of the kinds with an offset only
+    std::string_view digits;       ///< of the date, the time or both
+    std::string_view fractionText; ///< digits behind the ".", without zeros at the end
     DateTimeFields fields;         ///< as they are written; 1970-01-01 stands for a date that is not there
-    TimeCount count;               ///< of the fields, with what runs over carried
 
+    /// Eight digits, or empty.
+    std::string_view dateText() const noexcept;
+    /// Six digits, or empty.
+    std::string_view timeText() const noexcept;
     /// Canonical, or empty. A view into this record.
     std::string_view offsetText() const noexcept {
         return hasOffset(type) ? offset.view() : std::string_view();
@@ -57,19 +61,31 @@ TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept;
 /// may be 10000 then.
 DateTimeFields carriedFields(const CanonicalRecord& record) noexcept;
 
+/// A value as the answer of a function, before there is a text of it.
+struct ValueAnswer {
+    ReturnState state = ReturnState::Success;
+    TemporalType kind = TemporalType::Unsupported; ///< of the text; it is empty for this one
+    DateTimeFields fields;                         ///< within their bounds, but for the year
+    std::optional<OffsetForm> offset;              ///< to be written behind the value
+};
+
+/// The record as it is, of its own kind. The offset is as it was written: "+10:75" stays.
+ValueAnswer answerOf(const CanonicalRecord& record) noexcept;
+
+/// The instant, with its offset if it has one and there is a text for it.
+ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant,
+                     ReturnState state = ReturnState::Success) noexcept;
+
+/// The answer with its text, which is made in its place.
+TextResult resultOf(const ValueAnswer& answer);
+
+/// The text alone.
+UString<0> canonicalText(const ValueAnswer& answer);
+
 /// Writes the numbers as canonical text: the date or the time or both, as the kind has them, and then `offset` as it is
 /// given. The numbers are within their bounds, but for the year. Nothing for `Unsupported`.
 void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,
                     std::string_view offset);
-
-/// The same as a text of its own.
-UString<0> canonicalText(TemporalType kind, const DateTimeFields& fields, std::string_view offset);
-
-/// The record as text of its own kind. The offset is as it was written: "+10:75" stays.
-UString<0> canonicalText(const CanonicalRecord& record);
-
-/// The instant as text, with its offset if it has one and there is a text for it.
-UString<0> canonicalText(TemporalType kind, const TemporalInstant& instant);
 
 /// The word for a kind in messages: "date", "time", "time with UTC offset" and so on; "unsupported" for all else.
 std::string_view kindWord(TemporalType type) noexcept;

@@ -1,8 +1,9 @@
 // The border between the work and the host: how results are made and how failures become messages.
 //
-// Every public function hands its work to `guarded`. The work returns an Outcome of the whole result: what it knows
-// to answer itself, good or bad, or a Failure, which the function's `words` turn into a message. Whatever is left, an
-// exception from outside included, gets the function's last resort. So nothing is thrown at the host.
+// Every public function hands its work to `guarded`. The work returns an Outcome of the result or of what resultOf()
+// makes it from: what it knows to answer itself, good or bad, or a Failure, which the function's `words` turn into a
+// message. Whatever is left, an exception from outside included, gets the function's last resort. So nothing is thrown
+// at the host.
 //
 //     TextResult cast(const UString<0>& value, CastToTemporalType target) {
 //         return guarded<UString<0>>([&] {
@@ -17,6 +18,7 @@
 #include <cstdint>
 #include <initializer_list>
 #include <optional>
+#include <span>
 #include <string_view>
 #include <tuple>
 #include <type_traits>
@@ -28,7 +30,10 @@ template <typename Value>
 using Result = std::tuple<ReturnState, Value, kvt::future::optional<LogMessageInfo>>;
 
 /// A message from its number and parameters.
-LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters = {});
+LogMessageInfo message(std::uint32_t number, std::span<const std::string_view> parameters);
+inline LogMessageInfo message(std::uint32_t number, std::initializer_list<std::string_view> parameters = {}) {
+    return message(number, std::span(parameters.begin(), parameters.size()));
+}
 
 /// The message without anything to say: 933068.
 LogMessageInfo genericMessage();
@@ -62,7 +67,8 @@ Result<Value> failed(std::uint32_t number, std::initializer_list<std::string_vie
 }
 
 /// The message of a failure whose words depend on nothing but the failure: ValueUnsupported (933063),
-/// IntervalUnreadable (933064), KindsNotComparable (933059) and DatePartRange (933065). None for the others.
+/// IntervalUnreadable (933064), KindsNotComparable (933059), DatePartRange (933065) and those of a single function. None
+/// for the others.
 std::optional<LogMessageInfo> messageOf(const Failure& failure);
 
 /// What a function answers where there are no words.
@@ -84,17 +90,21 @@ Result<Value> lastAnswer(LastResort resort) noexcept {
     return result;
 }
 
-/// Runs `work`, which returns Outcome<Result<Value>>; `words` returns std::optional<LogMessageInfo> for a Failure.
-/// Work that words its failures itself returns Result<Value>.
+/// Runs `work`, which returns an Outcome of Result<Value> or of what resultOf() takes; `words` returns
+/// std::optional<LogMessageInfo> for a Failure. Work that words its failures itself returns Result<Value>.
 template <typename Value, typename Work, typename Words>
 Result<Value> guarded(Work&& work, LastResort resort, Words&& words) {
     try {
         if constexpr (std::is_same_v<std::invoke_result_t<Work>, Result<Value>>) {
             return work();
         } else {
-            Outcome<Result<Value>> outcome = work();
+            auto outcome = work();
             if (outcome) {
-                return std::move(*outcome);
+                if constexpr (std::is_same_v<std::remove_reference_t<decltype(*outcome)>, Result<Value>>) {
+                    return std::move(*outcome);
+                } else {
+                    return resultOf(*outcome);
+                }
             }
             if (std::optional<LogMessageInfo> info = words(outcome.failure())) {
                 return makeDateTimeResult(ReturnState::Failure, Value(), std::move(*info));

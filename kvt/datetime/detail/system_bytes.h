@@ -1,6 +1,7 @@
 // Text in the system's encoding, in which patterns and the values that they read are compared byte by byte.
 #pragma once
 
+#include <kvt/foundation/detail/ascii.h>
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
 
@@ -10,11 +11,19 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// Whether there are only seven-bit bytes in it.
-bool isAscii(std::string_view text) noexcept;
+/// Whether the system's encoding is UTF-8. It does not change while the program runs.
+inline bool isSystemUtf8() {
+    static const bool isUtf8 = Encoding(Encoding::System).evaluate() == Encoding::Utf8;
+    return isUtf8;
+}
+
+/// Whether seven-bit text has the same bytes in the system's encoding.
+bool isAsciiPartOfSystem();
 
 /// Whether UTF-8 text has the same bytes in the system's encoding. It is not looked at where that is UTF-8.
-bool isSystemText(std::string_view utf8);
+inline bool isSystemText(std::string_view utf8) {
+    return isSystemUtf8() || (isAsciiPartOfSystem() && ex::detail::isAllAscii(utf8));
+}
 
 /// UTF-8 text as bytes of the system's encoding. Where these are the same bytes, the text is only referred to, and not
 /// looked at. Otherwise the constructor throws what the conversion throws, when the text is not well formed or has a

@@ -37,6 +37,14 @@ constexpr bool isDigit(char c) noexcept {
     return c >= '0' && c <= '9';
 }
 
+/// The number of two digits, or a negative one where they are none.
+constexpr int digitPair(const char* digits) noexcept {
+    return isDigit(digits[0]) && isDigit(digits[1]) ? (digits[0] - '0') * 10 + (digits[1] - '0') : -1;
+}
+
+/// How many digits a text begins with.
+std::size_t countDigits(std::string_view text) noexcept;
+
 /// True for the empty text.
 bool allDigits(std::string_view text) noexcept;
 
@@ -63,6 +71,13 @@ inline constexpr std::size_t longestFixedDouble = 1 + 309 + 1 + 9;
 /// Writes a double in fixed notation with at most nine decimals and without zeros at the end, and returns where it
 /// ends.
 char* writeFixed(char* first, char* last, double value) noexcept;
+
+/// Writes two digits and returns where they end; the number is below 100.
+inline char* writePair(char* place, unsigned number) noexcept {
+    place[0] = static_cast<char>('0' + number / 10);
+    place[1] = static_cast<char>('0' + number % 10);
+    return place + 2;
+}
 
 /// A copy of a text of up to 40 bytes that needs no memory: a number in a failure.
 class ShortText {
@@ -95,7 +110,11 @@ public:
     }
     /// In decimal, with leading zeros up to `width`.
     void putNumber(std::uint64_t number, unsigned width = 1) {
-        if (width == 4 && number < 10'000) { // a year
+        if (width <= 1 && number < 10) {
+            put(static_cast<char>('0' + number));
+        } else if (width <= 2 && number < 100) {
+            putPair(static_cast<unsigned>(number));
+        } else if (width == 4 && number < 10'000) { // a year
             putPair(static_cast<unsigned>(number / 100));
             putPair(static_cast<unsigned>(number % 100));
         } else {
@@ -103,13 +122,17 @@ public:
         }
     }
     /// Two digits; the number is below 100.
-    void putPair(unsigned number) {
-        char* const place = room(2);
-        place[0] = static_cast<char>('0' + number / 10);
-        place[1] = static_cast<char>('0' + number % 10);
-    }
+    void putPair(unsigned number) { writePair(room(2), number); }
     /// The same with "-" in front of a negative number, which counts as one of the `width`.
     void putSigned(std::int64_t number, unsigned width = 1);
+    /// Place for so many chars, which are part of the text then and the caller's to write.
+    char* room(std::size_t count) {
+        if (count > capacity_ - size_) {
+            grow(count);
+        }
+        size_ += count;
+        return data_ + size_ - count;
+    }
     /// "." and nine digits without the zeros at their end; nothing for zero. Below 1,000,000,000.
     void putFraction(std::uint64_t nanoseconds);
     /// Seconds and fraction as secondsFractionalToString(double) words their sum as a double.
@@ -119,14 +142,6 @@ public:
     UString<0> toString() const { return UString<0>(UStringView<0>(view())); }
 
 private:
-    /// Place for so many chars, which are part of the text then.
-    char* room(std::size_t count) {
-        if (count > capacity_ - size_) {
-            grow(count);
-        }
-        size_ += count;
-        return data_ + size_ - count;
-    }
     void grow(std::size_t count);
     void putDigits(std::uint64_t number, unsigned width);
 

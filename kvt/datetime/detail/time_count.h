@@ -20,6 +20,9 @@ struct TimeCount {
 
 /// The count of days and any number of nanoseconds, carried.
 constexpr TimeCount timeCount(std::int64_t days, std::int64_t nanoseconds) noexcept {
+    if (nanoseconds >= 0 && nanoseconds < nanosPerDay) {
+        return {days, nanoseconds}; // as nearly always
+    }
     std::int64_t carry = nanoseconds / nanosPerDay;
     carry -= nanoseconds % nanosPerDay < 0 ? 1 : 0;
     return {days + carry, nanoseconds - carry * nanosPerDay};
