@@ -12,11 +12,18 @@ add_library(kvt_objects OBJECT)
 target_compile_features(kvt_objects PUBLIC cxx_std_20)
 target_include_directories(kvt_objects PUBLIC "${PROJECT_SOURCE_DIR}")
 target_link_libraries(kvt_objects PRIVATE
-    ICU::uc Boost::headers double-conversion::double-conversion hwy::hwy kvt_date_headers Threads::Threads)
+    ICU::uc Boost::headers double-conversion::double-conversion kvt_date_headers Threads::Threads)
 set_target_properties(kvt_objects PROPERTIES
     POSITION_INDEPENDENT_CODE ON
     CXX_VISIBILITY_PRESET hidden
     VISIBILITY_INLINES_HIDDEN ON)
+# Of Highway the headers are enough (kvt/platform/vector_targets.h). What it checks in builds that are not optimised would
+# call its library.
+add_library(kvt_highway_headers INTERFACE)
+target_include_directories(kvt_highway_headers SYSTEM INTERFACE
+    $<TARGET_PROPERTY:hwy::hwy,INTERFACE_INCLUDE_DIRECTORIES>)
+target_compile_definitions(kvt_highway_headers INTERFACE HWY_WANT_AVX3_DL HWY_IS_DEBUG_BUILD=0)
+target_link_libraries(kvt_objects PRIVATE kvt_highway_headers)
 # What the library exports and calls itself is not replaced by a program, and may be inlined.
 target_compile_options(kvt_objects PRIVATE -fno-semantic-interposition)
 kvt_warnings(kvt_objects)
@@ -75,12 +82,12 @@ function(kvt_finish_library)
     foreach(library IN ITEMS kvt kvt_static)
         target_sources(${library} PRIVATE $<TARGET_OBJECTS:kvt_objects> $<TARGET_OBJECTS:kvt_date>)
         target_link_libraries(${library} PRIVATE
-            ICU::uc double-conversion::double-conversion hwy::hwy Threads::Threads)
+            ICU::uc double-conversion::double-conversion Threads::Threads)
         set_target_properties(${library} PROPERTIES LINKER_LANGUAGE CXX)
     endforeach()
     # Boost's headers show in the public ones of kvt/mmap.
     target_link_libraries(kvt INTERFACE Boost::headers)
-    target_link_libraries(kvt_static INTERFACE Boost::headers)
+    target_link_libraries(kvt_static INTERFACE Boost::headers kvt_highway_headers)
     target_compile_features(kvt INTERFACE cxx_std_17)
     target_compile_features(kvt_static INTERFACE cxx_std_20)
     target_include_directories(kvt_static INTERFACE "${PROJECT_SOURCE_DIR}")

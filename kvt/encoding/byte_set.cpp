@@ -3,12 +3,13 @@
 //
 // Each half of a byte chooses one byte of a table: the lower half those upper halves that are in the set with it, the upper
 // half its own bit.
-#define HWY_WANT_AVX3_DL // as in unicode_convert.cpp: all index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/byte_set.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/encoding/detail/byte_set.h>
+
+#include <kvt/platform/vector_targets.h>
 
 #include <hwy/highway.h>
 
@@ -56,10 +57,10 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace kvt::ex::detail::vectors {
 
-HWY_EXPORT(bitsOfSet);
+KVT_VECTOR_TABLE(bitsOfSet);
 
 std::uint64_t ByteSet::bitsOf(const std::uint8_t* bytes) const {
-    return HWY_DYNAMIC_DISPATCH(bitsOfSet)(rows_, bytes);
+    return KVT_VECTOR_CALL(bitsOfSet)(rows_, bytes);
 }
 
 } // namespace kvt::ex::detail::vectors

@@ -4,13 +4,14 @@
 // Reading UTF-8 computes, at each byte, what a character that begins there would be, and then drops the places where none
 // begins. Writing UTF-8 lays out the bytes of each character in a lane of their own, and one shuffle from a table, chosen
 // by the lengths, moves them together. Characters beyond U+FFFF go one by one, but for those from UTF-8 to UTF-16.
-#define HWY_WANT_AVX3_DL // whose one instruction drops the places where no character begins
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_convert.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/encoding/detail/unicode_characters-inl.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
+
+#include <kvt/platform/vector_targets.h>
 
 #include <hwy/highway.h>
 
@@ -596,38 +597,38 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace kvt::ex::detail::vectors {
 
-HWY_EXPORT(utf8ToUtf16);
-HWY_EXPORT(utf8ToUtf32);
-HWY_EXPORT(utf16ToUtf8);
-HWY_EXPORT(utf16ToUtf32);
-HWY_EXPORT(utf32ToUtf8);
-HWY_EXPORT(utf32ToUtf16);
-HWY_EXPORT(widenAscii);
-HWY_EXPORT(narrowAscii);
+KVT_VECTOR_TABLE(utf8ToUtf16);
+KVT_VECTOR_TABLE(utf8ToUtf32);
+KVT_VECTOR_TABLE(utf16ToUtf8);
+KVT_VECTOR_TABLE(utf16ToUtf32);
+KVT_VECTOR_TABLE(utf32ToUtf8);
+KVT_VECTOR_TABLE(utf32ToUtf16);
+KVT_VECTOR_TABLE(widenAscii);
+KVT_VECTOR_TABLE(narrowAscii);
 
 std::size_t utf8ToUtf16(const char* text, std::size_t bytes, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf8ToUtf16)(text, bytes, out, room);
+    return KVT_VECTOR_CALL(utf8ToUtf16)(text, bytes, out, room);
 }
 std::size_t utf8ToUtf32(const char* text, std::size_t bytes, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf8ToUtf32)(text, bytes, out, room);
+    return KVT_VECTOR_CALL(utf8ToUtf32)(text, bytes, out, room);
 }
 std::size_t utf16ToUtf8(const char* text, std::size_t units, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf16ToUtf8)(text, units, out, room);
+    return KVT_VECTOR_CALL(utf16ToUtf8)(text, units, out, room);
 }
 std::size_t utf16ToUtf32(const char* text, std::size_t units, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf16ToUtf32)(text, units, out, room);
+    return KVT_VECTOR_CALL(utf16ToUtf32)(text, units, out, room);
 }
 std::size_t utf32ToUtf8(const char* text, std::size_t units, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf32ToUtf8)(text, units, out, room);
+    return KVT_VECTOR_CALL(utf32ToUtf8)(text, units, out, room);
 }
 std::size_t utf32ToUtf16(const char* text, std::size_t units, char* out, std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(utf32ToUtf16)(text, units, out, room);
+    return KVT_VECTOR_CALL(utf32ToUtf16)(text, units, out, room);
 }
 std::size_t widenAscii(const char* text, std::size_t bytes, char* out) {
-    return HWY_DYNAMIC_DISPATCH(widenAscii)(text, bytes, out);
+    return KVT_VECTOR_CALL(widenAscii)(text, bytes, out);
 }
 std::size_t narrowAscii(const char* text, std::size_t units, char* out) {
-    return HWY_DYNAMIC_DISPATCH(narrowAscii)(text, units, out);
+    return KVT_VECTOR_CALL(narrowAscii)(text, units, out);
 }
 
 } // namespace kvt::ex::detail::vectors

@@ -3,13 +3,14 @@
 //
 // UTF-8 is checked as J. Keiser and D. Lemire do it in "Validating UTF-8 In Less Than One Instruction Per Byte" (2020): by
 // three look-ups by half bytes of each byte and its predecessor, whose common bits are the errors.
-#define HWY_WANT_AVX3_DL // as in unicode_convert.cpp: both index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_measure.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/encoding/detail/unicode_characters-inl.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
+
+#include <kvt/platform/vector_targets.h>
 
 #include <hwy/highway.h>
 
@@ -381,22 +382,22 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace kvt::ex::detail::vectors {
 
-HWY_EXPORT(measureUtf8);
-HWY_EXPORT(measureUtf16);
-HWY_EXPORT(measureUtf32);
-HWY_EXPORT(asciiPrefix);
+KVT_VECTOR_TABLE(measureUtf8);
+KVT_VECTOR_TABLE(measureUtf16);
+KVT_VECTOR_TABLE(measureUtf32);
+KVT_VECTOR_TABLE(asciiPrefix);
 
 Extent measureUtf8(const char* text, std::size_t bytes) {
-    return HWY_DYNAMIC_DISPATCH(measureUtf8)(text, bytes);
+    return KVT_VECTOR_CALL(measureUtf8)(text, bytes);
 }
 Extent measureUtf16(const char* text, std::size_t units) {
-    return HWY_DYNAMIC_DISPATCH(measureUtf16)(text, units);
+    return KVT_VECTOR_CALL(measureUtf16)(text, units);
 }
 Extent measureUtf32(const char* text, std::size_t units) {
-    return HWY_DYNAMIC_DISPATCH(measureUtf32)(text, units);
+    return KVT_VECTOR_CALL(measureUtf32)(text, units);
 }
 std::size_t asciiPrefix(const char* text, std::size_t bytes) {
-    return HWY_DYNAMIC_DISPATCH(asciiPrefix)(text, bytes);
+    return KVT_VECTOR_CALL(asciiPrefix)(text, bytes);
 }
 
 } // namespace kvt::ex::detail::vectors

@@ -3,11 +3,11 @@
 //
 // A set of bytes is told by two look-ups, by the upper and by the lower half of a byte. Each of up to eight different rows
 // of the set has a bit; the upper half gives the bit of its row, the lower one the bits of all rows that it is in.
-#define HWY_WANT_AVX3_DL // in all such sources: they index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/regex/prefix_scan.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
+#include <kvt/platform/vector_targets.h>
 #include <kvt/regex/detail/prefix_scan.h>
 
 #include <hwy/highway.h>
@@ -92,10 +92,10 @@ HWY_AFTER_NAMESPACE();
 namespace kvt::ex::detail {
 namespace vectors {
 
-HWY_EXPORT(findProbesIn);
+KVT_VECTOR_TABLE(findProbesIn);
 
 std::size_t findProbes(const PrefixScan::Probe* probes, const char* text, std::size_t places) {
-    return HWY_DYNAMIC_DISPATCH(findProbesIn)(probes, text, places);
+    return KVT_VECTOR_CALL(findProbesIn)(probes, text, places);
 }
 
 } // namespace vectors

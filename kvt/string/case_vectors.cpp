@@ -4,13 +4,14 @@
 // ASCII, Latin-1 and what does not change go by whole registers, other characters one by one by the table. Nothing is
 // checked for being well-formed: a lead byte with its trail bytes behind it is a character wherever it stands, and bytes that
 // are none are left alone, as ICU leaves them.
-#define HWY_WANT_AVX3_DL // in all such sources: they index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/case_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/encoding/detail/unicode_characters-inl.h>
 #include <kvt/string/detail/case_table.h>
+
+#include <kvt/platform/vector_targets.h>
 
 #include <hwy/highway.h>
 
@@ -208,11 +209,11 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace kvt::ex::detail::vectors {
 
-HWY_EXPORT(mapCaseBytes);
+KVT_VECTOR_TABLE(mapCaseBytes);
 
 CaseProgress mapCase(const CaseTable& table, const char* text, std::size_t size, std::size_t from, char* out,
                      std::size_t room) {
-    return HWY_DYNAMIC_DISPATCH(mapCaseBytes)(table, text, size, from, out, room);
+    return KVT_VECTOR_CALL(mapCaseBytes)(table, text, size, from, out, room);
 }
 
 } // namespace kvt::ex::detail::vectors

@@ -10,11 +10,11 @@
 // (l[i] ^ b[i]) * 0xB3. They are found for the whole block, bit by bit from the lowest one: bit k of the product is bit k of
 // l ^ b, changed where bits below it carry into it, so that bit k of all l is a running sum without carries of known bits.
 // That is a product without carries by a number of nothing but ones.
-#define HWY_WANT_AVX3_DL // in all such sources: they index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/hash_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
+#include <kvt/platform/vector_targets.h>
 #include <kvt/string/detail/hash_vectors.h>
 
 #include <hwy/highway.h>
@@ -160,10 +160,10 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 namespace kvt::ex::detail::vectors {
 
-HWY_EXPORT(fnv1aBytes);
+KVT_VECTOR_TABLE(fnv1aBytes);
 
 std::uint64_t fnv1a(std::uint64_t hash, const char* bytes, std::size_t size) noexcept {
-    return HWY_DYNAMIC_DISPATCH(fnv1aBytes)(hash, bytes, size);
+    return KVT_VECTOR_CALL(fnv1aBytes)(hash, bytes, size);
 }
 
 } // namespace kvt::ex::detail::vectors

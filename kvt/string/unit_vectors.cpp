@@ -1,11 +1,12 @@
 // Search by vector registers (see detail/unit_vectors.h): one source, compiled for each instruction set that Highway knows
 // for this processor family, and chosen when it is first called.
-#define HWY_WANT_AVX3_DL // in all such sources: they index their functions by one inline function of Highway
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/unit_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/string/detail/unit_vectors.h>
+
+#include <kvt/platform/vector_targets.h>
 
 #include <hwy/highway.h>
 
@@ -211,17 +212,17 @@ HWY_AFTER_NAMESPACE();
 namespace kvt::ex::detail::vectors {
 
 #define KVT_FOR_WIDTH(bits, Unit)                                                                            \
-    HWY_EXPORT(find##bits);                                                                                  \
-    HWY_EXPORT(parts##bits);                                                                                 \
-    HWY_EXPORT(places##bits);                                                                                \
+    KVT_VECTOR_TABLE(find##bits);                                                                            \
+    KVT_VECTOR_TABLE(parts##bits);                                                                           \
+    KVT_VECTOR_TABLE(places##bits);                                                                          \
     Place findSequence(const Unit* text, std::size_t places, const Unit* needle, std::size_t length) {       \
-        return HWY_DYNAMIC_DISPATCH(find##bits)(text, places, needle, length);                               \
+        return KVT_VECTOR_CALL(find##bits)(text, places, needle, length);                                    \
     }                                                                                                        \
     std::size_t countParts(const Unit* text, std::size_t size, Unit delimiter, bool withEmpty) {             \
-        return HWY_DYNAMIC_DISPATCH(parts##bits)(text, size, delimiter, withEmpty);                          \
+        return KVT_VECTOR_CALL(parts##bits)(text, size, delimiter, withEmpty);                               \
     }                                                                                                        \
     std::size_t placesOf(const Unit* text, std::uint32_t size, Unit unit, std::uint32_t* places) {           \
-        return HWY_DYNAMIC_DISPATCH(places##bits)(text, size, unit, places);                                 \
+        return KVT_VECTOR_CALL(places##bits)(text, size, unit, places);                                      \
     }
 KVT_FOR_WIDTH(8, char)
 KVT_FOR_WIDTH(16, char16_t)

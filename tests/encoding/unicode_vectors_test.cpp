@@ -6,9 +6,7 @@
 
 #include <reference/icu_reference.h>
 #include <support/guarded_memory.h>
-
-#define HWY_WANT_AVX3_DL // as the library is compiled
-#include <hwy/targets.h>
+#include <support/vector_targets.h>
 
 #include <gtest/gtest.h>
 
@@ -137,17 +135,8 @@ std::string_view bytesOf(const std::basic_string<Unit>& units) {
 
 // ---- Each instruction set ----------------------------------------------------------------------------------------
 
-class UnicodeVectors : public testing::TestWithParam<std::int64_t> {
+class UnicodeVectors : public OnEachVectorTarget {
 protected:
-    void SetUp() override {
-        hwy::SetSupportedTargetsForTest(GetParam());
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-    void TearDown() override {
-        hwy::SetSupportedTargetsForTest(0);
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-
     // Text and result stand at the end of memory that can be touched, so that a step beyond it ends the test.
     template <typename Unit, typename Convert>
     void checkConversion(std::string_view from, std::size_t units, const std::basic_string<Unit>& expected,
@@ -212,8 +201,7 @@ private:
     GuardedMemory output_{1 << 17};
 };
 
-INSTANTIATE_TEST_SUITE_P(Each, UnicodeVectors, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
-                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+INSTANTIATE_TEST_SUITE_P(Each, UnicodeVectors, testing::ValuesIn(vectorTargets()), vectorTargetName);
 
 // Characters of one to four bytes, at the borders of each length.
 constexpr char32_t samples[] = {0,      'a',    0x7F,   0x80,   0xE9,    0x7FF,   0x800,   0x3042,

@@ -3,9 +3,7 @@
 #include <kvt/regex/detail/prefix_scan.h>
 
 #include <support/guarded_memory.h>
-
-#define HWY_WANT_AVX3_DL // as the library is compiled
-#include <hwy/targets.h>
+#include <support/vector_targets.h>
 
 #include <gtest/gtest.h>
 
@@ -20,17 +18,8 @@ namespace {
 using kvt::ex::detail::ByteSet;
 using kvt::ex::detail::PrefixScan;
 
-class PrefixScanOn : public testing::TestWithParam<std::int64_t> {
+class PrefixScanOn : public OnEachVectorTarget {
 protected:
-    void SetUp() override {
-        hwy::SetSupportedTargetsForTest(GetParam());
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-    void TearDown() override {
-        hwy::SetSupportedTargetsForTest(0);
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-
     static bool standsAt(const std::vector<ByteSet>& sets, const std::string& text, std::size_t place) {
         for (std::size_t i = 0; i < sets.size(); ++i) {
             if (place + i >= text.size() || !sets[i].contains(static_cast<unsigned char>(text[place + i]))) {
@@ -57,8 +46,7 @@ private:
     GuardedMemory memory_{1 << 12};
 };
 
-INSTANTIATE_TEST_SUITE_P(Each, PrefixScanOn, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
-                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+INSTANTIATE_TEST_SUITE_P(Each, PrefixScanOn, testing::ValuesIn(vectorTargets()), vectorTargetName);
 
 ByteSet setOf(const std::string& bytes) {
     ByteSet set;

@@ -3,9 +3,7 @@
 #include <kvt/string/ustring.h>
 
 #include <support/guarded_memory.h>
-
-#define HWY_WANT_AVX3_DL // as the library is compiled
-#include <hwy/targets.h>
+#include <support/vector_targets.h>
 
 #include <gtest/gtest.h>
 #include <unicode/ucasemap.h>
@@ -54,17 +52,8 @@ std::string utf8(char32_t c) {
 
 constexpr std::size_t longEnough = 1024;
 
-class CaseTable : public testing::TestWithParam<std::int64_t> {
+class CaseTable : public OnEachVectorTarget {
 protected:
-    void SetUp() override {
-        hwy::SetSupportedTargetsForTest(GetParam());
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-    void TearDown() override {
-        hwy::SetSupportedTargetsForTest(0);
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-
     // What ICU gives; never shorter than the text.
     std::string byIcu(CaseFunction function, std::string_view text) {
         std::string mapped(3 * text.size(), '\0');
@@ -105,8 +94,7 @@ private:
     GuardedMemory memory_{1 << 16};
 };
 
-INSTANTIATE_TEST_SUITE_P(Each, CaseTable, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
-                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+INSTANTIATE_TEST_SUITE_P(Each, CaseTable, testing::ValuesIn(vectorTargets()), vectorTargetName);
 
 TEST_P(CaseTable, AllCodePoints) {
     std::string text;

@@ -6,9 +6,7 @@
 
 #include <string/naive_units.h>
 #include <support/guarded_memory.h>
-
-#define HWY_WANT_AVX3_DL // as the library is compiled
-#include <hwy/targets.h>
+#include <support/vector_targets.h>
 
 #include <gtest/gtest.h>
 
@@ -21,17 +19,8 @@ namespace {
 
 namespace detail = kvt::ex::detail;
 
-class HashVectors : public testing::TestWithParam<std::int64_t> {
+class HashVectors : public OnEachVectorTarget {
 protected:
-    void SetUp() override {
-        hwy::SetSupportedTargetsForTest(GetParam());
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-    void TearDown() override {
-        hwy::SetSupportedTargetsForTest(0);
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-
     void check(const std::string& text, std::uint64_t hash) {
         char* const bytes = memory_.end() - text.size();
         std::memcpy(bytes, text.data(), text.size());
@@ -46,8 +35,7 @@ private:
     GuardedMemory memory_{1 << 13};
 };
 
-INSTANTIATE_TEST_SUITE_P(Each, HashVectors, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
-                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+INSTANTIATE_TEST_SUITE_P(Each, HashVectors, testing::ValuesIn(vectorTargets()), vectorTargetName);
 
 TEST_P(HashVectors, EachLengthOfRandomBytes) {
     std::mt19937_64 random(51);

@@ -3,9 +3,7 @@
 #include <kvt/string/detail/unit_vectors.h>
 #include <string/naive_units.h>
 #include <support/guarded_memory.h>
-
-#define HWY_WANT_AVX3_DL // as the library is compiled
-#include <hwy/targets.h>
+#include <support/vector_targets.h>
 
 #include <gtest/gtest.h>
 
@@ -22,17 +20,8 @@ namespace vectors = kvt::ex::detail::vectors;
 template <typename Unit>
 constexpr Unit highest = static_cast<Unit>(~std::make_unsigned_t<Unit>{0});
 
-class UnitVectors : public testing::TestWithParam<std::int64_t> {
+class UnitVectors : public OnEachVectorTarget {
 protected:
-    void SetUp() override {
-        hwy::SetSupportedTargetsForTest(GetParam());
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-    void TearDown() override {
-        hwy::SetSupportedTargetsForTest(0);
-        hwy::GetChosenTarget().Update(hwy::SupportedTargets());
-    }
-
     // The text at the end of memory that can be touched.
     template <typename Unit>
     const Unit* placed(const std::basic_string<Unit>& text) {
@@ -113,8 +102,7 @@ private:
     GuardedMemory memory_{1 << 12};
 };
 
-INSTANTIATE_TEST_SUITE_P(Each, UnitVectors, testing::ValuesIn(hwy::SupportedAndGeneratedTargets()),
-                         [](const auto& target) { return std::string(hwy::TargetName(target.param)); });
+INSTANTIATE_TEST_SUITE_P(Each, UnitVectors, testing::ValuesIn(vectorTargets()), vectorTargetName);
 
 TEST_P(UnitVectors, BytesAreFoundCountedAndListed) {
     checkAll<char>();
