@@ -1,5 +1,5 @@
-// Giving a moment another offset. There are three ways to name one: the machine's zone, UTC, and an offset itself; what
-// is none of them takes the offset away.
+// Giving a moment another offset. There are three ways to name one: the machine's zone, UTC, and an offset itself. Any
+// other text takes the offset away.
 #include <kvt/datetime/detail/apply_offset.h>
 
 #include <kvt/datetime/detail/local_zone.h>

@@ -73,7 +73,7 @@ KVT_EXPORT TextResult add(const UString<0>& value, const UString<0>& interval);
 KVT_EXPORT TextResult diff(const UString<0>& first, const UString<0>& second);
 
 /// The same difference as one number. Years and months are whole months plus the rest as a part of the month in which
-/// the earlier end of that rest lies; all others are exact lengths of time. 933068 for a unit that is none.
+/// the earlier end of that rest lies; all others are exact lengths of time. 933068 for an unknown unit.
 KVT_EXPORT NumberResult diffAsNumber(const UString<0>& first, const UString<0>& second, UnitType unit);
 
 /// -1, 0 or 1 as `first` is earlier than, the same moment as or later than `second`; -3 where diff() would fail.
@@ -93,8 +93,8 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 ///     ISO    2020-01-02, 03:04:05, 2020-01-02T03:04:05, the last two also with an offset, "Z" included
 ///
 /// Any other format is a pattern. What is not in the following list stands for itself, byte for byte, in the system's
-/// encoding; so do blanks. Numbers take as many digits as there are up to their width, but a number right behind another
-/// one takes the whole width, all but %j. Where a bound is in brackets, `lenient` lifts it.
+/// encoding; so do blanks. Numbers take as many digits as there are up to their width, but a number right behind
+/// another one takes the whole width, all but %j. Where a bound is in brackets, `lenient` lifts it.
 ///
 ///     $    the end of the value, as the end of the format
 ///     *    one word, up to a blank
@@ -124,9 +124,9 @@ KVT_EXPORT TextResult intervalNegate(const UString<0>& interval);
 ///     %z   offset: Z, +hh, +hhmm or +hh:mm
 ///     %Ez  offset: Z, +hh, +hhmm or +hh:mm
 ///
-/// Names, "am" and "pm" are read in any case, and %B fails by an unknown one. A fraction is taken where there is one. %j
-/// needs %Y. The result of %s has the offset +00:00, that of %Es none. The word of "*" has to end in what stands behind
-/// the "*" up to a blank or "$". Without a "$" at the end of the format the rest of the value is not looked at.
+/// Names, "am" and "pm" are read in any case, and %B fails by an unknown one. A fraction is taken where there is one.
+/// %j needs %Y. The result of %s has the offset +00:00, that of %Es none. The word of "*" has to end in what stands
+/// behind the "*" up to a blank or "$". Without a "$" at the end of the format the rest of the value is not looked at.
 ///
 /// A format without any of %T %H %I %p %M %S %s %Es gives a date, so that %k and %l alone are read and dropped; one
 /// without any of %Y %m %N %b %B %d %e %j %s %Es gives a time; all others give a datetime. A date is
@@ -187,11 +187,11 @@ KVT_EXPORT TextResult format(const UString<0>& value, const UString<0>& format);
 // ---- Offsets and the zone of the machine
 
 /// The present moment. `Error` with 933050 and the cause where the zone of the machine cannot be found; `Error`
-/// without a message for a mode that is none. `Utc` needs no zone database.
+/// without a message for an unknown mode. `Utc` needs no zone database.
 KVT_EXPORT TextResult now(ZoneMode mode);
 
 /// The offset of a value, as text or as a signed number. 933071 for all that has none, unreadable values included;
-/// no message for a type that is none.
+/// no message for an unknown type.
 KVT_EXPORT TextResult timezoneGet(const UString<0>& value, UTCOffsetType type);
 
 /// The value with another offset: a text such as "+01:00", "utc", or "local" for that of the machine's zone at that

@@ -59,7 +59,7 @@ bool hasTimeFlag(std::string_view format) {
 TextResult failedByMismatch(std::string_view format, std::size_t place) {
     place = placeBetweenCharacters(format, place);
     const std::string_view matched = format.substr(0, place);
-    TextResult result(ReturnState::Failure, UString<0>(), std::nullopt);
+    TextResult result(ReturnState::Failure, UStringView<0>(), std::nullopt);
     LogMessageInfo& info = std::get<2>(result).emplace();
     info.messageNumber = message_number::formatMismatch;
     info.parameters.reserve(2);

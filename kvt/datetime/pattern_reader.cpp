@@ -81,8 +81,9 @@ std::size_t coveredLength(std::string_view tail) {
     return tail.size();
 }
 
-// The parts that a result has by this format, which is looked at as a text: what stands in it behind a fuzzy word counts
-// as well. In the search for offsets even the second character of "%%" counts as the beginning of a flag, so that "%%z" asks for one.
+// The parts that a result has by this format, which is looked at as a text: what stands in it behind a fuzzy word
+// counts as well. In the search for offsets even the second character of "%%" counts as the beginning of a flag, so
+// that "%%z" asks for one.
 Parts partsOf(std::string_view format) noexcept {
     Parts parts = noPart;
     bool isSecondOfPair = false;

@@ -1,5 +1,5 @@
-// Patterns, explained: what each element of a pattern means, and what each took when a value was read. For programs that
-// show patterns to people, as `kvt date why` does; whoever only wants the value calls parse() (datetime.h).
+// Patterns, explained: what each element of a pattern means, and what each took when a value was read. For programs
+// that show patterns to people, as `kvt date why` does; whoever only wants the value calls parse() (datetime.h).
 //
 //     for (const PatternTrace& tried : traceParse("2020-13-01", "%Y-%m-%d", false)) {
 //         for (const PatternStep& step : tried.steps) {
@@ -29,7 +29,7 @@ struct PatternElement {
     UString<0> writes; ///< what format() writes, and of which values; empty: unknown to it
 };
 
-/// All elements, in the order of the documents. What is none of them stands for itself, byte for byte.
+/// All elements, in the order of the documents. Anything else stands for itself, byte for byte.
 KVT_EXPORT vector<PatternElement> patternElements();
 
 /// How far an element came.
@@ -65,8 +65,8 @@ struct PatternTrace {
     TextResult result; ///< what parse() gives by this form alone; only where it was tried
 };
 
-/// What parse() does with a value, step by step. One trace for a pattern; for keywords one for each form that they stand
-/// for, in the order in which parse() tries them. Bytes are counted in the value without the blanks at its ends.
+/// What parse() does with a value, step by step. One trace for a pattern; for keywords one for each form that they
+/// stand for, in the order in which parse() tries them. Bytes are counted in the value without the blanks at its ends.
 KVT_EXPORT vector<PatternTrace> traceParse(const UString<0>& value, const UString<0>& format, bool lenient);
 
 } // namespace kvt::ex::datetime

@@ -3,11 +3,11 @@
 //
 // Some of what is asked for keeps the `date` library from going astray; that it does so otherwise is in its tz.cpp:
 //
-// - A line that is none of its own, it prints. One that it cannot read it prints as well, and where that is a zone's, it
-//   loads the database from within its loading, which ends the process.
+// - It prints a line that it does not know, and one that it cannot read. Where such a line is a zone's, it loads the
+//   database from within its loading, which ends the process.
 // - The last line of a zone reigns for ever, so that a zone cut off behind a line gives that line's offset.
-// - A word that is not a rule's name is read as a length of time, and a failure there leaves the zone half made; so does a
-//   rule without standard time.
+// - A word that is not a rule's name is read as a length of time, and a failure there leaves the zone half made; so
+//   does a rule without standard time.
 // - Of rules with one name it makes pieces of which any two stand in the same years or in none together, and goes from
 //   change to change by them, year by year. The work grows with the square of the pieces.
 // - It looks for the first and for the last change within a line of a zone, each from the beginning, and goes on from

@@ -12,8 +12,8 @@ namespace kvt::ex::datetime::detail {
 /// Whether a zone is "local", the zone of the machine, in any case.
 bool isLocalZone(std::string_view zone) noexcept;
 
-/// Gives the instant the offset that `zone` names: "local", "utc", both in any case, or an offset. The empty text, and
-/// a text that is none of these, take the offset away. `Replace` keeps the wall clock, `Convert` the moment; an
+/// Gives the instant the offset that `zone` names: "local", "utc", both in any case, or an offset. Any
+/// other text, the empty one too, takes the offset away. `Replace` keeps the wall clock, `Convert` the moment; an
 /// instant without offset counts as one in UTC for the latter. Lets the exceptions of the zone database through, for
 /// "local" only.
 void applyOffsetText(TemporalInstant& instant, std::string_view zone, SetZoneMode mode);

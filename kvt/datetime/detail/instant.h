@@ -43,13 +43,13 @@ DatePartRange hoursOutOfRange(std::int64_t hours) noexcept;
 DatePartRange minutesOutOfRange(std::int64_t minutes) noexcept;
 DatePartRange secondsOutOfRange(std::string_view seconds) noexcept;
 
-/// What is wrong with the time of day, if anything is. Without `lenient`: hours 0 to 23, minutes and seconds 0 to 59; with
-/// it, only the lower bounds hold. Nanoseconds are taken as they are. None of the numbers is longer than a value can
-/// write it.
+/// What is wrong with the time of day, if anything is. Without `lenient`: hours 0 to 23, minutes and seconds 0 to 59;
+/// with it, only the lower bounds hold. Nanoseconds are taken as they are. None of the numbers is longer than a value
+/// can write it.
 std::optional<DatePartRange> timeOutOfRange(const DateTimeFields& fields, bool lenient) noexcept;
 
-/// What is wrong with the date, if anything is. Year 1000 to 9999, month and day from 1; without `lenient` up to the 12th
-/// month and the last day of the month, with it up to what daysFromCivil() takes.
+/// What is wrong with the date, if anything is. Year 1000 to 9999, month and day from 1; without `lenient` up to the
+/// 12th month and the last day of the month, with it up to what daysFromCivil() takes.
 std::optional<DatePartRange> dateOutOfRange(const DateTimeFields& fields, bool lenient) noexcept;
 
 /// Whether all numbers are in their ranges, as they nearly always are, without a look at the length of the month.

@@ -8,8 +8,8 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// Reads an interval. A text that is none fails by IntervalUnreadable; by Unexpected one whose shape is right so far
-/// and whose number cannot be stored: a fraction of anything but seconds, or more than 2^31 - 1.
+/// Reads an interval. Any other text fails by IntervalUnreadable. A text of the right shape whose number cannot be
+/// stored fails by Unexpected: a fraction of anything but seconds, or more than 2^31 - 1.
 Outcome<IntervalParts> readInterval(std::string_view text);
 
 /// The fields as they are, without those that are not above zero as signed numbers; "PT0S" if none is left.

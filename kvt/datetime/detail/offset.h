@@ -20,8 +20,8 @@ struct OffsetForm {
 
 inline constexpr std::int32_t minutesPerHour = 60;
 
-/// Reads +hh, +hhmm and +hh:mm into `form`; false for anything else and for the empty text. The minutes of the text may be
-/// up to 99, and are not carried: "+1075" is "+10:75", of 675 minutes.
+/// Reads +hh, +hhmm and +hh:mm into `form`; false for anything else and for the empty text. The minutes of the text may
+/// be up to 99, and are not carried: "+1075" is "+10:75", of 675 minutes.
 inline bool readOffset(std::string_view text, OffsetForm& form) noexcept {
     if (text.empty() || (text.front() != '+' && text.front() != '-')) {
         return false;

@@ -51,8 +51,8 @@ public:
     /// anything is: ParseMismatch, ParseUnknownFlag, ParseEpochTimeRange, FormatStringBadCombo or ParseValidation.
     std::optional<PatternFailure> readAll(PatternReading& reading);
 
-    /// Goes on by another format where a "$" has stopped this one, and both are alike up to there; else false, and nothing
-    /// is done.
+    /// Goes on by another format where a "$" has stopped this one, and both are alike up to there; else false, and
+    /// nothing is done.
     bool goOnBy(std::string_view format) noexcept;
 
     /// Where the next element begins, in the format.

@@ -67,8 +67,8 @@ Result<Value> failed(std::uint32_t number, std::initializer_list<std::string_vie
 }
 
 /// The message of a failure whose words depend on nothing but the failure: ValueUnsupported (933063),
-/// IntervalUnreadable (933064), KindsNotComparable (933059), DatePartRange (933065) and those of a single function. None
-/// for the others.
+/// IntervalUnreadable (933064), KindsNotComparable (933059), DatePartRange (933065) and those of a single function.
+/// None for the others.
 std::optional<LogMessageInfo> messageOf(const Failure& failure);
 
 /// What a function answers where there are no words.

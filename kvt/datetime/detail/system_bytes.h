@@ -59,8 +59,8 @@ void appendReadable(UStringArray<0>& parameters, std::string_view bytes);
 /// The first `length` bytes, and where the system's encoding is UTF-8, the rest of the character that they end in.
 std::string_view wholeCharacters(std::string_view bytes, std::size_t length);
 
-/// Where to cut a text in two at `place`: where the system's encoding is UTF-8 and `place` is inside a character, in front
-/// of that character.
+/// Where to cut a text in two at `place`: where the system's encoding is UTF-8 and `place` is inside a character, in
+/// front of that character.
 std::size_t placeBetweenCharacters(std::string_view bytes, std::size_t place) noexcept;
 
 } // namespace kvt::ex::datetime::detail

@@ -1,9 +1,9 @@
 // One line of a zone file, read strictly.
 //
 // A line is good when the `date` library reads it as the zone compiler would. That library reads with stream operators:
-// it stops where a word stops to fit, takes the rest for the next field, and has its own ideas of some words. So a field
-// has to be a whole word here, and what the two read differently is refused: shortened or lower-case names, "-" for a
-// time, the letters "g" and "z" behind a time, minutes of a negative one, a "#" inside a word, quotes.
+// it stops where a word stops to fit, takes the rest for the next field, and has its own ideas of some words. So a
+// field has to be a whole word here, and what the two read differently is refused: shortened or lower-case names, "-"
+// for a time, the letters "g" and "z" behind a time, minutes of a negative one, a "#" inside a word, quotes.
 #pragma once
 
 #include <array>
