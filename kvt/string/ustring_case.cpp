@@ -7,6 +7,7 @@
 #include <kvt/string/detail/instantiate.h>
 
 #include <kvt/encoding/detail/failure_text.h>
+#include <kvt/encoding/detail/unicode_vectors.h>
 #include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/ascii.h>
 #include <kvt/foundation/throwable.h>
@@ -55,6 +56,15 @@ const UCaseMap* defaultCaseMap() {
     }
     static const ProcessCaseMap process;
     return process.map.get();
+}
+
+// The same; null where it cannot be opened.
+const UCaseMap* caseMapIfAny() {
+    try {
+        return defaultCaseMap();
+    } catch (const UStringException&) {
+        return nullptr;
+    }
 }
 
 // Whether ICU has written the text, or would have with more room.
@@ -169,16 +179,38 @@ private:
 constexpr std::size_t leastForTable = 1024;
 constexpr std::size_t mostForTable = std::numeric_limits<std::int32_t>::max() / 4;
 
-void mapByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text, std::string& out) {
+/// What the text becomes; just as long as it is.
+std::string mappedByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text) {
+    std::string out;
     MappingByTable mapped(mapping, caseMap, text);
     detail::appendInPlace(out, text.size(), [&](char* to) { return mapped.write(to, text.size()); });
     if (!mapped.isDone()) {
         const std::size_t rest = mapped.measure();
         detail::appendInPlace(out, rest, [&](char* to) { return mapped.write(to, rest); });
     }
-    if (out.size() < text.size()) {
-        out.resize(text.size());
+    return out;
+}
+
+// UTF-16 folds by way of UTF-8 where it is well-formed, for folding is the mapping that no language changes. Empty where it
+// is for ICU to do.
+std::u16string foldedByTable(std::u16string_view text) {
+    const auto bytesOf = [](auto* units) { return reinterpret_cast<const char*>(units); };
+    std::u16string out;
+    const detail::vectors::Extent extent = detail::vectors::measureUtf16(bytesOf(text.data()), text.size());
+    const UCaseMap* const caseMap = extent.taken == text.size() ? caseMapIfAny() : nullptr;
+    if (caseMap == nullptr) {
+        return out;
     }
+    std::string utf8;
+    detail::appendInPlace(utf8, extent.utf8, [&](char* to) {
+        return detail::vectors::utf16ToUtf8(bytesOf(text.data()), text.size(), to, extent.utf8);
+    });
+    utf8 = mappedByTable(Mapping::folded, caseMap, utf8);
+    const std::size_t units = detail::vectors::measureUtf8(utf8.data(), utf8.size()).utf16;
+    detail::appendInPlace(out, units, [&](char16_t* to) {
+        return detail::vectors::utf8ToUtf16(utf8.data(), utf8.size(), reinterpret_cast<char*>(to), units);
+    });
+    return out;
 }
 
 // `storage` gives the units of a string.
@@ -187,7 +219,8 @@ UString<0> mapUtf8(Mapping mapping, UStringView<0> source, Storage storage) {
     const UCaseMap* const caseMap = source.isEmpty() ? nullptr : defaultCaseMap();
     if (source.size() >= leastForTable && source.size() <= mostForTable) {
         UString<0> result;
-        mapByTable(mapping, caseMap, {source.data(), source.size()}, storage(result));
+        storage(result) = mappedByTable(mapping, caseMap, {source.data(), source.size()});
+        storage(result).resize(std::max(storage(result).size(), source.size()));
         return result;
     }
     const detail::CaseFunction function = detail::caseFunction(mapping);
@@ -197,7 +230,16 @@ UString<0> mapUtf8(Mapping mapping, UStringView<0> source, Storage storage) {
     });
 }
 
-UString<2> mapUtf16(Mapping mapping, UStringView<2> source) {
+template <typename Storage>
+UString<2> mapUtf16(Mapping mapping, UStringView<2> source, Storage storage) {
+    if (mapping == Mapping::folded && source.size() >= leastForTable && source.size() <= mostForTable / 3) {
+        UString<2> result;
+        storage(result) = foldedByTable({source.data(), source.size()});
+        if (!result.isEmpty()) {
+            storage(result).resize(std::max(storage(result).size(), source.size()));
+            return result;
+        }
+    }
     return icuStringHelper(source, [&](char16_t* target, std::int32_t capacity, const char16_t* text,
                                        std::int32_t length, UErrorCode* status) {
         switch (mapping) {
@@ -273,7 +315,8 @@ UString<N> map(UStringView<N> view, const char* name, Storage storage) {
     } else if constexpr (N == Encoding::Utf8) {
         return guarded(utf8Contexts[index], bytes, encoding, [&] { return mapUtf8(mapping, view, storage); });
     } else if constexpr (N == Encoding::Utf16LE) {
-        return guarded(utf16Contexts[index], bytes, encoding, [&] { return mapUtf16(mapping, view); });
+        return guarded(utf16Contexts[index], bytes, encoding,
+                       [&] { return mapUtf16(mapping, view, storage); });
     } else if constexpr (N == Encoding::UsAscii) {
         UString<N> result(view);
         std::transform(result.begin(), result.end(), &result[0], mapAscii<mapping>);

@@ -7,7 +7,9 @@
 
 #include <gtest/gtest.h>
 #include <unicode/ucasemap.h>
+#include <unicode/ustring.h>
 
+#include <algorithm>
 #include <cstring>
 #include <memory>
 #include <random>
@@ -85,6 +87,27 @@ protected:
                        << testing::PrintToString(expected.substr(at, 16));
             }
         }
+        checkFolding(text);
+    }
+
+    // Folding of UTF-16, which goes the same way. Where the text is not UTF-8 there are lone surrogates.
+    static void checkFolding(std::string_view text) {
+        constexpr char16_t substitute = 0xE000;
+        std::u16string units(text.size(), u'\0');
+        UErrorCode status = U_ZERO_ERROR;
+        std::int32_t count = 0;
+        u_strFromUTF8WithSub(units.data(), static_cast<std::int32_t>(units.size()), &count, text.data(),
+                             static_cast<std::int32_t>(text.size()), substitute, nullptr, &status);
+        units.resize(static_cast<std::size_t>(count));
+        std::replace(units.begin(), units.end(), substitute, char16_t{0xD812});
+        std::u16string expected(3 * units.size(), u'\0');
+        const std::int32_t size =
+            u_strFoldCase(expected.data(), static_cast<std::int32_t>(expected.size()), units.data(),
+                          static_cast<std::int32_t>(units.size()), U_FOLD_CASE_DEFAULT, &status);
+        expected.resize(static_cast<std::size_t>(size));
+        expected.resize(std::max(expected.size(), units.size()));
+        const UString<2> folded = UString<2>::getAsFoldedCase(UStringView<2>(units));
+        ASSERT_TRUE(std::u16string_view(folded.rawData(), folded.size()) == expected) << units.size();
     }
 
 private:
@@ -132,7 +155,7 @@ TEST_P(CaseTable, EachCharacterThatChangesAmongOthers) {
     check(text + std::string(longEnough, 'z'));
 }
 
-std::string randomText(std::mt19937& random, std::size_t size) {
+std::string randomText(std::mt19937& random, std::size_t size, bool isUtf8 = false) {
     // Runs of a kind, as texts have them; bytes that are not UTF-8 are one of the kinds.
     const std::vector<std::vector<std::string>> kinds = {
         {"a", "Z", " ", "[", "@", "`", "{", "0"},
@@ -146,12 +169,12 @@ std::string randomText(std::mt19937& random, std::size_t size) {
     };
     std::string text;
     while (text.size() < size) {
-        const auto& kind = kinds[random() % kinds.size()];
+        const auto& kind = kinds[random() % (kinds.size() - (isUtf8 ? 1 : 0))];
         for (std::size_t run = random() % 60; run-- > 0 && text.size() < size;) {
             text += kind[random() % kind.size()];
         }
     }
-    text.resize(size);
+    text.resize(isUtf8 ? text.size() : size);
     return text;
 }
 
@@ -159,6 +182,7 @@ TEST_P(CaseTable, RandomTextOfEachLength) {
     std::mt19937 random(32);
     for (std::size_t size = longEnough; size < longEnough + 600; ++size) {
         check(randomText(random, size));
+        check(randomText(random, 2 * size, true));
     }
     for (int round = 0; round < 100; ++round) {
         check(randomText(random, longEnough + random() % 20000));
