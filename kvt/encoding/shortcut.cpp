@@ -38,9 +38,9 @@ using Pivot = std::array<char16_t, pivotUnits>;
 // The bytes that are tried first where the target may lack a character, so that a text with many such characters is not
 // measured to its end after each of them. As long as all goes well, pieces become longer by the factor, as far as the next
 // step still finds them in the cache.
-constexpr std::size_t firstPiece = 128;
-constexpr std::size_t pieceFactor = 8;
-constexpr std::size_t longestPiece = firstPiece * pieceFactor * pieceFactor;
+constexpr std::size_t firstPiece = 32;
+constexpr std::size_t pieceFactor = 4;
+constexpr std::size_t longestPiece = 8192;
 
 constexpr bool isLittle = std::endian::native == std::endian::little;
 constexpr Form nativeUtf16 = isLittle ? Form::utf16le : Form::utf16be;
@@ -432,7 +432,7 @@ std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view
     std::size_t taken = 0;
     Pivot pivot;
     for (std::size_t pieceUnits = isUnicode(to.form) ? pivotUnits : firstPiece; taken < in.size();
-         pieceUnits = pivotUnits) {
+         pieceUnits = std::min(pieceUnits * pieceFactor, pivotUnits)) {
         std::string_view rest = in.substr(taken);
         const std::size_t units = table.read(rest, pivot.data(), pieceUnits);
         const Extent extent = vectors::measureUtf16(reinterpret_cast<const char*>(pivot.data()), units);
@@ -512,6 +512,25 @@ Side sideOf(Encoding encoding) {
     }
     EncodingProfile& profile = profileOf(encoding);
     return {profile.form(), &profile};
+}
+
+std::size_t characterLength(Side from, std::string_view in) {
+    if (from.form == Form::other || lacksDecoding(from)) {
+        return 0;
+    }
+    std::string_view rest = in.substr(0, longestUtf8);
+    if (hasTables(from.form)) {
+        char16_t unit = 0;
+        from.profile->decoding()->read(rest, &unit, 1);
+        return std::min(in.size(), longestUtf8) - rest.size();
+    }
+    // The shortest beginning that is well-formed.
+    std::size_t length = 0;
+    for (std::size_t bytes = unitBytes(from.form); length == 0 && bytes <= rest.size();
+         bytes += unitBytes(from.form)) {
+        length = measure(from.form, rest.substr(0, bytes)).taken * unitBytes(from.form);
+    }
+    return length;
 }
 
 bool canGoOn(Side from, Side to, std::size_t bytes) {

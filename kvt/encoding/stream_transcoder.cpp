@@ -72,6 +72,7 @@ public:
           hasShortcut_(fromSide_.form != Form::other && toSide_.form != Form::other && from != to),
           fromNature_(from_.nature()), isStateless_(fromNature_.isStateless && to_.nature().isStateless),
           countsHeldBytes_(from_.countsHeldBytes() && !fromNature_.isBehind),
+          canTakeCharacters_(hasShortcut_ && isStateless_ && countsHeldBytes_),
           substitution_(to_.substitution()) {
         from_.setListener(*this);
         to_.setListener(*this);
@@ -80,7 +81,9 @@ public:
     Impl& operator=(const Impl&) = delete;
 
     void convert(std::string_view block, std::string& out, const LossHandler& onLoss) {
+        bool canGoOn = false;
         bool isFirst = true;
+        bool expectsLoss = true;
         while (!block.empty()) {
             if (hasShortcut_ && holdsNothing()) {
                 goShortWay(block, out);
@@ -88,13 +91,24 @@ public:
                     detail::canGoOn(fromSide_, toSide_, block.size())) {
                     // It may be the tables that were missing.
                     goShortWay(block, out);
+                    canGoOn = canTakeCharacters_;
                 }
             }
             if (block.empty()) {
                 return;
             }
             const std::string_view slice = block.substr(0, sliceBytes);
-            block.remove_prefix(convertFast(slice, out) ? slice.size() : convertTracing(slice, out, onLoss));
+            if (canGoOn && expectsLoss) {
+                // Where the short way ends there is a loss, or else a stretch of text that is not for it.
+                expectsLoss = false;
+                block.remove_prefix(convertTracing(slice, 0, out, onLoss, expectsLoss));
+                continue;
+            }
+            bool ignored = false;
+            block.remove_prefix(convertFast(slice, out)
+                                    ? slice.size()
+                                    : convertTracing(slice, calmBytes, out, onLoss, ignored));
+            expectsLoss = true;
         }
     }
 
@@ -122,7 +136,8 @@ private:
         block.remove_prefix(taken);
     }
     bool convertFast(std::string_view slice, std::string& out);
-    std::size_t convertTracing(std::string_view slice, std::string& out, const LossHandler& onLoss);
+    std::size_t convertTracing(std::string_view slice, std::size_t calm, std::string& out,
+                               const LossHandler& onLoss, bool& foundLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
     Progress decode(const char*& source, const char* sourceEnd, bool flush);
     void encode(bool flush, std::string& out);
@@ -151,6 +166,7 @@ private:
     Converter::Nature fromNature_;
     bool isStateless_;
     bool countsHeldBytes_;
+    bool canTakeCharacters_;
     std::string substitution_;
 
     std::uint64_t position_ = 0;
@@ -211,17 +227,23 @@ bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& ou
     return false;
 }
 
-// Converts byte by byte and reports the losses. Where nothing hangs over, it ends when the character that was open at
-// the beginning is complete, or some way behind a loss.
-std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::string& out,
-                                                   const LossHandler& onLoss) {
-    std::size_t mayEndAt = isStateless_ && !holdsNothing() ? 0 : slice.size();
+// Converts character by character, or byte by byte, and reports the losses. Where nothing hangs over, it ends when the
+// character that was open at the beginning is complete, or `calm` bytes behind a loss; with none at the first place.
+std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::size_t calm, std::string& out,
+                                                   const LossHandler& onLoss, bool& foundLoss) {
+    std::size_t mayEndAt = isStateless_ && (calm == 0 || !holdsNothing()) ? 0 : slice.size();
     std::size_t taken = 0;
     do {
-        convertTraced(slice.substr(taken, 1), false, out);
-        ++taken;
-        if (isStateless_ && !losses_.empty()) {
-            mayEndAt = taken + calmBytes;
+        const std::string_view rest = slice.substr(taken);
+        // What is known to be one character comes out as one, so that its bytes need not be told apart.
+        const std::size_t length = canTakeCharacters_ && characterBegin_ == position_
+                                       ? std::max<std::size_t>(detail::characterLength(fromSide_, rest), 1)
+                                       : 1;
+        convertTraced(rest.substr(0, length), false, out);
+        taken += length;
+        if (!losses_.empty()) {
+            foundLoss = true;
+            mayEndAt = isStateless_ ? taken + calm : mayEndAt;
         }
         if (units_.empty()) {
             report(onLoss);
@@ -230,7 +252,7 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
     return taken;
 }
 
-// Converts one byte, or what is left when the stream ends, and keeps account of where each unit comes from.
+// Converts one byte or character, or what is left when the stream ends, and keeps account of where each unit comes from.
 void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, std::string& out) {
     isTracing_ = true;
     keepRecent(byte);
@@ -306,14 +328,17 @@ void StreamTranscoder::Impl::report(const LossHandler& onLoss) {
     if (losses_.empty()) {
         return;
     }
-    std::vector<Loss> losses;
-    losses.swap(losses_);
     // A character that was held back is known to be lost only after bad input that follows it.
-    std::stable_sort(losses.begin(), losses.end(),
-                     [](const Loss& left, const Loss& right) { return left.offset < right.offset; });
-    if (onLoss) {
-        std::for_each(losses.begin(), losses.end(), onLoss);
+    if (losses_.size() > 1) {
+        std::stable_sort(losses_.begin(), losses_.end(),
+                         [](const Loss& left, const Loss& right) { return left.offset < right.offset; });
     }
+    if (onLoss) {
+        for (const Loss& loss : losses_) {
+            onLoss(loss);
+        }
+    }
+    losses_.clear();
 }
 
 void StreamTranscoder::Impl::onBadInput(std::string_view bytes, const char16_t* target, int) noexcept {

@@ -212,10 +212,9 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
     if (bytes >= 2 * hn::Lanes(narrow)) {
         p = measureUtf8Singly(p, begin + 3, end, extent, ended);
         if (!ended) {
-            // What the widest registers leave over is worth narrower ones.
-            if (measureUtf8Blocks(Bytes(), p, end, extent)) {
-                measureUtf8Blocks(narrow, p, end, extent);
-            }
+            // What the widest registers leave over, or where they find a fault, is worth narrower ones.
+            measureUtf8Blocks(Bytes(), p, end, extent);
+            measureUtf8Blocks(narrow, p, end, extent);
             p = withoutOpenCharacter(p, extent);
         }
     }

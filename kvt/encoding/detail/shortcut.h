@@ -71,6 +71,9 @@ Side sideOf(Encoding encoding);
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
 
+/// The bytes of the first character of `in`, if it is known without ICU to be well-formed and complete; else 0.
+std::size_t characterLength(Side from, std::string_view in);
+
 /// Builds the tables that are missing between two sides where that is worth it, for a text of which convertPrefix() left
 /// `bytes`. Returns whether it can go on behind what ICU has to look at: the forms are known, and all tables are there.
 bool canGoOn(Side from, Side to, std::size_t bytes);
