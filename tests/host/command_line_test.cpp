@@ -147,6 +147,38 @@ TEST_F(KvtCommandLine, HelpForACommandThatThereIsNotIsRefused) {
     }
 }
 
+TEST_F(KvtCommandLine, ProgressIsOfOneKindEverywhere) {
+    write("file", "1\n");
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"convert", "--from", "UTF-8", "--to", "UTF-8", "file"},
+          {"text", "upper", "file"},
+          {"match", "1", "file"},
+          {"wwjd", "encode", "file"},
+          {"sort", "file"},
+          {"unique", "file"},
+          {"number", "--file", "file"},
+          {"date", "parse", "%H", "--file", "file"}}) {
+        const auto with = [&](const std::string& option) {
+            std::vector<std::string> all = arguments;
+            all.push_back(option);
+            return kvt(all);
+        };
+        EXPECT_TRUE(contains(with("--progress").err, "100% of 2 bytes")) << arguments[0];
+        EXPECT_TRUE(contains(with("--progress=always").err, "100% of 2 bytes")) << arguments[0];
+        EXPECT_EQ(with("--progress=never").err, "") << arguments[0];
+        EXPECT_EQ(with("--progress=auto").err, "") << arguments[0];
+        EXPECT_EQ(with("--progress=some").status, 2) << arguments[0];
+        EXPECT_TRUE(contains(with("--help").out, "--progress[=WHEN]")) << with("--help").out;
+        const ChildResult named = with("-oout");
+        EXPECT_EQ(named.out, "") << arguments[0];
+        EXPECT_NE(read("out"), "") << arguments[0];
+    }
+    EXPECT_EQ(kvt({"date", "parse", "12", "%H", "-o", "out"}).out, "");
+    EXPECT_EQ(read("out"), "120000\n");
+    EXPECT_EQ(kvt({"unique", "--ignore-case"}, "a\nA\n").out, "a\n");
+    EXPECT_EQ(kvt({"unique", "-i"}, "a\nA\n").out, "a\n");
+}
+
 TEST_F(KvtCommandLine, MissingOptionsAreNamed) {
     struct Row {
         std::vector<std::string> arguments;

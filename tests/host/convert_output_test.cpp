@@ -193,6 +193,29 @@ TEST_F(KvtConvertOutput, DevicesAreWrittenToAndNotReplaced) {
     EXPECT_EQ(result.out, "text");
 }
 
+TEST_F(KvtConvertOutput, WhatIsOpenAlreadyIsAStream) {
+    // Standard output is a file: it is written on, and not replaced by another one of that name.
+    write("out", "before ");
+    ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-8", "-o", "/dev/stdout"});
+    made.input = "text";
+    made.outputFile = path("out");
+    made.appendOutput = true;
+    EXPECT_EQ(runChild(made).status, 0);
+    EXPECT_EQ(read("out"), "before text");
+    made.command.back() = "/dev/fd/1";
+    EXPECT_EQ(runChild(made).status, 0);
+    EXPECT_EQ(read("out"), "before texttext");
+    std::filesystem::create_symlink("/dev/stdout", path("link"));
+    made.command.back() = path("link");
+    EXPECT_EQ(runChild(made).status, 0);
+    EXPECT_EQ(read("out"), "before texttexttext");
+    const ChildResult report =
+        convert("UTF-8", "US-ASCII", "\u0141", {"--report", "/dev/stderr", "--on-error", "report"});
+    EXPECT_EQ(report.out, "?");
+    EXPECT_TRUE(report.err.starts_with("{\"file\":\"standard input\"")) << report.err;
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "text", {"-o", "/dev/fd/99"}).status, 2);
+}
+
 TEST_F(KvtConvertOutput, AWriteProtectedFileIsNotReplaced) {
     write("out", "old");
     ::chmod(path("out").c_str(), 0444);

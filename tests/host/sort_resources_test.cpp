@@ -224,7 +224,7 @@ TEST_F(KvtSortResources, AClosedPipeLeavesNothingBehind) {
         made.input = randomLines(lineShapes().front(), 1'000'000, 3);
         made.readNothing = true;
         const ChildResult result = runChild(made);
-        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.status, 128 + SIGPIPE);
         EXPECT_EQ(result.err, "");
         EXPECT_TRUE(scratchIsEmpty());
     }

@@ -71,6 +71,7 @@ int statusOf(int waited) {
         const rlimit limit{setup.mostFileBytes, setup.mostFileBytes};
         ::setrlimit(RLIMIT_FSIZE, &limit);
     }
+    ::signal(SIGPIPE, SIG_DFL); // we ignore it ourselves
     if (setup.ignoredSignal != 0) {
         ::signal(setup.ignoredSignal, SIG_IGN);
     }

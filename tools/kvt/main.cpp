@@ -18,7 +18,8 @@ int main(int argc, char** argv) {
     try {
         return host::runCommandLine(argc, argv, diagnostics);
     } catch (const host::ClosedPipe&) {
-        // Nobody listens, so there is nothing to say.
+        // Nobody listens, so there is nothing to say. All that was temporary is gone by now.
+        host::dieOfClosedPipe();
     } catch (const kvt::ex::Throwable& failure) {
         diagnostics.say(host::describe(failure));
     } catch (const std::bad_alloc&) {

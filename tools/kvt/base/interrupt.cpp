@@ -31,6 +31,9 @@ extern "C" void removeAndDie(int number) {
     std::raise(number);
 }
 
+// As it was found: whoever had it ignored wants no signal.
+void (*pipeSignalBefore)(int) = SIG_DFL;
+
 sigset_t endingSet() {
     sigset_t set;
     sigemptyset(&set);
@@ -72,9 +75,16 @@ Failure systemFailure(const std::string& what, int errorNumber) {
 
 void prepareProcess() {
     takeStandardDescriptors();
-    std::signal(SIGPIPE, SIG_IGN);
+    pipeSignalBefore = std::signal(SIGPIPE, SIG_IGN);
     std::signal(SIGXFSZ, SIG_IGN);
     catchEndingSignals();
+}
+
+void dieOfClosedPipe() {
+    if (pipeSignalBefore != SIG_IGN) {
+        std::signal(SIGPIPE, SIG_DFL);
+        std::raise(SIGPIPE);
+    }
 }
 
 RemovedOnInterrupt::RemovedOnInterrupt(std::string path) : path_(std::move(path)), slot_(-1) {

@@ -1,5 +1,5 @@
 // Signals. An interrupted program leaves no temporary file behind, and a reader that goes away is an error of
-// write() and not a sudden death.
+// write() and no death before everything is cleaned up.
 #pragma once
 
 #include <string>
@@ -9,6 +9,10 @@ namespace host {
 /// Called once, before anything else: sees to it that the descriptors 0 to 2 are taken, ignores SIGPIPE and
 /// SIGXFSZ, and catches the signals that ask the program to end.
 void prepareProcess();
+
+/// Ends the program as a filter ends whose reader went away: by SIGPIPE, once everything is cleaned up. Comes back
+/// where whoever started the program had that signal ignored.
+void dieOfClosedPipe();
 
 /// A file that is removed when a signal ends the program while this object lives. At most four live at once.
 class RemovedOnInterrupt {

@@ -114,6 +114,17 @@ private:
     std::string shownPath_;
 };
 
+// A stream that was open before the program began.
+class OpenDescriptor : public DescriptorOutput {
+public:
+    OpenDescriptor(int descriptor, const std::string& path)
+        : DescriptorOutput(::fcntl(descriptor, F_DUPFD_CLOEXEC, STDERR_FILENO + 1), path) {
+        check(this->descriptor() < 0 ? errno : 0);
+    }
+    void commit() override { finish(); }
+    bool writesInPlaceTo(int other) const override { return isSameFile(descriptor(), other); }
+};
+
 class DeviceOutput : public DescriptorOutput {
 public:
     explicit DeviceOutput(const std::string& path)
@@ -190,6 +201,26 @@ private:
     Temporary temporary_;
 };
 
+// The descriptor that a path such as /dev/stdout, /dev/fd/3 or a link to one of them names. What is open there is a
+// stream, be it a file: to put another file in its place would take it from whoever opened it.
+std::optional<int> descriptorNamed(fs::path path) {
+    std::error_code error;
+    for (int links = 0; links < 40; ++links) {
+        const fs::path folder = path.parent_path();
+        const std::string name = path.filename().string();
+        if ((folder == "/dev/fd" || folder == "/proc/self/fd") && !name.empty() && name.size() <= 6 &&
+            name.find_first_not_of("0123456789") == std::string::npos) {
+            return std::stoi(name);
+        }
+        if (!fs::is_symlink(fs::symlink_status(path, error))) {
+            break;
+        }
+        const fs::path next = fs::read_symlink(path, error);
+        path = next.is_absolute() ? next : folder / next;
+    }
+    return std::nullopt;
+}
+
 // Where a chain of symbolic links leads to, whether or not there is something at its end.
 fs::path followLinks(fs::path path) {
     std::error_code error;
@@ -206,7 +237,7 @@ fs::path followLinks(fs::path path) {
 } // namespace
 
 bool isStandardOutput(const std::string& path) {
-    return path.empty() || path == "-";
+    return path.empty() || path == "-" || descriptorNamed(path) == STDOUT_FILENO;
 }
 
 bool isSamePlace(const std::string& left, const std::string& right) {
@@ -221,6 +252,9 @@ bool isSamePlace(const std::string& left, const std::string& right) {
 std::unique_ptr<Output> openOutput(const std::string& path) {
     if (isStandardOutput(path)) {
         return std::make_unique<StandardOutput>();
+    }
+    if (const std::optional<int> descriptor = descriptorNamed(path)) {
+        return std::make_unique<OpenDescriptor>(*descriptor, path);
     }
     struct stat existing {};
     if (::stat(path.c_str(), &existing) != 0) {

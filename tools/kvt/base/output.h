@@ -22,7 +22,7 @@ public:
     virtual bool writesInPlaceTo(int descriptor) const = 0;
 };
 
-/// "" and "-" are standard output.
+/// "", "-" and /dev/stdout are standard output.
 bool isStandardOutput(const std::string& path);
 
 /// Whether two paths lead to the same place, whether or not there is anything.

@@ -21,9 +21,6 @@ std::string amount(std::uint64_t bytes) {
 
 } // namespace
 
-Progress::Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, bool allowed)
-    : Progress(diagnostics, total, allowed ? Show::LongOnTerminal : Show::Never, {}) {}
-
 Progress::Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, Show show, std::string what)
     : diagnostics_(diagnostics), total_(total), what_(std::move(what)),
       active_(show == Show::Always ||

@@ -18,9 +18,7 @@ public:
         Always,         ///< a bar on a terminal, else a line now and then
     };
 
-    /// `total` is the number of bytes to come, if that is known. Nothing is drawn when `allowed` is false.
-    Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, bool allowed);
-    /// `what` is said before the bar.
+    /// `total` is the number of bytes to come, if that is known; `what` is said before the bar.
     Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, Show show, std::string what);
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;

@@ -27,6 +27,14 @@ public:
         return text + "\n" + make_footer(app);
     }
 
+    // CLI11 would show a value that may be left out as "--name{implied} WHEN".
+    std::string make_option_name(const CLI::Option* option, bool isPositional) const override {
+        const std::string name = CLI::Formatter::make_option_name(option, isPositional);
+        const std::size_t brace = name.find('{');
+        return brace == std::string::npos ? name
+                                          : name.substr(0, brace) + "[=" + option->get_type_name() + "]";
+    }
+
     std::string make_option_desc(const CLI::Option* option) const override {
         return wrapped(option->get_description());
     }
@@ -87,6 +95,11 @@ Syntax::~Syntax() = default;
 
 Option Syntax::flag(const std::string& names, bool& isGiven, const std::string& help) {
     return Option(*app_.add_flag(names, isGiven, help));
+}
+
+Option Syntax::flag(const std::string& names, const std::string& implied, std::string& value,
+                    const std::string& valueName, const std::string& help) {
+    return Option(*app_.add_flag(names + "{" + implied + "}", value, help)->type_name(valueName));
 }
 
 Option Syntax::option(const std::string& names, std::string& value, const std::string& valueName,

@@ -42,6 +42,9 @@ public:
 
     /// An option without a value. `names` are such as "-i,--ignore-case"; `help` is what the help says.
     Option flag(const std::string& names, bool& isGiven, const std::string& help);
+    /// An option whose value, which the help calls `valueName`, stands behind "=" or is left out: then it is `implied`.
+    Option flag(const std::string& names, const std::string& implied, std::string& value,
+                const std::string& valueName, const std::string& help);
     /// An option with a value, which the help calls `valueName`.
     Option option(const std::string& names, std::string& value, const std::string& valueName,
                   const std::string& help);

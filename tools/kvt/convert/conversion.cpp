@@ -6,6 +6,7 @@
 #include "base/text_units.h"
 #include "cli/exit_status.h"
 #include "convert/loss_report.h"
+#include "text/file_options.h"
 
 #include <filesystem>
 #include <unistd.h>
@@ -55,8 +56,7 @@ Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, 
     : options_(options), named_(from), from_(from.encoding), to_(to), fromName_(from_.getName()),
       toName_(to.getName()), diagnostics_(diagnostics), transcoder_(from_, to),
       onLoss_([this](const Loss& loss) { takeLoss(loss); }), lines_(from_),
-      progress_(diagnostics, totalSize(options.inputs),
-                !isStandardOutput(options.output) || ::isatty(STDOUT_FILENO) == 0) {
+      progress_(diagnostics, totalSize(options.inputs), options.progress, "") {
     if (options.verify) {
         roundTrip_.emplace(from_, to);
     }
@@ -97,13 +97,13 @@ int Conversion::run() {
 
 void Conversion::convertFile(const std::string& path) {
     source_.emplace(path, named_, options_.mark);
-    if (output_->writesInPlaceTo(source_->input().descriptor())) {
-        throw Failure(source_->input().name() + " is both input and output; use -o, which writes beside it");
-    }
+    refuseInPlace(*output_, source_->input());
     readIn(source_->encoding());
     std::string_view block = source_->next();
     lines_.restart(source_->skipped());
-    progress_.advance(source_->skipped());
+    if (source_->skipped() != 0) {
+        progress_.advance(source_->skipped());
+    }
     for (; !block.empty(); block = source_->next()) {
         convertBlock(block);
         progress_.advance(block.size());

@@ -8,6 +8,7 @@
 #include "convert/convert_options.h"
 #include "convert/dry_run.h"
 #include "text/encoding_catalogue.h"
+#include "text/file_options.h"
 
 #include <array>
 #include <utility>
@@ -60,8 +61,6 @@ public:
             .option("--to", to_, "ENC",
                     "Encoding of the output; with --dry-run, several with commas between them")
             .required();
-        syntax.option("-o,--output", options_.output, "FILE",
-                      "Where the output goes; '-' is standard output, the default");
         onErrorOption_ =
             syntax.option("--on-error", onError_, "WHAT",
                           "What a loss does: 'stop' ends the conversion without a result (default), "
@@ -76,11 +75,13 @@ public:
                     "Write nothing; print the encodings of --to, best first, with what each "
                     "would lose");
         syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'skip' (default), 'keep', 'strip' or 'add'");
-        syntax.operand("FILE", options_.inputs, "Files to convert; '-' is standard input, the default");
+        files_.declare(syntax, "Files to convert; '-' is standard input, the default");
     }
 
     int run(Diagnostics& diagnostics) override {
-        options_.inputs = inputsOrStandardInput(options_.inputs);
+        options_.inputs = files_.inputs();
+        options_.output = files_.outputPath();
+        options_.progress = files_.progress();
         options_.mark = choose("--bom", mark_, markChoices);
         options_.onError = choose("--on-error", onError_, errorChoices);
         if (!options_.report.empty()) {
@@ -112,6 +113,7 @@ private:
     std::string mark_ = "skip";
     bool dryRun_ = false;
     Option onErrorOption_;
+    FileOptions files_;
     ConvertOptions options_;
 };
 

@@ -1,6 +1,7 @@
 // What `kvt convert` was asked to do.
 #pragma once
 
+#include "base/progress.h"
 #include "text/byte_order_mark.h"
 
 #include <kvt/encoding/encoding.h>
@@ -23,6 +24,7 @@ struct ConvertOptions {
     OnError onError = OnError::Stop;
     MarkPolicy mark = MarkPolicy::Keep;
     bool verify = false;
+    Progress::Show progress = Progress::Show::Never;
 };
 
 } // namespace host

@@ -99,7 +99,7 @@ int dryRun(const ConvertOptions& options, const TextEncoding& from, const std::v
         targets.emplace_back(from.encoding, to);
     }
     {
-        Progress progress(diagnostics, totalSize(options.inputs), true);
+        Progress progress(diagnostics, totalSize(options.inputs), options.progress, "");
         for (const std::string& path : options.inputs) {
             Source source(path, from, options.mark);
             for (Target& target : targets) {

@@ -10,10 +10,9 @@
 #include "cli/exit_status.h"
 #include "convert/loss_report.h"
 #include "convert/wwjd_stream.h"
+#include "text/file_options.h"
 #include "text/line_counter.h"
 #include "text/source.h"
-
-#include <unistd.h>
 
 namespace host {
 
@@ -48,7 +47,7 @@ public:
     }
 
     int run(Diagnostics& diagnostics) override {
-        inputs_ = inputsOrStandardInput(inputs_);
+        const std::vector<std::string> inputs = files_.inputs();
         const bool encoding = encode_->isChosen();
         std::unique_ptr<WwjdStream> stream;
         if (encoding) {
@@ -56,11 +55,10 @@ public:
         } else {
             stream = std::make_unique<WwjdDecoder>();
         }
-        const std::unique_ptr<Output> output = openOutput(outputPath_);
+        const std::unique_ptr<Output> output = openOutput(files_.outputPath());
         {
-            Progress progress(diagnostics, totalSize(inputs_),
-                              !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
-            for (const std::string& path : inputs_) {
+            Progress progress(diagnostics, totalSize(inputs), files_.progress(), "");
+            for (const std::string& path : inputs) {
                 convertFile(path, *stream, *output, progress, encoding ? "UTF-8" : "zqt-wwjd");
             }
         }
@@ -72,9 +70,7 @@ private:
     Syntax* declareDirection(Syntax& syntax, const std::string& name, const std::string& summary,
                              const std::string& itsExamples) {
         Syntax& direction = syntax.subcommand(name, summary);
-        direction.option("-o,--output", outputPath_, "FILE",
-                         "Where the output goes; '-' is standard output, the default");
-        direction.operand("FILE", inputs_, "Files to read; '-' is standard input, the default");
+        files_.declare(direction);
         direction.setHelp(itsExamples, notes);
         return &direction;
     }
@@ -83,9 +79,7 @@ private:
                             const std::string& encodingName) {
         Source source(path, kvt::ex::Encoding::Utf8, MarkPolicy::Skip);
         const Input& input = source.input();
-        if (output.writesInPlaceTo(input.descriptor())) {
-            throw Failure(input.name() + " is both input and output; use -o, which writes beside it");
-        }
+        refuseInPlace(output, input);
         LineCounter lines(kvt::ex::Encoding::Utf8);
         std::string converted;
         try {
@@ -108,8 +102,7 @@ private:
         }
     }
 
-    std::vector<std::string> inputs_;
-    std::string outputPath_;
+    FileOptions files_;
     Syntax* encode_ = nullptr;
 };
 

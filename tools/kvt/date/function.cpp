@@ -70,7 +70,7 @@ int ValueFunction::run(Diagnostics& diagnostics) {
     }
     const ApplyToValue applyTo = [&](const kvt::ex::UString<0>& value) { return apply(value); };
     return fromInput ? runLines(applyTo, json_, lines_, diagnostics)
-                     : runValue(arguments.front(), applyTo, json_, diagnostics);
+                     : runValue(arguments.front(), applyTo, json_, lines_.output(), diagnostics);
 }
 
 // With one argument alone it is the operand. Where it is none, it was most likely meant for a value.

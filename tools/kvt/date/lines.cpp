@@ -75,15 +75,23 @@ private:
 
 } // namespace
 
-int runValue(const std::string& value, const ApplyToValue& apply, bool json, Diagnostics& diagnostics) {
+int runValue(const std::string& value, const ApplyToValue& apply, bool json, const std::string& outputPath,
+             Diagnostics& diagnostics) {
     const DateOutcome outcome = outcomeFor(value, apply);
-    if (!json) {
-        return showOutcome(outcome, json, diagnostics);
+    if (!json && !outcome.isGood()) {
+        sayFailure(outcome, "", diagnostics);
+        return NotDone;
     }
-    nlohmann::ordered_json object;
-    object["value"] = value;
-    addTo(object, outcome);
-    print(jsonLine(object));
+    const std::unique_ptr<Output> output = openOutput(outputPath);
+    if (json) {
+        nlohmann::ordered_json object;
+        object["value"] = value;
+        addTo(object, outcome);
+        output->write(jsonLine(object));
+    } else {
+        output->write(resultText(outcome) + "\n");
+    }
+    output->commit();
     return outcome.isGood() ? Done : NotDone;
 }
 

@@ -16,8 +16,9 @@ class ValueLines;
 
 using ApplyToValue = std::function<DateOutcome(const kvt::ex::UString<0>&)>;
 
-/// Prints what becomes of one value; gives an ExitStatus.
-int runValue(const std::string& value, const ApplyToValue& apply, bool json, Diagnostics& diagnostics);
+/// Writes what becomes of one value; gives an ExitStatus.
+int runValue(const std::string& value, const ApplyToValue& apply, bool json, const std::string& outputPath,
+             Diagnostics& diagnostics);
 
 /// The same for each of the lines.
 int runLines(const ApplyToValue& apply, bool json, ValueLines& lines, Diagnostics& diagnostics);

@@ -12,7 +12,6 @@
 #include "text/byte_order_mark.h"
 
 #include <algorithm>
-#include <unistd.h>
 
 namespace host {
 
@@ -74,10 +73,10 @@ const char* const lineCommandNotes =
 read. Lines end with LF, which the last one of a FILE need not have and gets; CR
 and NUL are bytes as any other. Lines and files may have any size.
 
-Lines are compared as bytes. With --fold, the FILEs are UTF-8, and lines that
-differ in case only are equal; bytes that are no UTF-8 end the command with their
-place. Case is that of full Unicode case folding, whatever the locale. Lines are
-written as they were read in any case.
+Lines are compared as bytes. With --ignore-case, the FILEs are UTF-8, and lines
+that differ in case only are equal; bytes that are no UTF-8 end the command with
+their place. Case is that of full Unicode case folding, whatever the locale.
+Lines are written as they were read in any case.
 
 At most SIZE of the lines are held in memory, beside some 32 MiB for the program
 itself; SIZE is a number with K, M, G or T behind it, at least 64K. What goes
@@ -97,15 +96,10 @@ Exit status:
   2  not done)";
 
 void LineCommand::declareShared(Syntax& syntax) {
-    syntax.flag("--fold", fold_, "Take lines that differ in case only for equal");
-    syntax.option("-o,--output", output_, "FILE",
-                  "Where the output goes; '-' is standard output, the default");
+    syntax.flag("-i,--ignore-case,--fold", ignoreCase_, "Take lines that differ in case only for equal");
     syntax.option("--memory", memory_, "SIZE", "How much may be held in memory; 256M without it");
     syntax.option("--workspace", workspace_, "FILE", "A file to make, use beyond that, and remove");
-    syntax.flag("--progress", progress_,
-                "Tell on standard error how far it is; on a terminal that is done for long "
-                "inputs anyway");
-    syntax.operand("FILE", inputs_, "Files to read; '-' is standard input, the default");
+    files_.declare(syntax);
 }
 
 int LineCommand::process(LineOrder order, OutputOrder outputOrder, bool showCounts,
@@ -115,10 +109,11 @@ int LineCommand::process(LineOrder order, OutputOrder outputOrder, bool showCoun
         throw Failure("--memory takes at least " + std::to_string(leastMemory / 1024) + "K, not '" +
                       printable(memory_) + "'");
     }
-    if (!workspace_.empty() && !isStandardOutput(output_) && isSamePlace(workspace_, output_)) {
+    if (!workspace_.empty() && !isStandardOutput(files_.outputPath()) &&
+        isSamePlace(workspace_, files_.outputPath())) {
         throw Failure("the workspace needs a file of its own: " + printable(workspace_));
     }
-    const std::unique_ptr<Output> output = openOutput(output_);
+    const std::unique_ptr<Output> output = openOutput(files_.outputPath());
     // The workspace is gone when the output appears.
     sendThrough(*output, std::min(memory, mostMemory), order, outputOrder, showCounts, diagnostics);
     output->commit();
@@ -127,15 +122,12 @@ int LineCommand::process(LineOrder order, OutputOrder outputOrder, bool showCoun
 
 void LineCommand::sendThrough(Output& output, std::uint64_t memory, LineOrder order, OutputOrder outputOrder,
                               bool showCounts, Diagnostics& diagnostics) const {
-    const std::vector<std::string> inputs = inputsOrStandardInput(inputs_);
+    const std::vector<std::string> inputs = files_.inputs();
     const bool asRead = outputOrder == OutputOrder::AsRead;
-    const bool mayDraw = !isStandardOutput(output_) || ::isatty(STDOUT_FILENO) == 0;
-    const Progress::Show show = progress_ ? Progress::Show::Always
-                                : mayDraw ? Progress::Show::LongOnTerminal
-                                          : Progress::Show::Never;
+    const Progress::Show show = files_.progress();
     Workspace workspace(workspace_);
     LineSorter sorter({order, asRead, memory / 16 * 15}, workspace);
-    LineFeeder feeder({fold_, asRead, memory / 16}, sorter, workspace);
+    LineFeeder feeder({ignoreCase_, asRead, memory / 16}, sorter, workspace);
     {
         Progress reading(diagnostics, totalSize(inputs), show, "reading");
         for (const std::string& path : inputs) {

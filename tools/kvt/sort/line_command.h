@@ -4,10 +4,10 @@
 
 #include "cli/command.h"
 #include "sort/line_sorter.h"
+#include "text/file_options.h"
 
 #include <cstdint>
 #include <string>
-#include <vector>
 
 namespace host {
 
@@ -24,12 +24,10 @@ private:
     void sendThrough(Output& output, std::uint64_t memory, LineOrder order, OutputOrder outputOrder,
                      bool showCounts, Diagnostics& diagnostics) const;
 
-    std::vector<std::string> inputs_;
-    std::string output_;
+    FileOptions files_;
     std::string workspace_;
     std::string memory_ = "256M";
-    bool fold_ = false;
-    bool progress_ = false;
+    bool ignoreCase_ = false;
 };
 
 /// The end of the help of both commands.

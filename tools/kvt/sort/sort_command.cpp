@@ -9,7 +9,7 @@ namespace host {
 namespace {
 
 constexpr const char* examples = R"(kvt sort names.txt
-kvt sort --fold --reverse one.txt two.txt -o sorted.txt
+kvt sort --ignore-case --reverse one.txt two.txt -o sorted.txt
 kvt sort --memory 1G --workspace /scratch/work huge.txt -o huge.txt)";
 
 class SortCommand : public LineCommand {

@@ -9,7 +9,7 @@ namespace host {
 namespace {
 
 constexpr const char* examples = R"(kvt unique names.txt
-kvt unique --fold --count one.txt two.txt
+kvt unique --ignore-case --count one.txt two.txt
 kvt unique --memory 1G huge.log -o huge.log)";
 
 constexpr const char* ownNotes =

@@ -8,14 +8,13 @@
 #include "cli/choices.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
-#include "text/encoding_catalogue.h"
+#include "text/file_options.h"
 #include "text/line_pattern.h"
 #include "text/line_reader.h"
 #include "text/text_writer.h"
 
 #include <optional>
 #include <stdexcept>
-#include <unistd.h>
 
 namespace host {
 
@@ -82,27 +81,22 @@ public:
         syntax.flag("--groups", groups_, "Print where the groups of each match stand, not the lines");
         syntax.option("--dialect", dialect_, "WHICH",
                       "How REGEX is to be read: 'perl' (default) or 'legacy'");
-        syntax.option("--encoding", encoding_, "ENC", "Encoding of the text; UTF-8 without it");
-        syntax.option("-o,--output", outputPath_, "FILE",
-                      "Where the output goes; '-' is standard output, the default");
-        syntax.operand("FILE", inputs_, "Files to read; '-' is standard input, the default");
+        files_.declareEncoding(syntax);
+        files_.declare(syntax);
     }
 
     int run(Diagnostics& diagnostics) override {
         pattern_ = compilePattern(regex_, choose("--dialect", dialect_, dialectChoices));
-        const TextEncoding encoding = inputEncoding(encoding_);
-        inputs_ = inputsOrStandardInput(inputs_);
-        const std::unique_ptr<Output> output = openOutput(outputPath_);
+        const TextEncoding encoding = files_.encoding();
+        const std::vector<std::string> inputs = files_.inputs();
+        showFiles_ = inputs.size() > 1;
+        const std::unique_ptr<Output> output = openOutput(files_.outputPath());
         std::optional<TextWriter> writer;
         {
-            Progress progress(diagnostics, totalSize(inputs_),
-                              !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
-            for (const std::string& path : inputs_) {
+            Progress progress(diagnostics, totalSize(inputs), files_.progress(), "");
+            for (const std::string& path : inputs) {
                 LineReader reader(path, encoding);
-                if (output->writesInPlaceTo(reader.input().descriptor())) {
-                    throw Failure(reader.input().name() +
-                                  " is both input and output; use -o, which writes beside it");
-                }
+                refuseInPlace(*output, reader.input());
                 if (!writer) { // in the byte order of the first
                     writer.emplace(*output, reader.encoding(), !groups_);
                 }
@@ -139,7 +133,7 @@ private:
     void write(const TextLine& line, LineReader& reader, TextWriter& writer) {
         std::string& out = writer.buffer();
         if (groups_) {
-            appendGroups(line, places_, inputs_.size() > 1, out);
+            appendGroups(line, places_, showFiles_, out);
         } else {
             out.append(reader.takeMark()).append(line.text);
             out += line.end.empty() ? "\n" : line.end;
@@ -149,9 +143,8 @@ private:
 
     std::string regex_;
     std::string dialect_ = "perl";
-    std::string encoding_ = "UTF-8";
-    std::string outputPath_;
-    std::vector<std::string> inputs_;
+    FileOptions files_;
+    bool showFiles_ = false;
     bool groups_ = false;
     std::unique_ptr<LinePattern> pattern_;
     GroupPlaces places_;

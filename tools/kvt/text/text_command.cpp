@@ -6,14 +6,13 @@
 #include "base/progress.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
-#include "text/encoding_catalogue.h"
+#include "text/file_options.h"
 #include "text/line_reader.h"
 #include "text/text_operation.h"
 #include "text/text_writer.h"
 
 #include <functional>
 #include <optional>
-#include <unistd.h>
 #include <utility>
 
 namespace host {
@@ -59,20 +58,16 @@ public:
     }
 
     int run(Diagnostics& diagnostics) override {
-        const TextEncoding encoding = inputEncoding(encoding_);
-        inputs_ = inputsOrStandardInput(inputs_);
+        const TextEncoding encoding = files_.encoding();
+        const std::vector<std::string> inputs = files_.inputs();
         const std::unique_ptr<TextOperation> operation = chosen();
-        const std::unique_ptr<Output> output = openOutput(outputPath_);
+        const std::unique_ptr<Output> output = openOutput(files_.outputPath());
         std::optional<TextWriter> writer;
         {
-            Progress progress(diagnostics, totalSize(inputs_),
-                              !isStandardOutput(outputPath_) || ::isatty(STDOUT_FILENO) == 0);
-            for (const std::string& path : inputs_) {
+            Progress progress(diagnostics, totalSize(inputs), files_.progress(), "");
+            for (const std::string& path : inputs) {
                 LineReader reader(path, encoding);
-                if (output->writesInPlaceTo(reader.input().descriptor())) {
-                    throw Failure(reader.input().name() +
-                                  " is both input and output; use -o, which writes beside it");
-                }
+                refuseInPlace(*output, reader.input());
                 if (!writer) { // in the byte order of the first
                     writer.emplace(*output, reader.encoding(), operation->givesText());
                 }
@@ -123,10 +118,8 @@ private:
         for (const auto& [argument, value] : arguments) {
             operation.operand(argument, *value, argumentMeaning(argument)).required();
         }
-        operation.option("--encoding", encoding_, "ENC", "Encoding of the text; UTF-8 without it");
-        operation.option("-o,--output", outputPath_, "FILE",
-                         "Where the output goes; '-' is standard output, the default");
-        operation.operand("FILE", inputs_, "Files to read; '-' is standard input, the default");
+        files_.declareEncoding(operation);
+        files_.declare(operation);
         operation.setHelp(itsExamples, itsNotes.empty() ? notes : itsNotes + "\n\n" + notes);
         operations_.emplace_back(&operation, make);
     }
@@ -159,7 +152,7 @@ position is counted from 0 in the line, in bytes of the line as UTF-8, whatever
 ENC is; a byte order mark is not counted. Nothing is printed when nothing is
 found. With --ignore-case the position is still that in the line as it stands.)",
                          {{"NEEDLE", &first_}},
-                         [this] { return findText(first_, rule(), inputs_.size() > 1); });
+                         [this] { return findText(first_, rule(), files_.inputs().size() > 1); });
         declareIgnoreCase("Find it in upper and lower case alike");
     }
 
@@ -209,9 +202,7 @@ It is quick and not made to withstand anybody who wants two texts to agree.)",
     }
 
     std::vector<std::pair<Syntax*, Make>> operations_;
-    std::string encoding_ = "UTF-8";
-    std::string outputPath_;
-    std::vector<std::string> inputs_;
+    FileOptions files_;
     std::string first_;
     std::string second_;
     bool ignoreCase_ = false;

@@ -6,17 +6,14 @@
 #include "base/output.h"
 #include "base/progress.h"
 #include "base/text.h"
-#include "cli/choices.h"
 #include "cli/exit_status.h"
 #include "cli/sizes.h"
-#include "text/encoding_catalogue.h"
 #include "text/line_reader.h"
 
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
 #include <limits>
-#include <unistd.h>
 #include <utility>
 
 namespace host {
@@ -27,10 +24,6 @@ namespace {
 constexpr std::uint64_t mostSaid = 10;
 // Kinds that have a line of their own in the ledger.
 constexpr std::size_t mostKinds = 1000;
-
-const Choices<Progress::Show> progressChoices = {{"auto", Progress::Show::LongOnTerminal},
-                                                 {"always", Progress::Show::Always},
-                                                 {"never", Progress::Show::Never}};
 
 std::string placeOf(const TextLine& line) {
     return std::string(line.file) + ": line " + std::to_string(line.number);
@@ -53,20 +46,14 @@ struct TooMany {};
 } // namespace
 
 void ValueLines::declare(Syntax& syntax) {
-    options_.push_back(
-        syntax.option("-f,--file", files_, "FILE",
-                      "Read the values from the lines of FILE, '-' is standard input; may be given "
-                      "several times"));
-    options_.push_back(syntax.option("-o,--output", output_, "FILE",
-                                     "Where the output goes; '-' is standard output, the default"));
-    options_.push_back(
-        syntax.option("--encoding", encoding_, "ENC", "Encoding of the lines; UTF-8 without it"));
-    options_.push_back(
-        syntax.option("--max-errors", mostErrors_, "N", "End when more than N lines have failed"));
-    options_.push_back(syntax.option("--report", reportPath_, "FILE",
-                                     "Write all failures to FILE, one JSON object on each line"));
-    syntax.option("--progress", progress_, "WHEN",
-                  "Whether to show on standard error how far it is: 'auto' (default), 'always' or 'never'");
+    options_ = {syntax.option("-f,--file", paths_, "FILE",
+                              "Read the values from the lines of FILE, '-' is standard input; may be given "
+                              "several times"),
+                syntax.option("--max-errors", mostErrors_, "N", "End when more than N lines have failed"),
+                syntax.option("--report", reportPath_, "FILE",
+                              "Write all failures to FILE, one JSON object on each line")};
+    files_.declareEncoding(syntax);
+    files_.declareOutput(syntax);
 }
 
 bool ValueLines::isAsked() const {
@@ -79,21 +66,18 @@ int ValueLines::run(LineWork& work, bool failuresAreInOutput, Diagnostics& diagn
     failuresAreInOutput_ = failuresAreInOutput;
     limit_ = mostErrors_.empty() ? std::numeric_limits<std::uint64_t>::max()
                                  : parseNumber("--max-errors", mostErrors_);
-    const Progress::Show show = choose("--progress", progress_, progressChoices);
-    textEncoding(encoding_);
-    const std::vector<std::string> files = inputsOrStandardInput(files_);
-    const std::unique_ptr<Output> output = openOutput(output_);
+    encoding_ = files_.encoding();
+    const Progress::Show show = files_.progress();
+    const std::vector<std::string> paths = inputsOrStandardInput(paths_);
+    const std::unique_ptr<Output> output = openOutput(files_.outputPath());
     if (!reportPath_.empty()) {
         report_ = openOutput(reportPath_);
     }
-    const bool mayDraw = !isStandardOutput(output_) || ::isatty(STDOUT_FILENO) == 0;
     bool isWhole = true;
     try {
-        Progress progress(diagnostics, totalSize(files),
-                          show == Progress::Show::LongOnTerminal && !mayDraw ? Progress::Show::Never : show,
-                          "");
-        for (const std::string& file : files) {
-            readFile(file, work, *output, progress);
+        Progress progress(diagnostics, totalSize(paths), show, "");
+        for (const std::string& path : paths) {
+            readFile(path, work, *output, progress);
         }
     } catch (const TooMany&) {
         isWhole = false;
@@ -112,10 +96,8 @@ int ValueLines::run(LineWork& work, bool failuresAreInOutput, Diagnostics& diagn
 }
 
 void ValueLines::readFile(const std::string& path, LineWork& work, Output& output, Progress& progress) {
-    LineReader reader(path, inputEncoding(encoding_), LineReader::BadText::Passes);
-    if (output.writesInPlaceTo(reader.input().descriptor())) {
-        throw Failure(reader.input().name() + " is both input and output; use -o, which writes beside it");
-    }
+    LineReader reader(path, encoding_, LineReader::BadText::Passes);
+    refuseInPlace(output, reader.input());
     TextLine line{};
     std::string results;
     while (reader.readBlock()) {

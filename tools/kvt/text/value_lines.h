@@ -7,6 +7,7 @@
 
 #include "base/output.h"
 #include "cli/syntax.h"
+#include "text/file_options.h"
 
 #include <cstdint>
 #include <functional>
@@ -44,11 +45,11 @@ public:
 
 class ValueLines {
 public:
-    /// Declares --file, -o, --encoding, --progress, --max-errors and --report.
+    /// Declares --file, --max-errors and --report, and what other commands on files take, too.
     void declare(Syntax& syntax);
-    /// Whether the command line says where the lines are, or how they are to be read.
+    /// Whether the command line has an option that is about many lines.
     bool isAsked() const;
-    const std::string& output() const { return output_; }
+    const std::string& output() const { return files_.outputPath(); }
 
     /// Gives an ExitStatus. Where the failures are in the output already, they are counted and not said. Throws Failure.
     int run(LineWork& work, bool failuresAreInOutput, Diagnostics& diagnostics);
@@ -65,10 +66,9 @@ private:
     void say(const TextLine& line, const LineWork& work, const Kind& kind);
     void printLedger() const;
 
-    std::vector<std::string> files_;
-    std::string output_;
-    std::string encoding_ = "UTF-8";
-    std::string progress_ = "auto";
+    std::vector<std::string> paths_;
+    FileOptions files_;
+    TextEncoding encoding_ = kvt::ex::Encoding::Utf8;
     std::string mostErrors_;
     std::string reportPath_;
     std::vector<Option> options_;
