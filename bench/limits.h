@@ -3,6 +3,10 @@
 // All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
 // falls on all of them alike. A row is the median of the ratios of its two ways within a round. A row that misses its
 // limit is marked, and the exit status is then 1.
+//
+//     --benchmark_filter=REGEX   only the rows whose work it finds
+//     --quick                    a fifth of the rounds
+//     --results=FILE             adds the rows to a file, one in a line with tabs between its parts; see report.cpp
 #pragma once
 
 #include <benchmark/benchmark.h>
@@ -14,7 +18,6 @@
 #include <map>
 #include <regex>
 #include <string>
-#include <string_view>
 #include <vector>
 
 namespace kvt::bench {
@@ -54,9 +57,15 @@ public:
     void add(const std::string& name, Way measured) { ways_[name] = std::move(measured); }
     void hold(Row row) { rows_.push_back(std::move(row)); }
 
-    /// Measures the rows that --benchmark_filter names, prints them, and returns the exit status.
+    /// Measures the rows that the arguments ask for, prints them, and returns the exit status.
     int run(int count, char** arguments) {
-        const std::regex filter = filterOf(count, arguments);
+        const std::vector<std::string> given(arguments + 1, arguments + count);
+        const std::regex filter(valueOf(given, "--benchmark_filter=", ".*"));
+        const std::string file = valueOf(given, "--results=", "");
+        results_ = file.empty() ? nullptr : std::fopen(file.c_str(), "a");
+        if (std::find(given.begin(), given.end(), "--quick") != given.end()) {
+            rounds_ = std::max(rounds_ / 5, 5);
+        }
         rows_.erase(std::remove_if(rows_.begin(), rows_.end(),
                                    [&](const Row& row) { return !std::regex_search(row.work, filter); }),
                     rows_.end());
@@ -64,6 +73,9 @@ public:
         bool areAllWithin = true;
         for (const Row& row : rows_) {
             areAllWithin = isWithinLimit(row) && areAllWithin;
+        }
+        if (results_ != nullptr) {
+            std::fclose(results_);
         }
         return areAllWithin ? 0 : 1;
     }
@@ -116,18 +128,22 @@ private:
                         isWithin ? "" : "   MISSED");
         }
         std::printf("\n");
+        if (results_ != nullptr) {
+            std::fprintf(results_, "%s\t%s\t%d\t%g\t%g\t%g\t%g\n", row.work.c_str(), row.beside.c_str(),
+                         static_cast<int>(row.bound), row.limit, ratio, median(work), median(beside));
+        }
         return isWithin;
     }
 
-    static std::regex filterOf(int count, char** arguments) {
-        constexpr std::string_view option = "--benchmark_filter=";
-        for (int i = 1; i < count; ++i) {
-            const std::string_view argument = arguments[i];
-            if (argument.substr(0, option.size()) == option) {
-                return std::regex(std::string(argument.substr(option.size())));
+    // What stands behind an option.
+    static std::string valueOf(const std::vector<std::string>& given, const std::string& option,
+                               const std::string& otherwise) {
+        for (const std::string& argument : given) {
+            if (argument.compare(0, option.size(), option) == 0) {
+                return argument.substr(option.size());
             }
         }
-        return std::regex(".*");
+        return otherwise;
     }
 
     int rounds_;
@@ -135,6 +151,7 @@ private:
     std::map<std::string, Way> ways_;
     std::vector<Row> rows_;
     std::map<std::string, std::vector<double>> times_;
+    std::FILE* results_ = nullptr;
 };
 
 } // namespace kvt::bench
