@@ -102,7 +102,11 @@ std::uint32_t EncodingRegistry::lookupId(std::string_view name) {
     if (const auto id = staticIds_.find(name)) {
         return *id;
     }
+    if (const auto id = dynamicIds_.find(name)) {
+        return *id;
+    }
     const std::lock_guard lock(mutex_);
+    // It may have come in meanwhile.
     if (const auto id = dynamicIds_.find(name)) {
         return *id;
     }
@@ -116,14 +120,19 @@ std::uint32_t EncodingRegistry::lookupId(std::string_view name) {
         dynamicIds_.insert(name, *id);
         return *id;
     }
-    const auto id = static_cast<std::uint32_t>(dynamicNames_.size()) + firstDynamic;
+    const auto count = static_cast<std::uint32_t>(dynamicNames_.size());
+    const std::uint32_t id = count + firstDynamic;
+    std::string_view& view = dynamicViews_.make(count);
     dynamicNames_.push_back(canonical);
+    view = dynamicNames_.back();
+    dynamicCount_.store(count + 1, std::memory_order_release);
     try {
         dynamicIds_.insert(canonical, id);
         dynamicIds_.insert(name, id);
     } catch (...) {
         // Without its key the name would take an id that nobody can find. (If the key is in, so is the name.)
         if (!dynamicIds_.find(canonical)) {
+            dynamicCount_.store(count, std::memory_order_release);
             dynamicNames_.pop_back();
         }
         throw;
@@ -135,9 +144,9 @@ std::string_view EncodingRegistry::nameOf(std::uint32_t id) {
     if (id < firstDynamic) {
         return typeNames_[id];
     }
-    const std::lock_guard lock(mutex_);
-    const std::size_t index = id - firstDynamic;
-    return index < dynamicNames_.size() ? std::string_view(dynamicNames_[index]) : std::string_view();
+    const std::uint32_t index = id - firstDynamic;
+    return index < dynamicCount_.load(std::memory_order_acquire) ? *dynamicViews_.find(index)
+                                                                 : std::string_view();
 }
 
 std::string EncodingRegistry::normaliseName(std::string_view name) {

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <utility>
 
 namespace kvt::ex::detail {
 namespace {
@@ -40,11 +41,14 @@ NameTable::NameTable(std::initializer_list<Entry> entries) {
 }
 
 std::optional<std::uint32_t> NameTable::find(std::string_view key) const {
-    if (slots_.empty()) {
+    const Slots* const slots = slots_.load(std::memory_order_acquire);
+    if (slots == nullptr) {
         return std::nullopt;
     }
-    const Slot& slot = slots_[probe(key)];
-    return slot.state == State::occupied ? std::optional(slot.id) : std::nullopt;
+    const Slot& slot = (*slots)[probe(*slots, key)];
+    return slot.state.load(std::memory_order_acquire) == State::occupied && slot.key == key
+               ? std::optional(slot.id)
+               : std::nullopt;
 }
 
 bool NameTable::insert(std::string_view key, std::uint32_t id) {
@@ -52,23 +56,29 @@ bool NameTable::insert(std::string_view key, std::uint32_t id) {
         return false;
     }
     growForOne();
-    Slot& slot = slots_[probe(key)];
-    slot.key = key;
-    slot.id = id;
-    slot.state = State::occupied;
+    fill(*generations_.back(), key, id);
     ++used_;
     return true;
 }
 
-std::size_t NameTable::probe(std::string_view key) const {
-    std::size_t index = static_cast<std::uint32_t>(fnv1a(key)) % buckets();
+std::size_t NameTable::probe(const Slots& slots, std::string_view key) {
+    std::size_t index = static_cast<std::uint32_t>(fnv1a(key)) % slots.size();
     while (true) {
-        const Slot& slot = slots_[index];
-        if (slot.state == State::empty || (slot.state == State::occupied && slot.key == key)) {
+        const Slot& slot = slots[index];
+        const State state = slot.state.load(std::memory_order_acquire);
+        if (state == State::empty || (state == State::occupied && slot.key == key)) {
             return index;
         }
-        index = index + 1 < slots_.size() ? index + 1 : 0;
+        index = index + 1 < slots.size() ? index + 1 : 0;
     }
+}
+
+// Threads that look for the key meanwhile find the slot empty, or all of the entry.
+void NameTable::fill(Slots& slots, std::string_view key, std::uint32_t id) {
+    Slot& slot = slots[probe(slots, key)];
+    slot.key = key;
+    slot.id = id;
+    slot.state.store(State::occupied, std::memory_order_release);
 }
 
 void NameTable::growForOne() {
@@ -87,13 +97,16 @@ void NameTable::growForRange(std::uint32_t count) {
 }
 
 void NameTable::rehash(std::uint32_t buckets) {
-    std::vector<Slot> old(buckets);
-    old.swap(slots_);
-    for (Slot& slot : old) {
-        if (slot.state == State::occupied) {
-            slots_[probe(slot.key)] = std::move(slot);
+    auto larger = std::make_unique<Slots>(buckets);
+    if (const Slots* const slots = slots_.load(std::memory_order_relaxed)) {
+        for (const Slot& slot : *slots) {
+            if (slot.state.load(std::memory_order_relaxed) == State::occupied) {
+                fill(*larger, slot.key, slot.id);
+            }
         }
     }
+    generations_.push_back(std::move(larger));
+    slots_.store(generations_.back().get(), std::memory_order_release);
     deleted_ = 0;
     threshold_ = static_cast<std::uint32_t>(std::floor(static_cast<float>(buckets) * maxLoadFactor_));
 }

@@ -145,4 +145,31 @@ TEST(RegistryThreads, ReadersSeeNamesWhileOthersRegister) {
     });
 }
 
+// Names go in behind a mutex; what is in is read without one, while they do.
+TEST(RegistryThreads, EachNameIsFoundBySpellingAndByIdAsSoonAsItIsIn) {
+    constexpr std::uint32_t spellings = 4000;
+    const auto spelling = [](std::uint32_t i) {
+        return "gb-18030" + std::string(i % 50, '-') + std::string(i / 50, '_');
+    };
+    std::atomic<std::uint32_t> registered{0};
+    onManyThreads([&](int t) {
+        if (t == 0) {
+            for (std::uint32_t i = 0; i < spellings; ++i) {
+                (void)Encoding(View(spelling(i)), kvt::ex::nothrow);
+                registered.store(i + 1, std::memory_order_release);
+            }
+            return;
+        }
+        for (std::uint32_t seen = 0; seen < spellings;) {
+            seen = registered.load(std::memory_order_acquire);
+            for (std::uint32_t i = seen - std::min(seen, 20U); i < seen; ++i) {
+                const Encoding found(View(spelling(i)), kvt::ex::nothrow);
+                if (found.id() != Encoding::Unknown) {
+                    EXPECT_EQ(found.getName(), "GB18030");
+                }
+            }
+        }
+    });
+}
+
 } // namespace

@@ -6,9 +6,11 @@
 #pragma once
 
 #include <kvt/encoding/detail/name_table.h>
+#include <kvt/encoding/detail/stable_array.h>
 #include <kvt/encoding/encoding.h>
 
 #include <array>
+#include <atomic>
 #include <cstdint>
 #include <deque>
 #include <mutex>
@@ -46,12 +48,15 @@ private:
     const NameTable staticIds_;
     const std::array<std::string_view, firstDynamic> typeNames_;
 
-    // Guards the two members below, and is held across the calls into ICU for a new name, so that two threads with
-    // one new name cannot be given two ids. Nothing that runs under it takes another lock of the library.
+    // Held by who writes the members below, also across the calls into ICU for a new name, so that two threads with one new
+    // name cannot be given two ids. Nothing that runs under it takes another lock of the library. What is in the members
+    // never changes or moves, and is read without it.
     std::mutex mutex_;
     NameTable dynamicIds_;
-    // A deque, since the views that nameOf() hands out must outlast later additions.
-    std::deque<std::string> dynamicNames_;
+    std::deque<std::string> dynamicNames_; // for who writes, and for debuggers
+    // The same names for all others: as many as the count says, which is set before an id can be found.
+    StableArray<std::string_view> dynamicViews_;
+    std::atomic<std::uint32_t> dynamicCount_{0};
 };
 
 } // namespace kvt::ex::detail
