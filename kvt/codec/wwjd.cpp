@@ -1,7 +1,7 @@
 // The codec of the wwjd text encoding.
 //
-// Both decoders walk from one token to the next with the same scanner and differ in what they do with the text
-// between tokens and in whether they know `<uXXXX>`.
+// Both decoders know the named tokens by one table. The one to UTF-16 walks from token to token, as its failure says where the
+// last one ended; the one to bytes goes byte by byte.
 #include <kvt/codec/wwjd.h>
 
 #include <kvt/encoding/detail/failure_text.h>
@@ -39,6 +39,31 @@ constexpr bool byName(const Token& left, const Token& right) {
 
 static_assert(std::is_sorted(tokens.begin(), tokens.end(), byName));
 
+constexpr std::size_t longestName = 12;
+static_assert(std::all_of(tokens.begin(), tokens.end(),
+                          [](const Token& token) { return token.name.size() <= longestName; }));
+
+// Length, first and last letter tell the names apart: by these numbers, each has a place of its own.
+constexpr std::size_t places = 64;
+constexpr std::size_t placeOf(std::string_view name) {
+    return (name.size() + static_cast<unsigned char>(name.front()) * std::size_t{10} +
+            static_cast<unsigned char>(name.back()) * std::size_t{46}) %
+           places;
+}
+
+constexpr std::array<Token, places> tokensByPlace() {
+    std::array<Token, places> table{};
+    for (const Token& token : tokens) {
+        table[placeOf(token.name)] = token;
+    }
+    return table;
+}
+
+constexpr std::array<Token, places> tokenAt = tokensByPlace();
+static_assert(std::all_of(tokens.begin(), tokens.end(), [](const Token& token) {
+    return tokenAt[placeOf(token.name)].name == token.name;
+}));
+
 // The names by character, empty for a character that stands for itself.
 constexpr std::array<std::string_view, 128> namesByUnit() {
     std::array<std::string_view, 128> names{};
@@ -51,8 +76,11 @@ constexpr std::array<std::string_view, 128> namesByUnit() {
 constexpr std::array<std::string_view, 128> tokenNames = namesByUnit();
 
 std::optional<char> unitOf(std::string_view name) {
-    const auto* const found = std::lower_bound(tokens.begin(), tokens.end(), Token{name, '\0'}, byName);
-    return found != tokens.end() && found->name == name ? std::optional(found->unit) : std::nullopt;
+    if (name.empty()) {
+        return std::nullopt;
+    }
+    const Token& token = tokenAt[placeOf(name)];
+    return token.name == name ? std::optional(token.unit) : std::nullopt;
 }
 
 // Finds what may be a token: a "<" and the next ">" behind it.
@@ -94,6 +122,18 @@ private:
 // Reads a number in base 16 as std::stoi does: leading blanks, a sign and "0x" are allowed, and what follows the
 // digits is ignored. Four characters cannot be out of its range.
 char16_t hexadecimalUnit(std::string_view digits) {
+    unsigned unit = 0;
+    const auto isDigit = [&](char c) {
+        const auto lower = static_cast<unsigned char>(c | 0x20);
+        const unsigned digit = c >= '0' && c <= '9'           ? c - '0'
+                               : lower >= 'a' && lower <= 'f' ? lower - 'a' + 10U
+                                                              : 16;
+        unit = unit << 4 | digit;
+        return digit < 16;
+    };
+    if (std::all_of(digits.begin(), digits.end(), isDigit)) {
+        return static_cast<char16_t>(unit);
+    }
     const std::string terminated(digits);
     char* end = nullptr;
     const long value = std::strtol(terminated.c_str(), &end, 16);
@@ -105,13 +145,16 @@ char16_t hexadecimalUnit(std::string_view digits) {
 
 // Appends each byte as a unit, U+FFFD for one above 127; returns whether there was none of these.
 bool appendAscii(std::string_view bytes, std::u16string& out) {
-    bool valid = true;
-    for (const char c : bytes) {
-        const auto byte = static_cast<unsigned char>(c);
-        valid = valid && byte < 128;
-        out += byte < 128 ? static_cast<char16_t>(byte) : u'\uFFFD';
-    }
-    return valid;
+    unsigned all = 0;
+    const std::size_t before = out.size();
+    out.resize(before + bytes.size());
+    std::transform(bytes.begin(), bytes.end(), out.begin() + static_cast<std::ptrdiff_t>(before),
+                   [&](char c) {
+                       const auto byte = static_cast<unsigned char>(c);
+                       all |= byte;
+                       return byte < 128 ? static_cast<char16_t>(byte) : u'\uFFFD';
+                   });
+    return all < 128;
 }
 
 } // namespace
@@ -171,21 +214,27 @@ UString<2> wwjdToUtf16(std::string_view text) {
     return UString<2>(out.data(), out.size());
 }
 
+// Nothing here depends on where the ">" of something stands that is no name, so a look at the bytes of the longest name is
+// enough at each "<". No result is longer than its text.
 std::string wwjdToBytes(std::string_view text) {
-    std::string out;
-    out.reserve(text.size());
-    Scanner scanner(text);
-    while (scanner.next()) {
-        out += scanner.textBefore();
-        if (const auto unit = unitOf(scanner.name())) {
-            out += *unit;
-            scanner.skipToken();
-        } else {
-            out += '<';
-            scanner.skipOpening();
+    std::string out(text.size(), '\0');
+    char* target = out.data();
+    const char* p = text.data();
+    const char* const end = p + text.size();
+    while (p != end) {
+        if (*p != '<') {
+            *target++ = *p++;
+            continue;
         }
+        const char* const name = p + 1;
+        const char* const limit = name + std::min<std::ptrdiff_t>(end - name, longestName + 1);
+        const char* const close = std::find(name, limit, '>');
+        const auto unit =
+            close != limit ? unitOf({name, static_cast<std::size_t>(close - name)}) : std::nullopt;
+        *target++ = unit.value_or('<');
+        p = unit ? close + 1 : name;
     }
-    out += scanner.rest();
+    out.resize(static_cast<std::size_t>(target - out.data()));
     out.shrink_to_fit();
     return out;
 }
