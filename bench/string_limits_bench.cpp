@@ -6,6 +6,7 @@
 #include <kvt/string/ustring_array.h>
 
 #include <unicode/ucasemap.h>
+#include <unicode/ustring.h>
 
 #include <cstring>
 #include <memory>
@@ -102,6 +103,61 @@ void holdFind(Limits& limits, const std::string& name, std::size_t size, const s
     limits.hold({name, other, bound, limit});
 }
 
+// ---- What is shown beside the standard library ----------------------------------------------------------------------
+
+template <std::uint32_t N>
+UString<N> stringOf(const std::string& ascii) {
+    using Units = std::basic_string<typename UString<N>::value_type>;
+    return UString<N>(UStringView<N>(Units(ascii.begin(), ascii.end())));
+}
+
+// What is usually written in place of a replaceAll(); the tail moves at each replacement that changes the length.
+template <typename Text>
+void replacePlainly(Text& text, const Text& from, const Text& to) {
+    for (std::size_t pos = 0; (pos = text.find(from, pos)) != Text::npos; pos += to.size()) {
+        text.replace(pos, from.size(), to);
+    }
+}
+
+template <std::uint32_t N>
+void showOthers(Limits& limits, const std::string& unit) {
+    using Text = std::basic_string<typename UString<N>::value_type>;
+    constexpr std::size_t size = 100'000;
+    const UString<N> text = stringOf<N>(prose(size));
+    const UString<N> needle = stringOf<N>("animal kingdom");
+    const UString<N> from = stringOf<N>("animals");
+    const UString<N> to = stringOf<N>("creatures");
+    const UString<N> units = stringOf<N>("QZ!?");
+    const auto plain = [](const UString<N>& string) { return Text(string.begin(), string.end()); };
+    const auto show = [&](const std::string& name, auto work, auto beside) {
+        limits.add(name + unit, way(work));
+        limits.add(name + unit + ": standard", way(beside));
+        limits.hold({name + unit, name + unit + ": standard"});
+    };
+    show(
+        "find", [=] { return text.find(needle); },
+        [text = plain(text), needle = plain(needle)] { return text.find(needle); });
+    show(
+        "rfind", [=] { return text.rfind(needle); },
+        [text = plain(text), needle = plain(needle)] { return text.rfind(needle); });
+    show(
+        "find any of four",
+        [text, set = vector<typename UString<N>::value_type>(units.begin(), units.end())] {
+            return text.findFirstOf(set);
+        },
+        [text = plain(text), set = plain(units)] { return text.find_first_of(set); });
+    show(
+        "compare", [text, other = UString<N>(text)] { return text.compare(other); },
+        [text = plain(text), other = plain(text)] { return text.compare(other); });
+    show(
+        "replace all", [=] { return UString<N>(text).replaceAll(from, to).size(); },
+        [text = plain(text), from = plain(from), to = plain(to)] {
+            Text copy(text);
+            replacePlainly(copy, from, to);
+            return copy.size();
+        });
+}
+
 // ---- Hashing ------------------------------------------------------------------------------------------------------
 
 [[gnu::noinline]] std::uint64_t hashPlainly(const std::string& text) {
@@ -182,6 +238,17 @@ void holdCase(Limits& limits) {
     };
     UErrorCode status = U_ZERO_ERROR;
     const std::shared_ptr<UCaseMap> map(ucasemap_open("", 0, &status), &ucasemap_close);
+    const UString<2> wide(string(shuffled(texts[1].sentence)));
+    limits.add("fold UTF-16, Latin", way([wide] { return wide.getAsFoldedCase(); }));
+    limits.add("fold UTF-16, Latin: u_strFoldCase", way([wide] {
+                   std::u16string result(wide.size() * 2, u'\0');
+                   UErrorCode error = U_ZERO_ERROR;
+                   result.resize(static_cast<std::size_t>(
+                       u_strFoldCase(result.data(), static_cast<std::int32_t>(result.size()), wide.rawData(),
+                                     static_cast<std::int32_t>(wide.size()), U_FOLD_CASE_DEFAULT, &error)));
+                   return result;
+               }));
+    limits.hold({"fold UTF-16, Latin", "fold UTF-16, Latin: u_strFoldCase"});
     for (const Mapping& mapping : mappings) {
         for (const Text& row : texts) {
             const std::string name = std::string(mapping.name) + ", " + row.name;
@@ -206,6 +273,9 @@ int main(int argc, char** argv) {
              8);
     holdHash(large, "hash of 1 MiB", mebibyte, 1.5);
     holdCase(large);
+    showOthers<0>(large, ", 8 bits");
+    showOthers<2>(large, ", 16 bits");
+    showOthers<3>(large, ", 32 bits");
     Limits small(101, 20'000);
     holdFind(small, "find in 64 bytes", 64, "looked in", false, Bound::atLeast, 1);
     holdFind(small, "find in 64 bytes, rare first byte", 64, "quick", false, Bound::atLeast, 1);
