@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cstdint>
 
 namespace kvt::ex::detail {
 namespace {
@@ -22,6 +23,17 @@ const char* textOf(const states::re_syntax_base* literal) {
     return reinterpret_cast<const char*>(&as<states::re_literal>(literal) + 1);
 }
 
+/// Which of eight bytes are not 0, the first one's bit lowest.
+unsigned bitsOf(const unsigned char* bytes) {
+    constexpr std::uint64_t low7 = 0x7F7F7F7F7F7F7F7F;
+    std::uint64_t word = 0;
+    for (unsigned i = 0; i < 8; ++i) {
+        word |= static_cast<std::uint64_t>(bytes[i]) << (8 * i);
+    }
+    word = (((word & low7) + low7) | word) >> 7U & 0x0101010101010101; // 1 in each byte that was not 0
+    return static_cast<unsigned>(word * 0x0102040810204080 >> 56U);
+}
+
 ByteSet only(char byte) {
     ByteSet set;
     set.add(static_cast<unsigned char>(byte));
@@ -35,13 +47,10 @@ ByteSet bytesOf(const states::re_syntax_base* state) {
         return only(*textOf(state));
     }
     if (state->type == states::syntax_element_set) {
-        const auto& map = as<states::re_set>(state)._map;
-        for (std::size_t high = 0; high < set.rows.size(); ++high) {
-            unsigned row = 0;
-            for (std::size_t low = 0; low < 16; ++low) {
-                row |= (map[high * 16 + low] != 0 ? 1U : 0U) << low;
-            }
-            set.rows[high] = static_cast<std::uint16_t>(row);
+        const auto* map = as<states::re_set>(state)._map;
+        for (std::uint16_t& row : set.rows) {
+            row = static_cast<std::uint16_t>(bitsOf(map) | bitsOf(map + 8) << 8U);
+            map += 16;
         }
         return set;
     }
@@ -74,7 +83,8 @@ bool readParts(const Engine& engine, FixedPrefix& prefix) {
         case states::syntax_element_char_rep:
         case states::syntax_element_short_set_rep: {
             const auto& repeat = as<states::re_repeat>(state);
-            prefix.parts.push_back({bytesOf(state->next.p), repeat.min, repeat.max});
+            prefix.parts.push_back(
+                {repeat.min != repeat.max ? bytesOf(state->next.p) : ByteSet(), repeat.min, repeat.max});
             state = state->next.p; // what is repeated
             break;
         }
