@@ -19,10 +19,10 @@ constexpr std::size_t largestPiece = std::size_t{1} << 30;
 constexpr std::size_t outputUnits = 4096;
 
 // The bytes for which ICU is asked where the short way ends: those of one character at first, and twice as many each time
-// that the short way found little to take behind them.
+// that the short way found little to take behind them. Less than this costs ICU no more than to come and go.
 constexpr std::size_t firstLook = 4;
 constexpr std::size_t longestLook = 1024;
-constexpr std::size_t little = 16;
+constexpr std::size_t little = 128;
 
 template <typename CharT>
 std::string_view bytesOf(std::basic_string_view<CharT> units) {

@@ -524,13 +524,18 @@ std::size_t characterLength(Side from, std::string_view in) {
         from.profile->decoding()->read(rest, &unit, 1);
         return std::min(in.size(), longestUtf8) - rest.size();
     }
-    // The shortest beginning that is well-formed.
-    std::size_t length = 0;
-    for (std::size_t bytes = unitBytes(from.form); length == 0 && bytes <= rest.size();
-         bytes += unitBytes(from.form)) {
-        length = measure(from.form, rest.substr(0, bytes)).taken * unitBytes(from.form);
+    // As many bytes as its first unit announces.
+    std::size_t length = unitBytes(from.form);
+    if (from.form == Form::utf8 && !in.empty()) {
+        const auto lead = static_cast<unsigned char>(in.front());
+        length = lead < 0xC0 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : 4;
+    } else if (isUtf16(from.form) && in.size() >= 2) {
+        const auto high = static_cast<unsigned char>(in[from.form == Form::utf16le ? 1 : 0]);
+        length = isHighSurrogate(char32_t{high} << 8) ? 4 : 2;
     }
-    return length;
+    const bool isWhole = length <= rest.size() &&
+                         measure(from.form, rest.substr(0, length)).taken * unitBytes(from.form) == length;
+    return isWhole ? length : 0;
 }
 
 bool canGoOn(Side from, Side to, std::size_t bytes) {
