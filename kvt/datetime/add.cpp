@@ -13,7 +13,6 @@ namespace kvt::ex::datetime {
 namespace {
 
 using detail::CanonicalRecord;
-using detail::DateTimeFields;
 using detail::Outcome;
 using detail::ValueAnswer;
 
@@ -26,22 +25,12 @@ bool hasTimeParts(const IntervalParts& interval) noexcept {
            interval.nanoseconds() > 0;
 }
 
-// A sum as the answer, of the kind of the value that it began with. A year out of range is a failure as long as it fits
-// four digits; beyond them the answer is an empty text.
-Outcome<ValueAnswer> answerOfSum(ValueAnswer answer, const DateTimeFields& sum) {
-    answer.fields = sum;
-    if (sum.year < detail::lowestYear || sum.year > detail::highestYear) {
-        if (sum.year >= 0 && sum.year < detail::lowestYear) {
-            return detail::yearOutOfRange(sum.year);
-        }
-        answer.kind = TemporalType::Unsupported;
-    }
-    return answer;
-}
-
+// The answer is of the kind of the value, but for a date to which a time is added, which becomes a datetime. A year out
+// of range is a failure as long as it fits four digits; beyond them the answer is an empty text.
 Outcome<ValueAnswer> addTo(const CanonicalRecord& record, const IntervalParts& interval) {
-    ValueAnswer answer = detail::answerOf(record);
-    // A date to which a time is added becomes a datetime.
+    Outcome<ValueAnswer> outcome;
+    ValueAnswer& answer = *outcome;
+    detail::setAnswer(answer, record);
     if (record.type == TemporalType::Date && hasTimeParts(interval)) {
         answer.kind = TemporalType::Datetime;
     }
@@ -51,9 +40,14 @@ Outcome<ValueAnswer> addTo(const CanonicalRecord& record, const IntervalParts& i
     if (record.offsetRepaired) {
         answer.state = ReturnState::Repaired;
     }
-    return detail::addInterval(answer.fields, interval).andThen([&](const DateTimeFields& sum) {
-        return answerOfSum(answer, sum);
-    });
+    if (const auto wrong = detail::addInterval(answer.fields, interval)) {
+        outcome = *wrong;
+    } else if (const std::int64_t year = answer.fields.year; year < detail::lowestYear && year >= 0) {
+        outcome = detail::yearOutOfRange(year);
+    } else if (year < 0 || year > detail::highestYear) {
+        answer.kind = TemporalType::Unsupported;
+    }
+    return outcome;
 }
 
 } // namespace

@@ -49,7 +49,7 @@ bool hasExactParts(const IntervalParts& interval) noexcept {
 
 } // namespace
 
-Outcome<DateTimeFields> addInterval(const DateTimeFields& fields, const IntervalParts& interval) {
+std::optional<DatePartRange> addInterval(DateTimeFields& fields, const IntervalParts& interval) {
     const CivilDate date = {fields.year, static_cast<unsigned>(fields.month),
                             static_cast<unsigned>(fields.day)};
     if (!isInRange(date)) {
@@ -59,12 +59,11 @@ Outcome<DateTimeFields> addInterval(const DateTimeFields& fields, const Interval
         return interval.negative() ? wrappingNegation(magnitude) : magnitude;
     };
     const CivilDate reached = dateAfter(date, signedPart(interval.years()), signedPart(interval.months()));
-    DateTimeFields sum = fields;
-    sum.year = reached.year;
-    sum.month = reached.month;
-    sum.day = reached.day;
     if (!hasExactParts(interval)) {
-        return sum;
+        fields.year = reached.year;
+        fields.month = reached.month;
+        fields.day = reached.day;
+        return std::nullopt;
     }
     const std::int64_t days = wrappingSum(daysOf(reached), signedPart(interval.days()));
     std::int64_t seconds = wrappingSum(wrappingProduct(days, 24), signedPart(interval.hours()));
@@ -72,8 +71,9 @@ Outcome<DateTimeFields> addInterval(const DateTimeFields& fields, const Interval
     seconds = wrappingSum(seconds, wrappingProduct(signedPart(interval.minutes()), secondsPerMinute));
     seconds = wrappingSum(seconds, signedPart(interval.seconds()));
     // The time of day joins as the nanoseconds that it is.
-    return fieldsFromCount(
+    fields = fieldsFromCount(
         timeCountOfSeconds(seconds, nanosecondsOfDay(fields) + signedPart(interval.nanoseconds())));
+    return std::nullopt;
 }
 
 // ---- Difference

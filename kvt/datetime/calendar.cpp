@@ -57,7 +57,7 @@ CivilDate civilFromDays(std::int64_t days) noexcept {
 }
 
 unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept {
-    constexpr unsigned lengths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    static constexpr unsigned lengths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
     if (month - 1 >= std::size(lengths)) {
         return 29;
     }
@@ -69,7 +69,7 @@ unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept {
 }
 
 std::string_view lastDayText(unsigned lastDay) noexcept {
-    constexpr std::string_view texts[] = {"28", "29", "30", "31"};
+    static constexpr std::string_view texts[] = {"28", "29", "30", "31"};
     return texts[lastDay - 28];
 }
 

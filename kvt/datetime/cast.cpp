@@ -17,13 +17,14 @@ using detail::Outcome;
 using detail::ValueAnswer;
 
 // The state says whether the offset was repaired, if the text has it.
-ValueAnswer castTo(TemporalType kind, const CanonicalRecord& record) noexcept {
-    ValueAnswer answer = detail::answerOf(record);
-    answer.kind = kind;
+Outcome<ValueAnswer> castTo(TemporalType kind, const CanonicalRecord& record) {
+    Outcome<ValueAnswer> answer;
+    detail::setAnswer(*answer, record);
+    answer->kind = kind;
     if (kind == TemporalType::Date) {
-        answer.offset.reset();
+        answer->offset.reset();
     } else if (record.offsetRepaired) {
-        answer.state = ReturnState::Repaired;
+        answer->state = ReturnState::Repaired;
     }
     return answer;
 }

@@ -22,7 +22,7 @@ namespace {
 using namespace detail;
 
 // What a pattern that fits gives: a date, a time or both, as it asks for them.
-ValueAnswer answerOf(const PatternReading& reading) noexcept {
+TextResult resultOf(const PatternReading& reading) {
     const bool hasTime = (reading.parts & timePart) != 0;
     const bool hasDate = (reading.parts & datePart) != 0 || !hasTime;
     const TemporalType kind = hasDate && hasTime ? TemporalType::Datetime
@@ -31,7 +31,7 @@ ValueAnswer answerOf(const PatternReading& reading) noexcept {
     // Offsets of 100 hours and more can be read but not written; there is none then.
     const std::optional<OffsetForm> offset =
         hasTime && (reading.parts & offsetPart) != 0 ? offsetOfMinutes(reading.offsetMinutes) : std::nullopt;
-    return {ReturnState::Success, kind, reading.fields, offset};
+    return detail::resultOf(ReturnState::Success, kind, reading.fields, offset);
 }
 
 // ---- Messages
@@ -132,7 +132,7 @@ TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bo
         if (keyword == Keyword::Iso) {
             PatternReading reading;
             if (readIso(trimmed(viewOf(value)), lenient, reading)) {
-                found = resultOf(answerOf(reading));
+                found = resultOf(reading);
             }
         } else if (const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient); !record) {
             found = makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
@@ -154,7 +154,7 @@ TextResult parseByPattern(std::string_view value, std::string_view pattern, bool
     const SystemBytes patternBytes(pattern);
     PatternReading reading;
     const auto failure = PatternReader(valueBytes.view(), patternBytes.view(), lenient).readAll(reading);
-    return failure ? failedBy(*failure, pattern, patternBytes.view()) : resultOf(answerOf(reading));
+    return failure ? failedBy(*failure, pattern, patternBytes.view()) : resultOf(reading);
 }
 
 } // namespace

@@ -133,9 +133,12 @@ DateTimeFields carriedFields(const CanonicalRecord& record) noexcept {
 
 // ---- Writing
 
-ValueAnswer answerOf(const CanonicalRecord& record) noexcept {
-    return {ReturnState::Success, record.type, carriedFields(record),
-            hasOffset(record.type) ? std::optional(record.offset) : std::nullopt};
+void setAnswer(ValueAnswer& answer, const CanonicalRecord& record) noexcept {
+    answer.kind = record.type;
+    answer.fields = carriedFields(record);
+    if (hasOffset(record.type)) {
+        answer.offset = record.offset;
+    }
 }
 
 ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant, ReturnState state) noexcept {
@@ -177,22 +180,22 @@ void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& f
 
 namespace {
 
-void writeAnswer(TextBuffer& text, const ValueAnswer& answer) {
-    writeCanonical(text, answer.kind, answer.fields,
-                   answer.offset ? answer.offset->view() : std::string_view());
+std::string_view viewOf(const std::optional<OffsetForm>& offset) noexcept {
+    return offset ? offset->view() : std::string_view();
 }
 
 } // namespace
 
-TextResult resultOf(const ValueAnswer& answer) {
+TextResult resultOf(ReturnState state, TemporalType kind, const DateTimeFields& fields,
+                    const std::optional<OffsetForm>& offset) {
     TextBuffer text;
-    writeAnswer(text, answer);
-    return TextResult(answer.state, UStringView<0>(text.view()), std::nullopt);
+    writeCanonical(text, kind, fields, viewOf(offset));
+    return TextResult(state, UStringView<0>(text.view()), std::nullopt);
 }
 
 UString<0> canonicalText(const ValueAnswer& answer) {
     TextBuffer text;
-    writeAnswer(text, answer);
+    writeCanonical(text, answer.kind, answer.fields, viewOf(answer.offset));
     return text.toString();
 }
 

@@ -10,8 +10,8 @@ namespace kvt::ex::datetime::detail {
 
 /// Years and months by the calendar, with the day cut to the length of the month once, then the rest as exact
 /// lengths. The sum of the years is kept in 16 bits, as the calendar of the `date` library keeps it. The numbers are
-/// within their bounds. A failure if their year is out of range; that of the result may be any.
-Outcome<DateTimeFields> addInterval(const DateTimeFields& fields, const IntervalParts& interval);
+/// within their bounds. A failure if their year is out of range, and nothing is added then; that of the sum may be any.
+std::optional<DatePartRange> addInterval(DateTimeFields& fields, const IntervalParts& interval);
 
 /// A length of time: years and months by the calendar, and what is left behind them.
 struct Difference {

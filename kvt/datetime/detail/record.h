@@ -69,15 +69,28 @@ struct ValueAnswer {
     std::optional<OffsetForm> offset;              ///< to be written behind the value
 };
 
-/// The record as it is, of its own kind. The offset is as it was written: "+10:75" stays.
-ValueAnswer answerOf(const CanonicalRecord& record) noexcept;
+/// Makes the answer the record as it is, of its own kind. The offset is as it was written: "+10:75" stays. In its place,
+/// since a copy of what was just written has to wait for it.
+void setAnswer(ValueAnswer& answer, const CanonicalRecord& record) noexcept;
+
+/// The same as a value.
+inline ValueAnswer answerOf(const CanonicalRecord& record) noexcept {
+    ValueAnswer answer;
+    setAnswer(answer, record);
+    return answer;
+}
 
 /// The instant, with its offset if it has one and there is a text for it.
 ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant,
                      ReturnState state = ReturnState::Success) noexcept;
 
-/// The answer with its text, which is made in its place.
-TextResult resultOf(const ValueAnswer& answer);
+/// A result with the text of these numbers, which is made in its place.
+TextResult resultOf(ReturnState state, TemporalType kind, const DateTimeFields& fields,
+                    const std::optional<OffsetForm>& offset);
+
+inline TextResult resultOf(const ValueAnswer& answer) {
+    return resultOf(answer.state, answer.kind, answer.fields, answer.offset);
+}
 
 /// The text alone.
 UString<0> canonicalText(const ValueAnswer& answer);
