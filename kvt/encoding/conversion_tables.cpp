@@ -238,7 +238,7 @@ void EncodingTable::add(char16_t unit, std::string_view bytes) {
     if (bytes.empty() || bytes.size() > 2) {
         return;
     }
-    const auto first = static_cast<unsigned char>(bytes[0]);
+    const std::size_t first = static_cast<unsigned char>(bytes[0]);
     const std::size_t code = bytes.size() == 1 ? first : first << 8 | static_cast<unsigned char>(bytes[1]);
     // The number would say something else.
     if (bytes.size() == 2 && (first == 0 || code == noCode)) {

@@ -305,7 +305,7 @@ TEST_P(ConversionTables, AgreeWithIcuOnTextsOfAllTheirCharacters) {
                     << subject.name << ' ' << hex(character);
             }
         }
-        for (const std::size_t shift : {0, 1, 3, 8, 15, 17}) {
+        for (const std::size_t shift : {0U, 1U, 3U, 8U, 15U, 17U}) {
             const std::string shifted =
                 hasAscii ? std::string(shift, '1') + text + std::string(33 - shift, '2') : text;
             const Raw raw = convertWithIcu("UTF-8", subject.name, shifted);

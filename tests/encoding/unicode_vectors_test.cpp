@@ -318,7 +318,8 @@ TEST_P(UnicodeVectors, SetsOfBytesKnowWhichOfABlockAreTheirs) {
             reinterpret_cast<std::uint8_t*>(in.end() - vectors::ByteSet::block - random() % 3);
         std::uint64_t expected = 0;
         for (std::size_t i = 0; i < vectors::ByteSet::block; ++i) {
-            bytes[i] = static_cast<std::uint8_t>(round < 4 ? round * 64 + static_cast<int>(i) : random());
+            bytes[i] =
+                static_cast<std::uint8_t>(round < 4 ? static_cast<std::size_t>(round) * 64 + i : random());
             expected |= std::uint64_t{isMember[bytes[i]]} << i;
         }
         ASSERT_EQ(set.bitsOf(bytes), expected) << round;
