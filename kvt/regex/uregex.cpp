@@ -23,26 +23,28 @@ namespace {
 using Groups = vector<std::pair<std::uint64_t, std::uint64_t>>;
 
 // The position of a group that took no part is one before `start`, modulo 2 to the 64th.
-Groups groupsOf(const boost::cmatch& result, std::string_view subject, std::uint64_t start) {
-    Groups groups;
+void fill(Groups& groups, const boost::cmatch& result, std::string_view subject, std::uint64_t start) {
     groups.reserve(result.size());
     for (const auto& group : result) {
         groups.emplace_back(group.matched ? static_cast<std::uint64_t>(group.first - subject.data())
                                           : start - 1,
                             static_cast<std::uint64_t>(group.length()));
     }
-    return groups;
 }
 
-Groups matchWhole(const detail::CompiledPattern* pattern, std::string_view subject) {
+void matchWhole(const detail::CompiledPattern* pattern, std::string_view subject, Groups& groups) {
     boost::cmatch result;
-    return pattern != nullptr && pattern->match(subject, result) ? groupsOf(result, subject, 0) : Groups();
+    if (pattern != nullptr && pattern->match(subject, result)) {
+        fill(groups, result, subject, 0);
+    }
 }
 
-Groups searchFrom(const detail::CompiledPattern* pattern, std::string_view subject, std::uint64_t start) {
+void searchFrom(const detail::CompiledPattern* pattern, std::string_view subject, std::uint64_t start,
+                Groups& groups) {
     boost::cmatch result;
-    return pattern != nullptr && pattern->search(subject, start, result) ? groupsOf(result, subject, start)
-                                                                         : Groups();
+    if (pattern != nullptr && pattern->search(subject, start, result)) {
+        fill(groups, result, subject, start);
+    }
 }
 
 } // namespace
@@ -86,12 +88,16 @@ URegex<N>::operator bool() const noexcept {
 
 template <std::uint32_t N>
 URegexMatch<N> URegex<N>::match(const UString<N>& subject) const {
-    return {subject, matchWhole(d().pattern.get(), subject)};
+    URegexMatch<N> match(subject);
+    matchWhole(d().pattern.get(), subject, match.groups_);
+    return match;
 }
 
 template <std::uint32_t N>
 URegexMatch<N> URegex<N>::search(const UString<N>& subject, std::uint64_t start) const {
-    return {subject, searchFrom(d().pattern.get(), subject, start)};
+    URegexMatch<N> match(subject);
+    searchFrom(d().pattern.get(), subject, start, match.groups_);
+    return match;
 }
 
 template class URegex<0>;

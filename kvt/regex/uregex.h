@@ -64,8 +64,7 @@ public:
 
 private:
     friend class URegex<N>;
-    URegexMatch(const UString<N>& subject, vector<Group> groups)
-        : subject_(subject), groups_(std::move(groups)) {}
+    explicit URegexMatch(const UString<N>& subject) : subject_(subject) {}
 
     UString<N> subject_;
     vector<Group> groups_;
