@@ -206,6 +206,29 @@ TEST_F(KvtMatch, CompleteLinesAreWrittenWithoutWaitingForMore) {
     EXPECT_EQ(read("out"), "a\nab\n");
 }
 
+TEST_F(KvtMatch, LinesAreCountedNumberedAndTurnedRound) {
+    const std::string text = "\uFEFFone\r\ntwo\nTHREE\nfour";
+    EXPECT_EQ(kvt({"match", "o"}, text).out, "\uFEFFone\r\ntwo\nfour\n");
+    EXPECT_EQ(kvt({"match", "-v", "o"}, text).out, "\uFEFFTHREE\n");
+    EXPECT_EQ(kvt({"match", "-n", "o"}, text).out, "\uFEFF1:one\r\n2:two\n4:four\n");
+    EXPECT_EQ(kvt({"match", "-vn", "o"}, text).out, "\uFEFF3:THREE\n");
+    EXPECT_EQ(kvt({"match", "-c", "o"}, text).out, "3\n");
+    EXPECT_EQ(kvt({"match", "-cv", "o"}, text).out, "1\n");
+    EXPECT_EQ(kvt({"match", "-c", "x"}, text).out, "0\n");
+    EXPECT_EQ(kvt({"match", "-i", "^t"}, text).out, "\uFEFFtwo\nTHREE\n");
+    EXPECT_EQ(kvt({"match", "--ignore-case", "e$|R$"}, text).out, "\uFEFFone\r\nTHREE\nfour\n");
+    write("one", "a\n");
+    write("two", "b\nc\n");
+    EXPECT_EQ(kvt({"match", "--count", ".", "one", "two"}).out, "one:1\ntwo:2\n");
+    const std::string wide = convert("UTF-8", "UTF-16LE", "a\nb\n").out;
+    EXPECT_EQ(kvt({"match", "-c", "b", "--encoding", "UTF-16LE"}, wide).out, "1\n");
+    EXPECT_EQ(kvt({"match", "-n", "b", "--encoding", "UTF-16LE"}, wide).out,
+              convert("UTF-8", "UTF-16LE", "2:b\n").out);
+    EXPECT_EQ(kvt({"match", "--groups", "-v", "b"}, text).status, 2);
+    EXPECT_EQ(kvt({"match", "--dialect", "legacy", "-i", "b"}, text).status, 2);
+    EXPECT_EQ(kvt({"match", "-i", "(b"}, text).err, kvt({"match", "(b"}, text).err);
+}
+
 TEST_F(KvtMatch, AClosedPipeEndsItQuietly) {
     ChildSetup made = setup({"match", "$"});
     const std::string piece(1 << 10, '\n');

@@ -13,6 +13,7 @@
 #include "text/line_reader.h"
 #include "text/text_writer.h"
 
+#include <cstdint>
 #include <optional>
 #include <stdexcept>
 
@@ -31,6 +32,9 @@ group, LINE:GROUP:POSITION:LENGTH:TEXT, and FILE: before it when there are
 several FILEs. Group 0 is the whole match; a group that took no part has '-' for
 its position and length. Lines are counted from 1. Positions are counted from 0
 in the line, and they and lengths in bytes of the line as UTF-8, whatever ENC is.
+
+With --count, prints how many lines there are, FILE: before it when there are
+several FILEs; with --line-number, the number of each line and a colon before it.
 
 The dialect 'perl' is the syntax of Perl's regular expressions. In 'legacy' the
 characters { } ( ) | are ordinary text, and so is $ but at the end: it has no
@@ -78,6 +82,10 @@ class MatchCommand : public Command {
 public:
     void declare(Syntax& syntax) override {
         syntax.operand("REGEX", regex_, "What to look for").required();
+        syntax.flag("-v,--invert-match", invert_, "Print the lines in which REGEX does not match");
+        syntax.flag("-c,--count", count_, "Print how many lines it would be, for each FILE");
+        syntax.flag("-n,--line-number", numbers_, "Print the number of each line before it");
+        syntax.flag("-i,--ignore-case", ignoreCase_, "Take letters of ASCII in either case for the same");
         syntax.flag("--groups", groups_, "Print where the groups of each match stand, not the lines");
         syntax.option("--dialect", dialect_, "WHICH",
                       "How REGEX is to be read: 'perl' (default) or 'legacy'");
@@ -86,7 +94,18 @@ public:
     }
 
     int run(Diagnostics& diagnostics) override {
-        pattern_ = compilePattern(regex_, choose("--dialect", dialect_, dialectChoices));
+        const Dialect dialect = choose("--dialect", dialect_, dialectChoices);
+        if (groups_ && (invert_ || count_ || numbers_)) {
+            throw Failure("--groups does not go with --invert-match, --count or --line-number");
+        }
+        if (ignoreCase_ && dialect != Dialect::Perl) {
+            throw Failure("--ignore-case goes with the dialect 'perl' only");
+        }
+        // By itself first, so that its faults are its own.
+        pattern_ = compilePattern(regex_, dialect);
+        if (ignoreCase_) {
+            pattern_ = compilePattern("(?i)" + regex_, dialect);
+        }
         const TextEncoding encoding = files_.encoding();
         const std::vector<std::string> inputs = files_.inputs();
         showFiles_ = inputs.size() > 1;
@@ -98,7 +117,7 @@ public:
                 LineReader reader(path, encoding);
                 refuseInPlace(*output, reader.input());
                 if (!writer) { // in the byte order of the first
-                    writer.emplace(*output, reader.encoding(), !groups_);
+                    writer.emplace(*output, reader.encoding(), !groups_ && !count_);
                 }
                 searchAll(reader, *writer, progress);
             }
@@ -110,14 +129,24 @@ public:
 private:
     void searchAll(LineReader& reader, TextWriter& writer, Progress& progress) {
         TextLine line{};
+        std::uint64_t found = 0;
         while (reader.readBlock()) {
             while (reader.next(line)) {
-                if (matches(line)) {
+                if (matches(line) == invert_) {
+                    continue;
+                }
+                ++found;
+                if (!count_) {
                     write(line, reader, writer);
                 }
             }
             writer.flush();
             progress.advance(reader.lastBlock());
+        }
+        if (count_) {
+            writer.buffer() +=
+                (showFiles_ ? reader.input().name() + ":" : std::string()) + std::to_string(found) + "\n";
+            writer.flush();
         }
     }
 
@@ -135,7 +164,11 @@ private:
         if (groups_) {
             appendGroups(line, places_, showFiles_, out);
         } else {
-            out.append(reader.takeMark()).append(line.text);
+            out.append(reader.takeMark());
+            if (numbers_) {
+                out.append(std::to_string(line.number)).append(":");
+            }
+            out.append(line.text);
             out += line.end.empty() ? "\n" : line.end;
         }
         writer.endLine(line);
@@ -146,6 +179,10 @@ private:
     FileOptions files_;
     bool showFiles_ = false;
     bool groups_ = false;
+    bool invert_ = false;
+    bool count_ = false;
+    bool numbers_ = false;
+    bool ignoreCase_ = false;
     std::unique_ptr<LinePattern> pattern_;
     GroupPlaces places_;
 };
