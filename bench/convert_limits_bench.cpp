@@ -1,6 +1,6 @@
 // How many times as fast as the plain design conversion has to be: a loop over ucnv_convertEx with a pivot of 1024 units
-// and chunks of 4096, one result string made afresh for each call. The C library's iconv and, where there is one, ICU's
-// own call for the pair are shown beside it.
+// and chunks of 4096, one result string made afresh for each call. The C library's iconv is held beside it. Behind that
+// come texts with losses, wwjd, strings of 14 bytes, and the registry of encodings on two threads.
 #include "limits.h"
 
 #include <kvt/kvt.h>
@@ -15,6 +15,7 @@
 #include <random>
 #include <sstream>
 #include <stdexcept>
+#include <thread>
 
 namespace {
 
@@ -163,11 +164,14 @@ kvt::bench::Way libraryWay(const Held& row, const std::string& text) {
     });
 }
 
-void holdConversions(Limits& limits, std::size_t bytes, const std::string& size, Bound bound) {
+/// What a text of `bytes` has to reach: the limit of its row, or one for all rows.
+void holdConversions(Limits& limits, std::size_t bytes, const std::string& size, double limitForAll) {
     for (const Held& row : held) {
         const Converter utf8("UTF-8");
         const Converter from(row.from);
         const Converter to(row.to);
+        // A long text first, which has the library build what tables there are for the pair.
+        libraryWay(row, convertPlainly(from, utf8, shuffled(row.text.sentence, textBytes)))(1);
         const std::string text = convertPlainly(from, utf8, shuffled(row.text.sentence, bytes));
         const std::string name = std::string(row.from) + " to " + row.to + ", " + row.text.name + ", " + size;
         limits.add(name, libraryWay(row, text));
@@ -175,20 +179,124 @@ void holdConversions(Limits& limits, std::size_t bytes, const std::string& size,
         limits.add(name + ": iconv",
                    way([iconv = Iconv(row.to, row.from), text] { return iconv.convert(text); }));
         limits.add(name + ": copy", way([text] { return std::string(text); }));
-        limits.hold({name, name + ": plain", bound, row.limit});
-        limits.hold({name, name + ": iconv", bound, 1});
+        limits.hold({name, name + ": plain", Bound::atLeast, limitForAll != 0 ? limitForAll : row.limit});
+        limits.hold({name, name + ": iconv", limitForAll != 0 ? Bound::shown : Bound::atLeast, 1});
         limits.hold({name, name + ": copy"});
     }
+}
+
+/// One character in twenty is lost.
+void holdLosses(Limits& limits) {
+    struct Lossy {
+        const char* to;
+        const char* good; ///< nineteen characters
+        const char* lost;
+    };
+    constexpr Lossy rows[] = {
+        {"ISO-8859-1", "abcdefghijklmnopqrs", "日"},
+        {"windows-1252", "Größe führen über l", "日"},
+        {"Shift_JIS", "いろはにほへとちりぬるをわかよたれそ", "é"},
+    };
+    for (const Lossy& row : rows) {
+        std::string text;
+        while (text.size() < textBytes / 4) {
+            text.append(row.good).append(row.lost);
+        }
+        const Encoding to{kvt::future::string_view(row.to)};
+        const std::string name = std::string("UTF-8 to ") + row.to + " with losses, ";
+        limits.add(name + "failure", way([to, text] {
+                       std::string out;
+                       try {
+                           ICUTranscoder(Encoding::Utf8, to).transcode<char, char>(text, out);
+                       } catch (const UStringTranscodingException& failure) {
+                           return failure.getLossyConversion().size();
+                       }
+                       return out.size();
+                   }));
+        limits.add(name + "stream", way([to, text] {
+                       std::string out;
+                       std::size_t losses = 0;
+                       const auto onLoss = [&](const Loss&) { ++losses; };
+                       StreamTranscoder stream(Encoding::Utf8, to);
+                       stream.convert(text, out, onLoss);
+                       stream.finish(out, onLoss);
+                       return losses;
+                   }));
+        limits.add(name + "plain", way([to = Converter(row.to), from = Converter("UTF-8"), text] {
+                       return convertPlainly(to, from, text);
+                   }));
+        limits.hold({name + "failure", name + "plain", Bound::atMost, 2});
+        limits.hold({name + "stream", name + "plain", Bound::atMost, 2});
+    }
+}
+
+void holdWwjd(Limits& limits) {
+    const std::string text = shuffled(ascii.sentence, textBytes / 4);
+    const UString<2> wide{UString<0>(text)};
+    const std::string tokens = detail::utf16ToWwjd({wide.rawData(), wide.size()});
+    limits.add("wwjdEncode", way([wide] { return detail::utf16ToWwjd({wide.rawData(), wide.size()}); }));
+    limits.add("wwjdDecode", way([tokens] {
+                   const char* data = nullptr;
+                   std::uint64_t size = 0;
+                   detail::wwjdDecode<char>(kvt::future::string_view(tokens), data, size);
+                   return size;
+               }));
+    limits.hold({"wwjdDecode", "wwjdEncode", Bound::atMost, 2});
+}
+
+template <std::uint32_t To, std::uint32_t From>
+void holdPair(Limits& limits, const char* name) {
+    const UString<From> text{UString<0>("fourteen bytes")};
+    limits.add(name, way([text] { return UString<To>(text); }));
+    limits.hold({name, "copy of UString<0>, 14 bytes", Bound::atMost, 25.0 / 9});
+}
+
+void holdShortPairs(Limits& limits) {
+    limits.add("copy of UString<0>, 14 bytes",
+               way([text = UString<0>("fourteen bytes")] { return UString<0>(text); }));
+    holdPair<2, 0>(limits, "UString<2>(UString<0>), 14 bytes");
+    holdPair<3, 0>(limits, "UString<3>(UString<0>), 14 bytes");
+    holdPair<0, 2>(limits, "UString<0>(UString<2>), 14 bytes");
+    holdPair<3, 2>(limits, "UString<3>(UString<2>), 14 bytes");
+    holdPair<0, 3>(limits, "UString<0>(UString<3>), 14 bytes");
+    holdPair<2, 3>(limits, "UString<2>(UString<3>), 14 bytes");
+}
+
+/// Two threads do 1.8 times the work of one.
+template <typename Work>
+void holdScaling(Limits& limits, const std::string& name, Work work) {
+    const auto one = [work](int calls) {
+        for (int i = 0; i < calls; ++i) {
+            auto result = work();
+            benchmark::DoNotOptimize(&result);
+        }
+    };
+    limits.add(name + ", one thread", one);
+    limits.add(name + ", two threads", [one](int calls) {
+        std::thread other(one, calls);
+        one(calls);
+        other.join();
+    });
+    limits.hold({name + ", two threads", name + ", one thread", Bound::atMost, 2 / 1.8});
 }
 
 } // namespace
 
 int main(int argc, char** argv) {
     Limits large(31, 1);
-    holdConversions(large, textBytes, "1 MiB", Bound::atLeast);
+    holdConversions(large, textBytes, "1 MiB", 0);
+    holdLosses(large);
+    holdWwjd(large);
     Limits small(101, 2000);
-    holdConversions(small, 64, "64 bytes", Bound::shown);
-    holdConversions(small, 16, "16 bytes", Bound::shown);
-    const bool isLargeWithin = large.run(argc, argv) == 0;
-    return small.run(argc, argv) == 0 && isLargeWithin ? 0 : 1;
+    holdConversions(small, 64, "64 bytes", 4);
+    holdConversions(small, 16, "16 bytes", 3);
+    holdShortPairs(small);
+    Limits threads(15, 1000000);
+    holdScaling(threads, "getName", [encoding = Encoding("KOI8-R")] { return encoding.getName(); });
+    holdScaling(threads, "Encoding(name)", [] { return Encoding("KOI8-R"); });
+    bool areAllWithin = true;
+    for (Limits* const limits : {&large, &small, &threads}) {
+        areAllWithin = limits->run(argc, argv) == 0 && areAllWithin;
+    }
+    return areAllWithin ? 0 : 1;
 }

@@ -39,6 +39,7 @@ using Pivot = std::array<char16_t, pivotUnits>;
 // measured to its end after each of them. As long as all goes well, pieces become longer by the factor, as far as the next
 // step still finds them in the cache.
 constexpr std::size_t firstPiece = 32;
+constexpr std::size_t onePiece = 256; // Less than this is taken at once.
 constexpr std::size_t pieceFactor = 4;
 constexpr std::size_t longestPiece = 8192;
 
@@ -398,7 +399,7 @@ template <typename CharOut>
 std::size_t convertMeasured(Form from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
     const std::size_t before = out.size();
     std::size_t taken = 0;
-    std::size_t pieceBytes = isUnicode(to.form) ? in.size() : firstPiece;
+    std::size_t pieceBytes = isUnicode(to.form) || in.size() <= onePiece ? in.size() : firstPiece;
     for (bool ended = false; !ended && taken < in.size();) {
         std::string_view piece = in.substr(taken, pieceBytes);
         const Extent extent = measure(from, piece);
@@ -431,8 +432,8 @@ std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view
     const std::size_t before = out.size();
     std::size_t taken = 0;
     Pivot pivot;
-    for (std::size_t pieceUnits = isUnicode(to.form) ? pivotUnits : firstPiece; taken < in.size();
-         pieceUnits = std::min(pieceUnits * pieceFactor, pivotUnits)) {
+    for (std::size_t pieceUnits = isUnicode(to.form) || in.size() <= onePiece ? pivotUnits : firstPiece;
+         taken < in.size(); pieceUnits = std::min(pieceUnits * pieceFactor, pivotUnits)) {
         std::string_view rest = in.substr(taken);
         const std::size_t units = table.read(rest, pivot.data(), pieceUnits);
         const Extent extent = vectors::measureUtf16(reinterpret_cast<const char*>(pivot.data()), units);
