@@ -1,9 +1,10 @@
 #!/usr/bin/env bash
-# What libkvt.so exports.
+# What libkvt.so exports, and what it takes from others.
 #
 #   exported_names.sh list LIBRARY            prints the names
 #   exported_names.sh own LIBRARY             fails on a name outside namespace kvt and the named global classes
 #   exported_names.sh compare LIBRARY FILE    fails when the names are not those of the reviewed FILE
+#   exported_names.sh needed LIBRARY          fails when it loads a library that it is not known to need
 #
 # `./dev exports` refreshes the reviewed file.
 
@@ -49,10 +50,23 @@ compare() {
     }
 }
 
+# Each library that is loaded costs the start of every program, some of them much.
+needed() {
+    local strangers
+    strangers=$(objdump -p "$1" | sed -n 's/^ *NEEDED *//p' |
+        grep -Ev '^(libicuuc|libicudata|libdouble-conversion|libstdc\+\+|libgcc_s|libm|libc|ld-linux-[a-z0-9_-]+)\.so\.' ||
+        true)
+    if [[ -n $strangers ]]; then
+        echo "loaded, but not known to be needed:"
+        echo "$strangers"
+        return 1
+    fi
+}
+
 case ${1:-} in
-list | own | compare) "$@" ;;
+list | own | compare | needed) "$@" ;;
 *)
-    sed -n '2,8s/^# \{0,1\}//p' "$0" >&2
+    sed -n '2,9s/^# \{0,1\}//p' "$0" >&2
     exit 2
     ;;
 esac
