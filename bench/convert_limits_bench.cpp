@@ -2,6 +2,7 @@
 // and chunks of 4096, one result string made afresh for each call. The C library's iconv is held beside it. Behind that
 // come texts with losses, wwjd, strings of 14 bytes, and the registry of encodings on two threads.
 #include "limits.h"
+#include "texts.h"
 
 #include <kvt/kvt.h>
 
@@ -13,33 +14,22 @@
 #include <cerrno>
 #include <memory>
 #include <random>
-#include <sstream>
 #include <stdexcept>
 #include <thread>
 
 namespace {
 
 using namespace kvt::ex;
+using kvt::bench::ascii;
 using kvt::bench::Bound;
+using kvt::bench::japanese;
+using kvt::bench::latin;
 using kvt::bench::Limits;
+using kvt::bench::shuffled;
+using kvt::bench::Text;
 using kvt::bench::way;
 
 constexpr std::size_t textBytes = 1 << 20;
-
-/// Words of a sentence in a random order, since a text that repeats itself flatters whatever branches on characters.
-std::string shuffled(const char* sentence, std::size_t bytes) {
-    std::istringstream stream(sentence);
-    std::vector<std::string> words;
-    for (std::string word; stream >> word;) {
-        words.push_back(word + " ");
-    }
-    std::mt19937_64 random(1);
-    std::string text;
-    while (text.size() < bytes) {
-        text += words[random() % words.size()];
-    }
-    return text;
-}
 
 class Converter {
 public:
@@ -98,11 +88,6 @@ private:
     std::shared_ptr<void> descriptor_;
 };
 
-struct Text {
-    const char* name;
-    const char* sentence;
-};
-
 struct Held {
     const char* from;
     const char* to;
@@ -110,12 +95,6 @@ struct Held {
     double limit;
 };
 
-constexpr Text ascii{"ASCII", "The quick brown fox jumps over the lazy dog, and the dog does not mind it. "};
-constexpr Text latin{"Latin",
-                     "Größere Brücken führen über die Flüsse; l'été, déjà, où l'élève rêve à côté. "};
-constexpr Text japanese{
-    "Japanese",
-    "いろはにほへと ちりぬるを わかよたれそ 常ならむ、 有為の奥山 今日越えて 浅き夢見じ 酔ひもせず。"};
 constexpr Text simplified{"Chinese",
                           "春眠不觉晓， 处处闻啼鸟。 夜来风雨声， 花落知多少。 白日依山尽， 黄河入海流。"};
 constexpr Text traditional{"Chinese",

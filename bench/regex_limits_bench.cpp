@@ -1,15 +1,14 @@
 // What searching with a URegex must reach beside the engine itself: boost::regex with a match that is used again, without
 // the copy of the subject that a URegexMatch holds. std::regex is shown.
 #include "limits.h"
+#include "texts.h"
 
 #include <kvt/regex/uregex.h>
 
 #include <boost/regex.hpp>
 
 #include <algorithm>
-#include <array>
 #include <memory>
-#include <random>
 #include <regex>
 #include <string>
 #include <thread>
@@ -19,40 +18,13 @@ namespace {
 using namespace kvt::ex;
 using kvt::bench::Bound;
 using kvt::bench::Limits;
+using kvt::bench::logText;
+using kvt::bench::prose;
 using kvt::bench::way;
 using kvt::bench::Way;
 
 UString<0> string(const std::string& text) {
     return UString<0>(UStringView<0>(text));
-}
-
-/// Lines of a log, without a date and without the words that are sought, but for one at the end.
-std::string logText(std::size_t size) {
-    const std::array<const char*, 6> lines = {
-        "12:03:55.120 INFO  [pool-3] request 4711 from 10.0.12.7 took 15 ms, 2048 bytes sent\n",
-        "12:03:55.121 DEBUG [pool-1] cache hit for key user/77/profile, age 35 s\n",
-        "12:03:56.007 WARN  [main] queue has 120 of 128 places taken\n",
-        "12:03:56.450 INFO  [pool-2] session 9f3c-22 opened, 3 others active\n",
-        "12:03:57.003 INFO  [pool-3] request 4712 from 10.0.12.9 took 7 ms, 512 bytes sent\n",
-        "12:03:58.999 DEBUG [gc] pause of 3 ms, 512 MB of 2048 MB in use\n",
-    };
-    std::mt19937_64 random(1);
-    std::string text;
-    while (text.size() < size) {
-        text += lines[random() % lines.size()];
-    }
-    return text + "2020-01-31 12:04:00.000 ERROR [main] disk full\n";
-}
-
-/// Sentences without digits.
-std::string prose(std::size_t size) {
-    const std::string sentence = "the lazy dog and the other animals looked on, as the fox came; ";
-    std::string text;
-    while (text.size() < size) {
-        text += sentence;
-    }
-    text.resize(size);
-    return text;
 }
 
 Way kvtWay(const std::string& pattern, const std::string& text) {

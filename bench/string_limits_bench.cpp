@@ -1,6 +1,7 @@
 // What splitting, searching, hashing and case mapping must reach beside the plain way to do each: the standard library's
 // strings, a loop over the bytes, and ICU's own calls.
 #include "limits.h"
+#include "texts.h"
 
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
@@ -10,8 +11,6 @@
 
 #include <cstring>
 #include <memory>
-#include <random>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -30,18 +29,6 @@ UString<0> string(const std::string& text) {
 
 // ---- Splitting ----------------------------------------------------------------------------------------------------
 
-std::string fields(std::size_t length) {
-    std::mt19937_64 random(1);
-    std::string text;
-    while (text.size() < mebibyte) {
-        for (std::size_t i = 0; i < length; ++i) {
-            text += static_cast<char>('a' + random() % 26);
-        }
-        text += ',';
-    }
-    return text;
-}
-
 std::vector<std::string> splitPlainly(const std::string& text) {
     std::vector<std::string> pieces;
     std::size_t start = 0;
@@ -54,25 +41,13 @@ std::vector<std::string> splitPlainly(const std::string& text) {
 
 void holdSplit(Limits& limits, std::size_t length, double limit) {
     const std::string name = "split, fields of " + std::to_string(length);
-    const std::string text = fields(length);
+    const std::string text = kvt::bench::fields(length, mebibyte);
     limits.add(name, way([string = string(text)] { return string.split(','); }));
     limits.add(name + ": find and push_back", way([text] { return splitPlainly(text); }));
     limits.hold({name, name + ": find and push_back", Bound::atLeast, limit});
 }
 
 // ---- Searching ----------------------------------------------------------------------------------------------------
-
-/// Sentences in which the first unit of a needle is frequent and the needle is not.
-std::string prose(std::size_t size) {
-    const std::string sentence =
-        "the lazy dog and the other animals looked on, zealous and amazed, as the fox came; ";
-    std::string text;
-    while (text.size() < size) {
-        text += sentence;
-    }
-    text.resize(size);
-    return text;
-}
 
 /// The first byte by the C library, and then all of them.
 std::size_t findPlainly(const std::string& text, const std::string& needle) {
@@ -94,7 +69,7 @@ std::size_t findPlainly(const std::string& text, const std::string& needle) {
 
 void holdFind(Limits& limits, const std::string& name, std::size_t size, const std::string& needle,
               bool isPlain, Bound bound, double limit) {
-    const std::string text = prose(size);
+    const std::string text = kvt::bench::prose(size);
     limits.add(name, way([text = string(text), needle = string(needle)] { return text.find(needle); }));
     const std::string other = name + (isPlain ? ": memchr and memcmp" : ": std::string::find");
     limits.add(other, way([text, needle, isPlain] {
@@ -123,7 +98,7 @@ template <std::uint32_t N>
 void showOthers(Limits& limits, const std::string& unit) {
     using Text = std::basic_string<typename UString<N>::value_type>;
     constexpr std::size_t size = 100'000;
-    const UString<N> text = stringOf<N>(prose(size));
+    const UString<N> text = stringOf<N>(kvt::bench::prose(size));
     const UString<N> needle = stringOf<N>("animal kingdom");
     const UString<N> from = stringOf<N>("animals");
     const UString<N> to = stringOf<N>("creatures");
@@ -169,28 +144,13 @@ void showOthers(Limits& limits, const std::string& unit) {
 }
 
 void holdHash(Limits& limits, const std::string& name, std::size_t size, double limit) {
-    const std::string text = prose(size);
+    const std::string text = kvt::bench::prose(size);
     limits.add(name, way([text = string(text)] { return text.hash(); }));
     limits.add(name + ": a loop over the bytes", way([text] { return hashPlainly(text); }));
     limits.hold({name, name + ": a loop over the bytes", Bound::atLeast, limit});
 }
 
 // ---- Case mapping -------------------------------------------------------------------------------------------------
-
-/// Words of a sentence in a random order, since a text that repeats itself flatters whatever branches on characters.
-std::string shuffled(const char* sentence) {
-    std::istringstream stream(sentence);
-    std::vector<std::string> words;
-    for (std::string word; stream >> word;) {
-        words.push_back(word + " ");
-    }
-    std::mt19937_64 random(1);
-    std::string text;
-    while (text.size() < mebibyte) {
-        text += words[random() % words.size()];
-    }
-    return text;
-}
 
 using CaseFunction = std::int32_t (*)(const UCaseMap*, char*, std::int32_t, const char*, std::int32_t,
                                       UErrorCode*);
@@ -238,7 +198,7 @@ void holdCase(Limits& limits) {
     };
     UErrorCode status = U_ZERO_ERROR;
     const std::shared_ptr<UCaseMap> map(ucasemap_open("", 0, &status), &ucasemap_close);
-    const UString<2> wide(string(shuffled(texts[1].sentence)));
+    const UString<2> wide(string(kvt::bench::shuffled(texts[1].sentence, mebibyte)));
     limits.add("fold UTF-16, Latin", way([wide] { return wide.getAsFoldedCase(); }));
     limits.add("fold UTF-16, Latin: u_strFoldCase", way([wide] {
                    std::u16string result(wide.size() * 2, u'\0');
@@ -252,7 +212,7 @@ void holdCase(Limits& limits) {
     for (const Mapping& mapping : mappings) {
         for (const Text& row : texts) {
             const std::string name = std::string(mapping.name) + ", " + row.name;
-            const std::string text = shuffled(row.sentence);
+            const std::string text = kvt::bench::shuffled(row.sentence, mebibyte);
             limits.add(name,
                        way([string = string(text), member = mapping.member] { return (string.*member)(); }));
             limits.add(name + ": ucasemap", way([map, function = mapping.function, text] {

@@ -66,7 +66,7 @@ inline std::string logText(std::size_t bytes) {
     return text + "2020-01-31 12:04:00.000 ERROR [main] disk full\n";
 }
 
-/// Sentences without digits.
+/// Sentences without digits, in which the first letters of words are frequent.
 inline std::string prose(std::size_t bytes) {
     const std::string sentence = "the lazy dog and the other animals looked on, as the fox came; ";
     std::string text;
