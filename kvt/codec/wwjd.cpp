@@ -124,10 +124,10 @@ private:
 char16_t hexadecimalUnit(std::string_view digits) {
     unsigned unit = 0;
     const auto isDigit = [&](char c) {
-        const auto lower = static_cast<unsigned char>(c | 0x20);
-        const unsigned digit = c >= '0' && c <= '9'           ? c - '0'
-                               : lower >= 'a' && lower <= 'f' ? lower - 'a' + 10U
-                                                              : 16;
+        const auto lower = static_cast<unsigned>(static_cast<unsigned char>(c)) | 0x20U;
+        const unsigned digit = lower >= 'a' && lower <= 'f' ? lower - 'a' + 10
+                               : c >= '0' && c <= '9'       ? lower - '0'
+                                                            : 16;
         unit = unit << 4 | digit;
         return digit < 16;
     };
