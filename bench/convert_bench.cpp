@@ -69,8 +69,8 @@ std::string convert(std::string_view text, const char* from, const char* to) {
     return out;
 }
 
-/// The words of the sample in a random order, in the source encoding of a pair. In a text that repeats itself a processor
-/// foresees where the next character of several bytes stands, as it does in no other.
+/// The words of the sample in a random order, in the source encoding of a pair. In a text that repeats itself a
+/// processor foresees where the next character of several bytes stands, as it does in no other.
 std::string sourceText(const Text& text, const char* encoding) {
     std::vector<std::string> words;
     std::istringstream sample(text.sample);

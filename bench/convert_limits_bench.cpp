@@ -1,6 +1,6 @@
-// How many times as fast as the plain design conversion has to be: a loop over ucnv_convertEx with a pivot of 1024 units
-// and chunks of 4096, one result string made afresh for each call. The C library's iconv is held beside it. Behind that
-// come texts with losses, wwjd, strings of 14 bytes, and the registry of encodings on two threads.
+// How many times as fast as the plain design conversion has to be: a loop over ucnv_convertEx with a pivot of 1024
+// units and chunks of 4096, one result string made afresh for each call. The C library's iconv is held beside it.
+// Behind that come texts with losses, wwjd, strings of 14 bytes, and the registry of encodings on two threads.
 #include "limits.h"
 #include "texts.h"
 

@@ -1,6 +1,6 @@
-// The library beside what users would pick instead, each work as that library is meant to be used. It has to be ahead of
-// them, but for what compiles a pattern to machine code and for {fmt}, which are shown. The texts are UTF-8 of 1 MiB,
-// unless a row says otherwise; each call makes its result afresh.
+// The library beside what users would pick instead, each work as that library is meant to be used. It has to be ahead
+// of them, but for what compiles a pattern to machine code and for {fmt}, which are shown. The texts are UTF-8 of 1
+// MiB, unless a row says otherwise; each call makes its result afresh.
 #include "limits.h"
 #include "texts.h"
 

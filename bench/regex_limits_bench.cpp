@@ -1,5 +1,5 @@
-// What searching with a URegex must reach beside the engine itself: boost::regex with a match that is used again, without
-// the copy of the subject that a URegexMatch holds. std::regex is shown.
+// What searching with a URegex must reach beside the engine itself: boost::regex with a match that is used again,
+// without the copy of the subject that a URegexMatch holds. std::regex is shown.
 #include "limits.h"
 #include "texts.h"
 

@@ -3,8 +3,8 @@
 //     report RESULTS [--against EARLIER] [--svg FILE]
 //
 // RESULTS is what they wrote with --results=FILE: work, other way, kind of bound, limit, ratio, and the nanoseconds of
-// both. With EARLIER, such a file of another run, each row shows how its ratio has changed. The exit status is 1 where a
-// row misses its limit.
+// both. With EARLIER, such a file of another run, each row shows how its ratio has changed. The exit status is 1 where
+// a row misses its limit.
 #include <algorithm>
 #include <cmath>
 #include <cstdio>

@@ -1,5 +1,5 @@
-// What splitting, searching, hashing and case mapping must reach beside the plain way to do each: the standard library's
-// strings, a loop over the bytes, and ICU's own calls.
+// What splitting, searching, hashing and case mapping must reach beside the plain way to do each: the standard
+// library's strings, a loop over the bytes, and ICU's own calls.
 #include "limits.h"
 #include "texts.h"
 

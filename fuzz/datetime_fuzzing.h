@@ -54,8 +54,8 @@ inline void requireShape(const kvt::ex::datetime::TextResult& result) {
     }
 }
 
-/// Whether a fraction that was rounded up, or a day that `lenient` let run over, has led behind the last year. Such a text
-/// has one digit more than a value and cannot be read again.
+/// Whether a fraction that was rounded up, or a day that `lenient` let run over, has led behind the last year. Such a
+/// text has one digit more than a value and cannot be read again.
 inline bool isBehindLastYear(const kvt::ex::datetime::TextResult& result) {
     const std::size_t digits = textOf(result).find_first_not_of("0123456789");
     const std::size_t length = std::min(digits, textOf(result).size());

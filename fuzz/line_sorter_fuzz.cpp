@@ -1,9 +1,10 @@
 // LineSorter against std::stable_sort, with so little memory that a few hundred bytes become several levels of runs.
 //
 // Input: a byte of flags (1 descending, 2 only the first of equal lines, in the order of the input), a byte for the
-// memory, then lines. Nearly all the time goes into segments of the workspace, one for each run, at some twenty calls to
-// the system. So the workspace lies in a file system in memory, where there is one, since on a disk it takes a hundred
-// times as long to give a segment back; and there are only so many lines that each number of levels comes about.
+// memory, then lines. Nearly all the time goes into segments of the workspace, one for each run, at some twenty calls
+// to the system. So the workspace lies in a file system in memory, where there is one, since on a disk it takes a
+// hundred times as long to give a segment back; and there are only so many lines that each number of levels comes
+// about.
 #include <fuzzing.h>
 
 #include <sort/line_sorter.h>

@@ -1,4 +1,5 @@
-// inspectMemoryFile: whatever is in a file, reading stays within it, ends, and gives a report that adds up or a Failure.
+// inspectMemoryFile: whatever is in a file, reading stays within it, ends, and gives a report that adds up or a
+// Failure.
 //
 // Input: a byte that says whether and how a size for the header segment is given, then the file. The corpus begins with
 // real files whose segments are small; damage to them is what reaches the table and the lists.

@@ -1,8 +1,9 @@
 // Strings of each type made from bytes in any encoding, against ICU alone; and from each of them to all others,
 // which must end in a string or in one of the stated failures, whatever the bytes are.
 //
-// Input: encoding, what is checked, then the bytes. The replay checks everything on each input. libFuzzer, which counts its
-// runs, checks one thing in each: nearly all of the time goes into failures, and there are a hundred for one input of noise.
+// Input: encoding, what is checked, then the bytes. The replay checks everything on each input. libFuzzer, which counts
+// its runs, checks one thing in each: nearly all of the time goes into failures, and there are a hundred for one input
+// of noise.
 #include <fuzzing.h>
 #include <reference/wwjd_reference.h>
 #include <support/outcome.h>

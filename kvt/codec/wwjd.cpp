@@ -1,7 +1,7 @@
 // The codec of the wwjd text encoding.
 //
-// Both decoders know the named tokens by one table. The one to UTF-16 walks from token to token, as its failure says where the
-// last one ended; the one to bytes goes byte by byte.
+// Both decoders know the named tokens by one table. The one to UTF-16 walks from token to token, as its failure says
+// where the last one ended; the one to bytes goes byte by byte.
 #include <kvt/codec/wwjd.h>
 
 #include <kvt/encoding/detail/failure_text.h>
@@ -214,8 +214,8 @@ UString<2> wwjdToUtf16(std::string_view text) {
     return UString<2>(out.data(), out.size());
 }
 
-// Nothing here depends on where the ">" of something stands that is no name, so a look at the bytes of the longest name is
-// enough at each "<". No result is longer than its text.
+// Nothing here depends on where the ">" of something stands that is no name, so a look at the bytes of the longest name
+// is enough at each "<". No result is longer than its text.
 std::string wwjdToBytes(std::string_view text) {
     std::string out(text.size(), '\0');
     char* target = out.data();

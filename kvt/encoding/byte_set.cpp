@@ -1,8 +1,8 @@
 // Sets of bytes (see detail/byte_set.h): one source, compiled for each instruction set that Highway knows for this
 // processor family, and chosen when it is first called.
 //
-// Each half of a byte chooses one byte of a table: the lower half those upper halves that are in the set with it, the upper
-// half its own bit.
+// Each half of a byte chooses one byte of a table: the lower half those upper halves that are in the set with it, the
+// upper half its own bit.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/byte_set.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h

@@ -94,10 +94,11 @@ bool areAscii(const char16_t* p) {
     return (all & 0xFF80FF80FF80FF80U) == 0;
 }
 
-/// The bytes that end a pair, in a block that begins with a character: those behind a byte that begins one, where that is no
-/// end itself. In a run of such bytes that is every second one, behind it the next byte if the run's length is odd. The
-/// carry of an addition runs through each of them (as G. Langdale and D. Lemire find what a run of backslashes escapes, in
-/// "Parsing Gigabytes of JSON per Second", 2019). `overhang` is whether the last pair ends behind the block.
+/// The bytes that end a pair, in a block that begins with a character: those behind a byte that begins one, where that
+/// is no end itself. In a run of such bytes that is every second one, behind it the next byte if the run's length is
+/// odd. The carry of an addition runs through each of them (as G. Langdale and D. Lemire find what a run of backslashes
+/// escapes, in "Parsing Gigabytes of JSON per Second", 2019). `overhang` is whether the last pair ends behind the
+/// block.
 std::uint64_t endsOfPairs(std::uint64_t leads, bool& overhang) {
     constexpr std::uint64_t even = 0x5555555555555555U;
     const std::uint64_t behindLead = leads << 1;
@@ -288,7 +289,8 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
     return {i, i};
 }
 
-// Whether a character has one byte or two is no branch, since texts have both in no order that a processor could foresee.
+// Whether a character has one byte or two is no branch, since texts have both in no order that a processor could
+// foresee.
 EncodingTable::Written EncodingTable::writePairs(const char16_t* units, std::size_t count, char* out) const {
     constexpr std::size_t block = 16;
     const std::uint16_t* const pageOf = pageOf_.data();

@@ -18,8 +18,8 @@ using detail::TranscoderHelper;
 constexpr std::size_t largestPiece = std::size_t{1} << 30;
 constexpr std::size_t outputUnits = 4096;
 
-// The bytes for which ICU is asked where the short way ends: those of one character at first, and twice as many each time
-// that the short way found little to take behind them. Less than this costs ICU no more than to come and go.
+// The bytes for which ICU is asked where the short way ends: those of one character at first, and twice as many each
+// time that the short way found little to take behind them. Less than this costs ICU no more than to come and go.
 constexpr std::size_t firstLook = 4;
 constexpr std::size_t longestLook = 1024;
 constexpr std::size_t little = 128;
@@ -39,8 +39,8 @@ Losses takeLosses(TranscoderHelper& from, TranscoderHelper& to) {
     return badInput ? Losses::badInput : notRepresentable ? Losses::notRepresentable : Losses::none;
 }
 
-// Converts `length` bytes of `text` by ICU and takes them from it; and further ones, where `untilSettled`, as long as one of
-// the converters holds the beginning of something. Returns false when ICU gave up.
+// Converts `length` bytes of `text` by ICU and takes them from it; and further ones, where `untilSettled`, as long as
+// one of the converters holds the beginning of something. Returns false when ICU gave up.
 template <typename CharOut>
 bool convertByIcu(ICUTranscoder& transcoder, TranscoderHelper& from, TranscoderHelper& to,
                   std::string_view& text, std::size_t length, bool untilSettled, bool& reset,

@@ -2,10 +2,10 @@
 //
 // A conversion is measured first: how much of the input is well-formed and complete, and how long the result will be.
 // Then the result is made in one piece. Between UTF-8, UTF-16 and UTF-32 in the machine's byte order, that is one step
-// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the code pages by
-// their tables, which are read once only, so that what they hold is measured as UTF-16; the forms in the other byte order
-// by swapping. What is not well-formed, is cut off, or is more than the target's form can say, is left to ICU, so this
-// code decides nothing about substitutions.
+// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the code pages
+// by their tables, which are read once only, so that what they hold is measured as UTF-16; the forms in the other byte
+// order by swapping. What is not well-formed, is cut off, or is more than the target's form can say, is left to ICU, so
+// this code decides nothing about substitutions.
 //
 // What ICU does with the text that is taken here, and so must hold for these ways to be the same ones:
 //
@@ -36,8 +36,8 @@ constexpr std::size_t pivotUnits = 2048;
 using Pivot = std::array<char16_t, pivotUnits>;
 
 // The bytes that are tried first where the target may lack a character, so that a text with many such characters is not
-// measured to its end after each of them. As long as all goes well, pieces become longer by the factor, as far as the next
-// step still finds them in the cache.
+// measured to its end after each of them. As long as all goes well, pieces become longer by the factor, as far as the
+// next step still finds them in the cache.
 constexpr std::size_t firstPiece = 32;
 constexpr std::size_t onePiece = 256; // Less than this is taken at once.
 constexpr std::size_t pieceFactor = 4;
@@ -232,8 +232,8 @@ std::size_t roomFor(const Extent& extent, Side to) {
 
 // ---- By way of UTF-16 --------------------------------------------------------------------------------------------
 
-/// Reads well-formed text of a form without tables up to a character border, until the pivot is full. Returns the units;
-/// `in` is moved on.
+/// Reads well-formed text of a form without tables up to a character border, until the pivot is full. Returns the
+/// units; `in` is moved on.
 std::size_t decode(Form from, std::string_view& in, Pivot& pivot) {
     auto* const out = reinterpret_cast<char*>(pivot.data());
     std::size_t bytes = std::min(in.size(), pivotUnits * unitBytes(from));
@@ -383,9 +383,9 @@ Progress convertWellFormed(Form from, Side to, std::string_view in, char* out, s
     return {in.size(), convert(in.data(), in.size() / unitBytes(from), out, room / unit) * unit};
 }
 
-/// Makes room for what is likely to come of the rest of a text, by what came of its beginning, so that the result does not
-/// move with each piece that is appended. It is short of the truth or too much by little; to be exact, all of the text
-/// would have to be read through its table twice.
+/// Makes room for what is likely to come of the rest of a text, by what came of its beginning, so that the result does
+/// not move with each piece that is appended. It is short of the truth or too much by little; to be exact, all of the
+/// text would have to be read through its table twice.
 template <typename CharOut>
 void reserveForRest(std::basic_string<CharOut>& out, std::size_t written, std::size_t taken,
                     std::size_t rest) {

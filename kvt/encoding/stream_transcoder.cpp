@@ -5,8 +5,8 @@
 // across calls. Such a slice is done again from its beginning, byte by byte: what comes out after a byte is the
 // character that ended with it. So each unit of UTF-16 is known with the bytes that it comes from.
 //
-// The caller's blocks must not show in the result. So nothing rests on where a slice ended, and a slice is taken back by
-// copies of the converters that were made before it, or by a reset where that comes to the same.
+// The caller's blocks must not show in the result. So nothing rests on where a slice ended, and a slice is taken back
+// by copies of the converters that were made before it, or by a reset where that comes to the same.
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <kvt/encoding/detail/icu.h>
@@ -186,8 +186,8 @@ private:
     std::exception_ptr exception_; // that a callback could not throw through ICU
 };
 
-// Converts a slice whole. When something is lost in it, all is as it was before, and the answer is false. So it is where
-// it could not be known afterwards, or not be taken back, what the converters hold.
+// Converts a slice whole. When something is lost in it, all is as it was before, and the answer is false. So it is
+// where it could not be known afterwards, or not be taken back, what the converters hold.
 bool StreamTranscoder::Impl::convertFast(std::string_view slice, std::string& out) {
     if (!countsHeldBytes_ || !units_.empty() || (isStateless_ && !holdsNothing())) {
         return false;
@@ -252,7 +252,8 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
     return taken;
 }
 
-// Converts one byte or character, or what is left when the stream ends, and keeps account of where each unit comes from.
+// Converts one byte or character, or what is left when the stream ends, and keeps account of where each unit comes
+// from.
 void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, std::string& out) {
     isTracing_ = true;
     keepRecent(byte);
@@ -387,7 +388,8 @@ std::optional<std::uint64_t> StreamTranscoder::Impl::placeOfBadInput(std::string
     return isNew ? std::optional(recentBegin() + found) : std::nullopt;
 }
 
-// Where that begins which came to nothing: a character that is open, or else the last byte, unless it was a loss already.
+// Where that begins which came to nothing: a character that is open, or else the last byte, unless it was a loss
+// already.
 std::uint64_t StreamTranscoder::Impl::openBegin() const {
     return characterBegin_ < position_ ? characterBegin_ : std::max(badEnd_, position_ - 1);
 }

@@ -1,9 +1,10 @@
 // Well-formed text from one Unicode form to another (see detail/unicode_vectors.h): one source, compiled for each
 // instruction set that Highway knows for this processor family, and chosen when it is first called.
 //
-// Reading UTF-8 computes, at each byte, what a character that begins there would be, and then drops the places where none
-// begins. Writing UTF-8 lays out the bytes of each character in a lane of their own, and one shuffle from a table, chosen
-// by the lengths, moves them together. Characters beyond U+FFFF go one by one, but for those from UTF-8 to UTF-16.
+// Reading UTF-8 computes, at each byte, what a character that begins there would be, and then drops the places where
+// none begins. Writing UTF-8 lays out the bytes of each character in a lane of their own, and one shuffle from a table,
+// chosen by the lengths, moves them together. Characters beyond U+FFFF go one by one, but for those from UTF-8 to
+// UTF-16.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_convert.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
@@ -77,7 +78,7 @@ constexpr auto shufflesOfThree = [] {
 HWY_BEFORE_NAMESPACE();
 namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
 
-// ---- From UTF-8 ------------------------------------------------------------------------------------------------------
+// ---- From UTF-8
 
 #if KVT_HAS_VECTORS
 /// Stores units of UTF-16 as they are, or widened.
@@ -131,8 +132,8 @@ HWY_INLINE void storeSome(D d, hn::Vec<D> units, std::uint64_t mask, Unit*& q) {
 /// What the longest character of a block is.
 enum class Longest { two, three, four };
 
-/// The unit of UTF-16 that belongs to each of the bytes from `p` on: to the first byte of a character, and of one of four
-/// bytes to the second as well.
+/// The unit of UTF-16 that belongs to each of the bytes from `p` on: to the first byte of a character, and of one of
+/// four bytes to the second as well.
 template <Longest longest, class D>
 HWY_INLINE hn::Vec<D> unitsAt(D d, const std::uint8_t* p) {
     const hn::Rebind<std::uint8_t, D> narrow;
@@ -224,8 +225,8 @@ HWY_INLINE void fromUtf8Blocks(D d, const std::uint8_t* first, const std::uint8_
 #endif
 
 #if KVT_HAS_VECTORS
-/// Converts the last bytes of a text, fewer than two narrow registers, as a register or two with zeros behind them. They may
-/// begin with trail bytes of a character that is done.
+/// Converts the last bytes of a text, fewer than two narrow registers, as a register or two with zeros behind them.
+/// They may begin with trail bytes of a character that is done.
 template <typename Unit>
 HWY_INLINE void fromUtf8End(const std::uint8_t*& p, const std::uint8_t* end, Unit*& q) {
     const Eight16 d;
@@ -291,7 +292,7 @@ std::size_t utf8ToUtf32(const char* text, std::size_t bytes, char* out, std::siz
     return fromUtf8<std::uint32_t>(text, bytes, out, room);
 }
 
-// ---- To UTF-8 --------------------------------------------------------------------------------------------------------
+// ---- To UTF-8
 
 #if KVT_HAS_VECTORS
 /// Eight units below U+0800. Sixteen bytes are written.
@@ -415,7 +416,7 @@ std::size_t utf16ToUtf8(const char* text, std::size_t units, char* out, std::siz
     return static_cast<std::size_t>(q - begin);
 }
 
-// ---- UTF-16 and UTF-32 -------------------------------------------------------------------------------------------
+// ---- UTF-16 and UTF-32 ----------------------------------------------------------------------------------------------
 
 #if KVT_HAS_VECTORS
 template <class D>
@@ -536,7 +537,7 @@ std::size_t utf32ToUtf8(const char* text, std::size_t units, char* out, std::siz
     return static_cast<std::size_t>(q - begin);
 }
 
-// ---- ASCII -------------------------------------------------------------------------------------------------------
+// ---- ASCII ----------------------------------------------------------------------------------------------------------
 
 std::size_t widenAscii(const char* text, std::size_t bytes, char* out) {
     const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);

@@ -1,8 +1,8 @@
 // How much of a text is well-formed, and what it measures in other forms (see detail/unicode_vectors.h): one source,
 // compiled for each instruction set that Highway knows for this processor family, and chosen when it is first called.
 //
-// UTF-8 is checked as J. Keiser and D. Lemire do it in "Validating UTF-8 In Less Than One Instruction Per Byte" (2020): by
-// three look-ups by half bytes of each byte and its predecessor, whose common bits are the errors.
+// UTF-8 is checked as J. Keiser and D. Lemire do it in "Validating UTF-8 In Less Than One Instruction Per Byte" (2020):
+// by three look-ups by half bytes of each byte and its predecessor, whose common bits are the errors.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_measure.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
@@ -122,8 +122,8 @@ HWY_INLINE const std::uint8_t* measureUtf8Singly(const std::uint8_t* p, const st
 }
 
 #if KVT_HAS_VECTORS
-/// Adds whole registers of bytes, of which three can be read in front of `p`. Returns whether all was well-formed; what is
-/// not stands in the bytes from `p` on, or begins within the three before it.
+/// Adds whole registers of bytes, of which three can be read in front of `p`. Returns whether all was well-formed; what
+/// is not stands in the bytes from `p` on, or begins within the three before it.
 template <class D>
 HWY_INLINE bool measureUtf8Blocks(D d, const std::uint8_t*& p, const std::uint8_t* end, Extent& extent) {
     const hn::RebindToSigned<D> dSigned;
@@ -178,8 +178,8 @@ HWY_INLINE const std::uint8_t* withoutOpenCharacter(const std::uint8_t* p, Exten
 #endif
 
 #if KVT_HAS_VECTORS
-/// Adds the last bytes of a text, fewer than two narrow registers, as a register or two with zeros around them; or nothing,
-/// when that is not well-formed. They begin with a character.
+/// Adds the last bytes of a text, fewer than two narrow registers, as a register or two with zeros around them; or
+/// nothing, when that is not well-formed. They begin with a character.
 template <class D>
 HWY_INLINE const std::uint8_t* measureUtf8End(D narrow, const std::uint8_t* p, const std::uint8_t* end,
                                               Extent& extent) {

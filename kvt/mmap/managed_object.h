@@ -41,8 +41,8 @@ public:
         : impl_(std::make_unique<impl>(std::move(segment))) {}
 
     /// Maps the segment and finds or makes the object, where that has not been done. Fails as
-    /// mapped_region_segment::load() does, with boost::interprocess::bad_alloc when the heap has no room for the object,
-    /// and with what the constructor of `T` throws; then it can be tried again.
+    /// mapped_region_segment::load() does, with boost::interprocess::bad_alloc when the heap has no room for the
+    /// object, and with what the constructor of `T` throws; then it can be tried again.
     proxy access() {
         impl_->get();
         return proxy(*this);

@@ -81,8 +81,8 @@ public:
     /// Maps the stretch and opens its heap; does nothing on a segment that is loaded.
     ///
     /// `initialised` says that the stretch holds a heap already, which is believed: bytes that hold none are read as
-    /// one: what uses it may crash, damage the file, or never end. Without it a heap is made over whatever is there, unless
-    /// this segment was loaded before: then the heap of that time is opened.
+    /// one: what uses it may crash, damage the file, or never end. Without it a heap is made over whatever is there,
+    /// unless this segment was loaded before: then the heap of that time is opened.
     ///
     /// Throws boost::interprocess::interprocess_exception, and the segment is not loaded:
     ///   - with the code size_error, when the stretch does not lie in the file as it is, or begins at an offset that is

@@ -28,8 +28,8 @@ struct KVT_EXPORT manager_options {
     static const unsigned long long k_default_segment_size = 16777216;
 
     /// Bytes of a segment that is created without a size of its own, and of the header segment. Rounded up to whole
-    /// pages by the manager; 0 stays 0, and a segment of 0 bytes cannot be loaded, the header segment included. The header
-    /// never grows: one of 4096 bytes has room for 191 segments, or for four saved vectors of a few words.
+    /// pages by the manager; 0 stays 0, and a segment of 0 bytes cannot be loaded, the header segment included. The
+    /// header never grows: one of 4096 bytes has room for 191 segments, or for four saved vectors of a few words.
     unsigned long long segment_size = k_default_segment_size;
     /// The file outlives the manager and holds a header.
     bool persistent = false;
@@ -56,45 +56,47 @@ namespace mmap {
 ///
 /// docs/segment_file.md describes it byte by byte, and segment_file.h has the numbers.
 ///
-/// A file is opened again with the segment_size that it was made with, which stands in no place where the library looks.
-/// With a larger one it opens as long as the file is that long. With a smaller one it opens, too: what is in the header
-/// can be read as far as it is mapped. But the first change that takes memory of the header's heap, be it save() or
-/// create_segment(), writes at the end of that heap, which is not mapped: that ends the process by SIGSEGV, or writes
-/// over other memory of the process that happens to lie there.
+/// A file is opened again with the segment_size that it was made with, which stands in no place where the library
+/// looks. With a larger one it opens as long as the file is that long. With a smaller one it opens, too: what is in the
+/// header can be read as far as it is mapped. But the first change that takes memory of the header's heap, be it save()
+/// or create_segment(), writes at the end of that heap, which is not mapped: that ends the process by SIGSEGV, or
+/// writes over other memory of the process that happens to lie there.
 ///
-/// What is in the file is trusted. One thing is looked at: as long as the header's stretch is zeros all over, the file was
-/// made and never used, and the first call that wants the header makes it.
+/// What is in the file is trusted. One thing is looked at: as long as the header's stretch is zeros all over, the file
+/// was made and never used, and the first call that wants the header makes it.
 ///
 /// What a process leaves behind that ends at any moment, by SIGKILL too:
 ///   - What was written to mapped memory is in the file for the next process, flushed or not: the system keeps it. Only
 ///     when the machine itself stops is what was not released lost.
 ///   - Vectors whose save() has returned, and segments whose create_segment() has returned, are there.
-///   - A persistent file comes into being with the full length of its header segment, where the file system allows that.
-///   - Not covered: an end in the middle of a change of the header, which is inside save(), restore(), create_segment(),
-///     or the first access to a new file, and in the middle of any allocation in a segment for that segment. There
-///     is no journal. The heap may then be damaged without anyone noticing, and using it may crash or never end.
-///     What was saved and must not be lost has to have its copy elsewhere during such a call.
-///   - Not covered: a disk that gets full while the header is changed. As with any mapped memory, the system answers with
-///     SIGBUS, which ends the process in the middle of the change.
-///   - A segment for which the file grew, but whose row did not get into the table, stays in the file and belongs to nobody.
-///   - A segment that was created and never loaded has a row and no heap. open_segment() believes that there is one, and
-///     what uses that may crash, never end, or be given memory outside of the segment. So whoever creates a segment loads
-///     it before it passes its index on.
+///   - A persistent file comes into being with the full length of its header segment, where the file system allows
+///     that.
+///   - Not covered: an end in the middle of a change of the header, which is inside save(), restore(),
+///     create_segment(), or the first access to a new file, and in the middle of any allocation in a segment for that
+///     segment. There is no journal. The heap may then be damaged without anyone noticing, and using it may crash or
+///     never end. What was saved and must not be lost has to have its copy elsewhere during such a call.
+///   - Not covered: a disk that gets full while the header is changed. As with any mapped memory, the system answers
+///     with SIGBUS, which ends the process in the middle of the change.
+///   - A segment for which the file grew, but whose row did not get into the table, stays in the file and belongs to
+///     nobody.
+///   - A segment that was created and never loaded has a row and no heap. open_segment() believes that there is one,
+///     and what uses that may crash, never end, or be given memory outside of the segment. So whoever creates a segment
+///     loads it before it passes its index on.
 ///
 /// Threads: handles may be copied and dropped on any thread, and all members may be called on all threads; each takes
 /// the one mutex of its manager. Segments and their contents are the host's to serialise, and so are two managers that
 /// were made for one file: they share its header, and no mutex. One process at a time uses a file; nothing locks it,
 /// and a file that another program cuts short ends this one with SIGBUS.
 ///
-/// Signals: where the length of files is limited (RLIMIT_FSIZE), the system answers growth beyond the limit with SIGXFSZ,
-/// which ends the process. A host that wants the stated failures instead ignores that signal; the library leaves signals
-/// as they are.
+/// Signals: where the length of files is limited (RLIMIT_FSIZE), the system answers growth beyond the limit with
+/// SIGXFSZ, which ends the process. A host that wants the stated failures instead ignores that signal; the library
+/// leaves signals as they are.
 ///
 /// A member throws std::system_error when the mutex cannot be locked.
 ///
-/// A counted handle: copies share one file. A moved-from handle may only be destroyed or assigned to, and the last handle
-/// of a file must not be assigned to itself. When the last one goes, a temporary file is deleted; segments that are
-/// loaded stay as they are, others must not be loaded any more.
+/// A counted handle: copies share one file. A moved-from handle may only be destroyed or assigned to, and the last
+/// handle of a file must not be assigned to itself. When the last one goes, a temporary file is deleted; segments that
+/// are loaded stay as they are, others must not be loaded any more.
 class KVT_EXPORT memory_manager : public detail::PimplShared<memory_manager_impl, std::mutex> {
 public:
     /// Opens or makes the file at `path`; one that is made can be read and written by its owner only.
@@ -122,7 +124,8 @@ public:
     /// and for k_no_index, a new segment as by create_segment().
     ///
     /// `index` is that of a segment that has been loaded since it was created (see above). Throws std::out_of_range
-    /// "memory_manager: segment index out of range" when the table is shorter, and as mapped_region_segment::load() does.
+    /// "memory_manager: segment index out of range" when the table is shorter, and as mapped_region_segment::load()
+    /// does.
     mapped_region_segment open_segment(unsigned long long index) { return load_segment(index, {}); }
 
     /// A new segment at the end of the file, of `size` bytes rounded up to whole pages, by default
@@ -131,8 +134,8 @@ public:
     ///
     /// When the file cannot be made longer, the segment has the offset -1, and so has its row in the table: loading it
     /// throws. Loading also throws when the file's length was no multiple of the page size, since somebody else has
-    /// written to it: this segment lies at a crooked offset, and so do all after it. Throws boost::interprocess::bad_alloc when the header has no room for the row; the file has then
-    /// grown for nothing.
+    /// written to it: this segment lies at a crooked offset, and so do all after it. Throws
+    /// boost::interprocess::bad_alloc when the header has no room for the row; the file has then grown for nothing.
     mapped_region_segment create_segment(future::optional<unsigned long long> size = {}) {
         return load_segment(k_no_index, size);
     }

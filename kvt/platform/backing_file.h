@@ -23,8 +23,9 @@ std::int64_t growFile(const char* path, std::uint64_t bytes) noexcept;
 /// The length of an open file, -1 when the system does not report it.
 std::int64_t fileSize(int file) noexcept;
 
-/// Writes one zero byte into an open file, so that the page around it has room on the disk and is in memory. Gives 0, or the system's error number. A first touch of mapped memory could not report a full disk, and
-/// would read in a long stretch of nothing around it.
+/// Writes one zero byte into an open file, so that the page around it has room on the disk and is in memory. Gives 0,
+/// or the system's error number. A first touch of mapped memory could not report a full disk, and would read in a long
+/// stretch of nothing around it.
 int writeZero(int file, std::int64_t offset) noexcept;
 
 /// Whether a stretch within an open file holds nothing but zeros. Parts never written are not read.

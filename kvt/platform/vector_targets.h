@@ -1,8 +1,8 @@
 // Which of the instruction sets that Highway compiles for is used: the best that the processor has.
 //
-// Highway's own choice stands in its shared library. That library measures the clock when it is loaded, which takes some
-// 16 milliseconds of each program. Nothing else of it is needed here, so the choice is made here, too, and the library
-// is not loaded.
+// Highway's own choice stands in its shared library. That library measures the clock when it is loaded, which takes
+// some 16 milliseconds of each program. Nothing else of it is needed here, so the choice is made here, too, and the
+// library is not loaded.
 //
 // A source that is compiled for each of them (hwy/foreach_target.h) includes this header, and in its HWY_ONCE part:
 //

@@ -1,5 +1,5 @@
-// A search scans for the prefix and has the engine try the pattern at such a place only. It goes back to the plain search
-// from the start where the scan does not pay, and where the engine might have given up on its way.
+// A search scans for the prefix and has the engine try the pattern at such a place only. It goes back to the plain
+// search from the start where the scan does not pay, and where the engine might have given up on its way.
 #include <kvt/regex/detail/compiled_pattern.h>
 
 #include <memory>

@@ -1,5 +1,5 @@
-// The compiled program is read, not the pattern, so that classes and escapes are what the engine takes them for. It is a
-// chain of states in the order of the pattern. A kind of state that is not in the tables below ends the matter: then
+// The compiled program is read, not the pattern, so that classes and escapes are what the engine takes them for. It is
+// a chain of states in the order of the pattern. A kind of state that is not in the tables below ends the matter: then
 // nothing is passed over.
 #include <kvt/regex/detail/fixed_prefix.h>
 
@@ -193,8 +193,8 @@ FixedPrefix fixedPrefix(const Engine& engine) {
     return prefix;
 }
 
-// Each part lies between two places, the nearest and the farthest that it may get to; a repeat gives as many ways more as
-// there are places for its end.
+// Each part lies between two places, the nearest and the farthest that it may get to; a repeat gives as many ways more
+// as there are places for its end.
 double FixedPrefix::statesOfTry(std::string_view text, std::size_t place) const {
     std::size_t nearest = place;
     std::size_t farthest = place;

@@ -1,8 +1,8 @@
-// The scan for a prefix (see detail/prefix_scan.h): one source, compiled for each instruction set that Highway knows for
-// this processor family, and chosen when it is first called.
+// The scan for a prefix (see detail/prefix_scan.h): one source, compiled for each instruction set that Highway knows
+// for this processor family, and chosen when it is first called.
 //
-// A set of bytes is told by two look-ups, by the upper and by the lower half of a byte. Each of up to eight different rows
-// of the set has a bit; the upper half gives the bit of its row, the lower one the bits of all rows that it is in.
+// A set of bytes is told by two look-ups, by the upper and by the lower half of a byte. Each of up to eight different
+// rows of the set has a bit; the upper half gives the bit of its row, the lower one the bits of all rows that it is in.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/regex/prefix_scan.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h

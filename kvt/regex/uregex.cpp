@@ -1,5 +1,5 @@
-// URegex on the compiled pattern. It works on bytes, so that all instantiations share the one of its code; what is left for
-// the template is to copy the subject.
+// URegex on the compiled pattern. It works on bytes, so that all instantiations share the one of its code; what is left
+// for the template is to copy the subject.
 #include <kvt/regex/uregex.h>
 
 #include <kvt/regex/detail/compiled_pattern.h>

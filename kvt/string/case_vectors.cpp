@@ -1,9 +1,9 @@
-// Case mapping of UTF-8 by vector registers (see detail/case_table.h): one source, compiled for each instruction set that
-// Highway knows for this processor family, and chosen when it is first called.
+// Case mapping of UTF-8 by vector registers (see detail/case_table.h): one source, compiled for each instruction set
+// that Highway knows for this processor family, and chosen when it is first called.
 //
 // ASCII, Latin-1 and what does not change go by whole registers, other characters one by one by the table. Nothing is
-// checked for being well-formed: a lead byte with its trail bytes behind it is a character wherever it stands, and bytes that
-// are none are left alone, as ICU leaves them.
+// checked for being well-formed: a lead byte with its trail bytes behind it is a character wherever it stands, and
+// bytes that are none are left alone, as ICU leaves them.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/case_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
@@ -101,8 +101,8 @@ HWY_INLINE Step mapOne(const CaseTable& table, CaseState& s) {
 }
 
 #if KVT_HAS_VECTORS
-/// Maps whole registers, of which one byte can be read in front, up to the first character for the table; returns whether
-/// it stands there.
+/// Maps whole registers, of which one byte can be read in front, up to the first character for the table; returns
+/// whether it stands there.
 template <CaseMapping mapping>
 HWY_INLINE bool mapRegisters(const CaseTable& table, CaseState& s) {
     using L = Letters<mapping>;

@@ -25,8 +25,8 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     }
 }
 
-// A short text is converted before anything is asked about the converters of this thread, which would cost more than the
-// text. One that needs ICU is done again from its beginning.
+// A short text is converted before anything is asked about the converters of this thread, which would cost more than
+// the text. One that needs ICU is done again from its beginning.
 template <typename CharOut>
 void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
     constexpr std::size_t shortText = 1024;

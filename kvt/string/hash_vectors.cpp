@@ -1,5 +1,5 @@
-// FNV-1a, 64 bytes in one step: one source, compiled for each instruction set that Highway knows for this processor family,
-// and chosen when it is first called.
+// FNV-1a, 64 bytes in one step: one source, compiled for each instruction set that Highway knows for this processor
+// family, and chosen when it is first called.
 //
 // A byte b makes (h ^ b) * p of the hash h. The exclusive or touches the lowest byte l of h alone, so that it is the
 // addition of d = (l ^ b) - l, and a block of n bytes makes
@@ -7,9 +7,9 @@
 //     h * p^n + d[0] * p^n + d[1] * p^(n - 1) + ... + d[n - 1] * p
 //
 // whose products do not wait for each other. What is left in sequence are the low bytes: l[i + 1] is the low byte of
-// (l[i] ^ b[i]) * 0xB3. They are found for the whole block, bit by bit from the lowest one: bit k of the product is bit k of
-// l ^ b, changed where bits below it carry into it, so that bit k of all l is a running sum without carries of known bits.
-// That is a product without carries by a number of nothing but ones.
+// (l[i] ^ b[i]) * 0xB3. They are found for the whole block, bit by bit from the lowest one: bit k of the product is bit
+// k of l ^ b, changed where bits below it carry into it, so that bit k of all l is a running sum without carries of
+// known bits. That is a product without carries by a number of nothing but ones.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/hash_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
@@ -51,8 +51,8 @@ using Slices = std::array<std::uint64_t, 8>;
 /// The bits of the low bytes of the hash before each byte of a block.
 struct LowBytes {
     Slices slices{};
-    /// The bits of the low byte before the next block, each as nothing but zeros or ones. They stand alone, so that a bit of
-    /// the next block waits for that bit only.
+    /// The bits of the low byte before the next block, each as nothing but zeros or ones. They stand alone, so that a
+    /// bit of the next block waits for that bit only.
     Slices next{};
 
     /// Makes one bit of them from the bits of the bytes and what is carried into it; returns that bit of both together.
@@ -71,8 +71,8 @@ HWY_INLINE std::uint64_t majority(std::uint64_t a, std::uint64_t b, std::uint64_
     return (a & b) | ((a | b) & c);
 }
 
-// 0xB3 has the bits 0, 1, 4, 5 and 7: each bit of the product is the sum of five bits of the factor at most, and of what
-// the sums before it carry, of which there are up to three.
+// 0xB3 has the bits 0, 1, 4, 5 and 7: each bit of the product is the sum of five bits of the factor at most, and of
+// what the sums before it carry, of which there are up to three.
 HWY_INLINE void makeLowBytes(const Slices& b, LowBytes& l) {
     const std::uint64_t x0 = l.make<0>(b, 0);
     const std::uint64_t x1 = l.make<1>(b, x0);

@@ -1,5 +1,5 @@
-// Search by vector registers (see detail/unit_vectors.h): one source, compiled for each instruction set that Highway knows
-// for this processor family, and chosen when it is first called.
+// Search by vector registers (see detail/unit_vectors.h): one source, compiled for each instruction set that Highway
+// knows for this processor family, and chosen when it is first called.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/string/unit_vectors.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h

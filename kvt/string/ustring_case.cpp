@@ -1,5 +1,5 @@
-// Case mapping. ICU maps UTF-8 and UTF-16 directly, ASCII is mapped here, and the other text goes by way of UTF-16. A long
-// text of UTF-8 is mapped by tables of what ICU does to each character, which know no language, as its case map.
+// Case mapping. ICU maps UTF-8 and UTF-16 directly, ASCII is mapped here, and the other text goes by way of UTF-16. A
+// long text of UTF-8 is mapped by tables of what ICU does to each character, which know no language, as its case map.
 //
 // A result is never shorter than its source: where the mapped text has fewer units, zero units follow it. They are
 // real units that count in size() and take part in comparisons.
@@ -47,8 +47,8 @@ struct ProcessCaseMap {
     static inline std::atomic<bool> isClosed{false};
 };
 
-// Opened at first use and only read after that; when it cannot be opened, the next use tries again. Destructors of static
-// objects may map text when it is closed already: they get another one, which stays open.
+// Opened at first use and only read after that; when it cannot be opened, the next use tries again. Destructors of
+// static objects may map text when it is closed already: they get another one, which stays open.
 const UCaseMap* defaultCaseMap() {
     if (ProcessCaseMap::isClosed) {
         static const UCaseMap* const late = openCaseMap().release();
@@ -152,9 +152,9 @@ private:
         return static_cast<std::size_t>(size);
     }
 
-    // The next character is mapped as its neighbours have it, which none behind a blank are. So ICU sees it with all that
-    // stands between two blanks; what of that lies in front is mapped already. Where there is one such character there
-    // are more, so that ICU goes some way on.
+    // The next character is mapped as its neighbours have it, which none behind a blank are. So ICU sees it with all
+    // that stands between two blanks; what of that lies in front is mapped already. Where there is one such character
+    // there are more, so that ICU goes some way on.
     void askIcu() {
         constexpr std::size_t someWay = 256;
         const std::size_t blank = text_.substr(0, taken_).find_last_of(' ');
@@ -191,8 +191,8 @@ std::string mappedByTable(Mapping mapping, const UCaseMap* caseMap, std::string_
     return out;
 }
 
-// UTF-16 folds by way of UTF-8 where it is well-formed, for folding is the mapping that no language changes. Empty where it
-// is for ICU to do.
+// UTF-16 folds by way of UTF-8 where it is well-formed, for folding is the mapping that no language changes. Empty
+// where it is for ICU to do.
 std::u16string foldedByTable(std::u16string_view text) {
     const auto bytesOf = [](auto* units) { return reinterpret_cast<const char*>(units); };
     std::u16string out;

@@ -1,5 +1,5 @@
-// Split: one loop for all kinds of delimiters. Where they are single units their places are found for a block of units at
-// once and the pieces are counted first, so that the array is made once.
+// Split: one loop for all kinds of delimiters. Where they are single units their places are found for a block of units
+// at once and the pieces are counted first, so that the array is made once.
 #include <kvt/string/detail/instantiate.h>
 #include <kvt/string/detail/unit_search.h>
 #include <kvt/string/detail/unit_vectors.h>
@@ -14,8 +14,9 @@
 namespace kvt::ex {
 namespace {
 
-// Cuts `text` where `findNext(start)` says, and calls `add(start, end)` for each piece. Of a delimiter just the first unit
-// is passed over, however long it is; what is left when `maxCount` pieces are cut off is one more piece, whatever it holds.
+// Cuts `text` where `findNext(start)` says, and calls `add(start, end)` for each piece. Of a delimiter just the first
+// unit is passed over, however long it is; what is left when `maxCount` pieces are cut off is one more piece, whatever
+// it holds.
 template <typename Unit, typename FindNext, typename Add>
 void cutAt(detail::Units<Unit> text, bool keepEmptyParts, std::uint64_t maxCount, FindNext findNext,
            Add add) {

@@ -1,4 +1,5 @@
-// The zone functions where there is no zone database. A program of its own, since a database that has been loaded stays.
+// The zone functions where there is no zone database. A program of its own, since a database that has been loaded
+// stays.
 #include "answer.h"
 #include "machine_zone.h"
 

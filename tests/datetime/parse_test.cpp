@@ -1,5 +1,5 @@
-// parse() by patterns: literal text, names, seconds since 1970, offsets, and what kind of value comes out. Numbers, fuzzy words
-// and keywords have files of their own.
+// parse() by patterns: literal text, names, seconds since 1970, offsets, and what kind of value comes out. Numbers,
+// fuzzy words and keywords have files of their own.
 
 #include "pattern_rows.h"
 

@@ -370,7 +370,8 @@ Answers naiveDiff(const std::string& first, const std::string& other) {
 }
 
 Answer naiveCreate(const NaiveDateTime& at, const std::string& offset) {
-    // What needs more than two digits is refused before the bounds are looked at. A month that is none has 29 days here.
+    // What needs more than two digits is refused before the bounds are looked at. A month that is none has 29 days
+    // here.
     if (at.year < 1000 || at.year > 9999) {
         return yearOutOfRange(at.year);
     }

@@ -1,6 +1,6 @@
-// The tables of every code page that the installed ICU lists, for all bytes, all pairs of bytes and all code points, on all
-// ways that use them: what they take is what ICU makes of it without an objection, and they take all that is one byte or
-// two for one unit of UTF-16.
+// The tables of every code page that the installed ICU lists, for all bytes, all pairs of bytes and all code points, on
+// all ways that use them: what they take is what ICU makes of it without an objection, and they take all that is one
+// byte or two for one unit of UTF-16.
 //
 // The converters are dealt out to shards, so that the cases run side by side.
 #include <kvt/encoding/detail/encoding_profile.h>
@@ -326,8 +326,8 @@ TEST_P(ConversionTables, AgreeWithIcuOnTextsOfAllTheirCharacters) {
     });
 }
 
-// What is a pair's second byte depends on all bytes before it, a block of them at a time; so characters of one byte and of
-// two in any order, with one that is not known somewhere, at the end of memory that can be touched.
+// What is a pair's second byte depends on all bytes before it, a block of them at a time; so characters of one byte and
+// of two in any order, with one that is not known somewhere, at the end of memory that can be touched.
 TEST_P(ConversionTables, FindTheCharactersOfEachLengthInAnyOrder) {
     GuardedMemory memory(1 << 14);
     forEachCodePage([&](Subject& subject) {

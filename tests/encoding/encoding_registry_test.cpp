@@ -208,8 +208,8 @@ TEST(RegistryLookup, UnknownNamesTakeNoId) {
 }
 
 TEST(RegistryLookup, ACanonicalNameMayBeTheSpellingOfAnotherConverter) {
-    // What "TIS-620" opens is not the converter whose IANA name it is; whoever comes first decides. Here it is a spelling
-    // of an encoding that has its id already, and must be remembered as that.
+    // What "TIS-620" opens is not the converter whose IANA name it is; whoever comes first decides. Here it is a
+    // spelling of an encoding that has its id already, and must be remembered as that.
     const std::uint32_t opened = registry().lookupId("windows-874-2000");
     EXPECT_EQ(registry().nameOf(opened), "windows-874-2000");
     EXPECT_EQ(registry().lookupId("TIS-620"), opened);

@@ -276,8 +276,8 @@ TEST_P(IcuDifferential, SubstitutionsAcrossBorders) {
     });
 }
 
-/// Code pages of two bytes. A long text comes before, which has the library build its tables, so that short ones go that
-/// way as well.
+/// Code pages of two bytes. A long text comes before, which has the library build its tables, so that short ones go
+/// that way as well.
 class TableDifferential : public testing::TestWithParam<const char*> {
 public:
     void SetUp() override {

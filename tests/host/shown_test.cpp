@@ -1,5 +1,5 @@
-// The story and the reference of the commands show the command at work, and examples/demo.sh performs the story. What they
-// show is what happens.
+// The story and the reference of the commands show the command at work, and examples/demo.sh performs the story. What
+// they show is what happens.
 
 #include "host_test.h"
 

@@ -81,8 +81,8 @@ ConverterPtr prepare(const std::string& name, Notes& notes) {
     return converter;
 }
 
-/// A few of ICU's converters (in ICU 72 those of ISCII, ISO-2022-KR, LMBCS and SCSU) give other bytes when the output is full
-/// in between. For them the size of the library's buffers decides what comes out.
+/// A few of ICU's converters (in ICU 72 those of ISCII, ISO-2022-KR, LMBCS and SCSU) give other bytes when the output
+/// is full in between. For them the size of the library's buffers decides what comes out.
 Raw convertAsTheLibrary(const std::string& from, const std::string& to, std::string_view bytes) {
     static const std::set<std::string> forgetful = {"ISO-2022-KR", "LMBCS-1", "SCSU"};
     const bool matters = bytes.size() > 256 && (to.starts_with("ISCII") || forgetful.contains(to));

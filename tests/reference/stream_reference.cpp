@@ -50,8 +50,8 @@ std::string transcoded(const std::string& from, const std::string& to, std::stri
     return out;
 }
 
-/// These have many spellings of one text, and ICU chooses by what it sees of it at a time; or they write an announcement
-/// that ICU leaves out where a conversion begins with a reset. Of these the text has to be equal.
+/// These have many spellings of one text, and ICU chooses by what it sees of it at a time; or they write an
+/// announcement that ICU leaves out where a conversion begins with a reset. Of these the text has to be equal.
 std::string comparable(const std::string& to, const std::string& bytes) {
     const bool hasSpellings =
         to == "SCSU" || to == "LMBCS-1" || to == "ISO-2022-KR" || to == "ISO_2022,locale=ko,version=1";

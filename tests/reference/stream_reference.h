@@ -9,8 +9,8 @@
 
 namespace kvt::test {
 
-/// What is wrong with a stream from `from` to `to` (canonical names, different ones), in words; empty when nothing is. The
-/// text goes through whole and then, for each of `cuts`, in blocks of that length and with one border there.
+/// What is wrong with a stream from `from` to `to` (canonical names, different ones), in words; empty when nothing is.
+/// The text goes through whole and then, for each of `cuts`, in blocks of that length and with one border there.
 std::string differenceInStream(const std::string& from, const std::string& to, std::string_view text,
                                const std::vector<std::size_t>& cuts);
 

@@ -1,5 +1,5 @@
-// The scan for a prefix, for each instruction set that this machine has and without any: the same places as a plain loop
-// finds, with nothing read outside of the text.
+// The scan for a prefix, for each instruction set that this machine has and without any: the same places as a plain
+// loop finds, with nothing read outside of the text.
 #include <kvt/regex/detail/prefix_scan.h>
 
 #include <support/guarded_memory.h>

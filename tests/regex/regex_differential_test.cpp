@@ -227,7 +227,8 @@ TEST(RegexDifferential, APatternWithAFixedBeginningIsFoundWhereTheEngineFindsIt)
     EXPECT_GT(tally.misses, 20000u);
 }
 
-// The engine counts its steps over all places of a search. Where that makes it give up, passing over places must not help.
+// The engine counts its steps over all places of a search. Where that makes it give up, passing over places must not
+// help.
 TEST(RegexDifferential, GivingUpIsNotPassedOver) {
     std::size_t givenUp = 0;
     std::size_t ended = 0;

@@ -1,5 +1,5 @@
-// Long texts of UTF-8, which are mapped by tables in vector registers: for each instruction set that this machine has and
-// without any the same as ICU's case map gives for the whole, with nothing read outside of the text.
+// Long texts of UTF-8, which are mapped by tables in vector registers: for each instruction set that this machine has
+// and without any the same as ICU's case map gives for the whole, with nothing read outside of the text.
 #include <kvt/string/ustring.h>
 
 #include <support/guarded_memory.h>

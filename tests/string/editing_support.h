@@ -1,4 +1,5 @@
-// What the tests of editing share: the fixture that its typed suite has in each file, and what a standard exception says.
+// What the tests of editing share: the fixture that its typed suite has in each file, and what a standard exception
+// says.
 #pragma once
 
 #include <support/string_types.h>

@@ -1,5 +1,5 @@
-// The hash by blocks, for each instruction set that this machine has and without any: the same as byte by byte, with nothing
-// read outside of the text.
+// The hash by blocks, for each instruction set that this machine has and without any: the same as byte by byte, with
+// nothing read outside of the text.
 #include <kvt/foundation/detail/fnv.h>
 #include <kvt/string/detail/hash_vectors.h>
 #include <kvt/string/ustring.h>

@@ -1,5 +1,5 @@
-// The lines that people write with strings: that they compile, for all eight types, and what they give. The file is also
-// compiled alone by every compiler that is there, as C++17 and as C++20 (see CMakeLists.txt).
+// The lines that people write with strings: that they compile, for all eight types, and what they give. The file is
+// also compiled alone by every compiler that is there, as C++17 and as C++20 (see CMakeLists.txt).
 
 #include <kvt/foundation/throwable.h>
 #include <kvt/string/ustring.h>

@@ -1,4 +1,5 @@
-// Editing where something occurs without regard to case: what is found in the folded text is replaced in the stored one.
+// Editing where something occurs without regard to case: what is found in the folded text is replaced in the stored
+// one.
 #include <string/editing_support.h>
 #include <support/failure_record.h>
 

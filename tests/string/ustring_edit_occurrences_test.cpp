@@ -1,4 +1,5 @@
-// Editing where something occurs: all occurrences of a text, its first and its last, single units, and units at the ends.
+// Editing where something occurs: all occurrences of a text, its first and its last, single units, and units at the
+// ends.
 #include <string/editing_support.h>
 
 namespace {

@@ -69,8 +69,8 @@ struct ValueAnswer {
     std::optional<OffsetForm> offset;              ///< to be written behind the value
 };
 
-/// Makes the answer the record as it is, of its own kind. The offset is as it was written: "+10:75" stays. In its place,
-/// since a copy of what was just written has to wait for it.
+/// Makes the answer the record as it is, of its own kind. The offset is as it was written: "+10:75" stays. In its
+/// place, since a copy of what was just written has to wait for it.
 void setAnswer(ValueAnswer& answer, const CanonicalRecord& record) noexcept;
 
 /// The same as a value.

@@ -1,9 +1,10 @@
 // What a code page makes of its bytes and of the characters, as tables, so that its text can be converted without ICU.
 //
-// The tables hold what ICU itself says of each character alone, and only what it converts without an objection: from one
-// byte or two to one unit of UTF-16, and back. For all else they say "ask ICU": for what is not text, for a character that
-// only resembles one of the encoding's own, for longer characters, and for whatever could be joined with the next. They are
-// for encodings without a state, do not change once they are made, and can be read by any number of threads.
+// The tables hold what ICU itself says of each character alone, and only what it converts without an objection: from
+// one byte or two to one unit of UTF-16, and back. For all else they say "ask ICU": for what is not text, for a
+// character that only resembles one of the encoding's own, for longer characters, and for whatever could be joined with
+// the next. They are for encodings without a state, do not change once they are made, and can be read by any number of
+// threads.
 #pragma once
 
 #include <kvt/encoding/detail/byte_set.h>
@@ -25,8 +26,8 @@ public:
     /// millisecond for others. Empty when ICU cannot open the encoding.
     explicit DecodingTable(Encoding encoding);
 
-    /// Reads characters and takes them from `in`, until there are `room` units, or the table does not know the next one.
-    /// Returns the units written; none is a surrogate.
+    /// Reads characters and takes them from `in`, until there are `room` units, or the table does not know the next
+    /// one. Returns the units written; none is a surrogate.
     std::size_t read(std::string_view& in, char16_t* out, std::size_t room) const;
 
     /// The bytes of the first `units` characters of `in`, which the table knows.

@@ -48,9 +48,9 @@ private:
     const NameTable staticIds_;
     const std::array<std::string_view, firstDynamic> typeNames_;
 
-    // Held by who writes the members below, also across the calls into ICU for a new name, so that two threads with one new
-    // name cannot be given two ids. Nothing that runs under it takes another lock of the library. What is in the members
-    // never changes or moves, and is read without it.
+    // Held by who writes the members below, also across the calls into ICU for a new name, so that two threads with one
+    // new name cannot be given two ids. Nothing that runs under it takes another lock of the library. What is in the
+    // members never changes or moves, and is read without it.
     std::mutex mutex_;
     NameTable dynamicIds_;
     std::deque<std::string> dynamicNames_; // for who writes, and for debuggers

@@ -34,8 +34,8 @@ enum class Form : std::uint8_t {
     utf32be,
 };
 
-/// The form of UTF-8, UTF-16 and UTF-32 with a stated byte order, which their numbers tell; `other` for all encodings whose
-/// converter has to be asked.
+/// The form of UTF-8, UTF-16 and UTF-32 with a stated byte order, which their numbers tell; `other` for all encodings
+/// whose converter has to be asked.
 inline Form unicodeForm(Encoding encoding) {
     switch (encoding.evaluate()) {
     case Encoding::Utf8:
@@ -74,8 +74,9 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
 /// The bytes of the first character of `in`, if it is known without ICU to be well-formed and complete; else 0.
 std::size_t characterLength(Side from, std::string_view in);
 
-/// Builds the tables that are missing between two sides where that is worth it, for a text of which convertPrefix() left
-/// `bytes`. Returns whether it can go on behind what ICU has to look at: the forms are known, and all tables are there.
+/// Builds the tables that are missing between two sides where that is worth it, for a text of which convertPrefix()
+/// left `bytes`. Returns whether it can go on behind what ICU has to look at: the forms are known, and all tables are
+/// there.
 bool canGoOn(Side from, Side to, std::size_t bytes);
 
 extern template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);

@@ -6,8 +6,8 @@
 
 namespace kvt::ex::detail {
 
-/// Appends up to `room` units that `write` puts at the pointer it is given; it returns how many it wrote, and may use all
-/// the room in between. The units are not filled first where the standard library can do without that.
+/// Appends up to `room` units that `write` puts at the pointer it is given; it returns how many it wrote, and may use
+/// all the room in between. The units are not filled first where the standard library can do without that.
 template <typename CharT, typename Write>
 void appendInPlace(std::basic_string<CharT>& text, std::size_t room, Write write) {
     const std::size_t size = text.size();

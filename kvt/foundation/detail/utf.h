@@ -29,7 +29,8 @@ constexpr char continuationByte(char32_t bits) noexcept {
 
 constexpr std::size_t longestUtf8 = 4; // bytes
 
-/// Writes a code point and returns the number of bytes, 1 to 4. A surrogate is written like any other number of its size.
+/// Writes a code point and returns the number of bytes, 1 to 4. A surrogate is written like any other number of its
+/// size.
 constexpr std::size_t encodeUtf8(char32_t codePoint, char* out) noexcept {
     if (codePoint < 0x80) {
         out[0] = static_cast<char>(codePoint);

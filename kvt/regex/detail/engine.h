@@ -1,7 +1,7 @@
 // The one way to the headers of the engine.
 //
-// The engine keeps memory for its next search in a cache that all threads share, so that they wait for each other at every
-// search. Its header for that is left out by the name that guards it; each thread has a block of its own instead.
+// The engine keeps memory for its next search in a cache that all threads share, so that they wait for each other at
+// every search. Its header for that is left out by the name that guards it; each thread has a block of its own instead.
 #pragma once
 
 #define BOOST_REGEX_V5_MEM_BLOCK_CACHE_HPP

@@ -1,5 +1,5 @@
-// What every match of a pattern begins with, as far as that is sure: one set of bytes for each of the first places. And how
-// many states of its program the engine can visit at most while it tries the pattern at a place.
+// What every match of a pattern begins with, as far as that is sure: one set of bytes for each of the first places. And
+// how many states of its program the engine can visit at most while it tries the pattern at a place.
 #pragma once
 
 #include <kvt/regex/detail/engine.h>
@@ -31,8 +31,9 @@ struct FixedPrefix {
     /// The states that a try at `place` visits at most.
     double statesOfTry(std::string_view text, std::size_t place) const;
 
-    /// Whether the engine, trying a pattern of `patternSize` bytes at each of `places`, must get on without giving up for the
-    /// number of states that it visits: when all tries fail within the prefix but for some that visit `visited`.
+    /// Whether the engine, trying a pattern of `patternSize` bytes at each of `places`, must get on without giving up
+    /// for the number of states that it visits: when all tries fail within the prefix but for some that visit
+    /// `visited`.
     bool isSureToEnd(std::size_t patternSize, std::size_t places, double visited) const;
 };
 

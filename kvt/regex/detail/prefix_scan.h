@@ -26,12 +26,12 @@ public:
 
     explicit operator bool() const { return !sets_.empty(); }
 
-    /// The first place at or after `from`, which is at most `size`, where the bytes lie in their sets; `size` where there is
-    /// none.
+    /// The first place at or after `from`, which is at most `size`, where the bytes lie in their sets; `size` where
+    /// there is none.
     std::size_t find(const char* text, std::size_t size, std::size_t from) const;
 
-    /// One place that is looked at in registers: the bytes whose halves have a bit in common in these tables are all of its
-    /// set, and may be some more.
+    /// One place that is looked at in registers: the bytes whose halves have a bit in common in these tables are all of
+    /// its set, and may be some more.
     struct Probe {
         std::size_t offset = 0;
         alignas(16) std::array<std::uint8_t, 16> low{};

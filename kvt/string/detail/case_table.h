@@ -17,14 +17,15 @@ enum class CaseMapping { upper, lower, folded };
 
 struct CaseTable {
     CaseMapping mapping{};
-    /// By the lower and the upper half of a byte: where both have a bit in common, the byte begins characters that change.
-    /// Letters of Latin-1 beside ASCII begin with C3, which is left out when their mappings are the usual ones: of one
-    /// length, at a distance of 32, with ß, and ÿ in upper case, for exceptions.
+    /// By the lower and the upper half of a byte: where both have a bit in common, the byte begins characters that
+    /// change. Letters of Latin-1 beside ASCII begin with C3, which is left out when their mappings are the usual ones:
+    /// of one length, at a distance of 32, with ß, and ÿ in upper case, for exceptions.
     alignas(16) std::array<std::uint8_t, 16> leadsLow{};
     alignas(16) std::array<std::uint8_t, 16> leadsHigh{};
     /// By code point: the number of its block of 64 in `characters`; 0 when none in the block changes.
     std::vector<std::uint16_t> blocks;
-    /// The mapped character in UTF-8, the first byte lowest, with its length in the highest byte; 0 for what is left to ICU.
+    /// The mapped character in UTF-8, the first byte lowest, with its length in the highest byte; 0 for what is left to
+    /// ICU.
     std::vector<std::uint64_t> characters;
 };
 

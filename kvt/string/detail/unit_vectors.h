@@ -13,12 +13,12 @@ struct Place {
     bool isSettled = true; ///< false when it gave up before the index, having found no match so far
 };
 
-/// The first of the `places` units from `text` on where the `length` units at `needle` begin. All units of a match can be
-/// read: those at `text` number `places + length - 1`. Neither number is 0.
+/// The first of the `places` units from `text` on where the `length` units at `needle` begin. All units of a match can
+/// be read: those at `text` number `places + length - 1`. Neither number is 0.
 ///
 /// The first and the last unit of the needle are compared at once, for a whole register of places. The search gives
-/// up where both keep standing at places that are no match, for then another way may be the better one; only the one for
-/// bytes does.
+/// up where both keep standing at places that are no match, for then another way may be the better one; only the one
+/// for bytes does.
 Place findSequence(const char* text, std::size_t places, const char* needle, std::size_t length);
 Place findSequence(const char16_t* text, std::size_t places, const char16_t* needle, std::size_t length);
 Place findSequence(const char32_t* text, std::size_t places, const char32_t* needle, std::size_t length);
@@ -28,8 +28,8 @@ std::size_t countParts(const char* text, std::size_t size, char delimiter, bool 
 std::size_t countParts(const char16_t* text, std::size_t size, char16_t delimiter, bool withEmpty);
 std::size_t countParts(const char32_t* text, std::size_t size, char32_t delimiter, bool withEmpty);
 
-/// Writes the index of each unit that equals `unit`, in order, and returns how many there are. There is room for `size` of
-/// them.
+/// Writes the index of each unit that equals `unit`, in order, and returns how many there are. There is room for `size`
+/// of them.
 std::size_t placesOf(const char* text, std::uint32_t size, char unit, std::uint32_t* places);
 std::size_t placesOf(const char16_t* text, std::uint32_t size, char16_t unit, std::uint32_t* places);
 std::size_t placesOf(const char32_t* text, std::uint32_t size, char32_t unit, std::uint32_t* places);

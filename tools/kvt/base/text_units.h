@@ -1,5 +1,5 @@
-// Single bytes of UTF-8 and of ASCII. The command stands on the library's public headers alone, so that it has these of its
-// own.
+// Single bytes of UTF-8 and of ASCII. The command stands on the library's public headers alone, so that it has these of
+// its own.
 #pragma once
 
 namespace host {

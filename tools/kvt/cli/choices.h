@@ -15,8 +15,8 @@ namespace host {
 template <typename Value>
 using Choices = std::vector<std::pair<std::string, Value>>;
 
-/// The value of the word `typed`, given for `what`. Throws Failure when it is not one of the words; the failure suggests
-/// the nearest.
+/// The value of the word `typed`, given for `what`. Throws Failure when it is not one of the words; the failure
+/// suggests the nearest.
 template <typename Value>
 Value choose(const std::string& what, const std::string& typed, const Choices<Value>& choices) {
     std::vector<std::string> names;

@@ -29,7 +29,8 @@ struct TextEncoding {
     /// The first block of a text: as much as there is at once, but enough to know whether it begins with a mark.
     std::string_view firstBlock(Input& input) const;
 
-    /// The encoding of a text in `file` that begins with the block `start`. Throws Failure where the mark is that of the other order; it names the encoding that would fit.
+    /// The encoding of a text in `file` that begins with the block `start`. Throws Failure where the mark is that of
+    /// the other order; it names the encoding that would fit.
     kvt::ex::Encoding of(std::string_view start, const std::string& file) const;
 };
 

@@ -51,7 +51,8 @@ public:
     bool isAsked() const;
     const std::string& output() const { return files_.outputPath(); }
 
-    /// Gives an ExitStatus. Where the failures are in the output already, they are counted and not said. Throws Failure.
+    /// Gives an ExitStatus. Where the failures are in the output already, they are counted and not said. Throws
+    /// Failure.
     int run(LineWork& work, bool failuresAreInOutput, Diagnostics& diagnostics);
 
 private:
