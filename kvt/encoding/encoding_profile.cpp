@@ -36,12 +36,12 @@ Encoding EncodingProfile::itself() const {
 
 Form EncodingProfile::form() {
     // Whoever comes first asks; others who come meanwhile ask too and find the same.
-    std::optional<Form> form = form_.load(std::memory_order_relaxed);
-    if (!form) {
+    Form form = form_.load(std::memory_order_relaxed);
+    if (form == unknownForm) {
         form = icu::Converter(itself()).form();
         form_.store(form, std::memory_order_relaxed);
     }
-    return *form;
+    return form;
 }
 
 template <typename Table>

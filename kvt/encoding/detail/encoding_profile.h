@@ -12,7 +12,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <mutex>
-#include <optional>
 
 namespace kvt::ex::detail {
 
@@ -50,7 +49,8 @@ private:
 
     // `Unknown` until the object is somebody's.
     std::atomic<std::uint32_t> id_{Encoding::Unknown};
-    std::atomic<std::optional<Form>> form_{std::nullopt};
+    static constexpr auto unknownForm = static_cast<Form>(0xFF);
+    std::atomic<Form> form_{unknownForm};
     std::mutex building_;
     Lazy<DecodingTable> decoding_;
     Lazy<EncodingTable> encoding_;
