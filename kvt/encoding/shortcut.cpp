@@ -115,7 +115,9 @@ bool isAscii(const char* text, std::size_t units) {
     std::uint64_t all = 0;
     std::uint64_t word = 0;
     if (bytes < sizeof word) {
-        std::memcpy(&word, text, bytes);
+        if (bytes != 0) { // no text may be a null pointer
+            std::memcpy(&word, text, bytes);
+        }
         return (word & beyond) == 0;
     }
     for (std::size_t i = 0; i + sizeof word < bytes; i += sizeof word) {

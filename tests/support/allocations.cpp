@@ -85,6 +85,19 @@ void* operator new[](std::size_t bytes) {
     return kvt::test::allocate(bytes);
 }
 
+// The C++ run-time makes these of the ones above, a sanitizer does not.
+void* operator new(std::size_t bytes, const std::nothrow_t&) noexcept {
+    try {
+        return kvt::test::allocate(bytes);
+    } catch (const std::bad_alloc&) {
+        return nullptr;
+    }
+}
+
+void* operator new[](std::size_t bytes, const std::nothrow_t& nothrow) noexcept {
+    return operator new(bytes, nothrow);
+}
+
 void operator delete(void* block) noexcept {
     kvt::test::release(block);
 }
