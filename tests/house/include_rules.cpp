@@ -92,6 +92,7 @@ const std::map<std::string, std::vector<std::string>>& neighbourRooms() {
         {"date", {"base/", "cli/", "text/", "zone/"}},
         {"sort", {"base/", "cli/", "text/"}},
         {"memory", {"base/", "cli/"}},
+        {"translate", {"base/", "cli/", "text/", "convert/", "zone/", "date/", "sort/"}},
     };
     return table;
 }
