@@ -338,6 +338,37 @@ bool Converter::countsHeldBytes() const {
     }
 }
 
+// How the text would go on shows what the converter is in the middle of. HZ: a "!" is itself, or the first byte of a
+// character, unless it comes behind a "~" or behind such a byte. UTF-7: a "-" is a "+" right behind one; and seven "A",
+// which are 42 bits of 0, make up a third character only where at least 6 bits of 0 were left over before.
+std::size_t Converter::forgottenBytes() const {
+    switch (ucnv_getType(converter_.get())) {
+    case UCNV_HZ: {
+        const std::optional<std::u16string> next = whatFollows("!");
+        return !next || (*next != u"" && *next != u"!") ? 1 : 0;
+    }
+    case UCNV_UTF7:
+        if (whatFollows("-") == u"+") {
+            return 1;
+        }
+        return whatFollows("AAAAAAA") == std::u16string(3, u'\0') ? heldBytes() : 0;
+    default:
+        return 0;
+    }
+}
+
+std::optional<std::u16string> Converter::whatFollows(std::string_view bytes) const {
+    const Converter copy = clone();
+    UErrorCode error = U_ZERO_ERROR;
+    ucnv_setToUCallBack(copy.converter_.get(), UCNV_TO_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
+    std::array<char16_t, 16> units{};
+    char16_t* target = units.data();
+    const char* source = bytes.data();
+    ucnv_toUnicode(copy.converter_.get(), &target, units.data() + units.size(), &source,
+                   bytes.data() + bytes.size(), nullptr, 0, &error);
+    return U_SUCCESS(error) ? std::optional(std::u16string(units.data(), target)) : std::nullopt;
+}
+
 bool Converter::holdsUnits() const {
     UErrorCode error = U_ZERO_ERROR;
     return ucnv_fromUCountPending(converter_.get(), &error) != 0;

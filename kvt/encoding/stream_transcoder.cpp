@@ -113,7 +113,11 @@ public:
     }
 
     void finish(std::string& out, const LossHandler& onLoss) {
-        convertTraced("", true, out);
+        if (const std::size_t forgotten = from_.forgottenBytes(); forgotten != 0) {
+            loseEnd(forgotten, out);
+        } else {
+            convertTraced("", true, out);
+        }
         report(onLoss);
         from_.reset();
         to_.reset();
@@ -139,6 +143,7 @@ private:
     std::size_t convertTracing(std::string_view slice, std::size_t calm, std::string& out,
                                const LossHandler& onLoss, bool& foundLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
+    void loseEnd(std::size_t length, std::string& out);
     Progress decode(const char*& source, const char* sourceEnd, bool flush);
     void encode(bool flush, std::string& out);
     void passOver(std::string_view bytes);
@@ -275,6 +280,18 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
     if (flush || !to_.holdsUnits()) {
         units_.clear();
     }
+    isTracing_ = false;
+}
+
+// The last bytes of the stream are bad input, of which the source's converter says nothing.
+void StreamTranscoder::Impl::loseEnd(std::size_t length, std::string& out) {
+    const std::uint64_t begin = position_ - length;
+    losses_.push_back({Loss::BadInput, begin, bytesOfInput(begin, position_), U'\uFFFD'});
+    units_.push_back({u'\uFFFD', begin, position_, true});
+    buffer_[0] = u'\uFFFD';
+    filled_ = 1;
+    isTracing_ = true;
+    encode(true, out);
     isTracing_ = false;
 }
 

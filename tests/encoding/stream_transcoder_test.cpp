@@ -364,6 +364,18 @@ TEST(StreamTranscoderLosses, AnUnfinishedCharacterAtTheEndIsOne) {
         {"Shift_JIS", "a\x82", "a\uFFFD", bad(1, "\x82")},
         {"EUC-JP", "a\x8F\xA2", "a\uFFFD", bad(1, "\x8F\xA2")},
         {"GB18030", "ab\x94\x39\xFC", "ab\uFFFD", bad(2, "\x94\x39\xFC")},
+        // Of these ICU says nothing.
+        {"UTF-7", "a+", "a\uFFFD", bad(1, "+")},
+        {"UTF-7", "+", "\uFFFD", bad(0, "+")},
+        {"UTF-7", "+A", "\uFFFD", bad(1, "A")},
+        {"UTF-7", "+AA", "\uFFFD", bad(1, "AA")},
+        {"UTF-7", "+AGEA", "a\uFFFD", bad(3, "EA")},
+        {"UTF-7", "+AGE-b+A", "ab\uFFFD", bad(7, "A")},
+        {"UTF-7", "+AGEAYQBiA", "aab\uFFFD", bad(9, "A")},
+        {"HZ-GB-2312", "ab~", "ab\uFFFD", bad(2, "~")},
+        {"HZ-GB-2312", "~{V", "\uFFFD", bad(2, "V")},
+        {"HZ-GB-2312", "~{VP~", "\u4E2D\uFFFD", bad(4, "~")},
+        {"IMAP-mailbox-name", "a&", "a\uFFFD", bad(1, "&")},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(std::string(row.from) + ' ' + printable(row.text));
@@ -373,6 +385,36 @@ TEST(StreamTranscoderLosses, AnUnfinishedCharacterAtTheEndIsOne) {
             EXPECT_EQ(printable(result.out), printable(row.out));
             EXPECT_EQ(result.losses, std::vector<Loss>{row.loss});
         }
+    }
+}
+
+TEST(StreamTranscoderLosses, ATextMayEndBehindACompleteShift) {
+    struct Row {
+        const char* from;
+        std::string_view text;
+        std::string_view out;
+    };
+    const Row rows[] = {
+        {"UTF-7", "+AGE", "a"},
+        {"UTF-7", "+AGE-", "a"},
+        {"UTF-7", "+AAA", "\0"sv},
+        {"UTF-7", "+AGEAYQBi", "aab"},
+        {"UTF-7", "+-", "+"},
+        {"UTF-7", "a-", "a-"},
+        {"UTF-7", "AAAAAAA", "AAAAAAA"},
+        {"HZ-GB-2312", "~~", "~"},
+        {"HZ-GB-2312", "a~{", "a"},
+        {"HZ-GB-2312", "~{VP", "\u4E2D"},
+        {"HZ-GB-2312", "~{VP~}", "\u4E2D"},
+        {"HZ-GB-2312", "a~\n", "a"},
+        {"IMAP-mailbox-name", "a&-", "a&"},
+        {"ISO-2022-JP", "a\x1B$B", "a"},
+        {"ISO-2022-KR", "a\x0E", "a"},
+    };
+    for (const Row& row : rows) {
+        const Streamed result = streamed(row.from, "UTF-8", row.text);
+        EXPECT_EQ(printable(result.out), printable(row.out)) << row.from << ' ' << printable(row.text);
+        EXPECT_TRUE(result.losses.empty()) << row.from << ' ' << printable(row.text);
     }
 }
 

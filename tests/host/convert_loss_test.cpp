@@ -194,11 +194,35 @@ TEST_F(KvtConvertLoss, AnUnfinishedCharacterAtTheEndIsALoss) {
     for (const Row& row :
          {Row{"UTF-8", "ab\xe2\x82", "bad bytes E2 82"},
           Row{"UTF-16LE", std::string("a\0b", 3), "bad bytes 62"}, Row{"Shift_JIS", "a\x93", "bad bytes 93"},
-          Row{"UTF-16BE", std::string("\xd8\x3d", 2), "bad bytes D8 3D"}}) {
+          Row{"UTF-16BE", std::string("\xd8\x3d", 2), "bad bytes D8 3D"},
+          Row{"UTF-7", "ab+", "bad bytes 2B; first in standard input: line 1, column 3, byte 2"},
+          Row{"UTF-7", "a\nb+A", "bad bytes 41; first in standard input: line 2, column 2, byte 4"},
+          Row{"HZ-GB-2312", "a\n\n~", "bad bytes 7E; first in standard input: line 3, column 1, byte 3"},
+          Row{"HZ-GB-2312", "~{VPV", "bad bytes 56; first in standard input: line 1, column 2, byte 4"}}) {
         const ChildResult result = convert(row.from, "UTF-32LE", row.input, {"--on-error", "replace"});
         EXPECT_EQ(result.status, 1) << row.from;
         EXPECT_TRUE(contains(result.err, row.lost)) << row.from << ": " << result.err;
     }
+}
+
+TEST_F(KvtConvertLoss, EveryCommandThatReadsTextSeesAnUnfinishedEnd) {
+    const std::vector<std::vector<std::string>> commands = {
+        {"convert", "--to", "UTF-8", "--from"},
+        {"text", "upper", "--encoding"},
+        {"match", "a", "--encoding"},
+        {"date", "parse", "%Y", "--encoding"},
+    };
+    for (std::vector<std::string> command : commands) {
+        command.emplace_back("UTF-7");
+        const ChildResult result = kvt(command, "1999\na+");
+        EXPECT_EQ(result.status, 2) << command[0];
+        EXPECT_TRUE(contains(result.err, "line 2, column 2, byte 6: The bytes \"+\" are not valid UTF-7"))
+            << result.err;
+    }
+    const ChildResult dry =
+        kvt({"convert", "--dry-run", "--from", "HZ-GB-2312", "--to", "UTF-8,US-ASCII"}, "1999\na~");
+    EXPECT_EQ(dry.status, 1);
+    EXPECT_TRUE(contains(dry.out, "1          1")) << dry.out;
 }
 
 TEST_F(KvtConvertLoss, TheSubstitutionIsAQuestionMarkOrTheReplacementCharacter) {

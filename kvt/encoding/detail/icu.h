@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -85,6 +86,9 @@ public:
     /// Bytes held as the beginning of a character, none where the converter does not count them.
     std::size_t heldBytes() const;
     bool countsHeldBytes() const;
+    /// The last bytes of a text that ends here where they are the beginning of something, and ICU would drop them
+    /// without a word.
+    std::size_t forgottenBytes() const;
     /// Whether UTF-16 is held of which the output has not been given yet.
     bool holdsUnits() const;
 
@@ -107,6 +111,8 @@ private:
     };
 
     bool forgetsToReset() const;
+    /// What further bytes would come to; nothing where they are bad input.
+    std::optional<std::u16string> whatFollows(std::string_view bytes) const;
 
     std::unique_ptr<UConverter, Close> converter_;
     Encoding encoding_ = Encoding::Unknown;
