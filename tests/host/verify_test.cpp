@@ -53,6 +53,52 @@ TEST_F(KvtConvertVerify, FindsChangesThatNoConverterReports) {
     EXPECT_EQ(read("out"), "a\x87\x82");
 }
 
+// Danda twice comes back as one double danda.
+const char* const dandas = "a\n\u0964\u0964";
+
+TEST_F(KvtConvertVerify, IsDoneUnaskedWhereTheEncodingDoesNotComeBack) {
+    const ChildResult stopped = convert("UTF-8", "ISCII,version=0", dandas, {"-o", "out"});
+    EXPECT_EQ(stopped.status, 2);
+    EXPECT_EQ(stopped.err,
+              "kvt: verify: the output does not convert back to the same text: at character 3, U+0964 "
+              "comes back as U+0965\n"
+              "     ISCII,version=0 is always verified: not all that is written in it can be read.\n");
+    EXPECT_FALSE(exists("out"));
+    const ChildResult replaced =
+        convert("UTF-8", "ISCII,version=0", dandas, {"-o", "out", "--on-error", "replace"});
+    EXPECT_EQ(replaced.status, 1);
+    EXPECT_EQ(replaced.err, stopped.err);
+    EXPECT_TRUE(exists("out"));
+
+    const ChildResult same = convert("UTF-8", "ISCII,version=0", "a \u0939\u093f\u0928\u094d\n");
+    EXPECT_EQ(same.status, 0);
+    EXPECT_EQ(same.err, "");
+    std::u32string all;
+    for (char32_t character = 0x20; character < 0x3000; ++character) {
+        all += character;
+    }
+    const ChildResult compound =
+        convert("UTF-8", "x11-compound-text", utf8Of(all), {"--on-error", "replace"});
+    EXPECT_TRUE(contains(compound.err, "x11-compound-text is always verified")) << compound.err;
+    EXPECT_EQ(convert("UTF-8", "x11-compound-text", "caf\u00e9").status, 0);
+}
+
+TEST_F(KvtConvertVerify, IsDoneUnaskedByADryRunAndByWhatWritesLines) {
+    EXPECT_EQ(convert("UTF-8", "ISCII,version=0", dandas, {"--dry-run"}).status, 1);
+    EXPECT_EQ(convert("UTF-8", "ISCII,version=0", "a\n\u0964", {"--dry-run"}).status, 0);
+
+    const std::string one = convert("UTF-8", "ISCII,version=0", "\u0964").out;
+    const ChildResult written =
+        kvt({"text", "replace", "x", "\u0964", "--encoding", "ISCII,version=0", "-o", "out"},
+            "a\nx" + one + "\n");
+    EXPECT_EQ(written.status, 2);
+    EXPECT_EQ(written.err,
+              "kvt: the result cannot be written in ISCII,version=0: the output does not convert back to the "
+              "same text: at character 3, U+0964 comes back as U+0965\n");
+    EXPECT_FALSE(exists("out"));
+    EXPECT_EQ(kvt({"text", "upper", "--encoding", "ISCII,version=0"}, "a\n" + one).status, 0);
+}
+
 TEST_F(KvtConvertVerify, WorksAcrossBlocksAndFiles) {
     std::u32string text;
     for (int index = 0; index < 100000; ++index) {

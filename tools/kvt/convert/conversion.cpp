@@ -6,6 +6,7 @@
 #include "base/text_units.h"
 #include "cli/exit_status.h"
 #include "convert/loss_report.h"
+#include "text/encoding_catalogue.h"
 #include "text/file_options.h"
 
 #include <filesystem>
@@ -45,10 +46,6 @@ std::unique_ptr<Output> openReport(const ConvertOptions& options) {
     return openOutput(options.report);
 }
 
-std::string shownCharacter(std::optional<char32_t> character) {
-    return character ? codePointName(*character) : "the end of the text";
-}
-
 } // namespace
 
 Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, Encoding to,
@@ -57,7 +54,7 @@ Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, 
       toName_(to.getName()), diagnostics_(diagnostics), transcoder_(from_, to),
       onLoss_([this](const Loss& loss) { takeLoss(loss); }), lines_(from_),
       progress_(diagnostics, totalSize(options.inputs), options.progress, "") {
-    if (options.verify) {
+    if (options.verify || !comesBack(to_)) {
         roundTrip_.emplace(from_, to);
     }
 }
@@ -214,11 +211,15 @@ bool Conversion::verified() {
         return true;
     }
     if (const auto& difference = roundTrip_->difference()) {
-        diagnostics_.say("verify: the output does not convert back to the same text: at character " +
-                         std::to_string(difference->character + 1) + ", " +
-                         shownCharacter(difference->before) + " comes back as " +
-                         shownCharacter(difference->after));
+        diagnostics_.say("verify: " + describe(*difference));
+        if (!options_.verify) {
+            diagnostics_.line("     " + toName_ +
+                              " is always verified: not all that is written in it can be read.");
+        }
         return false;
+    }
+    if (!options_.verify) {
+        return true;
     }
     diagnostics_.say(
         ledger_.isEmpty()

@@ -6,8 +6,8 @@
 #include "base/progress.h"
 #include "convert/convert_options.h"
 #include "convert/loss_ledger.h"
-#include "convert/round_trip.h"
 #include "text/line_counter.h"
+#include "text/round_trip.h"
 #include "text/source.h"
 
 #include <kvt/encoding/encoding.h>

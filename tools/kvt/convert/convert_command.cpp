@@ -33,7 +33,8 @@ with the loss have been written, and nothing of the loss or behind it.
 Places are the byte offset in the file, from 0, and line and column, from 1;
 columns count characters of the decoded text, lines end with LF, CR or CRLF.
 Whatever was lost is listed on standard error at the end: each character or
-bad byte sequence, how often, and where first.
+bad byte sequence, how often, and where first. Into the few encodings in which
+not all that is written can be read again, --verify is always on.
 
 Byte order marks: the one at the start of each FILE is skipped. In UTF-16 and
 UTF-32 it says which order the bytes are in, which is little-endian without one;

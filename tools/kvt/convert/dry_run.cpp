@@ -8,11 +8,14 @@
 #include "base/unicode_data.h"
 #include "cli/exit_status.h"
 #include "convert/loss_ledger.h"
+#include "text/encoding_catalogue.h"
+#include "text/round_trip.h"
 #include "text/source.h"
 
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <algorithm>
+#include <optional>
 #include <tuple>
 
 namespace host {
@@ -27,17 +30,25 @@ struct Target {
     Encoding from;
     Encoding to;
     kvt::ex::StreamTranscoder transcoder;
+    std::optional<RoundTrip> roundTrip; ///< where not all that is written can be read
     LossLedger ledger;
     std::uint64_t bytes = 0;
 
     Target(Encoding source, Encoding target)
-        : name(target.getName()), from(source), to(target), transcoder(from, to) {}
+        : name(target.getName()), from(source), to(target), transcoder(from, to) {
+        if (!comesBack(to)) {
+            roundTrip.emplace(from, to);
+        }
+    }
 
     // Files that are named alike may differ in the order of bytes.
     void readIn(Encoding source) {
         if (source != from) {
             from = source;
             transcoder = kvt::ex::StreamTranscoder(from, to);
+            if (roundTrip) {
+                roundTrip->readIn(from);
+            }
         }
     }
 
@@ -51,6 +62,21 @@ struct Target {
             transcoder.finish(converted, onLoss);
         }
         bytes += converted.size();
+        if (roundTrip) {
+            roundTrip->addInput(block != nullptr ? *block : std::string_view());
+            roundTrip->addOutput(converted);
+            if (block == nullptr) {
+                roundTrip->finish();
+            }
+        }
+    }
+
+    // Behind the first difference the texts have parted, so that it is the only one that is known.
+    void countDifference() {
+        if (roundTrip && roundTrip->difference() && ledger.isEmpty()) {
+            const char32_t before = roundTrip->difference()->before.value_or(U'\uFFFD');
+            ledger.add({Loss::NotRepresentable, 0, {}, before}, [] { return Place(); });
+        }
     }
 
     auto rank() const { return std::tuple(ledger.total(), ledger.entryCount(), bytes); }
@@ -115,6 +141,9 @@ int dryRun(const ConvertOptions& options, const TextEncoding& from, const std::v
                 target.convert(nullptr);
             }
         }
+    }
+    for (Target& target : targets) {
+        target.countDifference();
     }
     std::stable_sort(targets.begin(), targets.end(),
                      [](const Target& left, const Target& right) { return left.rank() < right.rank(); });

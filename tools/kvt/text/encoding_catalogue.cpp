@@ -8,6 +8,7 @@
 #include "cli/suggest.h"
 
 #include <algorithm>
+#include <array>
 #include <set>
 
 namespace host {
@@ -35,6 +36,14 @@ std::string comparedForm(std::string_view name) {
     }
     return form;
 }
+
+// A converter that forgets which set of characters it is in; seven scripts of India in one code, which join signs to
+// letters; and one that writes U+FFFE and U+FFFF, and takes them for bad input. A test tries all encodings.
+constexpr std::array<std::string_view, 11> notComingBack = {
+    "x11-compound-text", "ISCII,version=0", "ISCII,version=1", "ISCII,version=2",
+    "ISCII,version=3",   "ISCII,version=4", "ISCII,version=5", "ISCII,version=6",
+    "ISCII,version=7",   "ISCII,version=8", "LMBCS-1",
+};
 
 bool isKnown(const std::string& name) {
     return namedEncoding(name).id() != Encoding::Unknown;
@@ -128,6 +137,11 @@ Encoding namedEncoding(const std::string& name) {
         return comparedForm(known) == comparedForm(name);
     });
     return isName ? encoding : Encoding(Encoding::Unknown);
+}
+
+bool comesBack(Encoding encoding) {
+    return std::none_of(notComingBack.begin(), notComingBack.end(),
+                        [&](std::string_view name) { return encoding == Encoding(name, kvt::ex::nothrow); });
 }
 
 std::string unknownEncoding(const std::string& name, const EncodingCatalogue& catalogue) {

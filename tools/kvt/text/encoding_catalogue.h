@@ -55,6 +55,11 @@ std::string unknownEncoding(const std::string& name, const EncodingCatalogue& ca
 /// "ibm-37_P100-1995,swaplfnl". ICU overlooks one with anything behind it, and that is a name of no encoding here.
 kvt::ex::Encoding namedEncoding(const std::string& name);
 
+/// Whether ICU reads back what it writes in the encoding, but for characters of private use, which many encodings map to
+/// others that they came to have. Where it does not, a text that was converted has to be read again to know that it is
+/// still the same.
+bool comesBack(kvt::ex::Encoding encoding);
+
 /// "windows-1252,KOI8-R" as two names, each of which may have a comma of its own.
 std::vector<std::string> splitEncodings(const std::string& list);
 

@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/messages.h"
 #include "base/text.h"
+#include "text/encoding_catalogue.h"
 
 #include <string_view>
 
@@ -13,6 +14,9 @@ TextWriter::TextWriter(Output& output, kvt::ex::Encoding encoding, bool encoded)
     // What the operations make of valid UTF-8 is valid UTF-8.
     if (encoded && encoding != kvt::ex::Encoding(kvt::ex::Encoding::Utf8)) {
         encoder_.emplace(kvt::ex::Encoding::Utf8, encoding);
+        if (!comesBack(encoding)) {
+            roundTrip_.emplace(kvt::ex::Encoding::Utf8, encoding);
+        }
     }
 }
 
@@ -25,10 +29,24 @@ void TextWriter::endLine(const TextLine& line) {
         throw Failure(std::string(line.file) + ": line " + std::to_string(line.number) +
                       ": the result cannot be written. " + describe(910003, {lost, "UTF-8", encodingName_}));
     });
+    if (roundTrip_) {
+        roundTrip_->addInput(pending_);
+    }
     pending_.clear();
 }
 
+void TextWriter::requireSameText() const {
+    if (roundTrip_ && roundTrip_->difference()) {
+        throw Failure("the result cannot be written in " + encodingName_ + ": " +
+                      describe(*roundTrip_->difference()));
+    }
+}
+
 void TextWriter::flush() {
+    if (roundTrip_) {
+        roundTrip_->addOutput(ready_);
+        requireSameText();
+    }
     output_.write(ready_);
     ready_.clear();
 }
@@ -38,6 +56,10 @@ void TextWriter::finish() {
         encoder_->finish(ready_, {});
     }
     flush();
+    if (roundTrip_) {
+        roundTrip_->finish();
+        requireSameText();
+    }
     output_.commit();
 }
 

@@ -3,6 +3,7 @@
 
 #include "base/output.h"
 #include "text/line_reader.h"
+#include "text/round_trip.h"
 
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/stream_transcoder.h>
@@ -30,9 +31,12 @@ public:
     void finish();
 
 private:
+    void requireSameText() const;
+
     Output& output_;
     std::string encodingName_;
     std::optional<kvt::ex::StreamTranscoder> encoder_;
+    std::optional<RoundTrip> roundTrip_; ///< where not all that is written can be read
     std::string pending_;
     std::string ready_;
 };

@@ -1,4 +1,6 @@
-#include "convert/round_trip.h"
+#include "text/round_trip.h"
+
+#include "base/text.h"
 
 #include <algorithm>
 #include <cstring>
@@ -18,7 +20,17 @@ std::optional<char32_t> characterAt(const std::string& text, std::size_t index) 
     return character;
 }
 
+std::string shown(std::optional<char32_t> character) {
+    return character ? codePointName(*character) : "the end of the text";
+}
+
 } // namespace
+
+std::string describe(const RoundTrip::Difference& difference) {
+    return "the output does not convert back to the same text: at character " +
+           std::to_string(difference.character + 1) + ", " + shown(difference.before) + " comes back as " +
+           shown(difference.after);
+}
 
 RoundTrip::RoundTrip(kvt::ex::Encoding from, kvt::ex::Encoding to)
     : decodeInput_(from, kvt::ex::Encoding::Utf32LE), decodeOutput_(to, kvt::ex::Encoding::Utf32LE) {}

@@ -44,4 +44,7 @@ private:
     std::optional<Difference> difference_;
 };
 
+/// "the output does not convert back to the same text: at character 3, U+0141 comes back as U+003F".
+std::string describe(const RoundTrip::Difference& difference);
+
 } // namespace host
