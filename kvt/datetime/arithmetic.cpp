@@ -4,6 +4,7 @@
 #include <kvt/datetime/detail/calendar.h>
 #include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/parts_access.h>
+#include <kvt/datetime/detail/wall_clock.h>
 
 #include <algorithm>
 #include <cstdlib>
@@ -80,28 +81,11 @@ std::optional<DatePartRange> addInterval(DateTimeFields& fields, const IntervalP
 
 namespace {
 
-// A date and the time of its day.
-struct WallClock {
-    CivilDate date;
-    std::int64_t nanoseconds = 0;
-
-    friend bool operator<(const WallClock& left, const WallClock& right) noexcept {
-        const std::int64_t leftDay = ordinalOf(left.date);
-        const std::int64_t rightDay = ordinalOf(right.date);
-        return leftDay != rightDay ? leftDay < rightDay : left.nanoseconds < right.nanoseconds;
-    }
-
-private:
-    // Grows with the date, but not by one for each day.
-    static constexpr std::int64_t ordinalOf(const CivilDate& date) noexcept {
-        return (date.year * 16 + date.month) * 32 + date.day;
-    }
-};
-
-// How far the steps have come.
+// The way from one clock to another, in steps of years and then of months, neither of which goes past the end.
 struct Walk {
     WallClock at;
-    std::int64_t steps = 0; ///< how many of them; negative on the way back
+    const WallClock& target;
+    bool backwards;
 };
 
 // A step by the calendar: the date so many years or months after another, before it where they are negative.
@@ -115,34 +99,37 @@ CivilDate dateAfterMonths(const CivilDate& date, std::int64_t months) noexcept {
     return dateAfter(date, 0, months);
 }
 
-// Goes so many steps of one kind towards `target` or, if those pass it, one fewer.
-Outcome<Walk> walkTowards(const WallClock& start, const WallClock& target, std::int64_t steps,
-                          CalendarStep stepped) {
+// Goes so many steps of one kind or, if those pass the target, one fewer. How many it were, without their sign; none
+// where they would begin in a year that is out of range.
+template <CalendarStep stepped>
+std::optional<std::int64_t> go(Walk& walk, std::int64_t steps) noexcept {
     if (steps == 0) {
-        return Walk{start, 0};
+        return 0;
     }
-    if (!isInRange(start.date)) {
-        return yearOutOfRange(start.date.year);
+    const CivilDate start = walk.at.date;
+    if (!isInRange(start)) {
+        return std::nullopt;
     }
-    const bool backwards = target < start;
-    Walk walk = {{stepped(start.date, steps), start.nanoseconds}, steps};
-    if (backwards ? walk.at < target : target < walk.at) {
-        walk.steps += backwards ? 1 : -1;
-        walk.at.date = stepped(start.date, walk.steps);
+    walk.at.date = stepped(start, steps);
+    if (walk.backwards ? walk.at < walk.target : walk.target < walk.at) {
+        steps += walk.backwards ? 1 : -1;
+        walk.at.date = stepped(start, steps);
     }
-    return walk;
+    return std::abs(steps);
 }
 
-Outcome<Walk> walkYears(const WallClock& start, const WallClock& target) {
-    return walkTowards(start, target, target.date.year - start.date.year, dateAfterYears);
+std::optional<std::int64_t> goYears(Walk& walk) noexcept {
+    return go<dateAfterYears>(walk, walk.target.date.year - walk.at.date.year);
 }
 
-Outcome<Walk> walkMonths(const WallClock& start, const WallClock& target) {
-    std::int64_t apart = std::int64_t{target.date.month} - std::int64_t{start.date.month};
-    if (target.date.year != start.date.year) {
-        apart += target.date.year > start.date.year ? 12 : -12;
+std::optional<std::int64_t> goMonths(Walk& walk) noexcept {
+    const CivilDate& from = walk.at.date;
+    const CivilDate& to = walk.target.date;
+    std::int64_t apart = std::int64_t{to.month} - std::int64_t{from.month};
+    if (to.year != from.year) {
+        apart += to.year > from.year ? 12 : -12;
     }
-    return walkTowards(start, target, apart, dateAfterMonths);
+    return go<dateAfterMonths>(walk, apart);
 }
 
 } // namespace
@@ -171,25 +158,35 @@ double Difference::inMonths() const {
     return backwards ? -magnitude : magnitude;
 }
 
-Outcome<Difference> diffParts(const TimeCount& first, const TimeCount& second, bool byCalendar) {
+WallClock utcClock(const CanonicalRecord& record) noexcept {
+    const DateTimeFields& fields = record.fields;
+    const std::int32_t offset = hasOffset(record.type) ? record.offset.minutes : 0;
+    const std::int64_t nanoseconds = nanosecondsOfDay(fields) - offset * nanosPerMinute;
+    if (nanoseconds >= 0 && nanoseconds < nanosPerDay) {
+        return {{fields.year, static_cast<unsigned>(fields.month), static_cast<unsigned>(fields.day)},
+                nanoseconds};
+    }
+    const TimeCount count = plusMinutes(countOf(fields), -offset);
+    return {civilFromDays(count.days), count.nanoseconds};
+}
+
+Outcome<Difference> diffParts(const WallClock& first, const WallClock& second, bool byCalendar) {
     if (first == second) {
         return Difference();
     }
     const bool backwards = first < second;
-    const WallClock target = {civilFromDays(first.days), first.nanoseconds};
-    const WallClock start = {civilFromDays(second.days), second.nanoseconds};
     if (!byCalendar) {
         return Difference{backwards, 0, 0, backwards ? second - first : first - second,
-                          backwards ? target.date : start.date};
+                          backwards ? first.date : second.date};
     }
-    return walkYears(start, target).andThen([&](const Walk& years) {
-        return walkMonths(years.at, target).andThen([&](const Walk& months) {
-            const TimeCount reached = {daysOf(months.at.date), months.at.nanoseconds};
-            return Difference{backwards, std::abs(years.steps), std::abs(months.steps),
-                              backwards ? reached - first : first - reached,
-                              backwards ? target.date : months.at.date};
-        });
-    });
+    Walk walk = {second, first, backwards};
+    const std::optional<std::int64_t> years = goYears(walk);
+    const std::optional<std::int64_t> months = years ? goMonths(walk) : std::nullopt;
+    if (!months) {
+        return yearOutOfRange(walk.at.date.year);
+    }
+    return Difference{backwards, *years, *months, backwards ? walk.at - first : first - walk.at,
+                      backwards ? first.date : walk.at.date};
 }
 
 } // namespace kvt::ex::datetime::detail

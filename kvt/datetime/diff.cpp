@@ -6,19 +6,31 @@
 #include <kvt/datetime/detail/record.h>
 #include <kvt/datetime/detail/result.h>
 #include <kvt/datetime/detail/text.h>
+#include <kvt/datetime/detail/wall_clock.h>
 
 namespace kvt::ex::datetime {
+
+namespace detail {
+
+// Made in its place.
+static TextResult resultOf(const Difference& difference) {
+    TextBuffer text;
+    writeInterval(text, difference.parts());
+    return TextResult(ReturnState::Success, UStringView<0>(text.view()), std::nullopt);
+}
+
+} // namespace detail
 
 namespace {
 
 using detail::CanonicalRecord;
 using detail::Outcome;
-using detail::TimeCount;
+using detail::WallClock;
 
 /// Two values that can be compared, in UTC where they have an offset.
 struct Pair {
-    TimeCount first;
-    TimeCount second;
+    WallClock first;
+    WallClock second;
     bool haveDates;
 };
 
@@ -39,9 +51,7 @@ Outcome<Pair> readPair(const UString<0>& first, const UString<0>& second) {
                 if (!areComparable(left.type, right.type)) {
                     return detail::KindsNotComparable{detail::viewOf(first), detail::viewOf(second)};
                 }
-                return Pair{detail::utcCount(detail::instantWithOffset(left)),
-                            detail::utcCount(detail::instantWithOffset(right)),
-                            !detail::isTimeKind(right.type)};
+                return Pair{detail::utcClock(left), detail::utcClock(right), !detail::isTimeKind(right.type)};
             });
     });
 }
@@ -83,13 +93,9 @@ Outcome<double> numberBetween(const Pair& pair, UnitType unit) {
 
 TextResult diff(const UString<0>& first, const UString<0>& second) {
     return detail::guarded<UString<0>>([&] {
-        return readPair(first, second)
-            .andThen(
-                [](const Pair& pair) { return detail::diffParts(pair.first, pair.second, pair.haveDates); })
-            .andThen([](const detail::Difference& difference) {
-                return detail::makeDateTimeResult(ReturnState::Success,
-                                                  detail::intervalText(difference.parts()));
-            });
+        return readPair(first, second).andThen([](const Pair& pair) {
+            return detail::diffParts(pair.first, pair.second, pair.haveDates);
+        });
     });
 }
 
@@ -106,7 +112,7 @@ int compare(const UString<0>& first, const UString<0>& second) {
     if (!pair) {
         return -3;
     }
-    return pair->first < pair->second ? -1 : pair->first > pair->second ? 1 : 0;
+    return pair->first < pair->second ? -1 : pair->second < pair->first ? 1 : 0;
 }
 
 } // namespace kvt::ex::datetime

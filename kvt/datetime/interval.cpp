@@ -138,16 +138,18 @@ Outcome<IntervalParts> readInterval(std::string_view given) {
     return parts;
 }
 
-UString<0> intervalText(const IntervalParts& parts) {
-    TextBuffer text;
-    bool any = false;
+void writeInterval(TextBuffer& text, const IntervalParts& parts) {
     const auto put = [&](std::int64_t number, char designator) {
         if (number > 0) {
             text.putNumber(static_cast<std::uint64_t>(number));
             text.put(designator);
-            any = true;
         }
     };
+    const bool hasSeconds = parts.seconds() > 0 || parts.nanoseconds() > 0;
+    const bool hasTime = parts.hours() > 0 || parts.minutes() > 0 || hasSeconds;
+    if (!hasTime && parts.years() <= 0 && parts.months() <= 0 && parts.days() <= 0) {
+        return text.put("PT0S"); // without a sign
+    }
     if (parts.negative()) {
         text.put('-');
     }
@@ -155,19 +157,23 @@ UString<0> intervalText(const IntervalParts& parts) {
     put(parts.years(), 'Y');
     put(parts.months(), 'M');
     put(parts.days(), 'D');
-    const bool seconds = parts.seconds() > 0 || parts.nanoseconds() > 0;
-    if (parts.hours() > 0 || parts.minutes() > 0 || seconds) {
-        text.put('T');
+    if (!hasTime) {
+        return;
     }
+    text.put('T');
     put(parts.hours(), 'H');
     put(parts.minutes(), 'M');
-    if (seconds) {
+    if (hasSeconds) {
         text.putSeconds(static_cast<std::uint64_t>(parts.seconds()),
                         static_cast<std::uint64_t>(parts.nanoseconds()));
         text.put('S');
-        any = true;
     }
-    return any ? text.toString() : UString<0>("PT0S");
+}
+
+UString<0> intervalText(const IntervalParts& parts) {
+    TextBuffer text;
+    writeInterval(text, parts);
+    return text.toString();
 }
 
 } // namespace kvt::ex::datetime::detail

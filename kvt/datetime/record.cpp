@@ -5,6 +5,9 @@
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
+#include <array>
+#include <bit>
+#include <cstring>
 #include <optional>
 
 namespace kvt::ex::datetime::detail {
@@ -66,22 +69,42 @@ bool split(std::string_view text, CanonicalRecord& record) noexcept {
     return true;
 }
 
-std::uint64_t pairAt(const char* digits) noexcept {
-    return static_cast<std::uint64_t>((digits[0] - '0') * 10 + (digits[1] - '0'));
+// Eight digits as four numbers of two digits, the first one in the lowest sixteen bits.
+std::uint64_t pairsOf(const char* digits) noexcept {
+    constexpr std::uint64_t everyPair = 0x0001000100010001;
+    std::uint64_t bytes = 0;
+    std::memcpy(&bytes, digits, sizeof bytes);
+    if constexpr (std::endian::native == std::endian::big) {
+        bytes = __builtin_bswap64(bytes);
+    }
+    bytes &= everyPair * 0x0F0F;
+    return (bytes * 10 + (bytes >> 8)) & everyPair * 0xFF; // each byte stays below 100
+}
+
+std::int64_t pairAt(std::uint64_t pairs, unsigned index) noexcept {
+    return static_cast<std::int64_t>(pairs >> index * 16 & 0xFF);
 }
 
 void readNumbers(CanonicalRecord& record) noexcept {
     DateTimeFields& fields = record.fields;
-    if (const char* const date = record.digits.data(); !isTimeKind(record.type)) {
-        fields.year = static_cast<std::int64_t>(pairAt(date) * 100 + pairAt(date + 2));
-        fields.month = pairAt(date + 4);
-        fields.day = pairAt(date + 6);
+    std::string_view digits = record.digits;
+    if (!isTimeKind(record.type)) {
+        const std::uint64_t date = pairsOf(digits.data());
+        fields.year = pairAt(date, 0) * 100 + pairAt(date, 1);
+        fields.month = static_cast<std::uint64_t>(pairAt(date, 2));
+        fields.day = static_cast<std::uint64_t>(pairAt(date, 3));
     }
     if (record.type != TemporalType::Date) {
-        const char* const time = record.digits.data() + record.digits.size() - timeDigits;
-        fields.hours = static_cast<std::int64_t>(pairAt(time));
-        fields.minutes = static_cast<std::int64_t>(pairAt(time + 2));
-        fields.seconds = static_cast<std::int64_t>(pairAt(time + 4));
+        // The last eight digits end with those of the time; a time without a date has but six.
+        std::array<char, dateDigits> alone = {'0', '0'};
+        const bool isAlone = digits.size() == timeDigits;
+        if (isAlone) {
+            std::copy(digits.begin(), digits.end(), alone.begin() + 2);
+        }
+        const std::uint64_t time = pairsOf(isAlone ? alone.data() : digits.data() + timeDigits);
+        fields.hours = pairAt(time, 1);
+        fields.minutes = pairAt(time, 2);
+        fields.seconds = pairAt(time, 3);
     }
     if (!record.fractionText.empty()) {
         fields.nanoseconds = static_cast<std::int64_t>(fractionNanoseconds(record.fractionText));

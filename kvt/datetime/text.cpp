@@ -164,12 +164,16 @@ void TextBuffer::putFraction(std::uint64_t nanoseconds) {
     if (nanoseconds == 0) {
         return;
     }
-    char* place = room(1 + nanosecondDigits);
     const auto number = static_cast<std::uint32_t>(nanoseconds);
+    const std::uint32_t rest = number % 100'000'000;
+    char* place = room(rest == 0 ? 2 : 1 + nanosecondDigits); // many fractions have but one digit
     *place++ = '.';
     *place++ = static_cast<char>('0' + number / 100'000'000);
-    const std::uint32_t high = number % 100'000'000 / 10'000;
-    const std::uint32_t low = number % 10'000;
+    if (rest == 0) {
+        return;
+    }
+    const std::uint32_t high = rest / 10'000;
+    const std::uint32_t low = rest % 10'000;
     place = writePair(writePair(place, high / 100), high % 100);
     writePair(writePair(place, low / 100), low % 100);
     while (data_[size_ - 1] == '0') {

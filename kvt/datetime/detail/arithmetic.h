@@ -1,10 +1,11 @@
-// Moving a count by an interval, and the interval between two counts.
+// Moving a count by an interval, and the interval between two clocks.
 #pragma once
 
 #include <kvt/datetime/datetime_parts.h>
 #include <kvt/datetime/detail/failure.h>
 #include <kvt/datetime/detail/instant.h>
 #include <kvt/datetime/detail/time_count.h>
+#include <kvt/datetime/detail/wall_clock.h>
 
 namespace kvt::ex::datetime::detail {
 
@@ -28,6 +29,6 @@ struct Difference {
 
 /// First minus second; years and months only `byCalendar`, which values without a date have none of. A failure if the
 /// way leads over a year that is out of range.
-Outcome<Difference> diffParts(const TimeCount& first, const TimeCount& second, bool byCalendar);
+Outcome<Difference> diffParts(const WallClock& first, const WallClock& second, bool byCalendar);
 
 } // namespace kvt::ex::datetime::detail

@@ -52,19 +52,20 @@ std::optional<DatePartRange> timeOutOfRange(const DateTimeFields& fields, bool l
 /// 12th month and the last day of the month, with it up to what daysFromCivil() takes.
 std::optional<DatePartRange> dateOutOfRange(const DateTimeFields& fields, bool lenient) noexcept;
 
-/// Whether all numbers are in their ranges, as they nearly always are, without a look at the length of the month.
-constexpr bool areOfEveryMonth(const DateTimeFields& fields) noexcept {
+/// Whether all numbers are in their ranges in every year, as all are but a 29th of February.
+constexpr bool areOfEveryYear(const DateTimeFields& fields) noexcept {
+    constexpr std::uint8_t shortest[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
     const auto isBelow = [](std::int64_t number, std::uint64_t end) {
         return static_cast<std::uint64_t>(number) < end;
     };
     return isBelow(fields.year - lowestYear, highestYear - lowestYear + 1) && fields.month - 1 < 12 &&
-           fields.day - 1 < 28 && isBelow(fields.hours, 24) && isBelow(fields.minutes, 60) &&
-           isBelow(fields.seconds, 60);
+           fields.day - 1 < shortest[fields.month - 1] && isBelow(fields.hours, 24) &&
+           isBelow(fields.minutes, 60) && isBelow(fields.seconds, 60);
 }
 
 /// The first number that is out of its range, if one is.
 inline std::optional<DatePartRange> partOutOfRange(const DateTimeFields& fields, bool lenient) noexcept {
-    if (areOfEveryMonth(fields)) {
+    if (areOfEveryYear(fields)) {
         return std::nullopt;
     }
     if (std::optional<DatePartRange> wrong = timeOutOfRange(fields, lenient)) {

@@ -72,10 +72,19 @@ inline constexpr std::size_t longestFixedDouble = 1 + 309 + 1 + 9;
 /// ends.
 char* writeFixed(char* first, char* last, double value) noexcept;
 
+/// "00" to "99", one behind the other.
+inline constexpr std::array<char, 200> digitPairs = [] {
+    std::array<char, 200> digits{};
+    for (std::size_t number = 0; number < 100; ++number) {
+        digits[2 * number] = static_cast<char>('0' + number / 10);
+        digits[2 * number + 1] = static_cast<char>('0' + number % 10);
+    }
+    return digits;
+}();
+
 /// Writes two digits and returns where they end; the number is below 100.
 inline char* writePair(char* place, unsigned number) noexcept {
-    place[0] = static_cast<char>('0' + number / 10);
-    place[1] = static_cast<char>('0' + number % 10);
+    std::memcpy(place, &digitPairs[2 * std::size_t{number}], 2);
     return place + 2;
 }
 

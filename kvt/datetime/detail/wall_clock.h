@@ -1,0 +1,46 @@
+// A date and the time of its day: a place on the time line for who goes by the calendar. To compare two of them, or to
+// move one within its day, takes no count of days.
+#pragma once
+
+#include <kvt/datetime/detail/calendar.h>
+#include <kvt/datetime/detail/record.h>
+#include <kvt/datetime/detail/time_count.h>
+
+#include <cstdint>
+
+namespace kvt::ex::datetime::detail {
+
+struct WallClock {
+    CivilDate date;
+    std::int64_t nanoseconds = 0; ///< of the day: 0 and above, below nanosPerDay
+
+    friend constexpr bool operator==(const WallClock& left, const WallClock& right) noexcept {
+        return left.nanoseconds == right.nanoseconds && ordinalOf(left.date) == ordinalOf(right.date);
+    }
+    friend constexpr bool operator<(const WallClock& left, const WallClock& right) noexcept {
+        const std::int64_t leftDay = ordinalOf(left.date);
+        const std::int64_t rightDay = ordinalOf(right.date);
+        return leftDay != rightDay ? leftDay < rightDay : left.nanoseconds < right.nanoseconds;
+    }
+    /// How long it is from `right` to `left`.
+    friend TimeCount operator-(const WallClock& left, const WallClock& right) noexcept {
+        return timeCount(daysBetween(right.date, left.date), left.nanoseconds - right.nanoseconds);
+    }
+
+private:
+    // Grows with the date, but not by one for each day.
+    static constexpr std::int64_t ordinalOf(const CivilDate& date) noexcept {
+        return (date.year * 16 + date.month) * 32 + date.day;
+    }
+    static std::int64_t daysBetween(const CivilDate& from, const CivilDate& to) noexcept {
+        if (from.year == to.year && from.month == to.month) {
+            return std::int64_t{to.day} - std::int64_t{from.day};
+        }
+        return daysFromCivil(to.year, to.month, to.day) - daysFromCivil(from.year, from.month, from.day);
+    }
+};
+
+/// The clock of a record that was read without `lenient`: in UTC where it has an offset, else as it is written.
+WallClock utcClock(const CanonicalRecord& record) noexcept;
+
+} // namespace kvt::ex::datetime::detail
