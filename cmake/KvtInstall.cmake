@@ -20,7 +20,7 @@ endif()
 configure_package_config_file(
     "${PROJECT_SOURCE_DIR}/cmake/kvtConfig.cmake.in" "${PROJECT_BINARY_DIR}/kvtConfig.cmake"
     INSTALL_DESTINATION "${KVT_INSTALL_CMAKEDIR}")
-write_basic_package_version_file("${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake" COMPATIBILITY SameMinorVersion)
+write_basic_package_version_file("${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake" COMPATIBILITY SameMajorVersion)
 install(FILES "${PROJECT_BINARY_DIR}/kvtConfig.cmake" "${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake"
     DESTINATION "${KVT_INSTALL_CMAKEDIR}")
 
