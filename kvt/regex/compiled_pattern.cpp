@@ -60,18 +60,30 @@ bool CompiledPattern::match(std::string_view text, boost::cmatch& result) const 
 
 bool CompiledPattern::search(std::string_view text, std::size_t start, boost::cmatch& result) const {
     const char* const begin = text.data() + start;
-    const char* const end = text.data() + text.size();
-    if (scan_) {
-        if (const std::optional<bool> found = searchByPrefix(begin, end, result)) {
+    return searchIn({begin, begin, text.data() + text.size()}, boost::regex_constants::match_default, result);
+}
+
+bool CompiledPattern::searchOn(std::string_view text, std::size_t start, bool mayBeEmpty,
+                               boost::cmatch& result) const {
+    return searchIn({text.data(), text.data() + start, text.data() + text.size()},
+                    mayBeEmpty ? boost::regex_constants::match_default
+                               : boost::regex_constants::match_not_initial_null,
+                    result);
+}
+
+bool CompiledPattern::searchIn(const Range& range, boost::match_flag_type flags,
+                               boost::cmatch& result) const {
+    if (scan_ && flags == boost::regex_constants::match_default) {
+        if (const std::optional<bool> found = searchByPrefix(range, result)) {
             return *found;
         }
     }
-    return boost::regex_search(begin, end, result, engine());
+    return boost::regex_search(range.begin, range.end, result, engine(), flags, range.base);
 }
 
-std::optional<bool> CompiledPattern::searchByPrefix(const char* begin, const char* end,
-                                                    boost::cmatch& result) const {
-    const auto size = static_cast<std::size_t>(end - begin);
+std::optional<bool> CompiledPattern::searchByPrefix(const Range& range, boost::cmatch& result) const {
+    const char* const begin = range.begin;
+    const auto size = static_cast<std::size_t>(range.end - begin);
     double visited = 0; // states, by the tries
     std::size_t place = scan_.find(begin, size, 0);
     for (std::size_t tries = 1;; ++tries) {
@@ -83,8 +95,9 @@ std::optional<bool> CompiledPattern::searchByPrefix(const char* begin, const cha
             return false;
         }
         try {
-            // All that looks back sees the beginning of the search, not of the try.
-            if (boost::regex_search(begin + place, end, result, engine(), boost::match_continuous, begin)) {
+            // All that looks back sees what it would see in the plain search, and not the beginning of the try.
+            if (boost::regex_search(begin + place, range.end, result, engine(), boost::match_continuous,
+                                    range.base)) {
                 return true;
             }
         } catch (const boost::regex_error&) {

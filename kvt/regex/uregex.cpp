@@ -5,6 +5,7 @@
 #include <kvt/regex/detail/compiled_pattern.h>
 
 #include <cstddef>
+#include <functional>
 #include <string_view>
 
 namespace kvt::ex {
@@ -44,6 +45,24 @@ void searchFrom(const detail::CompiledPattern* pattern, std::string_view subject
     boost::cmatch result;
     if (pattern != nullptr && pattern->search(subject, start, result)) {
         fill(groups, result, subject, start);
+    }
+}
+
+void searchAllOf(const detail::CompiledPattern* pattern, std::string_view subject, Groups& groups,
+                 const std::function<bool()>& use) {
+    boost::cmatch result;
+    bool mayBeEmpty = true;
+    for (std::uint64_t start = 0;
+         pattern != nullptr && pattern->searchOn(subject, start, mayBeEmpty, result);) {
+        groups.clear();
+        fill(groups, result, subject, 0);
+        if (!use()) {
+            return;
+        }
+        // With \K in a look ahead, a match may end before it begins. The search goes on behind its start all the same.
+        const auto end = static_cast<std::uint64_t>(result[0].second - subject.data());
+        mayBeEmpty = end > start && groups[0].second != 0;
+        start = end;
     }
 }
 
@@ -98,6 +117,13 @@ URegexMatch<N> URegex<N>::search(const UString<N>& subject, std::uint64_t start)
     URegexMatch<N> match(subject);
     searchFrom(d().pattern.get(), subject, start, match.groups_);
     return match;
+}
+
+template <std::uint32_t N>
+void URegex<N>::searchAll(const UString<N>& subject,
+                          const std::function<bool(const URegexMatch<N>&)>& use) const {
+    URegexMatch<N> match(subject);
+    searchAllOf(d().pattern.get(), match.subject_, match.groups_, [&] { return use(match); });
 }
 
 template class URegex<0>;

@@ -20,6 +20,7 @@
 #include <kvt/string/ustring.h>
 
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <utility>
 
@@ -110,6 +111,15 @@ public:
     /// look behind ends there. Positions count from the beginning of the subject all the same.
     /// Not checked: `start` must be at most the size of the subject. Fails as match().
     URegexMatch<N> search(const UString<N>& subject, std::uint64_t start = 0) const;
+
+    /// Calls `use` with each match in `subject` from left to right, none within the one before, until it returns
+    /// false. All of the text can be seen: `^`, `\b` and a look behind take no match for a beginning. Where a match is
+    /// empty, the next one is a longer one at that place, or stands behind it. A group that took no part has the
+    /// position npos.
+    ///
+    /// The match that `use` gets is valid during the call; its subject is copied once for all of them. Fails as
+    /// match(), and with what `use` throws.
+    void searchAll(const UString<N>& subject, const std::function<bool(const URegexMatch<N>&)>& use) const;
 
 private:
     const detail::URegexImpl<N>& d() const noexcept { return *impl_; }

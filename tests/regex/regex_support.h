@@ -121,6 +121,44 @@ inline Found searchedByEngine(const boost::regex& regex, std::string_view subjec
     return found;
 }
 
+/// The groups of all matches, and the failure that ended the search for them.
+struct AllFound {
+    std::vector<Spans> matches;
+    EngineError error;
+
+    bool operator==(const AllFound&) const = default;
+};
+
+inline std::ostream& operator<<(std::ostream& out, const AllFound& all) {
+    for (const Spans& groups : all.matches) {
+        out << "[" << Found{groups, {}} << "] ";
+    }
+    return out << all.error;
+}
+
+template <std::uint32_t N>
+AllFound allFoundBy(const ex::URegex<N>& regex, std::string_view subject) {
+    AllFound all;
+    all.error = errorOf([&] {
+        regex.searchAll(units<N>(subject), [&](const ex::URegexMatch<N>& match) {
+            all.matches.push_back(groupsOf(match));
+            return true;
+        });
+    });
+    return all;
+}
+
+inline AllFound allFoundByEngine(const boost::regex& regex, std::string_view subject) {
+    using Iterator = boost::regex_iterator<std::string_view::const_iterator>;
+    AllFound all;
+    all.error = errorOf([&] {
+        for (Iterator match(subject.begin(), subject.end(), regex); match != Iterator(); ++match) {
+            all.matches.push_back(engineGroups(*match, subject, 0));
+        }
+    });
+    return all;
+}
+
 /// Position and length as ObsoleteRegexp gives them.
 inline Span indexedBy(const ObsoleteRegexp& regexp, std::string_view text, std::uint64_t start) {
     std::uint64_t length = 12345;

@@ -132,6 +132,37 @@ TEST(URegex, ASearchBeginsAtTheBeginningUnlessTold) {
     EXPECT_EQ(groupsOf(URegex<0>("a").search("ba")), (Spans{{1, 1}}));
 }
 
+TEST(URegex, AllMatchesAreFoundWithAViewOfTheWholeText) {
+    struct Row {
+        int line;
+        const char* pattern;
+        const char* subject;
+        std::vector<Spans> matches;
+    };
+    const Row rows[] = {
+        {__LINE__, "a", "banana", {{{1, 1}}, {{3, 1}}, {{5, 1}}}},
+        {__LINE__, "^a", "aaa", {{{0, 1}}}},
+        {__LINE__, "(?<=a)a", "aaa", {{{1, 1}}, {{2, 1}}}},
+        {__LINE__, "\\ba", "aa a", {{{0, 1}}, {{3, 1}}}},
+        {__LINE__, "b*", "abb", {{{0, 0}}, {{1, 2}}, {{3, 0}}}},
+        {__LINE__, "|b", "b", {{{0, 0}}, {{0, 1}}, {{1, 0}}}},
+        {__LINE__, "(a)|b", "ba", {{{0, 1}, {none, 0}}, {{1, 1}, {1, 1}}}},
+        {__LINE__, "(?=a\\K)", "a", {{{1, std::uint64_t(0) - 1}}}},
+        {__LINE__, "x", "", {}},
+    };
+    for (const Row& row : rows) {
+        EXPECT_EQ(allFoundBy(URegex<0>(row.pattern), row.subject).matches, row.matches) << "row " << row.line;
+    }
+    int calls = 0;
+    URegex<0>("a").searchAll("aaa", [&](const URegexMatch<0>& match) {
+        EXPECT_EQ(match.subject(), UString<0>("aaa"));
+        return ++calls < 2;
+    });
+    EXPECT_EQ(calls, 2);
+    URegex<0>().searchAll("a", [](const URegexMatch<0>&) -> bool { throw std::logic_error("no match"); });
+    EXPECT_THROW(URegex<0>("a").searchAll("a", [](const URegexMatch<0>&) -> bool { throw 1; }), int);
+}
+
 TEST(URegex, WithoutAPatternItIsFalseAndMatchesNothing) {
     const URegex<0> regex;
     EXPECT_FALSE(regex);

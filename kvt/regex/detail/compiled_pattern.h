@@ -27,15 +27,25 @@ public:
     bool match(std::string_view text, boost::cmatch& result) const;
     /// Whether it matches somewhere from `start` on, which is at most the size; nothing before `start` is seen.
     bool search(std::string_view text, std::size_t start, boost::cmatch& result) const;
+    /// The same with a view of the text before `start`; a match that is empty there counts only where it may be.
+    bool searchOn(std::string_view text, std::size_t start, bool mayBeEmpty, boost::cmatch& result) const;
 
 private:
     // The engine counts who uses a program, in the program. So threads have programs of their own, but for those that
     // have the same one of these numbers.
     static constexpr std::size_t programs = 8;
 
+    // What is searched; what looks back sees the text from `base` on.
+    struct Range {
+        const char* base;
+        const char* begin;
+        const char* end;
+    };
+
     const Engine& engine() const;
+    bool searchIn(const Range& range, boost::match_flag_type flags, boost::cmatch& result) const;
     // Nothing where it is for the plain search to say.
-    std::optional<bool> searchByPrefix(const char* begin, const char* end, boost::cmatch& result) const;
+    std::optional<bool> searchByPrefix(const Range& range, boost::cmatch& result) const;
 
     Engine engine_; // of the thread that compiled the pattern
     std::size_t owner_;
