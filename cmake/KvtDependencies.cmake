@@ -26,6 +26,7 @@ kvt_find(NAME "Highway" INSTALL "libhwy-dev" PACKAGE hwy CONFIG)
 kvt_find(NAME "the headers of the date library" INSTALL "libhowardhinnant-date-dev" PACKAGE date CONFIG)
 
 if(KVT_BUILD_TOOLS OR KVT_BUILD_TESTS OR KVT_BUILD_FUZZERS)
+    kvt_find(NAME "ICU's i18n library, for the kvt command" INSTALL "libicu-dev" PACKAGE ICU 58 COMPONENTS uc i18n)
     kvt_find(NAME "CLI11, for the kvt command" INSTALL "libcli11-dev" PACKAGE CLI11 CONFIG)
     kvt_find(NAME "nlohmann-json, for the kvt command" INSTALL "nlohmann-json3-dev" PACKAGE nlohmann_json CONFIG)
 endif()

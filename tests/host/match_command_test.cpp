@@ -56,6 +56,8 @@ TEST_F(KvtMatch, PrintsTheLinesOrTheGroups) {
         {__LINE__, {"--dialect", "legacy", "a|b"}, "b\na|b\n", "a|b\n"},
         {__LINE__, {"--dialect", "legacy", "f(x)$"}, "f(x)+\ny=f(x)\n", "y=f(x)\n"},
         {__LINE__, {"--dialect", "legacy", "--groups", "(.)"}, "\n(a) (b)\n", "2:0:0:3:(a)\n"},
+        {__LINE__, {"--unicode", "(a)|b"}, "x\nb\n", "b\n"},
+        {__LINE__, {"--unicode", "^..$"}, "😀é\nabc\n", "😀é\n"},
         {__LINE__, {"--dialect", "legacy", "x*"}, "\na\n", "a\n"},
         {__LINE__, {"--dialect", "legacy", "{2}$"}, "a{2}\naa\n", "a{2}\n"},
     };
@@ -227,6 +229,189 @@ TEST_F(KvtMatch, LinesAreCountedNumberedAndTurnedRound) {
     EXPECT_EQ(kvt({"match", "--groups", "-v", "b"}, text).status, 2);
     EXPECT_EQ(kvt({"match", "--dialect", "legacy", "-i", "b"}, text).status, 2);
     EXPECT_EQ(kvt({"match", "-i", "(b"}, text).err, kvt({"match", "(b"}, text).err);
+}
+
+TEST_F(KvtMatch, WhatMatchedIsPrintedAlone) {
+    struct Row {
+        int line;
+        Strings arguments;
+        std::string input;
+        std::string output;
+    };
+    const Row rows[] = {
+        {__LINE__, {"a"}, "banana\nx\na", "a\na\na\na\n"},
+        {__LINE__, {"^a"}, "aaa\r\n", "a\r\n"},
+        {__LINE__, {"\\ba"}, "aa a\n", "a\na\n"},
+        {__LINE__, {"(?<=a)."}, "abac\n", "b\nc\n"},
+        {__LINE__, {"x*"}, "axx\n", "xx\n"},
+        {__LINE__, {"-n", "\\d+"}, "1 22\n\n3\n", "1:1\n1:22\n3:3\n"},
+        {__LINE__, {"-i", "a"}, "aA\n", "a\nA\n"},
+        {__LINE__, {"é|€"}, "é€\n", "é\n€\n"},
+        {__LINE__, {"--unicode", "."}, "é😀x\n", "é\n😀\nx\n"},
+        {__LINE__, {"--unicode", "-i", "ł"}, "Łł\n", "Ł\nł\n"},
+        {__LINE__, {"--unicode", "^.*$"}, "a b\n", "a b\n"},
+        {__LINE__, {"--unicode", "(?<=😀)\\w+"}, "😀Ła\n", "Ła\n"},
+    };
+    for (const Row& row : rows) {
+        Strings arguments = row.arguments;
+        arguments.insert(arguments.begin(), "--only-matching");
+        const ChildResult result = match(arguments, row.input);
+        EXPECT_EQ(result.out, row.output) << row.line << ": " << result.err;
+        EXPECT_EQ(result.status, 0) << row.line;
+    }
+    EXPECT_EQ(match({"--only-matching", "ł", "--encoding", "ISO-8859-2"}, "\xb3 \xb3").out, "\xb3\n\xb3\n");
+    EXPECT_EQ(match({"--only-matching", "a", "--encoding", "UTF-16"}, utf16Of(U"\ufeffxa\n", true)).out,
+              utf16Of(U"\ufeffa\n", true));
+}
+
+TEST_F(KvtMatch, MatchesAreReplaced) {
+    struct Row {
+        int line;
+        std::string pattern;
+        std::string text;
+        Strings more;
+        std::string input;
+        std::string output;
+    };
+    const Row rows[] = {
+        {__LINE__, "(\\d+)-(\\d+)", "$2/$1", {}, "x 1-2, 3-4!\nnone\n", "x 2/1, 4/3!\n"},
+        {__LINE__, "(\\d+)-(\\d+)", "$2/$1", {"--all-lines"}, "x 1-2\r\nnone\n", "x 2/1\r\nnone\n"},
+        {__LINE__, "(\\d+)-(\\d+)", "<$0>", {"--only-matching"}, "x 1-2, 3-4\n", "<1-2>\n<3-4>\n"},
+        {__LINE__, "a", "$$1", {}, "a\n", "$1\n"},
+        {__LINE__, "(a)", "${1}0", {}, "a\n", "a0\n"},
+        {__LINE__, "(a)|b", "[$1]", {}, "ab\n", "[a][]\n"},
+        {__LINE__, "^", "> ", {}, "a\n\n", "> a\n> \n"},
+        {__LINE__, "$", ";", {}, "a\nb", "a;\nb;\n"},
+        {__LINE__, "x*", "-", {}, "éx\n", "-é--\n"},
+        {__LINE__, "a", "", {"-n"}, "ba\nab\n", "1:b\n2:b\n"},
+        {__LINE__, ".", "$0$0", {"--unicode"}, "éb\n", "éébb\n"},
+        {__LINE__, "(?<year>\\d+)", "$1!", {"--unicode"}, "in 2020\n", "in 2020!\n"},
+    };
+    for (const Row& row : rows) {
+        Strings arguments = {row.pattern, "--replace", row.text};
+        arguments.insert(arguments.end(), row.more.begin(), row.more.end());
+        const ChildResult result = match(arguments, row.input);
+        EXPECT_EQ(result.out, row.output) << row.line << ": " << result.err;
+        EXPECT_EQ(result.status, 0) << row.line;
+    }
+    EXPECT_EQ(match({"a", "--replace", "ł", "--encoding", "ISO-8859-2"}, "a\n").out, "\xb3\n");
+    EXPECT_EQ(
+        match({"a", "--replace", "ł", "--encoding", "ISO-8859-1"}, "b\na\n").err,
+        "kvt: standard input: line 2: the result cannot be written. The text \"ł\", read as UTF-8, holds "
+        "something that does not exist in ISO-8859-1.\n");
+}
+
+TEST_F(KvtMatch, AReplacementNamesGroupsThatThereAre) {
+    const std::string form =
+        "kvt: --replace takes $0, $1 and so on for groups, ${1} before a digit, and $$ for a dollar, not '";
+    for (const auto& [text, error] : std::vector<std::pair<std::string, std::string>>{
+             {"$2", "kvt: --replace names '$2', and REGEX has 1 group\n"},
+             {"x${99}", "kvt: --replace names '${99}', and REGEX has 1 group\n"},
+             {"$99999999999999999999",
+              "kvt: --replace names '$99999999999999999999', and REGEX has 1 group\n"},
+             {"5 $", form + "$'\n"},
+             {"$a", form + "$a'\n"},
+             {"${1", form + "${1'\n"}}) {
+        for (const Strings& dialect : {Strings{}, {"--unicode"}}) {
+            Strings arguments = {"(a)", "--replace", text, "-o", "out"};
+            arguments.insert(arguments.end(), dialect.begin(), dialect.end());
+            const ChildResult result = match(arguments, "a\n");
+            EXPECT_EQ(result.err, error);
+            EXPECT_EQ(result.status, 2);
+            EXPECT_FALSE(exists("out"));
+        }
+    }
+    EXPECT_TRUE(contains(match({"a", "--replace", "$1"}, "").err, "REGEX has no groups\n"));
+}
+
+TEST_F(KvtMatch, GroupsAreRowsOrRecords) {
+    EXPECT_EQ(match({"--tsv", "(\\w+)=(\\w*)( !)?"}, "a=1 b=\nx\nc=3 !\n").out, "a\t1\t\nb\t\t\nc\t3\t !\n");
+    EXPECT_EQ(match({"--tsv", "a."}, "abac\n").out, "ab\nac\n");
+    EXPECT_EQ(match({"--tsv", "(.*):(.*)"}, "a\tb:c\\d\n").out, "a\\tb\tc\\\\d\n");
+    EXPECT_EQ(match({"--tsv", "-n", "(a)(b)"}, "ab\nabab\r\n").out, "1\ta\tb\n2\ta\tb\r\n2\ta\tb\r\n");
+    EXPECT_EQ(match({"--tsv", "(.+) (.+)", "--encoding", "KOI8-R"}, "\xc1 \xc2\n").out, "\xc1\t\xc2\n");
+    EXPECT_EQ(
+        match({"--json", "(a)(b)?", "--encoding", "ISO-8859-1"}, "\xe9"
+                                                                 "a\nab\n")
+            .out,
+        "{\"file\":\"standard input\",\"line\":1,\"position\":2,\"length\":1,\"text\":\"a\",\"groups\":["
+        "{\"position\":2,\"length\":1,\"text\":\"a\"},null]}\n"
+        "{\"file\":\"standard input\",\"line\":2,\"position\":0,\"length\":2,\"text\":\"ab\",\"groups\":["
+        "{\"position\":0,\"length\":1,\"text\":\"a\"},{\"position\":1,\"length\":1,\"text\":\"b\"}]}\n");
+    EXPECT_EQ(match({"--groups", "--unicode", "(.)x"}, "€éx\n").out, "1:0:3:3:éx\n1:1:3:2:é\n");
+}
+
+TEST_F(KvtMatch, NoCharacterIsCutInTwo) {
+    for (const Strings& form :
+         std::vector<Strings>{{"--only-matching"}, {"--replace", "x"}, {"--tsv"}, {"--groups"}, {"--json"}}) {
+        for (const std::string pattern : {"a(.)", "(.)$", "[é]"}) {
+            Strings arguments = form;
+            arguments.push_back(pattern);
+            const ChildResult result = match(arguments, "ab\naé\n");
+            EXPECT_EQ(result.status, 2) << pattern;
+            EXPECT_EQ(
+                result.err,
+                "kvt: standard input: line 2: REGEX matches a part of a character; with --unicode it takes "
+                "whole ones\n");
+            EXPECT_EQ(result.out, "");
+            arguments.push_back("--unicode");
+            EXPECT_EQ(match(arguments, "ab\naé\n").status, 0) << pattern;
+        }
+    }
+    EXPECT_EQ(match({"a.$"}, "aé\nab\n").out, "ab\n");
+    EXPECT_EQ(match({"--unicode", "a.$"}, "aé\nab\n").out, "aé\nab\n");
+}
+
+TEST_F(KvtMatch, UnicodePatternsHaveTheirOwnFaults) {
+    for (const auto& [pattern, words] : std::vector<std::pair<std::string, std::string>>{
+             {"a(b", "parentheses do not go in pairs, behind 'a(b'"},
+             {"[a", "']' is missing, behind '[a'"},
+             {"\\p{Nosuch}", "there is no such property of characters"},
+             {"\\y", "a backslash stands before what has no meaning behind it, behind '\\y'"},
+             {"a{2,1}", "the most repetitions are fewer than the least"},
+             {"(a)\\2", "a reference names a group that there is not"}}) {
+        const ChildResult result = match({"--unicode", pattern}, "a\n");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_TRUE(result.err.starts_with("kvt: REGEX cannot be compiled: " + words)) << result.err;
+    }
+    const ChildResult result = match({"--unicode", "(a*)*b"}, std::string(60, 'a') + "\n");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_TRUE(result.err.starts_with("kvt: standard input: line 1: REGEX gives up: The line takes too m"))
+        << result.err;
+    EXPECT_EQ(match({"--unicode", ""}, "a\n\n").out, "a\n\n");
+}
+
+TEST_F(KvtMatch, OptionsThatExcludeEachOtherAreNamed) {
+    for (const Strings& pair : std::vector<Strings>{{"--count", "--tsv"},
+                                                    {"--groups", "--json"},
+                                                    {"--tsv", "--only-matching"},
+                                                    {"--json", "--replace"},
+                                                    {"--only-matching", "--invert-match"},
+                                                    {"--replace", "--invert-match"},
+                                                    {"--groups", "--line-number"},
+                                                    {"--unicode", "--dialect"}}) {
+        Strings arguments = {"a"};
+        for (const std::string& option : pair) {
+            arguments.push_back(option == "--replace"   ? "--replace=x"
+                                : option == "--dialect" ? "--dialect=perl"
+                                                        : option);
+        }
+        const ChildResult result = match(arguments, "");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.err, "kvt: " + pair[0] + " and " + pair[1] + " do not go together\n");
+    }
+    EXPECT_EQ(match({"a", "--all-lines"}, "").status, 2);
+    EXPECT_EQ(match({"a", "--dialect", "legacy", "--only-matching"}, "").err,
+              "kvt: --only-matching goes with the dialect 'perl' or --unicode only\n");
+}
+
+TEST_F(KvtMatch, ALongLineWithManyMatchesTakesNoLongerForEach) {
+    const std::string line(3'000'000, 'a');
+    for (const Strings& dialect : {Strings{}, {"--unicode"}}) {
+        Strings arguments = {"a", "--replace", "b"};
+        arguments.insert(arguments.end(), dialect.begin(), dialect.end());
+        EXPECT_TRUE(match(arguments, line).out == std::string(line.size(), 'b') + "\n");
+    }
 }
 
 TEST_F(KvtMatch, AClosedPipeEndsItQuietly) {

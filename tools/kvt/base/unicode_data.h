@@ -1,5 +1,5 @@
 // What only ICU knows and the library does not pass on: names of characters, the list of converters and their
-// aliases, its version. The one place of the program where ICU is called.
+// aliases, its version.
 #pragma once
 
 #include <string>
@@ -13,10 +13,10 @@ std::string characterName(char32_t character);
 /// Whether a terminal shows it as something of its own: not a control, a surrogate, a formatting mark or a line end.
 bool isPrintable(char32_t character);
 
-/// ICU's own names of all its converters.
 /// Whether `name` is one of "UTF-16" or "UTF-32" that say nothing about the order of bytes.
 bool leavesByteOrderOpen(const std::string& name);
 
+/// ICU's own names of all its converters.
 std::vector<std::string> converterNames();
 
 /// All names of the converter that ICU opens under `name`.

@@ -1,18 +1,14 @@
 // `kvt text`: the string operations of the library on the lines of a text.
 
 #include "base/failure.h"
-#include "base/input.h"
-#include "base/output.h"
-#include "base/progress.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "text/file_options.h"
-#include "text/line_reader.h"
+#include "text/line_filter.h"
 #include "text/text_operation.h"
-#include "text/text_writer.h"
 
 #include <functional>
-#include <optional>
+#include <memory>
 #include <utility>
 
 namespace host {
@@ -44,6 +40,17 @@ Exit status:
   0  done, also when nothing was found
   2  not done)";
 
+class OperationFilter : public LineFilter {
+public:
+    explicit OperationFilter(std::unique_ptr<TextOperation> operation) : operation_(std::move(operation)) {}
+    bool givesText() const override { return operation_->givesText(); }
+    void takeMark(std::string_view mark, std::string& out) override { out.append(givesText() ? mark : ""); }
+    void takeLine(const TextLine& line, std::string& out) override { operation_->apply(line, out); }
+
+private:
+    std::unique_ptr<TextOperation> operation_;
+};
+
 class TextCommand : public Command {
 public:
     void declare(Syntax& syntax) override {
@@ -58,45 +65,13 @@ public:
     }
 
     int run(Diagnostics& diagnostics) override {
-        const TextEncoding encoding = files_.encoding();
-        const std::vector<std::string> inputs = files_.inputs();
-        const std::unique_ptr<TextOperation> operation = chosen();
-        const std::unique_ptr<Output> output = openOutput(files_.outputPath());
-        std::optional<TextWriter> writer;
-        {
-            Progress progress(diagnostics, totalSize(inputs), files_.progress(), "");
-            for (const std::string& path : inputs) {
-                LineReader reader(path, encoding);
-                refuseInPlace(*output, reader.input());
-                if (!writer) { // in the byte order of the first
-                    writer.emplace(*output, reader.encoding(), operation->givesText());
-                }
-                applyTo(reader, *operation, *writer, progress);
-            }
-        }
-        writer->finish();
+        OperationFilter filter(chosen());
+        filterLines(files_, filter, diagnostics);
         return Done;
     }
 
 private:
     using Make = std::function<std::unique_ptr<TextOperation>()>;
-
-    static void applyTo(LineReader& reader, const TextOperation& operation, TextWriter& writer,
-                        Progress& progress) {
-        TextLine line{reader.input().name(), 1, {}, {}};
-        while (reader.readBlock()) {
-            if (operation.givesText()) {
-                writer.buffer() += reader.takeMark();
-                writer.endLine(line);
-            }
-            while (reader.next(line)) {
-                operation.apply(line, writer.buffer());
-                writer.endLine(line);
-            }
-            writer.flush();
-            progress.advance(reader.lastBlock());
-        }
-    }
 
     std::unique_ptr<TextOperation> chosen() const {
         for (const auto& [operation, make] : operations_) {
