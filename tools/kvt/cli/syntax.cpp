@@ -113,6 +113,18 @@ Option Syntax::option(const std::string& names, std::vector<std::string>& values
     return Option(*app_.add_option(names, values, help)->type_name(valueName)->allow_extra_args(false));
 }
 
+Option Syntax::option(const std::string& names, std::function<void(const std::string&)> take,
+                      const std::string& valueName, const std::string& help) {
+    return Option(
+        *app_.add_option_function(names,
+                                  std::function<void(const std::vector<std::string>&)>(
+                                      [take = std::move(take)](const auto& values) { take(values.back()); }),
+                                  help)
+             ->type_name(valueName)
+             ->allow_extra_args(false)
+             ->trigger_on_parse());
+}
+
 Option Syntax::operand(const std::string& name, std::string& value, const std::string& help) {
     return Option(*app_.add_option(name, value, help)->type_name(""));
 }

@@ -4,6 +4,7 @@
 // this header, and nowhere else, is the library that reads command lines, whose own headers take long to compile.
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -51,6 +52,9 @@ public:
     /// The same for one that may be given several times.
     Option option(const std::string& names, std::vector<std::string>& values, const std::string& valueName,
                   const std::string& help);
+    /// The same for one of several options whose order counts: what is typed goes to `take` at once.
+    Option option(const std::string& names, std::function<void(const std::string&)> take,
+                  const std::string& valueName, const std::string& help);
     /// What stands on the command line without the name of an option.
     Option operand(const std::string& name, std::string& value, const std::string& help);
     /// The same for the last one, which may be there any number of times.

@@ -106,6 +106,18 @@ std::string wrongInFormat(const std::string& typed, UString<0> datetime::Pattern
     return {};
 }
 
+} // namespace
+
+std::string wrongInReadFormat(const std::string& format) {
+    return wrongInFormat(format, &datetime::PatternElement::reads);
+}
+
+std::string wrongInWrittenFormat(const std::string& format) {
+    return wrongInFormat(format, &datetime::PatternElement::writes);
+}
+
+namespace {
+
 class ParseFunction : public ValueFunction {
 public:
     ParseFunction()
@@ -131,9 +143,9 @@ private:
                            &datetime::PatternElement::reads);
     }
     std::string whatIsWrongWith(const std::string& format) const override {
-        std::string wrong = wrongInFormat(format, &datetime::PatternElement::reads);
+        std::string wrong = wrongInReadFormat(format);
         for (auto other = others_.begin(); wrong.empty() && other != others_.end(); ++other) {
-            wrong = wrongInFormat(*other, &datetime::PatternElement::reads);
+            wrong = wrongInReadFormat(*other);
         }
         return wrong;
     }
@@ -189,7 +201,7 @@ private:
         return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
     }
     std::string whatIsWrongWith(const std::string& format) const override {
-        return wrongInFormat(format, &datetime::PatternElement::writes);
+        return wrongInWrittenFormat(format);
     }
     std::string exampleFor(const std::string& value) const override { return isValue(value) ? "ISO" : ""; }
     void prepare(const std::string& operand) override { format_ = toUString(operand); }

@@ -113,6 +113,10 @@ private:
 /// The text of an argument. Throws what the library throws where it is no UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
 
+/// What is wrong with a format for whatever value, in words; empty where nothing is.
+std::string wrongInReadFormat(const std::string& format);
+std::string wrongInWrittenFormat(const std::string& format);
+
 /// Whether it is a date, a time or both in canonical form.
 bool isValue(const std::string& text);
 

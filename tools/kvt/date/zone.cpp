@@ -3,21 +3,14 @@
 #include "date/function.h"
 
 #include "base/failure.h"
-#include "base/text.h"
-#include "base/text_units.h"
 #include "cli/choices.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "date/lines.h"
-#include "zone/named_zone.h"
+#include "date/zone_setting.h"
 
 #include <kvt/datetime/datetime.h>
-#include <kvt/datetime/message_numbers.h>
-#include <kvt/datetime/utc_offset.h>
 
-#include <algorithm>
-#include <chrono>
-#include <cstdlib>
 #include <optional>
 
 namespace host {
@@ -53,50 +46,6 @@ private:
     datetime::UTCOffsetType type_ = datetime::UTCOffsetType::OffsetText;
 };
 
-const Choices<datetime::SetZoneMode> modeChoices = {
-    {"automatic", datetime::SetZoneMode::Automatic},
-    {"replace", datetime::SetZoneMode::Replace},
-    {"convert", datetime::SetZoneMode::Convert},
-};
-
-// "20200131120000.5+01:00" as seconds since 1970 of its own clock; a date alone is its midnight.
-std::chrono::seconds clockOf(const std::string& canonical) {
-    const auto part = [&](std::size_t begin, std::size_t length) {
-        unsigned number = 0;
-        for (const char digit : canonical.substr(begin, length)) {
-            number = number * 10 + static_cast<unsigned>(digit - '0');
-        }
-        return number;
-    };
-    using namespace std::chrono;
-    const sys_days day{year(static_cast<int>(part(0, 4))) / static_cast<int>(part(4, 2)) /
-                       static_cast<int>(part(6, 2))};
-    return day.time_since_epoch() + hours(part(8, 2)) + minutes(part(10, 2)) + seconds(part(12, 2));
-}
-
-std::string offsetText(int minutes) {
-    const auto twoDigits = [](int number) {
-        return std::string(number < 10 ? "0" : "") + std::to_string(number);
-    };
-    const int magnitude = std::abs(minutes);
-    return (minutes < 0 ? "-" : "+") + twoDigits(magnitude / 60) + ":" + twoDigits(magnitude % 60);
-}
-
-// The library's numbers for what cannot be said of the machine's zone, in words for any zone.
-DateOutcome failedFor(const NamedZone& zone, const UString<0>& value, std::uint32_t number) {
-    namespace message_number = datetime::message_number;
-    const std::string shown = "\"" + printable(value.toStdString()) + "\"";
-    const std::string text =
-        number == message_number::localZoneForTime
-            ? shown + " has no date, and without one the offset of " + zone.name() + " is not known."
-        : number == message_number::localTimeInGap
-            ? "In " + zone.name() + ", " + shown + " is on no clock: they were put forward past it."
-            : "In " + zone.name() + ", " + shown + " is on the clocks twice: they were put back across it.";
-    DateOutcome outcome = failedOutcome("");
-    outcome.message = DateMessage{number, {value.toStdString()}, text};
-    return outcome;
-}
-
 class SetFunction : public ValueFunction {
 public:
     SetFunction()
@@ -115,70 +64,13 @@ private:
         database_.declare(syntax);
     }
     void prepare(const std::string& operand) override {
-        mode_ = choose("--mode", modeName_, modeChoices);
-        zone_ = toUString(operand);
-        const std::string typed = withoutBlanks(operand);
-        if (typed.empty()) {
-            throw Failure("ZONE is empty");
-        }
-        if (isWord(typed, "local")) {
-            database_.use();
-        } else if (!isWord(typed, "utc") && !datetime::ZQTDateTimeUTCOffset::repairOffset(toUString(typed))) {
-            named_.emplace(typed, database_.folder());
-        }
+        setting_.emplace(operand, zoneMode("--mode", modeName_), database_);
     }
-    DateOutcome apply(const UString<0>& value) override {
-        DateOutcome outcome =
-            named_ ? applyNamed(value) : outcomeOf(datetime::timezoneSet(value, zone_, mode_));
-        outcome.withoutMessage =
-            "The zone of this machine, or the zone database, cannot be found; 'kvt doctor' "
-            "says which.";
-        return outcome;
-    }
+    DateOutcome apply(const UString<0>& value) override { return setting_->apply(value); }
 
-    DateOutcome applyNamed(const UString<0>& value) const {
-        // Whatever no zone can do fails for UTC as well.
-        const datetime::TextResult inUtc = datetime::timezoneSet(value, "utc", mode_);
-        DateOutcome outcome = outcomeOf(inUtc);
-        if (!outcome.isGood()) {
-            return outcome;
-        }
-        const std::string canonical = std::get<1>(inUtc).toStdString();
-        constexpr std::size_t digitsOfTime = 6;
-        if (std::min(canonical.find_first_of(".+-"), canonical.size()) == digitsOfTime) {
-            return failedFor(*named_, value, datetime::message_number::localZoneForTime);
-        }
-        const bool isMoment = mode_ != datetime::SetZoneMode::Replace && hasOffset(value);
-        int offset = 0;
-        if (isMoment) {
-            offset = named_->minutesAt(std::chrono::sys_seconds(clockOf(canonical)));
-        } else {
-            const NamedZone::AtWallClock found = named_->atWallClock(clockOf(canonical));
-            if (found.clock != NamedZone::Clock::Once) {
-                const UString<0> wallClock = std::get<1>(datetime::timezoneRemove(value));
-                return failedFor(*named_, wallClock,
-                                 found.clock == NamedZone::Clock::Never
-                                     ? datetime::message_number::localTimeInGap
-                                     : datetime::message_number::localTimeAmbiguous);
-            }
-            offset = found.minutes;
-        }
-        return outcomeOf(datetime::timezoneSet(value, toUString(offsetText(offset)), mode_));
-    }
-
-    static bool hasOffset(const UString<0>& value) {
-        return outcomeOf(datetime::timezoneGet(value, datetime::UTCOffsetType::OffsetText)).isGood();
-    }
-    static bool isWord(const std::string& typed, std::string_view word) {
-        return std::equal(typed.begin(), typed.end(), word.begin(), word.end(),
-                          [](char left, char right) { return asciiLower(left) == right; });
-    }
-
-    UString<0> zone_;
     std::string modeName_ = "automatic";
-    datetime::SetZoneMode mode_ = datetime::SetZoneMode::Automatic;
     ZoneDatabaseOption database_;
-    std::optional<NamedZone> named_;
+    std::optional<ZoneSetting> setting_;
 };
 
 class RemoveFunction : public ValueFunction {
