@@ -81,6 +81,10 @@ public:
     Impl& operator=(const Impl&) = delete;
 
     void convert(std::string_view block, std::string& out, const LossHandler& onLoss) {
+        if (onCharacter_) {
+            convertWatched(block, out, onLoss);
+            return;
+        }
         bool canGoOn = false;
         bool isFirst = true;
         bool expectsLoss = true;
@@ -118,14 +122,24 @@ public:
         } else {
             convertTraced("", true, out);
         }
+        showCharacters();
         report(onLoss);
         from_.reset();
         to_.reset();
         units_.clear();
+        unseen_.clear();
         recent_.clear();
         position_ = 0;
         characterBegin_ = 0;
         badEnd_ = 0;
+    }
+
+    void watch(CharacterHandler handler) {
+        onCharacter_ = std::move(handler);
+        unseen_.clear();
+        if (!units_.empty() && detail::isHighSurrogate(units_.back().unit)) {
+            unseen_.push_back(units_.back());
+        }
     }
 
     std::uint64_t position() const { return position_; }
@@ -142,7 +156,9 @@ private:
     bool convertFast(std::string_view slice, std::string& out);
     std::size_t convertTracing(std::string_view slice, std::size_t calm, std::string& out,
                                const LossHandler& onLoss, bool& foundLoss);
+    void convertWatched(std::string_view block, std::string& out, const LossHandler& onLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
+    void showCharacters();
     void loseEnd(std::size_t length, std::string& out);
     Progress decode(const char*& source, const char* sourceEnd, bool flush);
     void encode(bool flush, std::string& out);
@@ -157,6 +173,7 @@ private:
     std::optional<std::uint64_t> placeOfBadInput(std::string_view bytes, std::size_t between) const;
     std::uint64_t openBegin() const;
     void attribute(std::size_t behind, std::uint64_t end);
+    void take(const Unit& unit);
     std::uint64_t lateBytes(std::uint64_t justRead) const {
         return fromNature_.isBehind && position_ - justRead > characterBegin_ ? justRead : 0;
     }
@@ -187,6 +204,8 @@ private:
     std::size_t attributed_ = 0;   // units of the buffer whose bytes are known
     bool isReadAgain_ = false;     // Bad input was met in the byte under way.
     std::vector<Unit> units_;      // which the target's converter has not settled yet
+    CharacterHandler onCharacter_; // empty but while it is watched
+    std::vector<Unit> unseen_;     // of which it has not heard
     std::vector<Loss> losses_;     // which have not been reported yet
     std::exception_ptr exception_; // that a callback could not throw through ICU
 };
@@ -245,6 +264,7 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
                                        ? std::max<std::size_t>(detail::characterLength(fromSide_, rest), 1)
                                        : 1;
         convertTraced(rest.substr(0, length), false, out);
+        showCharacters();
         taken += length;
         if (!losses_.empty()) {
             foundLoss = true;
@@ -255,6 +275,31 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
         }
     } while (taken < slice.size() && !(taken >= mayEndAt && holdsNothing()));
     return taken;
+}
+
+void StreamTranscoder::Impl::convertWatched(std::string_view block, std::string& out,
+                                            const LossHandler& onLoss) {
+    while (!block.empty()) {
+        bool ignored = false;
+        block.remove_prefix(convertTracing(block, block.size(), out, onLoss, ignored));
+    }
+}
+
+// Half a surrogate pair waits for the other half.
+void StreamTranscoder::Impl::showCharacters() {
+    std::size_t shown = 0;
+    while (shown < unseen_.size()) {
+        const Unit unit = unseen_[shown];
+        const bool isHigh = detail::isHighSurrogate(unit.unit);
+        if (isHigh && shown + 1 == unseen_.size()) {
+            break;
+        }
+        const bool isPair = isHigh && detail::isLowSurrogate(unseen_[shown + 1].unit);
+        onCharacter_(isPair ? detail::codePointOf(unit.unit, unseen_[shown + 1].unit) : unit.unit,
+                     unit.begin);
+        shown += isPair ? 2 : 1;
+    }
+    unseen_.erase(unseen_.begin(), unseen_.begin() + static_cast<std::ptrdiff_t>(shown));
 }
 
 // Converts one byte or character, or what is left when the stream ends, and keeps account of where each unit comes
@@ -287,7 +332,7 @@ void StreamTranscoder::Impl::convertTraced(std::string_view byte, bool flush, st
 void StreamTranscoder::Impl::loseEnd(std::size_t length, std::string& out) {
     const std::uint64_t begin = position_ - length;
     losses_.push_back({Loss::BadInput, begin, bytesOfInput(begin, position_), U'\uFFFD'});
-    units_.push_back({u'\uFFFD', begin, position_, true});
+    take({u'\uFFFD', begin, position_, true});
     buffer_[0] = u'\uFFFD';
     filled_ = 1;
     isTracing_ = true;
@@ -382,7 +427,7 @@ void StreamTranscoder::Impl::recordBadInput(std::string_view bytes, std::size_t 
     const std::uint64_t begin = found ? *found : openBegin();
     const std::uint64_t end = found ? begin + bytes.size() : position_;
     losses_.push_back({Loss::BadInput, begin, bytesOfInput(begin, end), U'\uFFFD'});
-    units_.push_back({u'\uFFFD', begin, end, true});
+    take({u'\uFFFD', begin, end, true});
     characterBegin_ = end;
     badEnd_ = end;
     attributed_ = index + 1;
@@ -417,10 +462,17 @@ void StreamTranscoder::Impl::attribute(std::size_t behind, std::uint64_t end) {
     const bool oneEach = isReadAgain_ && end - characterBegin_ == behind - attributed_;
     for (; attributed_ < behind; ++attributed_) {
         const std::uint64_t begin = characterBegin_;
-        units_.push_back({buffer_[attributed_], begin, oneEach ? begin + 1 : end, false});
+        take({buffer_[attributed_], begin, oneEach ? begin + 1 : end, false});
         characterBegin_ += oneEach ? 1 : 0;
     }
     characterBegin_ = end;
+}
+
+void StreamTranscoder::Impl::take(const Unit& unit) {
+    units_.push_back(unit);
+    if (onCharacter_) {
+        unseen_.push_back(unit);
+    }
 }
 
 void StreamTranscoder::Impl::onNotRepresentable(char32_t codePoint, int) noexcept {
@@ -487,6 +539,10 @@ void StreamTranscoder::convert(kvt::future::string_view block, std::string& out,
 
 void StreamTranscoder::finish(std::string& out, const LossHandler& onLoss) {
     impl_->finish(out, onLoss);
+}
+
+void StreamTranscoder::watch(CharacterHandler handler) {
+    impl_->watch(std::move(handler));
 }
 
 std::uint64_t StreamTranscoder::position() const noexcept {

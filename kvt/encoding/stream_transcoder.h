@@ -62,6 +62,15 @@ public:
     /// initial state. The object is then ready for a new stream that begins at offset 0.
     void finish(std::string& out, const LossHandler& onLoss);
 
+    /// Called for each character of the input in its order, with the bytes from the start of the stream to where it
+    /// begins; U+FFFD for bad input.
+    using CharacterHandler = std::function<void(char32_t character, std::uint64_t offset)>;
+
+    /// From now on, convert() and finish() call `handler` for each character when it is complete, also one that began
+    /// before; an empty handler ends that. Text is taken character by character meanwhile, which is many times slower.
+    /// The handler may throw as a LossHandler may.
+    void watch(CharacterHandler handler);
+
     /// Bytes taken since the start of the stream.
     std::uint64_t position() const noexcept;
 

@@ -464,6 +464,65 @@ TEST(StreamTranscoderLosses, OfStatefulInputNameTheCharacter) {
     }
 }
 
+struct Seen {
+    char32_t character;
+    std::uint64_t offset;
+    friend bool operator==(const Seen&, const Seen&) = default;
+    friend void PrintTo(const Seen& seen, std::ostream* stream) {
+        *stream << "U+" << std::hex << static_cast<std::uint32_t>(seen.character) << std::dec << '@'
+                << seen.offset;
+    }
+};
+
+TEST(StreamTranscoder, WatchNamesEachCharacterAndWhereItBegins) {
+    struct Row {
+        const char* from;
+        std::string_view text;
+        std::vector<Seen> characters;
+    };
+    const Row rows[] = {
+        {"UTF-8", "a\u00e9\U0001F600\xFFz", {{U'a', 0}, {0xE9, 1}, {0x1F600, 3}, {0xFFFD, 7}, {U'z', 8}}},
+        {"UTF-16LE", "\x3D\xD8\x00\xDEz\0\x3D"sv, {{0x1F600, 0}, {U'z', 4}, {0xFFFD, 6}}},
+        {"GB18030", "\xA1\x35\xFF", {{0xFFFD, 0}, {U'5', 1}, {0xFFFD, 2}}},
+        {"ISO-2022-JP", "a\x1B$B$\"$\"\x1B(Bz", {{U'a', 0}, {0x3042, 4}, {0x3042, 6}, {U'z', 11}}},
+        {"CESU-8", "\xED\xA0\xBD\xED\xB8\x80z", {{0x1F600, 0}, {U'z', 6}}},
+        {"HZ-GB-2312", "ab~", {{U'a', 0}, {U'b', 1}, {0xFFFD, 2}}},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.from);
+        // Watched from the first byte on, and from each other one.
+        for (std::size_t start = 0; start < row.text.size(); ++start) {
+            std::vector<Seen> seen;
+            StreamTranscoder stream(Encoding(row.from), Encoding::Utf32LE);
+            std::string before;
+            stream.convert(row.text.substr(0, start), before, {});
+            stream.watch([&](char32_t character, std::uint64_t offset) {
+                seen.push_back({character, offset});
+            });
+            std::string out = before;
+            stream.convert(row.text.substr(start), out, {});
+            stream.finish(out, {});
+            const auto first = row.characters.begin() + static_cast<std::ptrdiff_t>(before.size() / 4);
+            EXPECT_EQ(seen, std::vector<Seen>(first, row.characters.end())) << start;
+            EXPECT_EQ(out.size(), row.characters.size() * 4);
+        }
+    }
+}
+
+TEST(StreamTranscoder, WatchEndsWithAnEmptyHandler) {
+    StreamTranscoder stream(Encoding::Utf8, Encoding::UsAscii);
+    std::string out;
+    std::u32string seen;
+    stream.convert("ab", out, {});
+    stream.watch([&](char32_t character, std::uint64_t) { seen += character; });
+    stream.convert("c\u00e9", out, {});
+    stream.watch({});
+    stream.convert("d", out, {});
+    stream.watch([](char32_t, std::uint64_t) { throw std::runtime_error("seen"); });
+    EXPECT_EQ(failureOf([&] { stream.convert("e", out, {}); }).text, "seen");
+    EXPECT_EQ(seen, U"c\u00e9");
+}
+
 TEST(StreamTranscoder, FinishReturnsAStatefulEncodingToItsStart) {
     StreamTranscoder stream(Encoding::Utf8, Encoding("ISO-2022-JP"));
     std::string out;

@@ -263,6 +263,29 @@ TEST_F(KvtConvertPlace, BadBytesCountAsOneCharacterEach) {
               (std::vector<Found>{{1, 1, 2}, {2, 1, 3}, {5, 1, 6}, {8, 2, 1}}));
 }
 
+TEST_F(KvtConvertPlace, WhatStandsBeforeMayBeSeveralCharacters) {
+    struct Row {
+        const char* from;
+        std::string bytes;
+        std::vector<Found> places;
+    };
+    const std::vector<Row> rows = {
+        // Bytes that turn out not to belong together are read again one by one.
+        {"GB18030", "\xa1\x35\xff", {{0, 1, 1}, {2, 1, 3}}},
+        {"GB18030", "\x81\x30\x81 ", {{0, 1, 1}, {2, 1, 3}}},
+        {"EUC-TW", "\x8e\xa1\xa1 \xff", {{0, 1, 1}, {4, 1, 4}}},
+        {"ISO-2022-JP", "a\x1b$B%=\x1b(Bb\xff", {{10, 1, 4}}},
+        {"UTF-7", "a\n+AGEAYQ-b\xff", {{11, 2, 4}}},
+        // A form feed, and no line end.
+        {"gsm-03.38-2009", "a\x1b\nb\xff\n\xff", {{4, 1, 4}, {6, 2, 1}}},
+    };
+    for (const Row& row : rows) {
+        const Form form = {row.from, utf8Of, "UTF-16LE"};
+        EXPECT_EQ(reported(form, row.bytes), row.places) << row.from;
+        EXPECT_EQ(reportedInPieces(form, row.bytes, 1), row.places) << row.from;
+    }
+}
+
 TEST_F(KvtConvertPlace, ALoneSurrogateAtABlockBorderIsOnItsOwnLine) {
     const Form form = {"UTF-16LE", utf8Of, "UTF-8"};
     for (std::size_t units = 32764; units <= 32770; ++units) {

@@ -1,9 +1,8 @@
 #include "text/line_counter.h"
 
-#include "base/text.h"
-
 #include <algorithm>
 #include <cstring>
+#include <utility>
 
 namespace host {
 
@@ -14,6 +13,15 @@ using kvt::ex::StreamTranscoder;
 
 // A line that is longer than this is decoded before its end is known, so that it need not be kept.
 constexpr std::size_t longestCarry = 1024 * 1024;
+
+// Up to here, the text behind a block may yet decide what bytes of the block are.
+constexpr std::size_t longestCharacter = 64;
+
+std::u32string unitsIn(const std::string& utf32) {
+    std::u32string text(utf32.size() / sizeof(char32_t), U'\0');
+    std::memcpy(text.data(), utf32.data(), text.size() * sizeof(char32_t));
+    return text;
+}
 
 template <std::size_t Width, bool BigEndian>
 std::uint32_t unitAt(const char* bytes) {
@@ -52,24 +60,43 @@ LineEnds findByteLineEnds(std::string_view bytes, bool afterReturn) {
     return ends;
 }
 
-// Whether every ASCII byte is one character whatever stands around it, with line ends where ASCII has them. A text
-// of all of them in a row shows escapes, shifts and multi-byte schemes below 128, as each would swallow or reject
-// its neighbours. In the encodings that pass, no trailing byte of a longer character is below 32.
-bool asciiBytesStandAlone(Encoding encoding) {
+// Whether line ends are where ASCII has them, and nowhere else. A text of all ASCII bytes in a row shows escapes, shifts
+// and multi-byte schemes below 128, as each would swallow or reject its neighbours; the line ends behind each byte show
+// characters that have one of them for their second byte.
+bool lineEndsStandAlone(Encoding encoding) {
     std::string all;
     for (char byte = 0; byte != 127; ++byte) {
         all += byte;
     }
     all += '\x7f';
-    bool clean = true;
     StreamTranscoder transcoder(encoding, Encoding::Utf32LE);
-    std::string out;
-    const auto onLoss = [&](const kvt::ex::Loss&) { clean = false; };
-    transcoder.convert(all, out, onLoss);
-    transcoder.finish(out, onLoss);
-    const std::u32string text = toUtf32(out, Encoding::Utf32LE);
-    return clean && text.size() == all.size() && text.find(U'\n') == 10 && text.rfind(U'\n') == 10 &&
-           text.find(U'\r') == 13 && text.rfind(U'\r') == 13;
+    bool clean = true;
+    const auto decoded = [&](const std::string& bytes) {
+        std::string out;
+        const auto onLoss = [&](const kvt::ex::Loss&) { clean = false; };
+        transcoder.convert(bytes, out, onLoss);
+        transcoder.finish(out, onLoss);
+        return unitsIn(out);
+    };
+    const std::u32string text = decoded(all);
+    if (!clean || text.size() != all.size()) {
+        return false;
+    }
+    for (const char end : {'\n', '\r'}) {
+        std::string ends;
+        for (int byte = 0; byte < 256; ++byte) {
+            ends += static_cast<char>(byte);
+            ends += end;
+        }
+        const auto character = static_cast<char32_t>(end);
+        const std::u32string lines = decoded(ends);
+        if (text.find(character) != static_cast<std::size_t>(end) ||
+            text.rfind(character) != text.find(character) ||
+            std::count(lines.begin(), lines.end(), character) != 257) {
+            return false;
+        }
+    }
+    return true;
 }
 
 } // namespace
@@ -84,6 +111,8 @@ LineCounter::LineCounter(Encoding encoding)
 
 LineCounter::Units LineCounter::unitsOf(Encoding encoding) {
     switch (encoding.evaluate()) {
+    case Encoding::Utf8:
+        return Units::Bytes;
     case Encoding::Utf16LE:
         return Units::Little16;
     case Encoding::Utf16BE:
@@ -93,24 +122,25 @@ LineCounter::Units LineCounter::unitsOf(Encoding encoding) {
     case Encoding::Utf32BE:
         return Units::Big32;
     default:
-        return asciiBytesStandAlone(encoding) ? Units::Bytes : Units::Unclear;
+        return lineEndsStandAlone(encoding) ? Units::Bytes : Units::Unclear;
     }
 }
 
 void LineCounter::restart(std::uint64_t skipped) {
-    std::string ignored;
-    decoder_.finish(ignored, {});
-    decoded_.clear();
+    endDecoding();
     before_.clear();
     carry_.clear();
     block_ = {};
-    blockOffset_ = counted_ = skipped;
+    inBlock_ = false;
+    blockOffset_ = taken_ = skipped;
     line_ = column_ = 1;
-    afterReturn_ = decoderUsed_ = false;
+    afterReturn_ = false;
+    atStart_ = true;
 }
 
 void LineCounter::beginBlock(std::string_view block) {
     block_ = block;
+    inBlock_ = !block.empty();
 }
 
 std::size_t LineCounter::unitWidth() const {
@@ -119,10 +149,10 @@ std::size_t LineCounter::unitWidth() const {
                                                                  : 1;
 }
 
-// The bytes from counted_ to `offset`, in one piece. What it needs of the block moves over to carry_.
+// The bytes from taken_ to `offset`, in one piece. What it needs of the block moves over to carry_.
 std::string_view LineCounter::pendingUpTo(std::uint64_t offset) {
-    if (counted_ >= blockOffset_) {
-        return block_.substr(counted_ - blockOffset_, offset - counted_);
+    if (taken_ >= blockOffset_) {
+        return block_.substr(taken_ - blockOffset_, offset - taken_);
     }
     if (offset > blockOffset_) {
         const std::size_t moved = offset - blockOffset_;
@@ -131,31 +161,30 @@ std::string_view LineCounter::pendingUpTo(std::uint64_t offset) {
         blockOffset_ += moved;
     }
     const std::uint64_t carryOffset = blockOffset_ - carry_.size();
-    return std::string_view(carry_).substr(counted_ - carryOffset, offset - counted_);
+    return std::string_view(carry_).substr(taken_ - carryOffset, offset - taken_);
 }
 
 // Moves over the lines that end before `offset`, by their ends alone.
 void LineCounter::skipLinesUpTo(std::uint64_t offset) {
     // What was carried over has been looked at and holds no line end, but it may end with a part of a unit.
-    const std::uint64_t fresh = std::max(counted_, blockOffset_);
-    const bool wholeUnits = offset > fresh && (fresh - counted_) % unitWidth() == 0;
-    const std::uint64_t start = wholeUnits ? fresh : counted_;
+    const std::uint64_t fresh = std::max(taken_, blockOffset_);
+    const bool wholeUnits = offset > fresh && (fresh - taken_) % unitWidth() == 0;
+    const std::uint64_t start = wholeUnits ? fresh : taken_;
     const std::string_view bytes =
         wholeUnits ? block_.substr(start - blockOffset_, offset - start) : pendingUpTo(offset);
-    const LineEnds ends = findLineEnds(bytes, afterReturn_ && start == counted_);
+    const bool afterReturn = ahead_.empty() ? afterReturn_ : ahead_.back().character == U'\r';
+    const LineEnds ends = findLineEnds(bytes, afterReturn && start == taken_);
     if (ends.lastEnd == 0) {
         return;
     }
-    if (decoderUsed_) {
-        std::string ignored;
-        decoder_.finish(ignored, {});
-        decoderUsed_ = false;
-    }
+    passAhead(taken_);
+    endDecoding();
     before_.clear();
     line_ += ends.count;
     column_ = 1;
     afterReturn_ = ends.afterReturn;
-    counted_ = start + ends.lastEnd;
+    atStart_ = false;
+    taken_ = start + ends.lastEnd;
 }
 
 LineEnds LineCounter::findLineEnds(std::string_view bytes, bool afterReturn) const {
@@ -173,70 +202,108 @@ LineEnds LineCounter::findLineEnds(std::string_view bytes, bool afterReturn) con
     }
 }
 
-void LineCounter::decode(std::string_view bytes, bool toTheEnd) {
-    decoder_.convert(bytes, decoded_, {});
-    decoderUsed_ = true;
-    counted_ += bytes.size();
-    if (toTheEnd) {
-        decoder_.finish(decoded_, {});
-        decoderUsed_ = false;
+void LineCounter::decodeUpTo(std::uint64_t offset) {
+    passAhead(taken_);
+    if (decoder_.position() == 0) {
+        decoderBegin_ = taken_;
     }
-    countDecoded();
+    decoder_.convert(pendingUpTo(offset), decoded_, {});
+    taken_ = offset;
+    for (const char32_t character : unitsIn(decoded_)) {
+        count(character);
+    }
+    decoded_.clear();
 }
 
-void LineCounter::countDecoded() {
-    const bool atStart = line_ == 1 && column_ == 1 && before_.empty() && !afterReturn_;
-    std::u32string text = toUtf32(decoded_, Encoding::Utf32LE);
+// Decodes, unit by unit, until there is a character that begins at `offset`, or behind it.
+void LineCounter::lookAhead(std::uint64_t offset) {
+    if (decoder_.position() == 0) {
+        decoderBegin_ = taken_;
+    }
+    decoder_.watch([this](char32_t character, std::uint64_t begin) {
+        ahead_.push_back({character, decoderBegin_ + begin});
+    });
+    const std::uint64_t end = blockOffset_ + block_.size();
+    for (const std::size_t width = unitWidth(); ahead_.empty() && end - taken_ >= width; taken_ += width) {
+        decoder_.convert(pendingUpTo(taken_ + width), decoded_, {});
+        passAhead(offset);
+    }
+    if (ahead_.empty() && !inBlock_) {
+        decoder_.convert(pendingUpTo(end), decoded_, {});
+        taken_ = end;
+        decoder_.finish(decoded_, {});
+        passAhead(offset);
+    }
+    decoder_.watch({});
     decoded_.clear();
-    if (atStart && !text.empty() && text.front() == U'\uFEFF') {
-        text.erase(0, 1);
+}
+
+// Counts the characters that begin before `offset`.
+void LineCounter::passAhead(std::uint64_t offset) {
+    for (; !ahead_.empty() && ahead_.front().begin < offset; ahead_.pop_front()) {
+        count(ahead_.front().character);
     }
-    for (const char32_t character : text) {
-        if (character == U'\n' || character == U'\r') {
-            line_ += character == U'\r' || !afterReturn_ ? 1 : 0;
-            column_ = 1;
-            before_.clear();
-        } else {
-            ++column_;
-            before_ += character;
-            if (before_.size() >= 64 * contextLength) {
-                before_.erase(0, before_.size() - contextLength);
-            }
+}
+
+void LineCounter::count(char32_t character) {
+    if (std::exchange(atStart_, false) && character == U'\uFEFF') {
+        return;
+    }
+    if (character == U'\n' || character == U'\r') {
+        line_ += character == U'\r' || !afterReturn_ ? 1 : 0;
+        column_ = 1;
+        before_.clear();
+    } else {
+        ++column_;
+        before_ += character;
+        if (before_.size() >= 64 * contextLength) {
+            before_.erase(0, before_.size() - contextLength);
         }
-        afterReturn_ = character == U'\r';
     }
+    afterReturn_ = character == U'\r';
+}
+
+void LineCounter::endDecoding() {
+    if (decoder_.position() != 0) {
+        decoder_.finish(decoded_, {});
+        decoded_.clear();
+    }
+    ahead_.clear();
 }
 
 LineCounter::Position LineCounter::at(std::uint64_t offset) {
-    if (offset > counted_ && units_ != Units::Unclear) {
-        // The place is the start of a character, so that the decoder may be asked for all that it has; in an
-        // encoding without shifts the next character is decoded the same way after that.
-        skipLinesUpTo(offset);
-        decode(pendingUpTo(offset), true);
-    } else if (offset > counted_) {
-        decode(pendingUpTo(offset), false);
+    if (offset > taken_) {
+        if (units_ != Units::Unclear) {
+            skipLinesUpTo(offset);
+        }
+        decodeUpTo(offset);
+    }
+    passAhead(offset);
+    if (ahead_.empty()) {
+        lookAhead(offset);
     }
     return {line_, column_};
 }
 
 void LineCounter::endBlock() {
     const std::uint64_t end = blockOffset_ + block_.size();
-    if (units_ == Units::Unclear) {
-        decode(pendingUpTo(end), false);
-    } else {
+    if (units_ != Units::Unclear) {
         skipLinesUpTo(end);
-        if (end - counted_ > longestCarry) {
-            decode(pendingUpTo(end - (end - counted_) % unitWidth()), false);
-        }
     }
-    if (counted_ >= blockOffset_) {
-        carry_ = block_.substr(counted_ - blockOffset_);
+    const std::size_t keep = units_ == Units::Unclear ? longestCharacter : longestCarry;
+    if (end - taken_ > keep) {
+        const std::uint64_t settled = end - longestCharacter;
+        decodeUpTo(settled - (settled - taken_) % unitWidth());
+    }
+    if (taken_ >= blockOffset_) {
+        carry_ = block_.substr(taken_ - blockOffset_);
     } else {
-        carry_.erase(0, counted_ - (blockOffset_ - carry_.size()));
+        carry_.erase(0, taken_ - (blockOffset_ - carry_.size()));
         carry_.append(block_);
     }
     blockOffset_ = end;
     block_ = {};
+    inBlock_ = false;
 }
 
 std::u32string LineCounter::textBefore() const {
@@ -245,14 +312,18 @@ std::u32string LineCounter::textBefore() const {
 
 std::string_view LineCounter::rest() {
     const std::uint64_t end = blockOffset_ + block_.size();
-    return counted_ < end ? pendingUpTo(end) : std::string_view();
+    return taken_ < end ? pendingUpTo(end) : std::string_view();
 }
 
-std::u32string LineCounter::textAfter(std::string_view bytes) {
+std::u32string LineCounter::textAfter(std::string_view rest) {
+    std::u32string text;
+    for (const Character& character : ahead_) {
+        text += character.character;
+    }
     std::string decoded;
-    decoder_.convert(bytes, decoded, {});
+    decoder_.convert(rest, decoded, {});
     decoder_.finish(decoded, {});
-    std::u32string text = toUtf32(decoded, Encoding::Utf32LE);
+    text += unitsIn(decoded);
     text.resize(std::min({text.size(), text.find_first_of(U"\r\n"), contextLength}));
     return text;
 }

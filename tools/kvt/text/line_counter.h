@@ -5,6 +5,9 @@
 // mean nothing else. Only the rest of the last line is kept. In the other encodings (EBCDIC, those with shifts and
 // escapes) a line end is known by decoding only, and every block is decoded.
 //
+// What stands before a place may turn out to be two characters, or three, by what comes behind it. So the decoder goes on
+// until a character has come out that begins at the place; those before it are counted.
+//
 // Lines end with LF, CR or CRLF. Columns count code points from 1; a byte sequence that is not text counts as the
 // one U+FFFD that stands for it. A byte order mark at the start is not counted.
 #pragma once
@@ -13,6 +16,7 @@
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <cstdint>
+#include <deque>
 #include <string>
 #include <string_view>
 
@@ -41,7 +45,8 @@ public:
 
     /// Forgets everything: the next block is the first of a file. `skipped` bytes of the file precede it.
     void restart(std::uint64_t skipped);
-    /// `block` follows what was there before, and must stay in place until endBlock().
+    /// `block` follows what was there before, and must stay in place until endBlock(). Where a position is asked for
+    /// outside of a block, or in an empty one, the text ends there.
     void beginBlock(std::string_view block);
     void endBlock();
 
@@ -55,34 +60,44 @@ public:
 
     /// The end of the line as it reads before the place that was asked for last; at most contextLength characters.
     std::u32string textBefore() const;
-    /// What of the block lies behind that place.
+    /// What of the block is not decoded yet.
     std::string_view rest();
-    /// How the line goes on from that place when `bytes` follow it: at most contextLength characters, without the
-    /// line end. No other position can be asked for after that.
-    std::u32string textAfter(std::string_view bytes);
+    /// How the line goes on from that place when `rest` is what is not decoded yet, and more: at most contextLength
+    /// characters, without the line end. No other position can be asked for after that.
+    std::u32string textAfter(std::string_view rest);
     static constexpr std::size_t contextLength = 40;
 
 private:
     enum class Units { Bytes, Little16, Big16, Little32, Big32, Unclear };
+    struct Character {
+        char32_t character;
+        std::uint64_t begin;
+    };
 
     static Units unitsOf(kvt::ex::Encoding encoding);
     std::size_t unitWidth() const;
     std::string_view pendingUpTo(std::uint64_t offset);
     LineEnds findLineEnds(std::string_view bytes, bool afterReturn) const;
     void skipLinesUpTo(std::uint64_t offset);
-    void decode(std::string_view bytes, bool toTheEnd);
-    void countDecoded();
+    void decodeUpTo(std::uint64_t offset);
+    void lookAhead(std::uint64_t offset);
+    void passAhead(std::uint64_t offset);
+    void count(char32_t character);
+    void endDecoding();
 
     kvt::ex::StreamTranscoder decoder_;
+    std::uint64_t decoderBegin_ = 0; ///< offset of the first byte that the decoder was given
     Units units_;
     std::string_view block_;
+    bool inBlock_ = false;
     std::uint64_t blockOffset_ = 0; ///< of the first byte of block_
-    std::string carry_;             ///< bytes before block_ that are not counted yet
-    std::uint64_t counted_ = 0;     ///< offset up to which line_ and column_ are true
-    std::uint64_t line_ = 1;
+    std::string carry_;             ///< bytes before block_ that are not taken yet
+    std::uint64_t taken_ = 0;       ///< up to here, bytes were decoded or lines skipped
+    std::deque<Character> ahead_;   ///< decoded, but not counted
+    std::uint64_t line_ = 1;        ///< of the character behind the last one that was counted
     std::uint64_t column_ = 1;
     bool afterReturn_ = false; ///< the last character was a CR: a LF now belongs to it
-    bool decoderUsed_ = false; ///< the decoder has seen the beginning of this line
+    bool atStart_ = true;
     std::string decoded_;
     std::u32string before_;
 };
