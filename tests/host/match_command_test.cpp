@@ -43,19 +43,19 @@ TEST_F(KvtMatch, PrintsTheLinesOrTheGroups) {
         {__LINE__, {"b"}, "b\r\nc\rb\rb\n\rb", "b\r\nb\rb\nb\n"},
         {__LINE__, {"--", "-a"}, "x-a\n", "x-a\n"},
         {__LINE__, {"^a.b$"}, "b\na\0b\r\n\0\n"s, "a\0b\r\n"s},
-        {__LINE__, {"--groups", "\\x00(b)"}, "a\0b\n"s, "1:0:1:2:\0b\n1:1:2:1:b\n"s},
+        {__LINE__, {"--groups", "\\x00(b)"}, "a\0b\n"s, "1:2:1:0:2:\0b\n1:3:2:1:1:b\n"s},
         {__LINE__, {"--dialect", "legacy", "b$"}, "b\0\na\0b"s, "a\0b\n"s},
         {__LINE__,
          {"--groups", "a(b)?c"},
          "x\nxac abc\nabc\n",
-         "2:0:1:2:ac\n2:1:-:-:\n3:0:0:3:abc\n3:1:1:1:b\n"},
-        {__LINE__, {"--groups", "(x*)"}, "a\n", "1:0:0:0:\n1:1:0:0:\n"},
-        {__LINE__, {"--groups", "\u00e9(.)"}, "\u20ac\u00e9x\n", "1:0:3:3:\u00e9x\n1:1:5:1:x\n"},
-        {__LINE__, {"--groups", "b"}, "a\r\nb\r\n", "2:0:0:1:b\n"},
+         "2:2:3:0:2:ac\n2:-:-:1:-:\n3:1:10:0:3:abc\n3:2:11:1:1:b\n"},
+        {__LINE__, {"--groups", "(x*)"}, "a\n", "1:1:0:0:0:\n1:1:0:1:0:\n"},
+        {__LINE__, {"--groups", "\u00e9(.)"}, "\u20ac\u00e9x\n", "1:2:3:0:2:\u00e9x\n1:3:5:1:1:x\n"},
+        {__LINE__, {"--groups", "b"}, "a\r\nb\r\n", "2:1:3:0:1:b\n"},
         {__LINE__, {"--dialect", "perl", "a|b"}, "b\n", "b\n"},
         {__LINE__, {"--dialect", "legacy", "a|b"}, "b\na|b\n", "a|b\n"},
         {__LINE__, {"--dialect", "legacy", "f(x)$"}, "f(x)+\ny=f(x)\n", "y=f(x)\n"},
-        {__LINE__, {"--dialect", "legacy", "--groups", "(.)"}, "\n(a) (b)\n", "2:0:0:3:(a)\n"},
+        {__LINE__, {"--dialect", "legacy", "--groups", "(.)"}, "\n(a) (b)\n", "2:1:1:0:3:(a)\n"},
         {__LINE__, {"--unicode", "(a)|b"}, "x\nb\n", "b\n"},
         {__LINE__, {"--unicode", "^..$"}, "😀é\nabc\n", "😀é\n"},
         {__LINE__, {"--dialect", "legacy", "x*"}, "\na\n", "a\n"},
@@ -84,10 +84,10 @@ TEST_F(KvtMatch, LinesAreReadAndPrintedInTheirEncoding) {
         EXPECT_EQ(
             match({"b|\U0001F600", "--encoding", encoding}, utf16Of(U"a\n\U0001F600\r\n\u0a0d b", big)).out,
             utf16Of(U"\U0001F600\r\n\u0a0d b\n", big));
-        // What is said of the groups is UTF-8, and counts in it.
+        // What is said of the groups is UTF-8, with the bytes of the file.
         EXPECT_EQ(
             match({"--groups", "\u20ac(.)", "--encoding", encoding}, utf16Of(U"\u00e9\u20acb", big)).out,
-            "1:0:2:4:\u20acb\n1:1:5:1:b\n");
+            "1:2:2:0:2:\u20acb\n1:3:4:1:1:b\n");
     }
 }
 
@@ -99,7 +99,7 @@ TEST_F(KvtMatch, AByteOrderMarkGoesBeforeTheFirstLineThatIsPrinted) {
     EXPECT_EQ(match({"^b", "one"}, "").out, mark + "b\n");
     EXPECT_EQ(match({"a", "two"}, "").out, "");
     EXPECT_EQ(match({"b", "one", "two"}, "").out, mark + "b\n" + mark + "b\n");
-    EXPECT_EQ(match({"--groups", "^a", "one"}, "").out, "1:0:0:1:a\n3:0:0:1:a\n");
+    EXPECT_EQ(match({"--groups", "^a", "one"}, "").out, "1:1:3:0:1:a\n3:1:7:0:1:a\n");
     EXPECT_EQ(match({"a", "--encoding", "UTF-16LE"}, utf16Of(U"\ufeffb\na", false)).out,
               utf16Of(U"\ufeffa\n", false));
 }
@@ -109,8 +109,8 @@ TEST_F(KvtMatch, SeveralFilesBecomeOneOutputAndEachCountsItsLines) {
     write("two", "b\n");
     EXPECT_EQ(match({"b", "one", "-", "two"}, "c\nbb\n").out, "b\nbb\nb\n");
     EXPECT_EQ(match({"--groups", "b", "one", "-", "two"}, "ab\n").out,
-              "one:2:0:0:1:b\nstandard input:1:0:1:1:b\ntwo:1:0:0:1:b\n");
-    EXPECT_EQ(match({"--groups", "b", "one"}, "").out, "2:0:0:1:b\n");
+              "one:2:1:2:0:1:b\nstandard input:1:2:1:0:1:b\ntwo:1:1:0:0:1:b\n");
+    EXPECT_EQ(match({"--groups", "b", "one"}, "").out, "2:1:2:0:1:b\n");
     EXPECT_EQ(match({"b", "one", "-o", "one"}, "").status, 0);
     EXPECT_EQ(read("one"), "b\n");
     EXPECT_EQ(match({"b", "missing"}, "").err, "kvt: cannot read missing: No such file or directory\n");
@@ -184,7 +184,9 @@ TEST_F(KvtMatch, LinesMayBeSplitAtEveryBlockBorder) {
         const std::string lead(131072 - before, 'X');
         write("in", lead + tail);
         ASSERT_EQ(match({"X\u00e9$|x$", "in"}, "").out, lead + "\u00e9\r\n\U0001F600x\n") << before;
-        ASSERT_EQ(match({"--groups", "^b", "in"}, "").out, "2:0:0:1:b\n") << before;
+        ASSERT_EQ(match({"--groups", "^b", "in"}, "").out,
+                  "2:1:" + std::to_string(lead.size() + 4) + ":0:1:b\n")
+            << before;
     }
 }
 
@@ -330,15 +332,17 @@ TEST_F(KvtMatch, GroupsAreRowsOrRecords) {
     EXPECT_EQ(match({"--tsv", "(.*):(.*)"}, "a\tb:c\\d\n").out, "a\\tb\tc\\\\d\n");
     EXPECT_EQ(match({"--tsv", "-n", "(a)(b)"}, "ab\nabab\r\n").out, "1\ta\tb\n2\ta\tb\r\n2\ta\tb\r\n");
     EXPECT_EQ(match({"--tsv", "(.+) (.+)", "--encoding", "KOI8-R"}, "\xc1 \xc2\n").out, "\xc1\t\xc2\n");
-    EXPECT_EQ(
-        match({"--json", "(a)(b)?", "--encoding", "ISO-8859-1"}, "\xe9"
-                                                                 "a\nab\n")
-            .out,
-        "{\"file\":\"standard input\",\"line\":1,\"position\":2,\"length\":1,\"text\":\"a\",\"groups\":["
-        "{\"position\":2,\"length\":1,\"text\":\"a\"},null]}\n"
-        "{\"file\":\"standard input\",\"line\":2,\"position\":0,\"length\":2,\"text\":\"ab\",\"groups\":["
-        "{\"position\":0,\"length\":1,\"text\":\"a\"},{\"position\":1,\"length\":1,\"text\":\"b\"}]}\n");
-    EXPECT_EQ(match({"--groups", "--unicode", "(.)x"}, "€éx\n").out, "1:0:3:3:éx\n1:1:3:2:é\n");
+    EXPECT_EQ(match({"--json", "(a)(b)?", "--encoding", "ISO-8859-1"}, "\xe9"
+                                                                       "a\nab\n")
+                  .out,
+              "{\"file\":\"standard "
+              "input\",\"line\":1,\"column\":2,\"offset\":1,\"length\":1,\"text\":\"a\",\"groups\":["
+              "{\"column\":2,\"offset\":1,\"length\":1,\"text\":\"a\"},null]}\n"
+              "{\"file\":\"standard "
+              "input\",\"line\":2,\"column\":1,\"offset\":3,\"length\":2,\"text\":\"ab\",\"groups\":["
+              "{\"column\":1,\"offset\":3,\"length\":1,\"text\":\"a\"},{\"column\":2,\"offset\":4,\"length\":"
+              "1,\"text\":\"b\"}]}\n");
+    EXPECT_EQ(match({"--groups", "--unicode", "(.)x"}, "€éx\n").out, "1:2:3:0:2:éx\n1:2:3:1:1:é\n");
 }
 
 TEST_F(KvtMatch, NoCharacterIsCutInTwo) {

@@ -72,9 +72,9 @@ TEST_F(KvtText, EachOperationDoesItsWork) {
         {__LINE__, {"upper"}, "Stra\u00dfe \ufb00 \u00e9\n", "STRASSE FF \u00c9\n"},
         {__LINE__, {"lower"}, "\u00c9TAT \u039f\u0394\u039f\u03a3\n", "\u00e9tat \u03bf\u03b4\u03bf\u03c2\n"},
         {__LINE__, {"fold"}, "Stra\u00dfe \u03c2\n", "strasse \u03c3\n"},
-        {__LINE__, {"find", "an"}, "banana\n\nan\n", "1:1\n1:3\n3:0\n"},
-        {__LINE__, {"find", "aa"}, "aaaaa", "1:0\n1:2\n"},
-        {__LINE__, {"find", "\u20ac"}, "\u00e9\u20ac\n", "1:2\n"},
+        {__LINE__, {"find", "an"}, "banana\n\nan\n", "1:2:1\n1:4:3\n3:1:8\n"},
+        {__LINE__, {"find", "aa"}, "aaaaa", "1:1:0\n1:3:2\n"},
+        {__LINE__, {"find", "\u20ac"}, "\u00e9\u20ac\n", "1:2:2\n"},
         {__LINE__, {"find", "x"}, "banana\n", ""},
         {__LINE__, {"replace", "an", "\u20ac"}, "banana\n", "b\u20ac\u20aca\n"},
         {__LINE__, {"replace", "a", "aa"}, "banana", "baanaanaa"},
@@ -112,7 +112,7 @@ TEST_F(KvtText, LineEndsAreWrittenAsTheyWere) {
     EXPECT_EQ(text({"strip", " "}, ends).out, "a\nb\r\nc\rd\n\r\n\re");
     EXPECT_EQ(text({"strip", "\r\n "}, ends).out, "a\nb\r\nc\rd\n\r\n\re");
     EXPECT_EQ(text({"split", " "}, " x y\r\nz").out, "\r\nx\r\ny\r\nz\n");
-    EXPECT_EQ(text({"find", "e"}, ends).out, "7:1\n");
+    EXPECT_EQ(text({"find", "e"}, ends).out, "7:2:17\n");
 }
 
 TEST_F(KvtText, MappingThatShrinksLeavesNoZeros) {
@@ -134,18 +134,18 @@ TEST_F(KvtText, MappingThatShrinksLeavesNoZeros) {
     // U+2C65 has three bytes and U+023A, its upper case, two.
     EXPECT_EQ(text({"upper"}, "\u2c65" + zero + "\n").out, "\u023a" + zero + "\n");
     EXPECT_EQ(text({"hash", "-i"}, "\u212a").out, text({"hash"}, "k").out);
-    EXPECT_EQ(text({"find", "-i", "\u212a"}, "ak\n").out, "1:1\n");
+    EXPECT_EQ(text({"find", "-i", "\u212a"}, "ak\n").out, "1:2:1\n");
 }
 
 TEST_F(KvtText, CaseCanBeIgnored) {
-    EXPECT_EQ(text({"find", "--ignore-case", "STRASSE"}, "x Stra\u00dfe strasse\n").out, "1:2\n1:10\n");
-    EXPECT_EQ(text({"find", "-i", "stra\u00dfe"}, "\u212a STRASSE\n").out, "1:4\n");
+    EXPECT_EQ(text({"find", "--ignore-case", "STRASSE"}, "x Stra\u00dfe strasse\n").out, "1:3:2\n1:10:10\n");
+    EXPECT_EQ(text({"find", "-i", "stra\u00dfe"}, "\u212a STRASSE\n").out, "1:3:4\n");
     EXPECT_EQ(text({"replace", "-i", "strasse", "Weg"}, "\u212a Stra\u00dfe\u00df STRASSE\n").out,
               "\u212a Weg\u00df Weg\n");
     EXPECT_EQ(text({"split", "-i", "x"}, "aXbxc\n").out, "a\nb\nc\n");
     EXPECT_EQ(text({"hash", "-i"}, "Stra\u00dfe\nSTRASSE\n").out, text({"hash"}, "strasse\nstrasse\n").out);
     // Half of a character is no match.
-    EXPECT_EQ(text({"find", "-i", "s"}, "\u00df s\n").out, "1:3\n");
+    EXPECT_EQ(text({"find", "-i", "s"}, "\u00df s\n").out, "1:3:3\n");
     EXPECT_EQ(text({"replace", "-i", "s", "-"}, "\u00dfs\u00df\n").out, "\u00df-\u00df\n");
 }
 
@@ -165,16 +165,16 @@ TEST_F(KvtText, IgnoringCaseAgreesWithANaiveSearch) {
         std::string input, places, changed;
         for (std::size_t number = 1; number <= 100; ++number) {
             const std::u32string line = randomText(random() % 12);
-            input += utf8Of(line) + "\n";
             std::size_t done = 0;
             for (const auto& [start, end] : matches(line, needle)) {
-                places += std::to_string(number) + ":" +
-                          std::to_string(utf8Of(line.substr(0, start)).size()) + "\n";
+                places += std::to_string(number) + ":" + std::to_string(start + 1) + ":" +
+                          std::to_string(input.size() + utf8Of(line.substr(0, start)).size()) + "\n";
                 changed += utf8Of(line.substr(done, start - done)) + "_";
                 done = end;
                 ++found;
             }
             changed += utf8Of(line.substr(done)) + "\n";
+            input += utf8Of(line) + "\n";
         }
         EXPECT_EQ(text({"find", "-i", utf8Of(needle)}, input).out, places) << utf8Of(needle);
         EXPECT_EQ(text({"replace", "-i", utf8Of(needle), "_"}, input).out, changed) << utf8Of(needle);
@@ -198,7 +198,7 @@ TEST_F(KvtText, TextIsReadAndWrittenInItsEncoding) {
         EXPECT_EQ(text({"upper", "--encoding", thirtyTwo}, utf32Of(U"\u00e9\n\u00df", big)).out,
                   utf32Of(U"\u00c9\nSS", big));
         // Statements about the text are plain, and count in UTF-8.
-        EXPECT_EQ(text({"find", "b", "--encoding", sixteen}, utf16Of(U"\n\u20acb", big)).out, "2:3\n");
+        EXPECT_EQ(text({"find", "b", "--encoding", sixteen}, utf16Of(U"\n\u20acb", big)).out, "2:2:4\n");
         EXPECT_EQ(text({"hash", "--encoding", sixteen}, utf16Of(U"\u00e9\u20ac\n", big)).out,
                   text({"hash"}, "\u00e9\u20ac\n").out);
     }
@@ -209,7 +209,7 @@ TEST_F(KvtText, AByteOrderMarkIsNoPartOfTheFirstLine) {
     write("one", mark + " a\n");
     write("two", mark);
     EXPECT_EQ(text({"strip", " ", "one", "two", "one"}, "").out, mark + "a\n" + mark + mark + "a\n");
-    EXPECT_EQ(text({"find", "a", "one"}, "").out, "1:1\n");
+    EXPECT_EQ(text({"find", "a", "one"}, "").out, "1:2:4\n");
     EXPECT_EQ(text({"hash", "two", "one"}, "").out, text({"hash"}, " a\n").out);
     EXPECT_EQ(text({"upper", "--encoding", "UTF-16LE"}, utf16Of(U"\ufeffa", false)).out,
               utf16Of(U"\ufeffA", false));
@@ -258,8 +258,8 @@ TEST_F(KvtText, ArgumentsAreLookedAt) {
         EXPECT_EQ(text(arguments, "a").status, 2);
     }
     // Words that mean something elsewhere, and what looks like an option.
-    EXPECT_EQ(text({"find", "convert"}, "to convert").out, "1:3\n");
-    EXPECT_EQ(text({"find", "upper"}, "upper").out, "1:0\n");
+    EXPECT_EQ(text({"find", "convert"}, "to convert").out, "1:4:3\n");
+    EXPECT_EQ(text({"find", "upper"}, "upper").out, "1:1:0\n");
     EXPECT_EQ(text({"replace", "--", "-a", "--b"}, "x-a").out, "x--b");
     EXPECT_EQ(text({"find"}, "").status, 2);
     EXPECT_EQ(text({}, "").status, 2);
@@ -272,8 +272,9 @@ TEST_F(KvtText, SeveralFilesBecomeOneOutputAndEachCountsItsLines) {
     write("one", "a\nb");
     write("two", "b\n");
     EXPECT_EQ(text({"upper", "one", "-", "two"}, "c\n").out, "A\nBC\nB\n");
-    EXPECT_EQ(text({"find", "b", "one", "-", "two"}, "ab\n").out, "one:2:0\nstandard input:1:1\ntwo:1:0\n");
-    EXPECT_EQ(text({"find", "b", "one"}, "").out, "2:0\n");
+    EXPECT_EQ(text({"find", "b", "one", "-", "two"}, "ab\n").out,
+              "one:2:1:2\nstandard input:1:2:1\ntwo:1:1:0\n");
+    EXPECT_EQ(text({"find", "b", "one"}, "").out, "2:1:2\n");
     EXPECT_EQ(text({"upper", "one", "-o", "one"}, "").status, 0);
     EXPECT_EQ(read("one"), "A\nB");
     EXPECT_EQ(text({"upper", "missing"}, "").err, "kvt: cannot read missing: No such file or directory\n");
@@ -284,6 +285,31 @@ TEST_F(KvtText, SeveralFilesBecomeOneOutputAndEachCountsItsLines) {
     EXPECT_EQ(read("two"), "b\n");
 }
 
+TEST_F(KvtText, FindSaysWhereAPlaceIsInTheFileAsItIs) {
+    const std::u32string sample = U"a\r\n\u65e5\u672cx\u8a9ex\nx";
+    struct Row {
+        const char* encoding;
+        const char* places;
+    };
+    for (const Row& row :
+         {Row{"UTF-8", "2:3:9\n2:5:13\n3:1:15\n"}, Row{"UTF-16BE", "2:3:10\n2:5:14\n3:1:18\n"},
+          Row{"UTF-32LE", "2:3:20\n2:5:28\n3:1:36\n"}, Row{"Shift_JIS", "2:3:7\n2:5:10\n3:1:12\n"},
+          Row{"ISO-2022-JP", "2:3:13\n2:5:22\n3:1:24\n"}, Row{"GB18030", "2:3:7\n2:5:10\n3:1:12\n"}}) {
+        const std::string bytes = convert("UTF-8", row.encoding, utf8Of(sample)).out;
+        EXPECT_EQ(text({"find", "x", "--encoding", row.encoding}, bytes).out, row.places) << row.encoding;
+    }
+    // A mark is no character, but it has bytes.
+    EXPECT_EQ(text({"find", "x", "--encoding", "UTF-16"}, "\xff\xfe" + utf16Of(U"ax\nx", false)).out,
+              "1:2:4\n2:1:8\n");
+    std::string lines;
+    std::string places;
+    for (int line = 1; line <= 30000; ++line) {
+        places += std::to_string(line) + ":3:" + std::to_string(lines.size() + 3) + "\n";
+        lines += "\x83\x5c-x--\n";
+    }
+    EXPECT_EQ(text({"find", "x", "--encoding", "Shift_JIS"}, lines).out, places);
+}
+
 TEST_F(KvtText, LinesMayBeSplitAtEveryBlockBorder) {
     const std::string tail = "\u00e9\r\n\u20ac\r\r\n\U0001F600x";
     const std::string changed = "\u00c9\r\n\u20ac\r\r\n\U0001F600X";
@@ -291,7 +317,8 @@ TEST_F(KvtText, LinesMayBeSplitAtEveryBlockBorder) {
         const std::string lead(131072 - before, 'X');
         write("in", lead + tail);
         ASSERT_EQ(text({"upper", "in"}, "").out, lead + changed) << before;
-        ASSERT_EQ(text({"find", "\u20ac", "in"}, "").out, "2:0\n") << before;
+        ASSERT_EQ(text({"find", "\u20ac", "in"}, "").out, "2:1:" + std::to_string(lead.size() + 4) + "\n")
+            << before;
     }
 }
 

@@ -7,6 +7,7 @@
 #include "convert/convert_options.h"
 #include "convert/loss_ledger.h"
 #include "text/line_counter.h"
+#include "text/place.h"
 #include "text/round_trip.h"
 #include "text/source.h"
 

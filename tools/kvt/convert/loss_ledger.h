@@ -3,7 +3,7 @@
 // Memory stays bounded whatever is lost: beyond mostEntries different ones, losses are only counted.
 #pragma once
 
-#include "text/line_counter.h"
+#include "text/place.h"
 
 #include <kvt/encoding/stream_transcoder.h>
 

@@ -1,7 +1,7 @@
 // One loss at a time, as a line for a person or as JSON.
 #pragma once
 
-#include "text/line_counter.h"
+#include "text/place.h"
 
 #include <kvt/encoding/stream_transcoder.h>
 

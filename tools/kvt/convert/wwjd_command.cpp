@@ -12,6 +12,7 @@
 #include "convert/wwjd_stream.h"
 #include "text/file_options.h"
 #include "text/line_counter.h"
+#include "text/place.h"
 #include "text/source.h"
 
 namespace host {

@@ -101,11 +101,6 @@ bool lineEndsStandAlone(Encoding encoding) {
 
 } // namespace
 
-std::string describe(const Place& place) {
-    return place.file + ": line " + std::to_string(place.line) + ", column " + std::to_string(place.column) +
-           ", byte " + std::to_string(place.offset);
-}
-
 LineCounter::LineCounter(Encoding encoding)
     : decoder_(encoding, Encoding::Utf32LE), units_(unitsOf(encoding)) {}
 

@@ -22,16 +22,6 @@
 
 namespace host {
 
-struct Place {
-    std::string file;
-    std::uint64_t offset = 0; ///< in bytes from the start of the file
-    std::uint64_t line = 1;
-    std::uint64_t column = 1;
-};
-
-/// "FILE: line 2, column 5, byte 17".
-std::string describe(const Place& place);
-
 /// The ends of lines in a piece of text.
 struct LineEnds {
     std::uint64_t count = 0;

@@ -47,6 +47,9 @@ void filterLines(const FileOptions& files, LineFilter& filter, Diagnostics& diag
         for (const std::string& path : inputs) {
             LineReader reader(path, encoding);
             refuseInPlace(*output, reader.input());
+            if (filter.asksForPlaces()) {
+                reader.keepPlaces();
+            }
             if (!writer) { // in the byte order of the first
                 writer.emplace(*output, reader.encoding(), filter.givesText());
             }

@@ -18,6 +18,8 @@ public:
     virtual ~LineFilter() = default;
     /// Whether what it makes is text, which goes on in its own encoding, or statements about it, which are UTF-8.
     virtual bool givesText() const { return true; }
+    /// Whether it asks lines for places.
+    virtual bool asksForPlaces() const { return false; }
 
     /// A file begins; its name is one for people.
     virtual void beginFile(std::string_view) {}

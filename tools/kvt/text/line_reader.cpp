@@ -1,6 +1,7 @@
 #include "text/line_reader.h"
 
 #include "base/messages.h"
+#include "base/text_units.h"
 #include "text/byte_order_mark.h"
 
 #include <kvt/string/ustring.h>
@@ -47,11 +48,16 @@ bool LineReader::readBlock() {
         return false;
     }
     decoded_.erase(0, taken_);
+    decodedBegin_ += taken_;
     searched_ -= taken_;
     taken_ = 0;
     const std::string_view block = std::exchange(started_, true) ? input_.read() : first_;
     lastBlock_ = block.size();
     ended_ = block.empty();
+    if (offsets_) {
+        offsets_->passTo(decodedBegin_);
+        offsets_->add(block);
+    }
     if (isDecoded_) {
         decode(block);
     } else {
@@ -89,6 +95,29 @@ std::string_view LineReader::takeMark() {
     return std::exchange(marked_, false) ? byteOrderMark(Encoding::Utf8) : std::string_view();
 }
 
+void LineReader::keepPlaces() {
+    if (encoding_.evaluate() != Encoding::Utf8) {
+        offsets_.emplace(encoding_);
+    }
+}
+
+Place LineReader::placeOf(const TextLine& line, std::size_t position) {
+    const auto before = static_cast<std::size_t>(line.text.data() - decoded_.data());
+    const std::string_view start = line.text.substr(0, position);
+    const std::size_t characters =
+        start.size() - static_cast<std::size_t>(std::count_if(start.begin(), start.end(), isContinuation));
+    std::uint64_t offset = decodedBegin_ + before + position;
+    if (offsets_) {
+        offsets_->passTo(decodedBegin_ + before);
+        offset = offsets_->offsetOf(characters);
+    }
+    return {input_.name(), offset, line.number, characters + 1};
+}
+
+Place TextLine::placeOf(std::size_t position) const {
+    return reader->placeOf(*this, position);
+}
+
 bool LineReader::next(TextLine& line) {
     const auto isEnd = [](char byte) { return byte == '\n' || byte == '\r'; };
     const auto from = decoded_.begin() + static_cast<std::ptrdiff_t>(searched_);
@@ -108,7 +137,7 @@ bool LineReader::next(TextLine& line) {
         return false;
     }
     const std::size_t endLength = all.substr(end, 2) == "\r\n" ? 2 : end == all.size() ? 0 : 1;
-    line = {input_.name(), ++number_, all.substr(taken_, end - taken_), all.substr(end, endLength)};
+    line = {input_.name(), ++number_, all.substr(taken_, end - taken_), all.substr(end, endLength), this};
     taken_ = searched_ = end + endLength;
     return true;
 }

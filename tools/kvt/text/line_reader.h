@@ -10,16 +10,21 @@
 #include "base/input.h"
 #include "text/byte_order_mark.h"
 #include "text/line_counter.h"
+#include "text/place.h"
+#include "text/text_offsets.h"
 
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 
 namespace host {
+
+class LineReader;
 
 /// A line in UTF-8. The views are valid until the reader reads its next block.
 struct TextLine {
@@ -27,6 +32,11 @@ struct TextLine {
     std::uint64_t number;  ///< from 1, in its file
     std::string_view text; ///< without the end
     std::string_view end;  ///< "\n", "\r", "\r\n", or nothing behind the last line
+    LineReader* reader = nullptr;
+
+    /// Where the character at `position`, in bytes of the text, stands in the file, whatever its encoding is. The reader
+    /// was asked to keepPlaces().
+    Place placeOf(std::size_t position) const;
 };
 
 /// The failure of a loss in `file` when bytes that are not text must not be replaced: the place, and which bytes.
@@ -51,6 +61,9 @@ public:
     /// first line.
     std::string_view takeMark();
 
+    /// Before the first block: places in lines are going to be asked for, which costs time and memory.
+    void keepPlaces();
+
     const Input& input() const { return input_; }
     /// In which order of bytes, too.
     kvt::ex::Encoding encoding() const { return encoding_; }
@@ -64,6 +77,8 @@ private:
     [[noreturn]] void refuse(const kvt::ex::Loss& loss);
     void decode(std::string_view block);
     void findMark();
+    Place placeOf(const TextLine& line, std::size_t position);
+    friend TextLine;
 
     Input input_;
     std::string_view first_; ///< the first block, until readBlock() takes it
@@ -74,9 +89,11 @@ private:
     kvt::ex::StreamTranscoder decoder_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
     LineCounter places_;
+    std::optional<TextOffsets> offsets_; ///< where they are other ones in the file
     std::string decoded_;
-    std::size_t taken_ = 0;    ///< up to here, decoded_ was given out
-    std::size_t searched_ = 0; ///< up to here, decoded_ holds no end of the line that begins at taken_
+    std::uint64_t decodedBegin_ = 0; ///< what came before decoded_
+    std::size_t taken_ = 0;          ///< up to here, decoded_ was given out
+    std::size_t searched_ = 0;       ///< up to here, decoded_ holds no end of the line that begins at taken_
     std::uint64_t number_ = 0;
     std::size_t lastBlock_ = 0;
     bool markSought_ = false;

@@ -39,15 +39,17 @@ Other things are printed instead with one of these:
   --tsv            the groups of each match as a line, tabs between them, or the
                    whole match where REGEX has no groups; \t is a tab in a group,
                    \\ a backslash, and a group that took no part is empty
-  --groups         LINE:GROUP:POSITION:LENGTH:TEXT for each group of the first
-                   match; group 0 is the whole match, and a group that took no part
-                   has '-' for its position and length
+  --groups         LINE:COLUMN:BYTE:GROUP:LENGTH:TEXT for each group of the first
+                   match, FILE: before it when there are several FILEs; group 0 is
+                   the whole match, and a group that took no part has '-' for its
+                   column, byte and length
   --json           a JSON object for each match, with its groups
   --count          how many lines it would be, FILE: before it when there are
                    several FILEs
-Lines are counted from 1. Positions are counted from 0 in the line, and they and
-lengths in bytes of the line as UTF-8, whatever ENC is. With --line-number, the
-number of the line and a colon (a tab with --tsv) stand before what is printed.
+Lines and columns are counted from 1; columns and lengths are in characters.
+BYTE, "offset" with --json, is where the group begins in the file as it is,
+whatever ENC is, from 0. With --line-number, the number of the line and a colon
+(a tab with --tsv) stand before what is printed.
 
 The dialect 'perl' is the syntax of Perl's regular expressions. In 'legacy' the
 characters { } ( ) | are ordinary text, and so is $ but at the end: it has no
@@ -95,6 +97,7 @@ public:
         : rule_(rule), pattern_(pattern), printer_(printer) {}
 
     bool givesText() const override { return !rule_.count && printer_.givesText(); }
+    bool asksForPlaces() const override { return !rule_.count && printer_.asksForPlaces(); }
     void beginFile(std::string_view file) override {
         file_ = file;
         mark_.clear();
@@ -261,7 +264,7 @@ private:
             return only_ ? printReplacements(labels, std::move(text))
                          : printReplaced(labels, std::move(text));
         }
-        return groups_    ? printGroups({rule_.showFile, true})
+        return groups_    ? printGroups(rule_.showFile)
                : rows_    ? printRows(labels)
                : records_ ? printRecords(labels)
                : only_    ? printMatches(labels)

@@ -2,6 +2,7 @@
 
 #include "base/failure.h"
 #include "base/text.h"
+#include "base/text_units.h"
 
 #include <nlohmann/json.hpp>
 
@@ -16,6 +17,10 @@ namespace {
 
 std::string_view textOf(const TextLine& line, const std::optional<GroupPlace>& place) {
     return place ? line.text.substr(place->position, place->length) : std::string_view();
+}
+
+std::size_t characterCount(std::string_view text) {
+    return text.size() - static_cast<std::size_t>(std::count_if(text.begin(), text.end(), isContinuation));
 }
 
 std::string_view endOf(const TextLine& line) {
@@ -124,29 +129,35 @@ public:
 
 class Groups : public Labelled {
 public:
-    using Labelled::Labelled;
+    explicit Groups(bool showFile) : Labelled({showFile, true}), showFile_(showFile) {}
     bool givesText() const override { return false; }
+    bool asksForPlaces() const override { return true; }
     void begin(const TextLine&, std::string&) override {}
     bool take(const TextLine& line, const GroupPlaces& groups, std::string& out) override {
         for (std::size_t number = 0; number < groups.size(); ++number) {
-            label(line, ':', out);
-            out.append(std::to_string(number)).append(":");
-            if (const std::optional<GroupPlace>& place = groups[number]) {
-                out.append(std::to_string(place->position) + ":" + std::to_string(place->length) + ":");
-                out.append(textOf(line, place));
+            const std::string_view text = textOf(line, groups[number]);
+            if (groups[number]) {
+                appendPlace(line.placeOf(groups[number]->position), showFile_, out);
+                out.append(":" + std::to_string(number) + ":" + std::to_string(characterCount(text)) + ":");
+                out.append(text);
             } else {
-                out.append("-:-:");
+                label(line, ':', out);
+                out.append("-:-:" + std::to_string(number) + ":-:");
             }
             out += '\n';
         }
         return false;
     }
+
+private:
+    bool showFile_;
 };
 
 class Records : public Labelled {
 public:
     using Labelled::Labelled;
     bool givesText() const override { return false; }
+    bool asksForPlaces() const override { return true; }
     void begin(const TextLine&, std::string&) override {}
     bool take(const TextLine& line, const GroupPlaces& groups, std::string& out) override {
         nlohmann::ordered_json record;
@@ -166,10 +177,12 @@ public:
     }
 
 private:
-    static void addPlace(const TextLine& line, const GroupPlace& place, nlohmann::ordered_json& object) {
-        object["position"] = place.position;
-        object["length"] = place.length;
-        object["text"] = textOf(line, place);
+    static void addPlace(const TextLine& line, const GroupPlace& group, nlohmann::ordered_json& object) {
+        const Place place = line.placeOf(group.position);
+        object["column"] = place.column;
+        object["offset"] = place.offset;
+        object["length"] = characterCount(textOf(line, group));
+        object["text"] = textOf(line, group);
     }
 };
 
@@ -195,8 +208,8 @@ std::unique_ptr<MatchPrinter> printRows(const MatchLabels& labels) {
     return std::make_unique<Rows>(labels);
 }
 
-std::unique_ptr<MatchPrinter> printGroups(const MatchLabels& labels) {
-    return std::make_unique<Groups>(labels);
+std::unique_ptr<MatchPrinter> printGroups(bool showFile) {
+    return std::make_unique<Groups>(showFile);
 }
 
 std::unique_ptr<MatchPrinter> printRecords(const MatchLabels& labels) {

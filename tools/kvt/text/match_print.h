@@ -25,6 +25,8 @@ public:
     virtual ~MatchPrinter() = default;
     /// Whether it is text, in the encoding of the file, or statements about it, in UTF-8.
     virtual bool givesText() const { return true; }
+    /// Whether it asks lines for places.
+    virtual bool asksForPlaces() const { return false; }
     /// Whether matches have to be found, or only lines with one.
     virtual bool needsPlaces() const { return true; }
 
@@ -44,8 +46,8 @@ std::unique_ptr<MatchPrinter> printMatches(const MatchLabels& labels);
 std::unique_ptr<MatchPrinter> printReplacements(const MatchLabels& labels, Replacement text);
 /// The groups of each match as a row of values with tabs between them; a pattern without groups has one for all of it.
 std::unique_ptr<MatchPrinter> printRows(const MatchLabels& labels);
-/// "LINE:GROUP:POSITION:LENGTH:TEXT" for each group of the first match.
-std::unique_ptr<MatchPrinter> printGroups(const MatchLabels& labels);
+/// "LINE:COLUMN:BYTE:GROUP:LENGTH:TEXT" for each group of the first match.
+std::unique_ptr<MatchPrinter> printGroups(bool showFile);
 /// Each match with its groups as a JSON object.
 std::unique_ptr<MatchPrinter> printRecords(const MatchLabels& labels);
 

@@ -44,6 +44,7 @@ class OperationFilter : public LineFilter {
 public:
     explicit OperationFilter(std::unique_ptr<TextOperation> operation) : operation_(std::move(operation)) {}
     bool givesText() const override { return operation_->givesText(); }
+    bool asksForPlaces() const override { return operation_->asksForPlaces(); }
     void takeMark(std::string_view mark, std::string& out) override { out.append(givesText() ? mark : ""); }
     void takeLine(const TextLine& line, std::string& out) override { operation_->apply(line, out); }
 
@@ -121,11 +122,11 @@ private:
     void declareFind(Syntax& syntax) {
         declareOperation(syntax, "find", "Print where a text stands", R"(kvt text find 'TODAY' notes.txt
 kvt text find --ignore-case 'straße' one.txt two.txt)",
-                         R"(Prints LINE:POSITION for each place, from the left, none within the one before;
-FILE:LINE:POSITION when there are several FILEs. Lines are counted from 1. The
-position is counted from 0 in the line, in bytes of the line as UTF-8, whatever
-ENC is; a byte order mark is not counted. Nothing is printed when nothing is
-found. With --ignore-case the position is still that in the line as it stands.)",
+                         R"(Prints LINE:COLUMN:BYTE for each place, from the left, none within the one
+before; FILE: before it when there are several FILEs. Lines and columns are
+counted from 1, columns in characters, and a byte order mark is none. BYTE is
+where the place begins in the file as it is, whatever ENC is, from 0. Nothing is
+printed when nothing is found.)",
                          {{"NEEDLE", &first_}},
                          [this] { return findText(first_, rule(), files_.inputs().size() > 1); });
         declareIgnoreCase("Find it in upper and lower case alike");

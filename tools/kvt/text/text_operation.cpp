@@ -170,13 +170,12 @@ public:
         : matcher_(std::move(needle), rule), showFile_(showFile) {}
     void apply(const TextLine& line, std::string& out) const override {
         matcher_.forEach(line.text, [&](std::size_t position, std::size_t) {
-            if (showFile_) {
-                out.append(line.file) += ':';
-            }
-            out += std::to_string(line.number) + ":" + std::to_string(position) + "\n";
+            appendPlace(line.placeOf(position), showFile_, out);
+            out += '\n';
         });
     }
     bool givesText() const override { return false; }
+    bool asksForPlaces() const override { return true; }
 
 private:
     Matcher matcher_;

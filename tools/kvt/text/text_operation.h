@@ -18,6 +18,8 @@ public:
     virtual void apply(const TextLine& line, std::string& out) const = 0;
     /// Whether the results are the text itself, which goes on in its own encoding, or statements about it.
     virtual bool givesText() const { return true; }
+    /// Whether it asks lines for places.
+    virtual bool asksForPlaces() const { return false; }
 };
 
 enum class CaseChange { Upper, Lower, Fold };
@@ -27,8 +29,7 @@ enum class Side { Both, Front, Back };
 /// All texts are UTF-8; these throw kvt::ex::UStringBadEncodingException for one that is not, and Failure for
 /// an empty one where something has to be found.
 std::unique_ptr<TextOperation> changeCase(CaseChange change);
-/// "LINE:POSITION" for each place, with "FILE:" before it if that is wanted. The position is in bytes of
-/// UTF-8.
+/// "LINE:COLUMN:BYTE" for each place, with "FILE:" before it if that is wanted.
 std::unique_ptr<TextOperation> findText(const std::string& needle, CaseRule rule, bool showFile);
 std::unique_ptr<TextOperation> replaceText(const std::string& from, const std::string& to, CaseRule rule);
 std::unique_ptr<TextOperation> splitText(const std::string& delimiter, CaseRule rule, bool skipEmpty);
