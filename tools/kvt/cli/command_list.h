@@ -2,6 +2,7 @@
 // KVT_COMMAND(name) and includes this, perhaps more than once; hence no include guard.
 
 KVT_COMMAND(convert)
+KVT_COMMAND(translate)
 KVT_COMMAND(encodings)
 KVT_COMMAND(text)
 KVT_COMMAND(match)

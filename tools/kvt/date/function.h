@@ -102,6 +102,8 @@ private:
 class ZoneDatabaseOption {
 public:
     void declare(Syntax& syntax);
+    /// As if that folder was given; the usual one where it is empty.
+    void choose(const std::string& folder) { named_ = folder; }
     void use() const;
     /// The folder, which is made where it has to be and can be.
     std::string folder() const;

@@ -30,22 +30,6 @@ DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json valu
     return outcome;
 }
 
-std::string sentence(const DateOutcome& outcome) {
-    if (!outcome.message) {
-        return outcome.withoutMessage;
-    }
-    if (!outcome.message->text.empty()) {
-        return outcome.message->text;
-    }
-    std::vector<std::string> shown;
-    for (const std::string& parameter : outcome.message->parameters) {
-        shown.push_back(parameter == "@DateTimeParse()"    ? "'parse'"
-                        : parameter == "@DateTimeFormat()" ? "'format'"
-                                                           : printable(parameter));
-    }
-    return describe(outcome.message->number, shown);
-}
-
 } // namespace
 
 DateOutcome outcomeOf(const kvt::ex::datetime::TextResult& result) {
@@ -91,8 +75,25 @@ std::string resultText(const DateOutcome& outcome) {
     return outcome.result.dump();
 }
 
+std::string failureSentence(const DateOutcome& outcome) {
+    if (!outcome.message) {
+        return outcome.withoutMessage;
+    }
+    if (!outcome.message->text.empty()) {
+        return outcome.message->text;
+    }
+    std::vector<std::string> shown;
+    for (const std::string& parameter : outcome.message->parameters) {
+        shown.push_back(parameter == "@DateTimeParse()"    ? "'parse'"
+                        : parameter == "@DateTimeFormat()" ? "'format'"
+                                                           : printable(parameter));
+    }
+    return describe(outcome.message->number, shown);
+}
+
 std::string failureText(const DateOutcome& outcome) {
-    return sentence(outcome) + (outcome.message ? " (" + std::to_string(outcome.message->number) + ")" : "");
+    return failureSentence(outcome) +
+           (outcome.message ? " (" + std::to_string(outcome.message->number) + ")" : "");
 }
 
 std::vector<std::string> markedFormat(const DateOutcome& outcome) {
@@ -113,7 +114,7 @@ void addTo(nlohmann::ordered_json& object, const DateOutcome& outcome) {
     }
     nlohmann::ordered_json message;
     message["number"] = outcome.message ? nlohmann::ordered_json(outcome.message->number) : nullptr;
-    message["text"] = sentence(outcome);
+    message["text"] = failureSentence(outcome);
     message["parameters"] = outcome.message ? outcome.message->parameters : std::vector<std::string>();
     object["message"] = std::move(message);
 }

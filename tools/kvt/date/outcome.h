@@ -45,7 +45,9 @@ const char* stateName(kvt::ex::datetime::ReturnState state);
 /// The result as it stands, numbers by their shortest digits. For good outcomes.
 std::string resultText(const DateOutcome& outcome);
 
-/// The sentence about a failure, with its number in brackets behind it.
+/// The sentence about a failure.
+std::string failureSentence(const DateOutcome& outcome);
+/// The same with its number in brackets behind it.
 std::string failureText(const DateOutcome& outcome);
 
 /// For a value that did not fit a pattern: the pattern, and a line with a mark under the element that failed. Nothing

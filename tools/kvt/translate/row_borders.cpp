@@ -4,6 +4,24 @@
 
 namespace host {
 
+void RowBorders::setBorder(std::uint64_t border) {
+    border_ = border;
+    for (Watch& watch : watches_) {
+        if (!watch.border && border >= watch.limit) {
+            watch.border = border;
+        }
+    }
+}
+
+std::optional<std::uint64_t> RowBorders::firstBehind(std::uint64_t limit) const {
+    for (const Watch& watch : watches_) {
+        if (watch.limit == limit) {
+            return watch.border;
+        }
+    }
+    return std::nullopt;
+}
+
 void RowBorders::add(std::string_view text) {
     if (text.empty()) {
         return;
@@ -22,7 +40,7 @@ void RowBorders::add(std::string_view text) {
 
     const char* place = begin;
     if (endsInReturn_ && state_ != State::Quoted) {
-        border_ = offsetOf(*begin == '\n' ? begin + 1 : begin);
+        setBorder(offsetOf(*begin == '\n' ? begin + 1 : begin));
     }
     if (state_ == State::AfterQuote) {
         state_ = *begin == form_.quote ? State::Quoted : State::Plain;
@@ -65,9 +83,9 @@ void RowBorders::add(std::string_view text) {
                 place = found + 1;
             }
         } else if (*found == '\n') {
-            border_ = offsetOf(found + 1);
+            setBorder(offsetOf(found + 1));
         } else if (found + 1 != end && found[1] != '\n') {
-            border_ = offsetOf(found + 1);
+            setBorder(offsetOf(found + 1));
         }
     }
     endsInReturn_ = state_ == State::CellBegin && end[-1] == '\r';

@@ -6,7 +6,9 @@
 #include "translate/special_bytes.h"
 
 #include <cstdint>
+#include <optional>
 #include <string_view>
+#include <vector>
 
 namespace host {
 
@@ -20,6 +22,10 @@ public:
     /// The last border so far: a row begins there, or the text ends. A CR that ends the text is none yet.
     std::uint64_t border() const { return border_; }
     std::uint64_t size() const { return size_; }
+    /// The first border that is at `limit` or behind it is remembered, as firstBehind(limit). Before all text.
+    void watch(std::uint64_t limit) { watches_.push_back({limit, std::nullopt}); }
+    std::optional<std::uint64_t> firstBehind(std::uint64_t limit) const;
+
     /// Where the quote that is open now was opened; meaningful while isWithinQuotes().
     std::uint64_t openQuote() const { return openQuote_; }
     bool isWithinQuotes() const { return state_ == State::Quoted; }
@@ -32,8 +38,16 @@ private:
         AfterQuote, ///< the text ended behind a quote that closes the cell, or is the first of a pair
     };
 
+    struct Watch {
+        std::uint64_t limit;
+        std::optional<std::uint64_t> border;
+    };
+
+    void setBorder(std::uint64_t border);
+
     RowForm form_;
     SpecialPlaces<3> places_;
+    std::vector<Watch> watches_;
     State state_ = State::CellBegin;
     bool endsInReturn_ = false;
     std::uint64_t border_ = 0;

@@ -1,0 +1,97 @@
+// Dates and times in any of several forms, made canonical. What a form takes is what the library's parse() takes by it;
+// here it has to take the whole text, and may have two things more: years of two digits, and names of months in
+// another language.
+#pragma once
+
+#include "translate/problem.h"
+
+#include <kvt/string/ustring.h>
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace host {
+
+/// Patterns whose texts have a fixed length, of digits and single characters of ASCII: such texts are read without the
+/// library, with the same results. Whatever they do not fit is left to it.
+class FixedDateForm {
+public:
+    /// Nothing for patterns of another kind.
+    static std::optional<FixedDateForm> of(std::string_view pattern);
+
+    /// False where the library has to look.
+    bool read(std::string_view text, std::string& out) const;
+
+private:
+    enum Part : std::uint8_t { Year, Month, Day, Hour, Minute, Second, Literal };
+    struct Element {
+        Part part;
+        char literal;
+        std::uint8_t place; ///< in the text
+    };
+
+    std::vector<Element> elements_;
+    std::size_t length_ = 0;
+    bool hasTime_ = false;
+};
+
+/// Names of months by which texts are looked through.
+class MonthNames {
+public:
+    /// Throws Failure for a language that ICU does not know.
+    explicit MonthNames(const std::string& language);
+
+    /// The month, from 0, whose name stands at the beginning of the text, in any case, and the bytes of it; of several
+    /// names the longest.
+    std::optional<std::pair<std::size_t, std::size_t>> find(std::string_view text) const;
+
+private:
+    struct Name {
+        std::string folded;
+        std::size_t size; ///< bytes of it as it is written
+        std::size_t month;
+    };
+    std::vector<Name> names_;
+    std::size_t longest_ = 0;
+};
+
+class DateReader {
+public:
+    /// `formats` are patterns and keywords with "|" between them. A `pivot`, two digits, is for "%y"; without a
+    /// language, months have English names. Throws Failure.
+    DateReader(const std::string& formats, const std::string& pivot, const std::string& language);
+
+    /// The canonical text in `out`. False, with the problem by the form that fits best, where none fits.
+    bool read(std::string_view text, std::string& out, Problem& problem);
+
+private:
+    struct Form {
+        std::string typed;
+        kvt::ex::UString<0> format; ///< as the library gets it
+        std::optional<FixedDateForm> fixed;
+        bool isRewritten = false; ///< texts become such as the library reads
+    };
+
+    /// Why a form does not fit, and how much of it does.
+    struct Misfit {
+        std::size_t fit = 0;
+        Problem problem;
+    };
+
+    Form makeForm(const std::string& typed) const;
+    bool readBy(const Form& form, std::string_view text, std::string& out, Misfit* misfit);
+    std::optional<std::size_t> rewrite(std::string_view pattern, std::string_view text);
+
+    std::vector<Form> forms_;
+    std::optional<int> pivot_;
+    std::optional<MonthNames> months_;
+    kvt::ex::UString<0> value_;
+    std::string rewritten_;
+};
+
+} // namespace host

@@ -1,0 +1,134 @@
+// The steps that are about dates and times: date, write-date, zone, add.
+
+#include "translate/cell_step.h"
+
+#include "base/failure.h"
+#include "date/function.h"
+#include "date/outcome.h"
+#include "date/zone_setting.h"
+#include "translate/date_reader.h"
+
+#include <kvt/datetime/datetime.h>
+
+namespace host {
+
+namespace {
+
+namespace datetime = kvt::ex::datetime;
+using kvt::ex::UString;
+
+class DateStep : public CellStep {
+public:
+    DateStep(std::string column, DateReader reader)
+        : CellStep(std::move(column)), reader_(std::move(reader)) {}
+
+protected:
+    void applyTo(std::string_view text, RowCells& row) override {
+        Problem problem;
+        if (reader_.read(text, canonical_, problem)) {
+            set(row, canonical_);
+        } else {
+            fail(row, std::move(problem));
+        }
+    }
+
+private:
+    DateReader reader_;
+    std::string canonical_;
+};
+
+// What the functions on canonical values share.
+class CanonicalStep : public CellStep {
+public:
+    using CellStep::CellStep;
+
+protected:
+    virtual DateOutcome make(const UString<0>& value) const = 0;
+
+    void applyTo(std::string_view text, RowCells& row) override {
+        value_.clear();
+        value_.append(kvt::ex::UStringView<0>(text));
+        const DateOutcome outcome = make(value_);
+        if (outcome.isGood()) {
+            set(row, resultText(outcome));
+        } else {
+            fail(row, {outcome.message ? outcome.message->number : 0, failureSentence(outcome)});
+        }
+    }
+
+private:
+    UString<0> value_;
+};
+
+class WriteDateStep : public CanonicalStep {
+public:
+    WriteDateStep(std::string column, const std::string& format)
+        : CanonicalStep(std::move(column)), format_(toUString(format)) {}
+
+protected:
+    DateOutcome make(const UString<0>& value) const override {
+        return outcomeOf(datetime::format(value, format_));
+    }
+
+private:
+    UString<0> format_;
+};
+
+class AddStep : public CanonicalStep {
+public:
+    AddStep(std::string column, const std::string& interval)
+        : CanonicalStep(std::move(column)), interval_(toUString(interval)) {}
+
+protected:
+    DateOutcome make(const UString<0>& value) const override {
+        return outcomeOf(datetime::add(value, interval_));
+    }
+
+private:
+    UString<0> interval_;
+};
+
+class ZoneStep : public CanonicalStep {
+public:
+    ZoneStep(std::string column, ZoneSetting setting)
+        : CanonicalStep(std::move(column)), setting_(std::move(setting)) {}
+
+protected:
+    DateOutcome make(const UString<0>& value) const override { return setting_.apply(value); }
+
+private:
+    ZoneSetting setting_;
+};
+
+} // namespace
+
+std::unique_ptr<Step> makeDateStep(const StepValues& values) {
+    return std::make_unique<DateStep>(
+        values.get("column"), DateReader(values.get("format"), values.get("pivot"), values.get("months")));
+}
+
+std::unique_ptr<Step> makeWriteDateStep(const StepValues& values) {
+    if (const std::string wrong = wrongInWrittenFormat(values.get("format")); !wrong.empty()) {
+        throw Failure(wrong);
+    }
+    return std::make_unique<WriteDateStep>(values.get("column"), values.get("format"));
+}
+
+std::unique_ptr<Step> makeAddStep(const StepValues& values) {
+    const std::string& interval = values.get("interval");
+    const DateOutcome outcome = outcomeOf(datetime::intervalNegate(toUString(interval)));
+    if (!outcome.isGood()) {
+        throw Failure(failureText(outcome));
+    }
+    return std::make_unique<AddStep>(values.get("column"), interval);
+}
+
+std::unique_ptr<Step> makeZoneStep(const StepValues& values) {
+    ZoneDatabaseOption database;
+    database.choose(values.zoneDatabase());
+    const std::string mode = values.get("mode").empty() ? "automatic" : values.get("mode");
+    return std::make_unique<ZoneStep>(values.get("column"),
+                                      ZoneSetting(values.get("zone"), zoneMode("the mode", mode), database));
+}
+
+} // namespace host

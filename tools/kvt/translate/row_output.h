@@ -1,0 +1,56 @@
+// Rows on their way out. What stands in the output as it stood in the input is copied in one piece, be it a cell, a
+// stretch of them with their delimiters, or many rows.
+#pragma once
+
+#include "translate/layout.h"
+#include "translate/plan.h"
+#include "translate/row_cells.h"
+#include "translate/row_reader.h"
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace host {
+
+class RowOutput {
+public:
+    RowOutput(const Plan& plan, const Layout& layout);
+
+    /// Where the rows go; it and the text of the rows have to stay until flush().
+    void begin(std::string& out, std::string_view text);
+    /// Rows without a line end get one, where another row may follow.
+    void write(RowCells& cells, const RowReader& row, bool needsLineEnd);
+    /// The same for a row in which not only those cells may have changed that steps change.
+    void writeEachCell(RowCells& cells, const RowReader& row, bool needsLineEnd);
+    void flush();
+
+private:
+    struct Stretch {
+        std::size_t first; ///< slots; more than one only where all are written as they were read
+        std::size_t last;
+        bool isCopied;
+    };
+
+    void copy(const char* begin, const char* end);
+    void put(char byte);
+    void put(std::string_view bytes);
+    void putCell(RowCells& cells, std::size_t slot);
+    void writeAs(const std::vector<Stretch>& stretches, RowCells& cells, const RowReader& row,
+                 bool needsLineEnd);
+    void putLineEnd(const RowReader& row, bool needsLineEnd);
+
+    RowForm in_;
+    RowForm out_;
+    bool keepsForm_; ///< cells are written with the quotes that they had
+    RowEnds lineEnds_;
+    bool quoteAll_;
+    std::vector<Stretch> stretches_;
+    std::vector<Stretch> eachCell_;
+    std::string* output_ = nullptr;
+    const char* textEnd_ = nullptr;
+    const char* runBegin_ = nullptr; ///< of the text, to be copied
+    const char* runEnd_ = nullptr;
+};
+
+} // namespace host
