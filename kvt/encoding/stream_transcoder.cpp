@@ -35,6 +35,8 @@ constexpr std::size_t bufferUnits = 1024;
 constexpr std::size_t calmBytes = 32;
 // Bytes of earlier input that are kept, to show what a character was that began with them.
 constexpr std::size_t recentBytes = 64;
+// Bytes of a character whose length is known without ICU.
+constexpr std::size_t longestKnown = 4;
 
 Converter open(Encoding encoding) {
     const std::uint32_t id = encoding.evaluate();
@@ -159,6 +161,7 @@ private:
     void convertWatched(std::string_view block, std::string& out, const LossHandler& onLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
     void showCharacters();
+    void showPrefix(std::string_view bytes, std::uint64_t begin, const std::string& out, std::size_t at);
     void loseEnd(std::size_t length, std::string& out);
     Progress decode(const char*& source, const char* sourceEnd, bool flush);
     void encode(bool flush, std::string& out);
@@ -280,8 +283,32 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
 void StreamTranscoder::Impl::convertWatched(std::string_view block, std::string& out,
                                             const LossHandler& onLoss) {
     while (!block.empty()) {
+        if (hasShortcut_ && toSide_.form == Form::utf32le && holdsNothing()) {
+            const std::string_view before = block;
+            const std::uint64_t begin = position_;
+            const std::size_t outSize = out.size();
+            goShortWay(block, out);
+            showPrefix(before.substr(0, before.size() - block.size()), begin, out, outSize);
+        }
+        const std::string_view slice = block.substr(0, sliceBytes);
         bool ignored = false;
-        block.remove_prefix(convertTracing(block, block.size(), out, onLoss, ignored));
+        block.remove_prefix(slice.empty() ? 0 : convertTracing(slice, calmBytes, out, onLoss, ignored));
+    }
+}
+
+// What went the short way to UTF-32: its characters stand in `out` from `at` on.
+void StreamTranscoder::Impl::showPrefix(std::string_view bytes, std::uint64_t begin, const std::string& out,
+                                        std::size_t at) {
+    for (; at < out.size(); at += sizeof(char32_t)) {
+        char32_t character = 0;
+        for (std::size_t byte = sizeof(char32_t); byte-- > 0;) {
+            character = character << 8 | static_cast<unsigned char>(out[at + byte]);
+        }
+        onCharacter_(character, begin);
+        const std::size_t length =
+            std::max<std::size_t>(detail::characterLength(fromSide_, bytes.substr(0, longestKnown)), 1);
+        bytes.remove_prefix(length);
+        begin += length;
     }
 }
 

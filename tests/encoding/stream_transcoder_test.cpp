@@ -487,6 +487,7 @@ TEST(StreamTranscoder, WatchNamesEachCharacterAndWhereItBegins) {
         {"ISO-2022-JP", "a\x1B$B$\"$\"\x1B(Bz", {{U'a', 0}, {0x3042, 4}, {0x3042, 6}, {U'z', 11}}},
         {"CESU-8", "\xED\xA0\xBD\xED\xB8\x80z", {{0x1F600, 0}, {U'z', 6}}},
         {"HZ-GB-2312", "ab~", {{U'a', 0}, {U'b', 1}, {0xFFFD, 2}}},
+        {"Shift_JIS", "a\x83\x5C\xB1\xA0z", {{U'a', 0}, {0x30BD, 1}, {0xFF71, 3}, {0xFFFD, 4}, {U'z', 5}}},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.from);

@@ -9,8 +9,10 @@
 #include "text/encoding_catalogue.h"
 #include "text/file_options.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <unistd.h>
+#include <utility>
 
 namespace host {
 
@@ -46,16 +48,35 @@ std::unique_ptr<Output> openReport(const ConvertOptions& options) {
     return openOutput(options.report);
 }
 
+// At most LineCounter::contextLength characters on each side.
+std::u32string lineAround(std::u32string_view text, std::size_t index) {
+    const std::size_t start = text.find_last_of(U"\r\n", index == 0 ? 0 : index - 1);
+    const std::size_t lineBegin = start == text.npos || start >= index ? 0 : start + 1;
+    const std::size_t begin = std::max(lineBegin, index - std::min(index, LineCounter::contextLength));
+    const std::size_t end = std::min(text.find_first_of(U"\r\n", index), index + LineCounter::contextLength);
+    return std::u32string(text.substr(begin, end - begin));
+}
+
 } // namespace
 
 Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, Encoding to,
                        Diagnostics& diagnostics)
     : options_(options), named_(from), from_(from.encoding), to_(to), fromName_(from_.getName()),
       toName_(to.getName()), diagnostics_(diagnostics), transcoder_(from_, to),
-      onLoss_([this](const Loss& loss) { takeLoss(loss); }), lines_(from_),
-      progress_(diagnostics, totalSize(options.inputs), options.progress, "") {
+      onLoss_([this](const Loss& reported) {
+          Loss loss = reported;
+          loss.offset += source_->skipped();
+          takeLoss(
+              loss, [&] { return placeOf(loss); }, std::nullopt);
+      }),
+      lines_(from_), progress_(diagnostics, totalSize(options.inputs), options.progress, "") {
     if (options.verify || !comesBack(to_)) {
-        roundTrip_.emplace(from_, to);
+        roundTrip_.emplace(options.changesText() ? Encoding(Encoding::Utf32LE) : from_, to);
+    }
+    if (options.changesText()) {
+        reading_.emplace(from_, options.reading);
+        writer_.emplace(to, options.onError == OnError::Transliterate ? PieceWriter::Lost::IsTransliterated
+                                                                      : PieceWriter::Lost::IsSubstituted);
     }
 }
 
@@ -89,6 +110,7 @@ int Conversion::run() {
     if (!ledger_.isEmpty()) {
         printLedger(ledger_, fromName_, toName_, diagnostics_);
     }
+    printFallbackLines();
     return same && ledger_.isEmpty() ? Done : DoneWithLosses;
 }
 
@@ -98,6 +120,10 @@ void Conversion::convertFile(const std::string& path) {
     readIn(source_->encoding());
     std::string_view block = source_->next();
     lines_.restart(source_->skipped());
+    if (reading_) {
+        reading_->begin(source_->encoding(), source_->skipped());
+        before_.clear();
+    }
     if (source_->skipped() != 0) {
         progress_.advance(source_->skipped());
     }
@@ -117,12 +143,16 @@ void Conversion::readIn(Encoding from) {
     fromName_ = from.getName();
     transcoder_ = kvt::ex::StreamTranscoder(from, to_);
     lines_ = LineCounter(from);
-    if (roundTrip_) {
+    if (roundTrip_ && !reading_) {
         roundTrip_->readIn(from);
     }
 }
 
 void Conversion::convertBlock(std::string_view block) {
+    if (reading_) {
+        writePiece(reading_->take(block));
+        return;
+    }
     lines_.beginBlock(block);
     transcoder_.convert(block, converted_, onLoss_);
     lines_.endBlock();
@@ -133,8 +163,13 @@ void Conversion::convertBlock(std::string_view block) {
 }
 
 void Conversion::finishFile() {
-    lines_.beginBlock({});
-    transcoder_.finish(converted_, onLoss_);
+    if (reading_) {
+        writePiece(reading_->finish());
+        writer_->finish(converted_);
+    } else {
+        lines_.beginBlock({});
+        transcoder_.finish(converted_, onLoss_);
+    }
     writeConverted();
     if (roundTrip_) {
         roundTrip_->finish();
@@ -153,22 +188,53 @@ void Conversion::writeConverted() {
     }
 }
 
-void Conversion::takeLoss(const Loss& reported) {
-    Loss loss = reported;
-    loss.offset += source_->skipped();
+// Nothing of the piece is written when it has the loss at which the conversion stops.
+void Conversion::writePiece(TextPiece piece) {
+    if (roundTrip_) {
+        roundTrip_->addInput(utf32Bytes(piece.text));
+    }
+    TextPosition position = piece.start;
+    std::size_t passed = 0;
+    for (const PieceWriter::Change& change : writer_->changes(piece)) {
+        for (; passed < change.source; ++passed) {
+            position.pass(piece.source.text[passed]);
+        }
+        const auto place = [&] {
+            return Place{source_->input().name(), change.loss.offset, position.line, position.column};
+        };
+        if (options_.onError == OnError::Stop) {
+            throw Stopped{change.loss, place(),
+                          lineAround(before_ + piece.source.text, before_.size() + change.source)};
+        }
+        takeLoss(change.loss, place, change.written);
+    }
+    if (piece.firstFallback) {
+        piece.firstFallback->file = source_->input().name();
+        ledger_.addFallbackLines(piece.fallbackLines, *piece.firstFallback);
+    }
+    before_ += piece.source.text;
+    before_.erase(0, before_.size() - std::min(before_.size(), LineCounter::contextLength));
+    writer_->write(piece.text, converted_);
+    writeConverted();
+}
+
+void Conversion::takeLoss(const Loss& loss, const std::function<Place()>& placeOfIt,
+                          const std::optional<std::u32string>& written) {
     if (options_.onError == OnError::Stop) {
-        throw Stopped{loss, placeOf(loss)};
+        throw Stopped{loss, placeOfIt(), std::nullopt};
     }
     std::optional<Place> place;
-    if (options_.onError == OnError::Report) {
-        place = placeOf(loss);
-        if (report_) {
-            reportLines_ += lossAsJson(loss, *place, fromName_, toName_);
-        } else {
-            diagnostics_.say(describeLoss(loss, *place, fromName_, toName_));
-        }
+    const bool isReported = options_.onError == OnError::Report;
+    if (isReported || report_) {
+        place = placeOfIt();
     }
-    ledger_.add(loss, [&] { return place ? *place : placeOf(loss); });
+    if (report_) {
+        reportLines_ += lossAsJson(loss, *place, fromName_, toName_, written);
+    } else if (isReported) {
+        diagnostics_.say(describeLoss(loss, *place, fromName_, toName_));
+    }
+    ledger_.add(
+        loss, [&] { return place ? *place : placeOfIt(); }, written);
 }
 
 Place Conversion::placeOf(const Loss& loss) {
@@ -184,7 +250,8 @@ void Conversion::explainStop(const Stopped& stopped) {
             : describe(910003, {printable(std::u32string_view(&loss.codePoint, 1)), fromName_, toName_});
     diagnostics_.say(describe(stopped.place) + ": " + sentence);
     diagnostics_.line("     lost:        " + describeLost(loss));
-    diagnostics_.line("     would read:  " + lossyLine());
+    diagnostics_.line("     would read:  " +
+                      printable(through(stopped.line ? withChanges(*stopped.line) : lineAtLoss(), to_)));
     if (loss.codePoint == U'\uFEFF' && loss.offset == 0) {
         diagnostics_.line("     This is a byte order mark, which is left out without '--bom keep'.");
     }
@@ -195,15 +262,30 @@ void Conversion::explainStop(const Stopped& stopped) {
     printLedger(ledger_, fromName_, toName_, diagnostics_);
 }
 
-// The line around the loss as it would be in the output.
-std::string Conversion::lossyLine() {
+std::u32string Conversion::withChanges(const std::u32string& line) const {
+    const Normalization form = options_.reading.normalization;
+    return form == Normalization::None ? line : Normalizer(form).normalized(line);
+}
+
+// The line around the loss at which the transcoder stopped.
+std::u32string Conversion::lineAtLoss() {
     const std::u32string before = lines_.textBefore();
     std::string bytes(lines_.rest());
     // A pipe might keep us waiting for what is only a courtesy.
     if (bytes.size() < Input::blockSize / 2 && source_->input().remaining()) {
         bytes += source_->next();
     }
-    return printable(through(before + lines_.textAfter(bytes), to_));
+    return before + lines_.textAfter(bytes);
+}
+
+void Conversion::printFallbackLines() const {
+    if (ledger_.fallbackLines() != 0) {
+        const bool isOne = ledger_.fallbackLines() == 1;
+        diagnostics_.say(counted(ledger_.fallbackLines(), "line", "lines") + (isOne ? " is" : " are") +
+                         " not valid " + fromName_ + " and " + (isOne ? "was" : "were") + " read in " +
+                         std::string(options_.reading.fallback->getName()) + "; first in " +
+                         describe(ledger_.firstFallback()));
+    }
 }
 
 bool Conversion::verified() {

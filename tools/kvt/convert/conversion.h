@@ -6,6 +6,8 @@
 #include "base/progress.h"
 #include "convert/convert_options.h"
 #include "convert/loss_ledger.h"
+#include "convert/piece_writer.h"
+#include "convert/text_reading.h"
 #include "text/line_counter.h"
 #include "text/place.h"
 #include "text/round_trip.h"
@@ -14,6 +16,7 @@
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/stream_transcoder.h>
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -34,6 +37,7 @@ private:
     struct Stopped {
         kvt::ex::Loss loss;
         Place place;
+        std::optional<std::u32string> line; ///< around it, where the text is at hand
     };
 
     void convertFile(const std::string& path);
@@ -41,10 +45,14 @@ private:
     void convertBlock(std::string_view block);
     void finishFile();
     void writeConverted();
-    void takeLoss(const kvt::ex::Loss& loss);
+    void writePiece(TextPiece piece);
+    void takeLoss(const kvt::ex::Loss& loss, const std::function<Place()>& place,
+                  const std::optional<std::u32string>& written);
     Place placeOf(const kvt::ex::Loss& loss);
     void explainStop(const Stopped& stopped);
-    std::string lossyLine();
+    void printFallbackLines() const;
+    std::u32string withChanges(const std::u32string& line) const;
+    std::u32string lineAtLoss();
     bool verified();
 
     const ConvertOptions& options_;
@@ -57,6 +65,9 @@ private:
     kvt::ex::StreamTranscoder transcoder_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
     LineCounter lines_;
+    std::optional<TextReading> reading_; ///< where the text is not to stay as it is; and
+    std::optional<PieceWriter> writer_;
+    std::u32string before_; ///< the end of the piece before
     LossLedger ledger_;
     std::optional<RoundTrip> roundTrip_;
     std::unique_ptr<Output> output_;

@@ -36,6 +36,14 @@ Whatever was lost is listed on standard error at the end: each character or
 bad byte sequence, how often, and where first. Into the few encodings in which
 not all that is written can be read again, --verify is always on.
 
+--fallback is for files in which encodings are mixed: a line that is not valid in
+--from is read in ENC, if it is valid in that, and counted at the end. Lines that
+are longer than 4 MiB are read in --from. --on-error transliterate takes each
+character for itself: 'Ł' becomes 'L', 'ж' 'z', '…' three dots; the list of
+losses has what was written. Both go with --normalize, which takes place between
+reading and writing: 'nfc' composes letters and their marks, 'nfkc' also makes
+one of forms that mean the same, as 'ﬁ' and 'fi'. Places are those in the input.
+
 Byte order marks: the one at the start of each FILE is skipped. In UTF-16 and
 UTF-32 it says which order the bytes are in, which is little-endian without one;
 a mark that the name of the encoding contradicts ends the command. 'keep' takes
@@ -47,8 +55,12 @@ Exit status:
   1  done, but something was lost; with --dry-run: every encoding would lose
   2  not done; an output file was left as it was)";
 
-const Choices<OnError> errorChoices = {
-    {"stop", OnError::Stop}, {"replace", OnError::Replace}, {"report", OnError::Report}};
+const Choices<OnError> errorChoices = {{"stop", OnError::Stop},
+                                       {"replace", OnError::Replace},
+                                       {"report", OnError::Report},
+                                       {"transliterate", OnError::Transliterate}};
+const Choices<Normalization> normalizationChoices = {
+    {"none", Normalization::None}, {"nfc", Normalization::Nfc}, {"nfkc", Normalization::Nfkc}};
 const Choices<MarkPolicy> markChoices = {{"skip", MarkPolicy::Skip},
                                          {"keep", MarkPolicy::Keep},
                                          {"strip", MarkPolicy::Strip},
@@ -66,7 +78,12 @@ public:
             syntax.option("--on-error", onError_, "WHAT",
                           "What a loss does: 'stop' ends the conversion without a result (default), "
                           "'replace' puts a substitution in its place, 'report' does so too and tells "
-                          "of every loss");
+                          "of every loss, 'transliterate' writes what --to lacks in Latin letters where it "
+                          "has those, and else replaces it");
+        syntax.option("--fallback", fallback_, "ENC",
+                      "Read a line that is not valid in --from in this encoding");
+        syntax.option("--normalize", normalization_, "FORM",
+                      "Bring the text into a form of Unicode normalization: 'nfc' or 'nfkc'");
         syntax.option("--report", options_.report, "FILE",
                       "Write the report to FILE, one JSON object on each line, instead of to standard error; "
                       "implies --on-error report");
@@ -86,10 +103,16 @@ public:
         options_.mark = choose("--bom", mark_, markChoices);
         options_.onError = choose("--on-error", onError_, errorChoices);
         if (!options_.report.empty()) {
-            if (onErrorOption_.isGiven() && options_.onError != OnError::Report) {
-                throw Failure("--report goes with --on-error report only");
+            if (!onErrorOption_.isGiven()) {
+                options_.onError = OnError::Report;
             }
-            options_.onError = OnError::Report;
+            if (options_.onError != OnError::Report && options_.onError != OnError::Transliterate) {
+                throw Failure("--report goes with --on-error report or transliterate only");
+            }
+        }
+        options_.reading.normalization = choose("--normalize", normalization_, normalizationChoices);
+        if (!fallback_.empty()) {
+            options_.reading.fallback = textEncoding(fallback_);
         }
         const TextEncoding from = inputEncoding(from_);
         if (!dryRun_) {
@@ -112,6 +135,8 @@ private:
     std::string to_;
     std::string onError_ = "stop";
     std::string mark_ = "skip";
+    std::string fallback_;
+    std::string normalization_ = "none";
     bool dryRun_ = false;
     Option onErrorOption_;
     FileOptions files_;

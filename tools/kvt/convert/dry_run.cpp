@@ -8,6 +8,8 @@
 #include "base/unicode_data.h"
 #include "cli/exit_status.h"
 #include "convert/loss_ledger.h"
+#include "convert/piece_writer.h"
+#include "convert/text_reading.h"
 #include "text/encoding_catalogue.h"
 #include "text/round_trip.h"
 #include "text/source.h"
@@ -30,12 +32,16 @@ struct Target {
     Encoding from;
     Encoding to;
     kvt::ex::StreamTranscoder transcoder;
+    std::optional<PieceWriter> writer;  ///< where the text is not to stay as it is
     std::optional<RoundTrip> roundTrip; ///< where not all that is written can be read
     LossLedger ledger;
     std::uint64_t bytes = 0;
 
-    Target(Encoding source, Encoding target)
+    Target(Encoding source, Encoding target, bool changesText)
         : name(target.getName()), from(source), to(target), transcoder(from, to) {
+        if (changesText) {
+            writer.emplace(to, PieceWriter::Lost::IsSubstituted);
+        }
         if (!comesBack(to)) {
             roundTrip.emplace(from, to);
         }
@@ -61,13 +67,32 @@ struct Target {
         } else {
             transcoder.finish(converted, onLoss);
         }
+        count(block != nullptr ? *block : std::string_view(), converted);
+        if (block == nullptr && roundTrip) {
+            roundTrip->finish();
+        }
+    }
+
+    void write(TextPiece& piece, bool isLast) {
+        std::string converted;
+        for (const PieceWriter::Change& change : writer->changes(piece)) {
+            ledger.add(change.loss, [] { return Place(); });
+        }
+        writer->write(piece.text, converted);
+        if (isLast) {
+            writer->finish(converted);
+        }
+        count(utf32Bytes(piece.text), converted);
+        if (isLast && roundTrip) {
+            roundTrip->finish();
+        }
+    }
+
+    void count(std::string_view input, std::string_view converted) {
         bytes += converted.size();
         if (roundTrip) {
-            roundTrip->addInput(block != nullptr ? *block : std::string_view());
+            roundTrip->addInput(input);
             roundTrip->addOutput(converted);
-            if (block == nullptr) {
-                roundTrip->finish();
-            }
         }
     }
 
@@ -114,6 +139,38 @@ std::string tableOf(const std::vector<Target>& targets) {
                        rows);
 }
 
+void convert(Source& source, std::vector<Target>& targets, Progress& progress) {
+    for (Target& target : targets) {
+        target.readIn(source.encoding());
+    }
+    for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
+        for (Target& target : targets) {
+            target.convert(&block);
+        }
+        progress.advance(block.size());
+    }
+    for (Target& target : targets) {
+        target.convert(nullptr);
+    }
+}
+
+void convertChanged(Source& source, const ReadingRule& rule, std::vector<Target>& targets,
+                    Progress& progress) {
+    TextReading reading(source.encoding(), rule);
+    const auto write = [&](TextPiece piece, bool isLast) {
+        for (Target& target : targets) {
+            target.write(piece, isLast);
+        }
+    };
+    std::string_view block = source.next();
+    reading.begin(source.encoding(), source.skipped());
+    for (; !block.empty(); block = source.next()) {
+        write(reading.take(block), false);
+        progress.advance(block.size());
+    }
+    write(reading.finish(), true);
+}
+
 } // namespace
 
 int dryRun(const ConvertOptions& options, const TextEncoding& from, const std::vector<Encoding>& encodings,
@@ -122,23 +179,17 @@ int dryRun(const ConvertOptions& options, const TextEncoding& from, const std::v
     std::vector<Target> targets;
     targets.reserve(encodings.size());
     for (const Encoding to : encodings) {
-        targets.emplace_back(from.encoding, to);
+        targets.emplace_back(options.changesText() ? Encoding(Encoding::Utf32LE) : from.encoding, to,
+                             options.changesText());
     }
     {
         Progress progress(diagnostics, totalSize(options.inputs), options.progress, "");
         for (const std::string& path : options.inputs) {
             Source source(path, from, options.mark);
-            for (Target& target : targets) {
-                target.readIn(source.encoding());
-            }
-            for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
-                for (Target& target : targets) {
-                    target.convert(&block);
-                }
-                progress.advance(block.size());
-            }
-            for (Target& target : targets) {
-                target.convert(nullptr);
+            if (options.changesText()) {
+                convertChanged(source, options.reading, targets, progress);
+            } else {
+                convert(source, targets, progress);
             }
         }
     }

@@ -8,17 +8,25 @@
 
 namespace host {
 
-void LossLedger::add(const kvt::ex::Loss& loss, const std::function<Place()>& place) {
+void LossLedger::add(const kvt::ex::Loss& loss, const std::function<Place()>& place,
+                     const std::optional<std::u32string>& written) {
     ++total_;
     Key key(loss.codePoint, loss.kind == kvt::ex::Loss::BadInput ? loss.bytes : std::string());
     const auto found = entries_.find(key);
     if (found != entries_.end()) {
         ++found->second.count;
     } else if (entries_.size() < mostEntries) {
-        entries_.emplace(std::move(key), Entry{loss, place(), 1, entries_.size()});
+        entries_.emplace(std::move(key), Entry{loss, place(), 1, entries_.size(), written});
     } else {
         ++unlisted_;
     }
+}
+
+void LossLedger::addFallbackLines(std::uint64_t count, const Place& first) {
+    if (fallbackLines_ == 0) {
+        firstFallback_ = first;
+    }
+    fallbackLines_ += count;
 }
 
 std::vector<LossLedger::Entry> LossLedger::entries() const {
@@ -41,7 +49,8 @@ void printLedger(const LossLedger& ledger, const std::string& from, const std::s
     for (const LossLedger::Entry& entry : ledger.entries()) {
         std::string count = std::to_string(entry.count);
         count.insert(0, count.size() < 8 ? 8 - count.size() : 0, ' ');
-        diagnostics.line(count + "  " + describeLost(entry.first) + "; first in " + describe(entry.place));
+        diagnostics.line(count + "  " + describeLost(entry.first) + describeWritten(entry.written) +
+                         "; first in " + describe(entry.place));
     }
     if (ledger.unlisted() != 0) {
         diagnostics.line("     and  " + counted(ledger.unlisted(), "loss", "losses") +

@@ -10,6 +10,7 @@
 #include <cstdint>
 #include <functional>
 #include <map>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -24,12 +25,18 @@ public:
         kvt::ex::Loss first;
         Place place;
         std::uint64_t count = 0;
-        std::uint64_t order = 0; ///< how many entries came before it
+        std::uint64_t order = 0;               ///< how many entries came before it
+        std::optional<std::u32string> written; ///< in its place, where that is no substitution
     };
     static constexpr std::size_t mostEntries = 1000;
 
     /// Adds a loss. Places cost time, so `place` is called only for a first one.
-    void add(const kvt::ex::Loss& loss, const std::function<Place()>& place);
+    void add(const kvt::ex::Loss& loss, const std::function<Place()>& place,
+             const std::optional<std::u32string>& written = std::nullopt);
+    /// Adds lines that were read in another encoding, which is no loss.
+    void addFallbackLines(std::uint64_t count, const Place& first);
+    std::uint64_t fallbackLines() const { return fallbackLines_; }
+    const Place& firstFallback() const { return firstFallback_; }
 
     bool isEmpty() const { return total_ == 0; }
     /// All losses, those without an entry included.
@@ -46,6 +53,8 @@ private:
     std::map<Key, Entry> entries_;
     std::uint64_t total_ = 0;
     std::uint64_t unlisted_ = 0;
+    std::uint64_t fallbackLines_ = 0;
+    Place firstFallback_;
 };
 
 /// The ledger as lines on standard error.

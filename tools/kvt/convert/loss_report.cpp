@@ -32,8 +32,12 @@ std::string describeLoss(const kvt::ex::Loss& loss, const Place& place, const st
            (isBadInput(loss) ? " are not valid " + from : " is not in " + to);
 }
 
+std::string describeWritten(const std::optional<std::u32string>& written) {
+    return written ? ", written as \"" + printable(*written) + "\"" : "";
+}
+
 std::string lossAsJson(const kvt::ex::Loss& loss, const Place& place, const std::string& from,
-                       const std::string& to) {
+                       const std::string& to, const std::optional<std::u32string>& written) {
     nlohmann::ordered_json object;
     object["file"] = place.file;
     object["offset"] = place.offset;
@@ -49,6 +53,9 @@ std::string lossAsJson(const kvt::ex::Loss& loss, const Place& place, const std:
     }
     object["from"] = from;
     object["to"] = to;
+    if (written) {
+        object["replacement"] = toUtf8(*written);
+    }
     return object.dump() + "\n";
 }
 

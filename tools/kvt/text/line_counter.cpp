@@ -128,9 +128,7 @@ void LineCounter::restart(std::uint64_t skipped) {
     block_ = {};
     inBlock_ = false;
     blockOffset_ = taken_ = skipped;
-    line_ = column_ = 1;
-    afterReturn_ = false;
-    atStart_ = true;
+    position_ = {};
 }
 
 void LineCounter::beginBlock(std::string_view block) {
@@ -167,7 +165,7 @@ void LineCounter::skipLinesUpTo(std::uint64_t offset) {
     const std::uint64_t start = wholeUnits ? fresh : taken_;
     const std::string_view bytes =
         wholeUnits ? block_.substr(start - blockOffset_, offset - start) : pendingUpTo(offset);
-    const bool afterReturn = ahead_.empty() ? afterReturn_ : ahead_.back().character == U'\r';
+    const bool afterReturn = ahead_.empty() ? position_.afterReturn : ahead_.back().character == U'\r';
     const LineEnds ends = findLineEnds(bytes, afterReturn && start == taken_);
     if (ends.lastEnd == 0) {
         return;
@@ -175,10 +173,7 @@ void LineCounter::skipLinesUpTo(std::uint64_t offset) {
     passAhead(taken_);
     endDecoding();
     before_.clear();
-    line_ += ends.count;
-    column_ = 1;
-    afterReturn_ = ends.afterReturn;
-    atStart_ = false;
+    position_ = {position_.line + ends.count, 1, ends.afterReturn, false};
     taken_ = start + ends.lastEnd;
 }
 
@@ -241,21 +236,14 @@ void LineCounter::passAhead(std::uint64_t offset) {
 }
 
 void LineCounter::count(char32_t character) {
-    if (std::exchange(atStart_, false) && character == U'\uFEFF') {
+    if (position_.pass(character)) {
+        before_.clear();
         return;
     }
-    if (character == U'\n' || character == U'\r') {
-        line_ += character == U'\r' || !afterReturn_ ? 1 : 0;
-        column_ = 1;
-        before_.clear();
-    } else {
-        ++column_;
-        before_ += character;
-        if (before_.size() >= 64 * contextLength) {
-            before_.erase(0, before_.size() - contextLength);
-        }
+    before_ += character;
+    if (before_.size() >= 64 * contextLength) {
+        before_.erase(0, before_.size() - contextLength);
     }
-    afterReturn_ = character == U'\r';
 }
 
 void LineCounter::endDecoding() {
@@ -277,7 +265,7 @@ LineCounter::Position LineCounter::at(std::uint64_t offset) {
     if (ahead_.empty()) {
         lookAhead(offset);
     }
-    return {line_, column_};
+    return {position_.line, position_.column};
 }
 
 void LineCounter::endBlock() {

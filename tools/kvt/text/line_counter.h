@@ -12,6 +12,8 @@
 // one U+FFFD that stands for it. A byte order mark at the start is not counted.
 #pragma once
 
+#include "text/place.h"
+
 #include <kvt/encoding/encoding.h>
 #include <kvt/encoding/stream_transcoder.h>
 
@@ -84,10 +86,7 @@ private:
     std::string carry_;             ///< bytes before block_ that are not taken yet
     std::uint64_t taken_ = 0;       ///< up to here, bytes were decoded or lines skipped
     std::deque<Character> ahead_;   ///< decoded, but not counted
-    std::uint64_t line_ = 1;        ///< of the character behind the last one that was counted
-    std::uint64_t column_ = 1;
-    bool afterReturn_ = false; ///< the last character was a CR: a LF now belongs to it
-    bool atStart_ = true;
+    TextPosition position_;         ///< behind the last character that was counted
     std::string decoded_;
     std::u32string before_;
 };

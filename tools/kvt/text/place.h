@@ -13,6 +13,18 @@ struct Place {
     std::uint64_t column = 1; ///< in characters, whatever their bytes are
 };
 
+/// Line and column while one goes through a text. Lines end with LF, CR or CRLF; a byte order mark at the start is not
+/// counted.
+struct TextPosition {
+    std::uint64_t line = 1;
+    std::uint64_t column = 1;
+    bool afterReturn = false; ///< a LF now belongs to the line end before it
+    bool atStart = true;
+
+    /// Whether the character ends a line.
+    bool pass(char32_t character);
+};
+
 /// "FILE: line 2, column 5, byte 17".
 std::string describe(const Place& place);
 
