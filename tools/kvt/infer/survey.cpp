@@ -1,0 +1,197 @@
+#include "infer/survey.h"
+
+#include "base/failure.h"
+#include "infer/twice_read.h"
+#include "text/encoding_catalogue.h"
+#include "text/source.h"
+#include "translate/cell_text.h"
+#include "translate/row_borders.h"
+#include "translate/row_reader.h"
+
+#include <algorithm>
+#include <set>
+#include <utility>
+
+namespace host {
+
+namespace {
+
+using OnBytes = std::function<void(std::uint64_t)>;
+
+// So much of the beginning says what delimiter there is, and what ICU's detector thinks.
+constexpr std::size_t beginningSize = 1024 * 1024;
+// A row that is longer than that has a quote that was never closed.
+constexpr std::size_t longestRow = 64 * 1024 * 1024;
+
+void guessEncoding(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
+    Input input(file.path());
+    std::string beginning;
+    std::string_view block = input.read();
+    for (; !block.empty() && beginning.size() < beginningSize; block = input.read()) {
+        beginning += block;
+    }
+    EncodingGuess guess(beginning);
+    guess.add(beginning);
+    survey.bytes = beginning.size();
+    onBytes(beginning.size());
+    for (; !block.empty(); block = input.read()) {
+        guess.add(block);
+        survey.bytes += block.size();
+        onBytes(block.size());
+    }
+    survey.encodings = guess.finish();
+    survey.isMarked = guess.isMarked();
+    survey.isAscii = guess.isAscii();
+}
+
+// The text of the file in whole rows, in pieces.
+class DecodedRows {
+public:
+    DecodedRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes)
+        : survey_(survey), onBytes_(onBytes),
+          source_(file.path(), survey.encodings.front().encoding, MarkPolicy::Skip),
+          decoder_(source_.encoding(), kvt::ex::Encoding::Utf8) {}
+
+    // Calls use(text) for each piece, the last one of which may end without a line end.
+    template <typename Use>
+    void forEach(const Use& use) {
+        while (decode() && text_.size() < beginningSize) {
+        }
+        survey_.table = guessTable(text_, isEnd_);
+        RowBorders borders(survey_.table.form);
+        borders.add(text_);
+        std::uint64_t taken = 0;
+        while (true) {
+            const auto whole = static_cast<std::size_t>((isEnd_ ? borders.size() : borders.border()) - taken);
+            use(std::string_view(text_).substr(0, whole));
+            taken += whole;
+            text_.erase(0, whole);
+            if (isEnd_) {
+                return;
+            }
+            if (text_.size() > longestRow) {
+                throw Failure(survey_.file + ": a row is longer than " + std::to_string(longestRow >> 20) +
+                              " MiB; the quote that opens at byte " + std::to_string(borders.openQuote()) +
+                              " of its text may never be closed");
+            }
+            const std::size_t old = text_.size();
+            decode();
+            borders.add(std::string_view(text_).substr(old));
+        }
+    }
+
+private:
+    bool decode() {
+        const std::string_view block = source_.next();
+        onBytes_(block.size());
+        isEnd_ = block.empty();
+        if (isEnd_) {
+            decoder_.finish(text_, {});
+        } else {
+            decoder_.convert({block.data(), block.size()}, text_, {});
+        }
+        return !isEnd_;
+    }
+
+    Survey& survey_;
+    const OnBytes& onBytes_;
+    Source source_;
+    kvt::ex::StreamTranscoder decoder_;
+    std::string text_;
+    bool isEnd_ = false;
+};
+
+void takeRow(Survey& survey, const RowReader& reader, std::string& scratch) {
+    ++survey.rows;
+    if (reader.fault() != RowFault::None) {
+        survey.firstBrokenRow = ++survey.brokenRows == 1 ? survey.rows : survey.firstBrokenRow;
+        return;
+    }
+    if (reader.row().empty() && survey.columns.size() > 1) {
+        ++survey.emptyRows;
+        return;
+    }
+    if (reader.cellCount() != survey.columns.size()) {
+        survey.firstOddRow = ++survey.oddRows == 1 ? survey.rows : survey.firstOddRow;
+    }
+    const std::size_t count = std::min(reader.cellCount(), survey.columns.size());
+    for (std::size_t i = 0; i < count; ++i) {
+        const std::string_view text = textOfCell(reader.cell(i), survey.table.form, scratch);
+        survey.columns[i].guess.add(text);
+        survey.columns[i].doubled.add(text);
+    }
+}
+
+bool isData(const std::string& cell) {
+    ColumnGuess guess;
+    guess.add(cell);
+    return guess.type() == ColumnGuess::Type::Date || guess.type() == ColumnGuess::Type::Number;
+}
+
+// The first row has the names of columns if they are different, none is empty and none is a date or a number.
+void judgeHeader(Survey& survey, const std::vector<std::string>& first) {
+    std::set<std::string> names;
+    for (const std::string& cell : first) {
+        if (cell.empty() || !names.insert(cell).second || isData(cell)) {
+            survey.aboutHeader = cell.empty()   ? "a cell of row 1 is empty"
+                                 : isData(cell) ? "row 1 has a date or a number"
+                                                : "two cells of row 1 are alike";
+            return;
+        }
+    }
+    survey.hasHeader = !first.empty();
+    const bool isSure = std::any_of(survey.columns.begin(), survey.columns.end(), [](const SurveyedColumn& column) {
+        const ColumnGuess::Type type = column.guess.type();
+        return type == ColumnGuess::Type::Date || type == ColumnGuess::Type::Number;
+    });
+    survey.aboutHeader = isSure ? "row 1 has names where the rows below have dates or numbers"
+                                : "the cells of row 1 are different names; nothing else speaks for it";
+}
+
+void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
+    std::vector<std::string> first;
+    std::string scratch;
+    bool isFirst = true;
+    DecodedRows(survey, file, onBytes).forEach([&](std::string_view text) {
+        RowReader reader(survey.table.form, text);
+        while (reader.next()) {
+            if (!std::exchange(isFirst, false)) {
+                takeRow(survey, reader, scratch);
+                continue;
+            }
+            for (std::size_t i = 0; i < reader.cellCount(); ++i) {
+                first.emplace_back(textOfCell(reader.cell(i), survey.table.form, scratch));
+            }
+            survey.columns.resize(std::max(survey.table.columns, first.size()));
+        }
+    });
+    judgeHeader(survey, first);
+    for (std::size_t i = 0; i < first.size(); ++i) {
+        if (survey.hasHeader) {
+            survey.columns[i].name = first[i];
+        } else {
+            survey.columns[i].guess.add(first[i]);
+            survey.columns[i].doubled.add(first[i]);
+        }
+    }
+    survey.rows += !survey.hasHeader && !first.empty() ? 1 : 0;
+}
+
+} // namespace
+
+Survey surveyFile(const std::string& path, const std::string& encoding, const OnBytes& onBytes) {
+    const TwiceRead file(path);
+    Survey survey;
+    survey.file = file.name();
+    guessEncoding(survey, file, onBytes);
+    if (!encoding.empty()) {
+        survey.isEncodingGiven = true;
+        EncodingOpinion opinion{textEncoding(encoding)};
+        opinion.name = encoding;
+        survey.encodings.insert(survey.encodings.begin(), opinion);
+    }
+    surveyRows(survey, file, onBytes);
+    return survey;
+}
+
+} // namespace host
