@@ -93,6 +93,7 @@ const std::map<std::string, std::vector<std::string>>& neighbourRooms() {
         {"sort", {"base/", "cli/", "text/"}},
         {"memory", {"base/", "cli/"}},
         {"translate", {"base/", "cli/", "text/", "convert/", "zone/", "date/", "sort/"}},
+        {"infer", {"base/", "cli/", "text/", "translate/"}},
     };
     return table;
 }
@@ -341,7 +342,8 @@ Offences outsideIsBehindItsDoor(const Tree& tree) {
          false},
         {{"unicode/"},
          {"tools/kvt/base/unicode_data.cpp", "tools/kvt/text/unicode_pattern.cpp",
-          "tools/kvt/translate/icu_data.cpp"},
+          "tools/kvt/translate/icu_data.cpp",
+          "tools/kvt/infer/charset_detector.cpp"},
          "ICU is called where the library does not pass on what it has",
          false},
         {{"boost/multiprecision/"},

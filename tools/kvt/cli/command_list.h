@@ -3,6 +3,7 @@
 
 KVT_COMMAND(convert)
 KVT_COMMAND(translate)
+KVT_COMMAND(infer)
 KVT_COMMAND(encodings)
 KVT_COMMAND(text)
 KVT_COMMAND(match)

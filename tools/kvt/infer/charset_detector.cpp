@@ -11,8 +11,10 @@ namespace host {
 std::vector<CharsetGuess> detectCharsets(std::string_view bytes) {
     constexpr std::size_t most = std::numeric_limits<std::int32_t>::max();
     UErrorCode error = U_ZERO_ERROR;
-    const std::unique_ptr<UCharsetDetector, decltype(&ucsdet_close)> detector(ucsdet_open(&error), ucsdet_close);
-    ucsdet_setText(detector.get(), bytes.data(), static_cast<std::int32_t>(std::min(bytes.size(), most)), &error);
+    const std::unique_ptr<UCharsetDetector, decltype(&ucsdet_close)> detector(ucsdet_open(&error),
+                                                                              ucsdet_close);
+    ucsdet_setText(detector.get(), bytes.data(), static_cast<std::int32_t>(std::min(bytes.size(), most)),
+                   &error);
     std::int32_t count = 0;
     const UCharsetMatch** const matches = ucsdet_detectAll(detector.get(), &count, &error);
     std::vector<CharsetGuess> guesses;

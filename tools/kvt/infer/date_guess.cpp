@@ -66,23 +66,24 @@ const std::vector<Form>& allForms() {
             std::size_t yearAt;
         };
         static constexpr Date dates[] = {
-            {"%Y-%m-%d", "y-d-d", npos}, {"%d.%m.%Y", "d.d.y", npos},   {"%d/%m/%Y", "d/d/y", npos},
-            {"%m/%d/%Y", "d/d/y", npos}, {"%d-%m-%Y", "d-d-y", npos},   {"%m-%d-%Y", "d-d-y", npos},
-            {"%Y/%m/%d", "y/d/d", npos}, {"%Y.%m.%d", "y.d.d", npos},   {"%Y%m%d", "8", npos},
-            {"%d %m %Y", "d d y", npos}, {"%d %b %Y", "d a y", npos},   {"%d %B %Y", "d a y", npos},
-            {"%d-%b-%Y", "d-a-y", npos}, {"%d/%b/%Y", "d/a/y", npos},   {"%b %d, %Y", "a d, y", npos},
+            {"%Y-%m-%d", "y-d-d", npos},   {"%d.%m.%Y", "d.d.y", npos}, {"%d/%m/%Y", "d/d/y", npos},
+            {"%m/%d/%Y", "d/d/y", npos},   {"%d-%m-%Y", "d-d-y", npos}, {"%m-%d-%Y", "d-d-y", npos},
+            {"%Y/%m/%d", "y/d/d", npos},   {"%Y.%m.%d", "y.d.d", npos}, {"%Y%m%d", "8", npos},
+            {"%d %m %Y", "d d y", npos},   {"%d %b %Y", "d a y", npos}, {"%d %B %Y", "d a y", npos},
+            {"%d-%b-%Y", "d-a-y", npos},   {"%d/%b/%Y", "d/a/y", npos}, {"%b %d, %Y", "a d, y", npos},
             {"%B %d, %Y", "a d, y", npos}, {"%b %d %Y", "a d y", npos}, {"%B %d %Y", "a d y", npos},
-            {"%Y-%j", "y-n", npos},      {"%d.%m.%y", "d.d.d", 2},      {"%d/%m/%y", "d/d/d", 2},
-            {"%m/%d/%y", "d/d/d", 2},    {"%d-%m-%y", "d-d-d", 2},      {"%y-%m-%d", "d-d-d", 0},
-            {"%d %b %y", "d a d", 1},    {"%d-%b-%y", "d-a-d", 1},
+            {"%Y-%j", "y-n", npos},        {"%d.%m.%y", "d.d.d", 2},    {"%d/%m/%y", "d/d/d", 2},
+            {"%m/%d/%y", "d/d/d", 2},      {"%d-%m-%y", "d-d-d", 2},    {"%y-%m-%d", "d-d-d", 0},
+            {"%d %b %y", "d a d", 1},      {"%d-%b-%y", "d-a-d", 1},
         };
         using Pair = std::array<const char*, 2>;
-        static constexpr Pair times[] = {
-            {"%H:%M:%S", "d:d:d"}, {"%H:%M", "d:d"}, {"%I:%M:%S %p", "d:d:d a"}, {"%I:%M %p", "d:d a"},
-            {"%I:%M%p", "d:da"}};
-        static constexpr Pair offsets[] = {
-            {"", ""}, {"%Ez", "Z"}, {"%Ez", "+d:d"}, {"%Ez", "-d:d"}, {"%Ez", "+y"}, {"%Ez", "-y"}, {" %Ez", " +y"},
-            {" %Ez", " -y"}};
+        static constexpr Pair times[] = {{"%H:%M:%S", "d:d:d"},
+                                         {"%H:%M", "d:d"},
+                                         {"%I:%M:%S %p", "d:d:d a"},
+                                         {"%I:%M %p", "d:d a"},
+                                         {"%I:%M%p", "d:da"}};
+        static constexpr Pair offsets[] = {{"", ""},      {"%Ez", "Z"},  {"%Ez", "+d:d"}, {"%Ez", "-d:d"},
+                                           {"%Ez", "+y"}, {"%Ez", "-y"}, {" %Ez", " +y"}, {" %Ez", " -y"}};
         std::vector<Form> all;
         const auto addTimes = [&](const std::string& format, const std::string& shape, std::size_t yearAt) {
             for (const auto& time : times) {
@@ -186,9 +187,10 @@ std::vector<DateForm> DateGuess::forms() const {
                 counts[form] += seen.cells;
             }
         }
-        const auto best = *std::max_element(counts.begin(), counts.end(), [](const auto& one, const auto& other) {
-            return one.second < other.second; // the first one of equals
-        });
+        const auto best =
+            *std::max_element(counts.begin(), counts.end(), [](const auto& one, const auto& other) {
+                return one.second < other.second; // the first one of equals
+            });
         DateForm form{allForms()[best.first].format, best.second, "", ""};
         for (const auto& [place, count] : counts) {
             const bool readsTheSame = place != best.first && count == best.second;

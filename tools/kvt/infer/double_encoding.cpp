@@ -26,7 +26,8 @@ bool mayBeDouble(std::string_view utf8) {
     for (std::size_t at = 0; at + 3 < utf8.size(); ++at) {
         const auto lead = static_cast<unsigned char>(utf8[at]);
         const auto behind = static_cast<unsigned char>(utf8[at + 1]);
-        if (lead == 0xC3 && behind >= 0x82 && behind <= 0xB4 && static_cast<unsigned char>(utf8[at + 2]) >= 0xC2) {
+        if (lead == 0xC3 && behind >= 0x82 && behind <= 0xB4 &&
+            static_cast<unsigned char>(utf8[at + 2]) >= 0xC2) {
             return true;
         }
     }

@@ -15,7 +15,8 @@ namespace {
 using kvt::ex::Encoding;
 
 // Longer marks first: that of UTF-32LE begins like that of UTF-16LE.
-constexpr std::array<const char*, 5> markedEncodings = {"UTF-32LE", "UTF-32BE", "UTF-8", "UTF-16LE", "UTF-16BE"};
+constexpr std::array<const char*, 5> markedEncodings = {"UTF-32LE", "UTF-32BE", "UTF-8", "UTF-16LE",
+                                                        "UTF-16BE"};
 
 std::string markedEncoding(std::string_view beginning) {
     for (const char* const name : markedEncodings) {
@@ -62,7 +63,8 @@ bool isAsciiText(std::string_view bytes) {
 auto rankOf(const EncodingOpinion& opinion, bool isAscii) {
     constexpr std::uint64_t mostlyRight = 8;
     const bool isUtf8 = opinion.encoding == Encoding::Utf8 && (isAscii || opinion.beyondAscii > 0);
-    const bool isRight = opinion.losses == 0 || (isUtf8 && opinion.beyondAscii > mostlyRight * opinion.losses);
+    const bool isRight =
+        opinion.losses == 0 || (isUtf8 && opinion.beyondAscii > mostlyRight * opinion.losses);
     return std::tuple(!isRight, !isUtf8, isRight ? 0 : opinion.losses, opinion.controls, -opinion.confidence);
 }
 
@@ -93,11 +95,10 @@ void EncodingGuess::consider(const std::string& name, int confidence) {
     const bool isKnown = std::any_of(candidates_.begin(), candidates_.end(), [&](const Candidate& candidate) {
         return candidate.opinion.encoding == encoding;
     });
-    if (isKnown || encoding == Encoding::Unknown || !encoding.isValid()) {
+    if (isKnown || encoding.id() == Encoding::Unknown) {
         return;
     }
-    EncodingOpinion opinion{encoding};
-    opinion.name = name;
+    EncodingOpinion opinion(encoding, name);
     opinion.confidence = confidence;
     candidates_.push_back({std::move(opinion), kvt::ex::StreamTranscoder(encoding, Encoding::Utf8)});
 }

@@ -10,11 +10,14 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace host {
 
 struct EncodingOpinion {
+    EncodingOpinion(kvt::ex::Encoding known, std::string called) : encoding(known), name(std::move(called)) {}
+
     kvt::ex::Encoding encoding;
     std::string name;
     int confidence = 0;                     ///< of the detector, 0 to 100; 0 where it was not asked

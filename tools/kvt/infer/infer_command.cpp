@@ -47,7 +47,8 @@ public:
         const std::optional<std::uint64_t> size = totalSize({file_});
         Survey survey;
         {
-            Progress progress(diagnostics, size ? std::optional(*size * 2) : std::nullopt, files_.progress(), "");
+            Progress progress(diagnostics, size ? std::optional(*size * 2) : std::nullopt, files_.progress(),
+                              "");
             survey = surveyFile(file_, encoding_, [&](std::uint64_t bytes) { progress.advance(bytes); });
         }
         output->write(proposedJob(survey));

@@ -21,8 +21,8 @@ std::size_t currencySize(std::string_view text) {
             return sign.size();
         }
     }
-    const bool isInBlock = text.size() >= 3 && text.starts_with("\xE2\x82") &&
-                           static_cast<unsigned char>(text[2]) >= 0xA0;
+    const bool isInBlock =
+        text.size() >= 3 && text.starts_with("\xE2\x82") && static_cast<unsigned char>(text[2]) >= 0xA0;
     return isInBlock ? 3 : 0;
 }
 
@@ -82,7 +82,9 @@ bool takeNumber(std::string_view& text, NumberStyle style) {
 }
 
 bool takeSign(std::string_view& text) {
-    const std::size_t size = text.starts_with('-') || text.starts_with('+') ? 1 : text.starts_with("\xE2\x88\x92") ? 3 : 0;
+    const std::size_t size = text.starts_with('-') || text.starts_with('+') ? 1
+                             : text.starts_with("\xE2\x88\x92")             ? 3
+                                                                            : 0;
     text.remove_prefix(size);
     return size != 0;
 }

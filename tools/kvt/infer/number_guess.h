@@ -11,10 +11,10 @@
 namespace host {
 
 enum class NumberStyle : std::uint8_t {
-    Plain, ///< digits and perhaps a point: nothing to translate
-    Point, ///< 1,234.56
-    Comma, ///< 1.234,56
-    Space, ///< 1 234,56, with a blank of any kind
+    Plain,      ///< digits and perhaps a point: nothing to translate
+    Point,      ///< 1,234.56
+    Comma,      ///< 1.234,56
+    Space,      ///< 1 234,56, with a blank of any kind
     Apostrophe, ///< 1'234.56
 };
 inline constexpr std::size_t numberStyles = 5;

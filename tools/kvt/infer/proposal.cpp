@@ -64,10 +64,11 @@ public:
     explicit Proposal(const Survey& survey) : survey_(survey) {}
 
     std::string text() {
-        remark("What " + printable(survey_.file) + " seems to be: " + counted(survey_.bytes, "byte", "bytes") + ", " +
+        remark("What " + printable(survey_.file) +
+               " seems to be: " + counted(survey_.bytes, "byte", "bytes") + ", " +
                counted(survey_.rows, "row", "rows") + ". Look it over, and then");
         remark("");
-        remark("    kvt translate --job THIS " + printable(survey_.file));
+        remark("    kvt translate --job THIS FILE");
         writeInput();
         writeOutput();
         for (std::size_t i = 0; i < survey_.columns.size(); ++i) {
@@ -87,10 +88,10 @@ private:
         explainEncodings();
         set("encoding", quoted(survey_.encodings.front().name));
         const TableGuess& table = survey_.table;
-        remark(table.columns == 1 ? "No delimiter parts the rows: there is one column."
-                                  : "Of the first " + counted(table.rows, "row", "rows") + ", " +
-                                        grouped(table.rowsOfWidth) + " have " + grouped(table.columns) +
-                                        " cells by it.");
+        remark(table.columns == 1
+                   ? "No delimiter parts the rows: there is one column."
+                   : "Of the first " + counted(table.rows, "row", "rows") + ", " +
+                         grouped(table.rowsOfWidth) + " have " + grouped(table.columns) + " cells by it.");
         set("delimiter", quoted(std::string(1, table.form.delimiter)));
         if (table.form.quote != '"') {
             remark("No cell stands in double quotes.");
@@ -113,8 +114,9 @@ private:
         } else if (best.losses == 0) {
             remark("All of it is text in " + best.name + ", with " +
                    counted(best.beyondAscii, "character", "characters") + " beyond ASCII" +
-                   (best.confidence > 0 ? "; the detector's confidence is " + std::to_string(best.confidence) + " of 100"
-                                        : "") +
+                   (best.confidence > 0
+                        ? "; the detector's confidence is " + std::to_string(best.confidence) + " of 100"
+                        : "") +
                    ".");
         }
         explainLosses(best);
@@ -125,8 +127,9 @@ private:
 
     void explainLosses(const EncodingOpinion& opinion) {
         if (opinion.losses != 0) {
-            remark("Not all of it is text in " + opinion.name + ": " + counted(opinion.losses, "place is", "places are") +
-                   " not, the first at byte " + std::to_string(opinion.firstLoss.value_or(0)) + ".");
+            remark("Not all of it is text in " + opinion.name + ": " +
+                   counted(opinion.losses, "place is", "places are") + " not, the first at byte " +
+                   std::to_string(opinion.firstLoss.value_or(0)) + ".");
         }
     }
 
@@ -134,13 +137,14 @@ private:
         if (opinion.losses != 0) {
             return explainLosses(opinion);
         }
-        remark(opinion.name + " can read it, too" +
-               (opinion.controls != 0 ? ", but " + counted(opinion.controls, "character is", "characters are") +
-                                            " a control character then"
-                : opinion.confidence > 0
-                    ? "; the detector's confidence is " + std::to_string(opinion.confidence) + " of 100"
-                    : "") +
-               ".");
+        std::string about;
+        if (opinion.controls != 0) {
+            about = ", but " + counted(opinion.controls, "character is a control character then",
+                                       "characters are control characters then");
+        } else if (opinion.confidence > 0) {
+            about = "; the detector's confidence is " + std::to_string(opinion.confidence) + " of 100";
+        }
+        remark(opinion.name + " can read it, too" + about + ".");
     }
 
     void explainRows() {
@@ -148,8 +152,8 @@ private:
             remark(counted(survey_.emptyRows, "row is", "rows are") + " empty.");
         }
         if (survey_.oddRows != 0) {
-            remark(counted(survey_.oddRows, "row has", "rows have") + " more or fewer cells, the first is row " +
-                   rowNumber(survey_.firstOddRow) + ".");
+            remark(counted(survey_.oddRows, "row has", "rows have") +
+                   " more or fewer cells, the first is row " + rowNumber(survey_.firstOddRow) + ".");
         }
         if (survey_.brokenRows != 0) {
             remark(counted(survey_.brokenRows, "row has", "rows have") +
@@ -165,7 +169,8 @@ private:
         out_ += "\n[output]\n";
         set("encoding", quoted("UTF-8"));
         out_ += "\n[failures]\n";
-        remark("What becomes of a cell that a step cannot translate: \"keep\", \"empty\", \"skip\" its row, or \"stop\".");
+        remark("What becomes of a cell that a step cannot translate: \"keep\", \"empty\", \"skip\" its row, "
+               "or \"stop\".");
         set("on-error", quoted("keep"));
     }
 
@@ -179,7 +184,7 @@ private:
             remark(titleOf(index) + ": nothing in it.");
             break;
         case ColumnGuess::Type::Text:
-            remark(titleOf(index) + ": text" + aboutEmpty(column.guess) + ".");
+            writeText(index);
             break;
         case ColumnGuess::Type::Date:
             writeDates(index);
@@ -208,6 +213,20 @@ private:
         return guess.others() == 0 ? ""
                                    : ", " + counted(guess.others(), "other", "others") + " such as " +
                                          shown(guess.exampleOfOthers());
+    }
+
+    // Few columns of dates and numbers are clean: what speaks for one is said, too.
+    void writeText(std::size_t index) {
+        const ColumnGuess& guess = survey_.columns[index].guess;
+        const auto some = [](std::uint64_t count, const char* one, const char* many) {
+            return count == 0 ? "" : "; " + counted(count, one, many);
+        };
+        remark(titleOf(index) + ": text" + aboutEmpty(guess) +
+               some(guess.dates().cells(), "cell is a date or time", "cells are dates or times") +
+               some(guess.numbers().cells(), "cell is a number", "cells are numbers") +
+               some(guess.numbers().withLeadingZero(), "of them with a zero in front",
+                    "of them with a zero in front") +
+               ".");
     }
 
     void beginStep(const std::string& name, std::size_t index) {
@@ -246,7 +265,8 @@ private:
         const NumberStyle style = numbers.style();
         static constexpr std::array<const char*, numberStyles> words = {
             "digits and perhaps a decimal point", "a decimal point and commas between thousands",
-            "a decimal comma, perhaps points between thousands", "a decimal comma and blanks between thousands",
+            "a decimal comma, perhaps points between thousands",
+            "a decimal comma and blanks between thousands",
             "a decimal point and apostrophes between thousands"};
         static constexpr std::array<const char*, numberStyles> languages = {"", "en", "de", "fr", "de-CH"};
         const auto place = static_cast<std::size_t>(style);

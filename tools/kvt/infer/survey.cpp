@@ -130,6 +130,10 @@ bool isData(const std::string& cell) {
 
 // The first row has the names of columns if they are different, none is empty and none is a date or a number.
 void judgeHeader(Survey& survey, const std::vector<std::string>& first) {
+    if (first.empty()) {
+        survey.aboutHeader = "there is no row";
+        return;
+    }
     std::set<std::string> names;
     for (const std::string& cell : first) {
         if (cell.empty() || !names.insert(cell).second || isData(cell)) {
@@ -139,11 +143,12 @@ void judgeHeader(Survey& survey, const std::vector<std::string>& first) {
             return;
         }
     }
-    survey.hasHeader = !first.empty();
-    const bool isSure = std::any_of(survey.columns.begin(), survey.columns.end(), [](const SurveyedColumn& column) {
-        const ColumnGuess::Type type = column.guess.type();
-        return type == ColumnGuess::Type::Date || type == ColumnGuess::Type::Number;
-    });
+    survey.hasHeader = true;
+    const bool isSure =
+        std::any_of(survey.columns.begin(), survey.columns.end(), [](const SurveyedColumn& column) {
+            const ColumnGuess::Type type = column.guess.type();
+            return type == ColumnGuess::Type::Date || type == ColumnGuess::Type::Number;
+        });
     survey.aboutHeader = isSure ? "row 1 has names where the rows below have dates or numbers"
                                 : "the cells of row 1 are different names; nothing else speaks for it";
 }
@@ -186,9 +191,7 @@ Survey surveyFile(const std::string& path, const std::string& encoding, const On
     guessEncoding(survey, file, onBytes);
     if (!encoding.empty()) {
         survey.isEncodingGiven = true;
-        EncodingOpinion opinion{textEncoding(encoding)};
-        opinion.name = encoding;
-        survey.encodings.insert(survey.encodings.begin(), opinion);
+        survey.encodings.insert(survey.encodings.begin(), EncodingOpinion(textEncoding(encoding), encoding));
     }
     surveyRows(survey, file, onBytes);
     return survey;

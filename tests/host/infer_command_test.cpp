@@ -1,0 +1,80 @@
+#include "host_test.h"
+
+namespace {
+
+using kvt::test::HostTest;
+
+class InferCommand : public HostTest {};
+
+TEST_F(InferCommand, PrintsAJobWithItsEvidence) {
+    write("people.csv", "name;born;paid\nM\xFCller;31.12.1999;1.234,50\nJ\xF6rg;2020-01-02;12,5\nAnna;;n/"
+                        "a\nEva;1.2.2003;3\n");
+    const auto result = kvt({"infer", path("people.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    const std::string job = result.out.substr(result.out.find("\n[input]"));
+    EXPECT_NE(job.find("encoding = \"windows-1252\"\n"), std::string::npos) << job;
+    EXPECT_NE(job.find("# Of the first 5 rows, 5 have 3 cells by it.\ndelimiter = \";\"\n"),
+              std::string::npos)
+        << job;
+    EXPECT_NE(job.find("header = true\n"), std::string::npos) << job;
+    EXPECT_NE(job.find("# Column 2, \"born\": 3 dates or times, 1 cell empty.\n"
+                       "#   2 as %d.%m.%Y, such as \"31.12.1999\"\n"
+                       "#   1 as %Y-%m-%d, such as \"2020-01-02\"\n"
+                       "[[step]]\ndo = \"date\"\ncolumn = \"born\"\n"),
+              std::string::npos)
+        << job;
+    EXPECT_NE(job.find("# Column 3, \"paid\": text; 3 cells are numbers.\n"), std::string::npos) << job;
+}
+
+TEST_F(InferCommand, ReadsStandardInput) {
+    const auto result = kvt({"infer"}, "a,b\n1,2\n");
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out.substr(0, result.out.find(". Look")),
+              "# What standard input seems to be: 8 bytes, 1 row");
+}
+
+TEST_F(InferCommand, TakesTheWordOfTheUserForTheEncoding) {
+    write("a.csv", "a,b\n\xE9,1\n");
+    const auto result = kvt({"infer", "--from", "KOI8-R", path("a.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_NE(result.out.find("# As you said.\nencoding = \"KOI8-R\"\n"), std::string::npos) << result.out;
+    EXPECT_EQ(kvt({"infer", "--from", "nosuch", path("a.csv")}).status, 2);
+}
+
+TEST_F(InferCommand, SaysWhatIsWrongWithRows) {
+    write("a.csv", "a,b\n1,2\n1\n\n\"x\"y,2\n");
+    const auto result = kvt({"infer", path("a.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_NE(result.out.find("# 1 row is empty.\n"), std::string::npos) << result.out;
+    EXPECT_NE(result.out.find("# 1 row has more or fewer cells, the first is row 3.\n"), std::string::npos)
+        << result.out;
+    EXPECT_NE(result.out.find("the first is row 5.\n"), std::string::npos) << result.out;
+}
+
+TEST_F(InferCommand, NamesTextThatWentThroughTheWrongEncoding) {
+    write("a.csv", "a,b\nM\xC3\x83\xC2\xBCller,1\n");
+    EXPECT_NE(kvt({"infer", path("a.csv")}).out.find("\"M\xC3\x83\xC2\xBCller\" was \"M\xC3\xBCller\""),
+              std::string::npos);
+}
+
+TEST_F(InferCommand, WritesAFileOrNone) {
+    write("a.csv", "a,b\n1,2\n");
+    EXPECT_EQ(kvt({"infer", path("a.csv"), "-o", path("job.toml")}).status, 0);
+    EXPECT_TRUE(exists("job.toml"));
+    EXPECT_EQ(kvt({"infer", path("nosuch"), "-o", path("other.toml")}).status, 2);
+    EXPECT_FALSE(exists("other.toml"));
+}
+
+// The beginning decides on the delimiter, but all rows are counted, over the borders of blocks.
+TEST_F(InferCommand, ReadsAllOfALargeFile) {
+    std::string text = "n,d\n";
+    for (int i = 0; i < 200000; ++i) {
+        text += std::to_string(i) + ",\"2020-01-02\"\n";
+    }
+    write("large.csv", text);
+    const std::string job = kvt({"infer", path("large.csv")}).out;
+    EXPECT_NE(job.find("200,000 rows"), std::string::npos);
+    EXPECT_NE(job.find("#   200,000 as %Y-%m-%d"), std::string::npos) << job;
+}
+
+} // namespace
