@@ -5,11 +5,12 @@ include(CMakePackageConfigHelpers)
 
 set(KVT_INSTALL_CMAKEDIR "${CMAKE_INSTALL_LIBDIR}/cmake/kvt")
 
+# The components are what the packages are made of (KvtPackage.cmake).
 install(TARGETS kvt
     EXPORT kvtTargets
-    LIBRARY DESTINATION "${CMAKE_INSTALL_LIBDIR}"
-    FILE_SET HEADERS DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}")
-install(EXPORT kvtTargets NAMESPACE kvt:: DESTINATION "${KVT_INSTALL_CMAKEDIR}")
+    LIBRARY DESTINATION "${CMAKE_INSTALL_LIBDIR}" COMPONENT runtime NAMELINK_COMPONENT development
+    FILE_SET HEADERS DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}" COMPONENT development)
+install(EXPORT kvtTargets NAMESPACE kvt:: DESTINATION "${KVT_INSTALL_CMAKEDIR}" COMPONENT development)
 
 # The command finds the library of its own prefix, wherever that has been moved to.
 if(TARGET kvt_tool AND NOT IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" AND NOT IS_ABSOLUTE "${CMAKE_INSTALL_BINDIR}")
@@ -22,7 +23,7 @@ configure_package_config_file(
     INSTALL_DESTINATION "${KVT_INSTALL_CMAKEDIR}")
 write_basic_package_version_file("${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake" COMPATIBILITY SameMajorVersion)
 install(FILES "${PROJECT_BINARY_DIR}/kvtConfig.cmake" "${PROJECT_BINARY_DIR}/kvtConfigVersion.cmake"
-    DESTINATION "${KVT_INSTALL_CMAKEDIR}")
+    DESTINATION "${KVT_INSTALL_CMAKEDIR}" COMPONENT development)
 
 # kvt.pc finds its prefix from its own place, so that `cmake --install --prefix` and later moves keep it right;
 # only a library folder given as an absolute path nails it down.
@@ -45,7 +46,7 @@ list(REMOVE_ITEM KVT_BOOST_DIRS ${CMAKE_CXX_IMPLICIT_INCLUDE_DIRECTORIES})
 list(TRANSFORM KVT_BOOST_DIRS PREPEND " -I")
 list(JOIN KVT_BOOST_DIRS "" KVT_PC_BOOST_CFLAGS)
 configure_file("${PROJECT_SOURCE_DIR}/cmake/kvt.pc.in" "${PROJECT_BINARY_DIR}/kvt.pc" @ONLY)
-install(FILES "${PROJECT_BINARY_DIR}/kvt.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
+install(FILES "${PROJECT_BINARY_DIR}/kvt.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig" COMPONENT development)
 
 # The pretty-printers of gdb, for this very library: gdb looks for a file with the library's full name and path under
 # its folder of scripts. The path is that of where the library will be found, known when it is installed.
@@ -55,4 +56,11 @@ install(CODE "
     file(REAL_PATH \"\${libdir}\" libdir)
     file(INSTALL DESTINATION \"\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_DATADIR}/gdb/auto-load\${libdir}\"
         TYPE FILE RENAME \"libkvt.so.${PROJECT_VERSION}-gdb.py\"
-        FILES \"${PROJECT_SOURCE_DIR}/tools/gdb/kvt_gdb.py\")")
+        FILES \"${PROJECT_SOURCE_DIR}/tools/gdb/kvt_gdb.py\")"
+    COMPONENT development)
+
+install(FILES README.md CHANGELOG.md DESTINATION "${CMAKE_INSTALL_DOCDIR}" COMPONENT documentation)
+install(DIRECTORY docs/ DESTINATION "${CMAKE_INSTALL_DOCDIR}/docs" COMPONENT documentation
+    FILES_MATCHING PATTERN "*.md" PATTERN "*.svg")
+install(DIRECTORY examples/ DESTINATION "${CMAKE_INSTALL_DOCDIR}/examples" COMPONENT documentation
+    PATTERN "CMakeLists.txt" EXCLUDE)
