@@ -58,7 +58,7 @@ TEST_F(KvtCommandLine, EveryHelpBeginsWithAnExampleAndListsTheStatuses) {
 
 TEST_F(KvtCommandLine, HelpFitsATerminal) {
     for (const std::string command : {"convert", "encodings", "text", "match", "number", "explain", "date",
-                                      "sort", "unique", "memory", "doctor", "tzdata"}) {
+                                      "sort", "unique", "memory", "doctor", "tzdata", "infer"}) {
         std::istringstream lines(kvt({command, "--help"}).out);
         for (std::string line; std::getline(lines, line) && !line.empty();) {
             // Examples are command lines and stay whole.

@@ -133,13 +133,13 @@ TEST(URegex, ASearchBeginsAtTheBeginningUnlessTold) {
 }
 
 TEST(URegex, AllMatchesAreFoundWithAViewOfTheWholeText) {
-    struct Row {
+    struct Subject {
         int line;
         const char* pattern;
         const char* subject;
         std::vector<Spans> matches;
     };
-    const Row rows[] = {
+    const Subject rows[] = {
         {__LINE__, "a", "banana", {{{1, 1}}, {{3, 1}}, {{5, 1}}}},
         {__LINE__, "^a", "aaa", {{{0, 1}}}},
         {__LINE__, "(?<=a)a", "aaa", {{{1, 1}}, {{2, 1}}}},
@@ -150,7 +150,7 @@ TEST(URegex, AllMatchesAreFoundWithAViewOfTheWholeText) {
         {__LINE__, "(?=a\\K)", "a", {{{1, std::uint64_t(0) - 1}}}},
         {__LINE__, "x", "", {}},
     };
-    for (const Row& row : rows) {
+    for (const Subject& row : rows) {
         EXPECT_EQ(allFoundBy(URegex<0>(row.pattern), row.subject).matches, row.matches) << "row " << row.line;
     }
     int calls = 0;

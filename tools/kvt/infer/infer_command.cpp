@@ -19,16 +19,16 @@ kvt infer people.csv -o people.toml
 kvt translate --job people.toml people.csv)";
 
 constexpr const char* notes =
-    R"(Reads all of FILE and prints what it seems to be: its encoding, what stands between
-and around its cells, whether the first row has names, and for each column whether
-it has dates, numbers or text, and in which forms. That is a job for
-'kvt translate --job', with the evidence as comments beside each line, to be looked
-over and mended.
+    R"(Reads all of FILE and prints what it seems to be: its encoding, what stands
+between and around its cells, whether the first row has names, and for each
+column whether it has dates, numbers or text, and in which forms. That is a job
+for 'kvt translate --job', with the evidence as comments beside each line, to be
+looked over and mended.
 
-An encoding is proposed if all of the file is text in it; with --from it is known.
-A date such as 01/02/2020 can be read in two ways; if no other date of the column
-decides, the job says so. Text that was once read in the wrong encoding, so that an
-umlaut became two characters, is named.
+An encoding is proposed if all of the file is text in it; with --from it is
+known. A date such as 01/02/2020 can be read in two ways; if no other date of
+the column decides, the job says so. Text that was once read in the wrong
+encoding, so that an umlaut became two characters, is named.
 
 Exit status:
   0  done
