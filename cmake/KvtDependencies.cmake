@@ -29,6 +29,8 @@ if(KVT_BUILD_TOOLS OR KVT_BUILD_TESTS OR KVT_BUILD_FUZZERS)
     kvt_find(NAME "ICU's i18n library, for the kvt command" INSTALL "libicu-dev" PACKAGE ICU 58 COMPONENTS uc i18n)
     kvt_find(NAME "CLI11, for the kvt command" INSTALL "libcli11-dev" PACKAGE CLI11 CONFIG)
     kvt_find(NAME "nlohmann-json, for the kvt command" INSTALL "nlohmann-json3-dev" PACKAGE nlohmann_json CONFIG)
+    # Of its headers alone: the library that the package has, too, is not linked.
+    kvt_find(NAME "toml++, for the kvt command" INSTALL "libtomlplusplus-dev" PACKAGE tomlplusplus CONFIG)
 endif()
 if(KVT_BUILD_TESTS)
     kvt_find(NAME "GoogleTest, for the tests" INSTALL "libgtest-dev" PACKAGE GTest CONFIG)

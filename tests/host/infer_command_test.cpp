@@ -77,4 +77,42 @@ TEST_F(InferCommand, ReadsAllOfALargeFile) {
     EXPECT_NE(job.find("#   200,000 as %Y-%m-%d"), std::string::npos) << job;
 }
 
+// What infer proposes is a job that translate takes as it is, and the result is clean.
+TEST_F(InferCommand, ProposesAJobThatTranslateTakes) {
+    write("people.csv", "name;born;paid\r\nM\xFCller;31.12.1999;1.234,50\r\nJ\xF6rg;2020-01-02;12,5\r\n");
+    ASSERT_EQ(kvt({"infer", path("people.csv"), "-o", path("job.toml")}).status, 0);
+    const auto result = kvt({"translate", "--job", path("job.toml"), path("people.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out,
+              "name;born;paid\r\nM\xC3\xBCller;1999-12-31;1234.50\r\nJ\xC3\xB6rg;2020-01-02;12.5\r\n");
+}
+
+TEST_F(InferCommand, TranslateExplainsWhatAJobDoes) {
+    write("a.csv", "d,n\n01.02.2020,x\nbad,y\n1.1.2021,z\n");
+    const auto result =
+        kvt({"translate", "--date", "d=%d.%m.%Y", "--where", "n~[xy]", "--explain", path("a.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_NE(result.out.find("[[step]]\ndo = \"date\"\ncolumn = \"d\"\nformat = \"%d.%m.%Y\"\n"),
+              std::string::npos)
+        << result.out;
+    EXPECT_NE(result.out.find("row 1  before  d,n\n       after   d,n\n"
+                              "row 2  before  01.02.2020,x\n       after   20200201,x\n"
+                              "row 3  before  bad,y\n       after   bad,y\n       failed  d: "),
+              std::string::npos)
+        << result.out;
+    EXPECT_NE(result.out.find("row 4  before  1.1.2021,z\n       after   (left out)\n"), std::string::npos)
+        << result.out;
+}
+
+// What stands on the command line counts more than the job, and its steps come behind.
+TEST_F(InferCommand, TranslateTakesOptionsBesideAJob) {
+    write("job.toml", "[input]\ndelimiter = \";\"\nheader = false\n[[step]]\ndo = \"case\"\ncolumn = "
+                      "1\nchange = \"upper\"\n");
+    write("a.csv", "a,b\nc,d\n");
+    const auto result = kvt(
+        {"translate", "--job", path("job.toml"), "--delimiter", ",", "--replace", "1=/A/x/", path("a.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out, "x,b\nC,d\n");
+}
+
 } // namespace

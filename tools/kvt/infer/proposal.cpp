@@ -1,6 +1,7 @@
 #include "infer/proposal.h"
 
 #include "base/text.h"
+#include "translate/job_text.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -25,32 +26,13 @@ std::string counted(std::uint64_t count, const char* one, const char* many) {
     return grouped(count) + " " + (count == 1 ? one : many);
 }
 
-// A string of TOML.
-std::string quoted(std::string_view text) {
-    std::string out = "\"";
-    for (const char c : text) {
-        constexpr std::string_view digits = "0123456789ABCDEF";
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '"' || c == '\\') {
-            out += std::string("\\") + c;
-        } else if (c == '\t') {
-            out += "\\t";
-        } else if (byte < 0x20 || byte == 0x7F) {
-            out += std::string("\\u00") + digits[byte >> 4] + digits[byte & 15];
-        } else {
-            out += c;
-        }
-    }
-    return out + "\"";
-}
-
 std::string list(const std::vector<std::string>& texts) {
     if (texts.size() == 1) {
-        return quoted(texts.front());
+        return tomlString(texts.front());
     }
     std::string out = "[";
     for (const std::string& text : texts) {
-        out += (out.size() > 1 ? ", " : "") + quoted(text);
+        out += (out.size() > 1 ? ", " : "") + tomlString(text);
     }
     return out + "]";
 }
@@ -86,16 +68,16 @@ private:
     void writeInput() {
         out_ += "\n[input]\n";
         explainEncodings();
-        set("encoding", quoted(survey_.encodings.front().name));
+        set("encoding", tomlString(survey_.encodings.front().name));
         const TableGuess& table = survey_.table;
         remark(table.columns == 1
                    ? "No delimiter parts the rows: there is one column."
                    : "Of the first " + counted(table.rows, "row", "rows") + ", " +
                          grouped(table.rowsOfWidth) + " have " + grouped(table.columns) + " cells by it.");
-        set("delimiter", quoted(std::string(1, table.form.delimiter)));
+        set("delimiter", tomlString(std::string(1, table.form.delimiter)));
         if (table.form.quote != '"') {
             remark("No cell stands in double quotes.");
-            set("quote", quoted(std::string(1, table.form.quote)));
+            set("quote", tomlString(std::string(1, table.form.quote)));
         }
         remark("Because " + survey_.aboutHeader + ".");
         set("header", survey_.hasHeader ? "true" : "false");
@@ -167,11 +149,11 @@ private:
 
     void writeOutput() {
         out_ += "\n[output]\n";
-        set("encoding", quoted("UTF-8"));
+        set("encoding", tomlString("UTF-8"));
         out_ += "\n[failures]\n";
         remark("What becomes of a cell that a step cannot translate: \"keep\", \"empty\", \"skip\" its row, "
                "or \"stop\".");
-        set("on-error", quoted("keep"));
+        set("on-error", tomlString("keep"));
     }
 
     // ---- Columns
@@ -231,8 +213,8 @@ private:
 
     void beginStep(const std::string& name, std::size_t index) {
         out_ += "[[step]]\n";
-        set("do", quoted(name));
-        set("column", quoted(columnName(index)));
+        set("do", tomlString(name));
+        set("column", tomlString(columnName(index)));
     }
 
     // By its name, where that says which it is.
@@ -254,9 +236,9 @@ private:
         beginStep("date", index);
         set("format", list(formats));
         out_ += "[[step]]\n";
-        set("do", quoted("write-date"));
-        set("column", quoted(columnName(index)));
-        set("format", quoted("ISO"));
+        set("do", tomlString("write-date"));
+        set("column", tomlString(columnName(index)));
+        set("format", tomlString("ISO"));
     }
 
     void writeNumbers(std::size_t index) {
@@ -279,7 +261,7 @@ private:
             return;
         }
         beginStep("number", index);
-        set("language", quoted(languages[place]));
+        set("language", tomlString(languages[place]));
     }
 
     const Survey& survey_;

@@ -6,10 +6,13 @@
 #include "cli/command.h"
 #include "cli/sizes.h"
 #include "text/file_options.h"
+#include "translate/explanation.h"
+#include "translate/job_file.h"
 #include "translate/step_table.h"
 #include "translate/translation.h"
 
 #include <algorithm>
+#include <functional>
 #include <thread>
 #include <utility>
 
@@ -54,28 +57,26 @@ Exit status:
 class TranslateCommand : public Command {
 public:
     void declare(Syntax& syntax) override {
-        syntax.option("--from", job_.input.encoding, "ENC", "Encoding of the input; UTF-8 without it");
-        syntax.option("--to", job_.output.encoding, "ENC", "Encoding of the output; UTF-8 without it");
-        syntax.option("--delimiter", job_.input.delimiter, "CHAR",
-                      "What stands between cells: a character, or 'tab', 'comma' (default), 'semicolon', "
-                      "'pipe', 'space'");
-        syntax.option("--quote", job_.input.quote, "CHAR", "What stands around cells; '\"' without it");
-        syntax.option("--out-delimiter", job_.output.delimiter, "CHAR",
-                      "The delimiter of the output, if it is another");
-        syntax.option("--line-ends", job_.output.lineEnds, "WHAT",
-                      "'keep' the ends of rows (default), or write 'lf' or 'crlf'");
-        syntax.flag("--quote-all", job_.output.quoteAll, "Put quotes around all cells");
+        syntax.option(
+            "-j,--job", jobFile_, "FILE",
+            "Do what FILE says, such as 'kvt infer' writes; options beside it count more, and steps come "
+            "behind its own");
+        syntax.flag("--explain", explains_,
+                    "Print the job and the first rows before and after, and do no more");
+        declareForms(syntax);
         syntax.flag("--header", hasHeader_, "The first row names the columns, the default");
         syntax.flag("--no-header", hasNoHeader_, "There is no such row; columns have numbers");
         declareSteps(syntax);
         onErrorOption_ = syntax.option("--on-error", job_.onError, "WHAT",
                                        "What a failure does: 'stop' (default), 'keep', 'empty' or 'skip'");
+        field(onErrorOption_, [](Job& to, const Job& from) { to.onError = from.onError; });
         syntax.option(
             "--report", options_.report, "FILE",
             "Write all failures to FILE: as CSV where it ends in .csv, else a JSON object on each line");
         syntax.option("--reject", options_.reject, "FILE",
                       "Write the rows that are left out to FILE; implies --on-error skip");
-        syntax.option("--max-errors", job_.mostErrors, "N", "End when there are more than N failures");
+        field(syntax.option("--max-errors", job_.mostErrors, "N", "End when there are more than N failures"),
+              [](Job& to, const Job& from) { to.mostErrors = from.mostErrors; });
         syntax.flag("--dry-run", options_.isDryRun,
                     "Write nothing, and say what would be written and what would fail");
         syntax.option("--threads", threads_, "N", "Work on N blocks at a time; all cores without it");
@@ -100,7 +101,7 @@ public:
         if (hasHeader_ && hasNoHeader_) {
             throw Failure("--header and --no-header do not go together");
         }
-        job_.input.hasHeader = !hasNoHeader_;
+        readJob();
         if (!options_.reject.empty() && !onErrorOption_.isGiven()) {
             job_.onError = "skip";
         }
@@ -108,10 +109,54 @@ public:
         options_.part = part();
         options_.memory = parseSize("--memory", memory_);
         readSteps();
+        if (explains_) {
+            print(explanationOf(job_, options_.inputs));
+            return 0;
+        }
         return translate(job_, options_, diagnostics);
     }
 
 private:
+    using TakeField = std::function<void(Job& to, const Job& from)>;
+
+    void declareForms(Syntax& syntax) {
+        field(syntax.option("--from", job_.input.encoding, "ENC", "Encoding of the input; UTF-8 without it"),
+              [](Job& to, const Job& from) { to.input.encoding = from.input.encoding; });
+        field(syntax.option("--to", job_.output.encoding, "ENC", "Encoding of the output; UTF-8 without it"),
+              [](Job& to, const Job& from) { to.output.encoding = from.output.encoding; });
+        field(
+            syntax.option("--delimiter", job_.input.delimiter, "CHAR",
+                          "What stands between cells: a character, or 'tab', 'comma' (default), 'semicolon', "
+                          "'pipe', 'space'"),
+            [](Job& to, const Job& from) { to.input.delimiter = from.input.delimiter; });
+        field(syntax.option("--quote", job_.input.quote, "CHAR", "What stands around cells; '\"' without it"),
+              [](Job& to, const Job& from) { to.input.quote = from.input.quote; });
+        field(syntax.option("--out-delimiter", job_.output.delimiter, "CHAR",
+                            "The delimiter of the output, if it is another"),
+              [](Job& to, const Job& from) { to.output.delimiter = from.output.delimiter; });
+        field(syntax.option("--line-ends", job_.output.lineEnds, "WHAT",
+                            "'keep' the ends of rows (default), or write 'lf' or 'crlf'"),
+              [](Job& to, const Job& from) { to.output.lineEnds = from.output.lineEnds; });
+        field(syntax.flag("--quote-all", job_.output.quoteAll, "Put quotes around all cells"),
+              [](Job& to, const Job& from) { to.output.quoteAll = from.output.quoteAll; });
+    }
+
+    void field(const Option& option, TakeField take) { fields_.emplace_back(option, std::move(take)); }
+
+    // What stands on the command line counts more than what the file says.
+    void readJob() {
+        if (!jobFile_.empty()) {
+            const Job typed = std::exchange(job_, readJobFile(jobFile_, job_.zoneDatabase));
+            for (const auto& [option, take] : fields_) {
+                if (option.isGiven()) {
+                    take(job_, typed);
+                }
+            }
+            job_.zoneDatabase = typed.zoneDatabase;
+        }
+        job_.input.hasHeader = hasHeader_ || (job_.input.hasHeader && !hasNoHeader_);
+    }
+
     void declareSteps(Syntax& syntax) {
         for (const StepRow& row : stepTable()) {
             declareOrdered(syntax, row.name, row.typed, row.help);
@@ -189,6 +234,9 @@ private:
     TranslationOptions options_;
     FileOptions files_;
     Option onErrorOption_;
+    std::vector<std::pair<Option, TakeField>> fields_; ///< of the job that options set
+    std::string jobFile_;
+    bool explains_ = false;
     bool hasHeader_ = false;
     bool hasNoHeader_ = false;
     bool mergesReports_ = false;

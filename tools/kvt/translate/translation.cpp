@@ -11,7 +11,7 @@
 #include "cli/exit_status.h"
 #include "translate/accounts.h"
 #include "translate/block_worker.h"
-#include "translate/cell_text.h"
+#include "translate/header_names.h"
 
 #include <condition_variable>
 #include <exception>
@@ -184,30 +184,6 @@ std::unique_ptr<Output> openBeside(const std::string& what, const std::string& p
         throw Failure(what + " needs a file of its own: " + printable(path));
     }
     return openOutput(path);
-}
-
-std::vector<std::string> namesOf(const SourceBlock& block, const Plan& plan) {
-    std::string text = block.bytes;
-    if (!block.isDecoded) {
-        text.clear();
-        kvt::ex::StreamTranscoder decoder(block.encoding, kvt::ex::Encoding::Utf8);
-        decoder.convert(block.bytes, text, {});
-        decoder.finish(text, {});
-    }
-    RowReader reader(plan.in, text);
-    reader.next();
-    if (plan.job.input.hasHeader && reader.fault() != RowFault::None) {
-        throw Failure(block.name + ": the header cannot be read, at byte " +
-                      std::to_string(reader.faultPlace() - text.data()) + " of its text");
-    }
-    std::vector<std::string> names;
-    std::string scratch;
-    for (std::size_t index = 0; index < reader.cellCount(); ++index) {
-        names.push_back(plan.job.input.hasHeader
-                            ? std::string(textOfCell(reader.cell(index), plan.in, scratch))
-                            : std::to_string(index + 1));
-    }
-    return names;
 }
 
 void checkPart(const Plan& plan, const TranslationOptions& options) {
