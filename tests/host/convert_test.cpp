@@ -170,7 +170,7 @@ TEST_F(KvtConvert, OptionsThatContradictEachOtherAreRefused) {
     };
     const std::vector<Row> rows = {
         {{"--on-error", "stpo"},
-         "kvt: --on-error takes one of stop, replace, report, not 'stpo'. Did you mean 'stop'?\n"},
+         "kvt: --on-error takes one of stop, replace, report, transliterate, not 'stpo'. Did you mean 'stop'?\n"},
         {{"--bom", "remove"}, "kvt: --bom takes one of skip, keep, strip, add, not 'remove'.\n"},
         {{"--bom", "\x1B[2J"}, "kvt: --bom takes one of skip, keep, strip, add, not '\\x1B[2J'.\n"},
         {{"--report", "r", "--on-error", "stop"}, "kvt: --report goes with --on-error report or transliterate only\n"},

@@ -42,7 +42,7 @@ are longer than 4 MiB are read in --from. --on-error transliterate takes each
 character for itself: 'Ł' becomes 'L', 'ж' 'z', '…' three dots; the list of
 losses has what was written. Both go with --normalize, which takes place between
 reading and writing: 'nfc' composes letters and their marks, 'nfkc' also makes
-one of forms that mean the same, as 'ﬁ' and 'fi'. Places are those in the input.
+one of forms that mean the same, as 'ﬁ' and 'fi'. All places are in the input.
 
 Byte order marks: the one at the start of each FILE is skipped. In UTF-16 and
 UTF-32 it says which order the bytes are in, which is little-endian without one;

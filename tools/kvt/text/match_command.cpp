@@ -40,9 +40,9 @@ Other things are printed instead with one of these:
                    whole match where REGEX has no groups; \t is a tab in a group,
                    \\ a backslash, and a group that took no part is empty
   --groups         LINE:COLUMN:BYTE:GROUP:LENGTH:TEXT for each group of the first
-                   match, FILE: before it when there are several FILEs; group 0 is
-                   the whole match, and a group that took no part has '-' for its
-                   column, byte and length
+                   match, FILE: before it when there are several FILEs; group 0
+                   is the whole match, and a group that took no part has '-' for
+                   its column, byte and length
   --json           a JSON object for each match, with its groups
   --count          how many lines it would be, FILE: before it when there are
                    several FILEs
@@ -55,9 +55,9 @@ The dialect 'perl' is the syntax of Perl's regular expressions. In 'legacy' the
 characters { } ( ) | are ordinary text, and so is $ but at the end: it has no
 groups, and it finds nothing in an empty line, and but one match in any other. In
 both, everything works on bytes of UTF-8: '.' is one byte, and '[é]' one of two;
-write '(?:é|è)' for one of two characters. Classes such as \w know ASCII only. A
-match that cuts a character in two ends the command when it has to be printed; an
-empty one within a character does not count. --unicode takes ICU's regular
+write '(?:é|è)' for one of two characters. Classes such as \w know ASCII only.
+A match that cuts a character in two ends the command when it has to be printed;
+an empty one within a character does not count. --unicode takes ICU's regular
 expressions instead, in which '.' is a whole character, classes are those of
 Unicode, and \p{...} has its properties.
 
