@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
-# Performs the story in docs/story.md, on the same data, with the kvt command as it was built.
+# Performs the tutorial and the story in docs, on the same data, with the kvt command as it was built.
 #
 #   examples/demo.sh [PROGRAM | BUILD-FOLDER]     or KVT=PROGRAM examples/demo.sh
 #
-# The commands stand in the story and nowhere else. Each is shown as it stands there and run in a folder that is gone
+# The commands stand in these two pages and nowhere else. Each is shown as it stands there and run in a folder that is gone
 # afterwards. What it really prints follows, and its exit status if that is not 0.
 
 set -euo pipefail
@@ -53,9 +53,9 @@ while IFS= read -r line; do
         count=$((count + 1))
         ;;
     esac
-done <"$repository/docs/story.md"
+done < <(cat -- "$repository/docs/tutorial.md" "$repository/docs/story.md")
 
 if [[ $count -eq 0 ]]; then
-    echo "demo: no story in $repository/docs/story.md" >&2
+    echo "demo: there is nothing to perform in $repository/docs" >&2
     exit 2
 fi

@@ -86,6 +86,10 @@ protected:
     }
 };
 
+TEST_F(KvtShown, TheTutorialShowsWhatHappens) {
+    expectBlocksToHappen(KVT_SOURCE_DIR "/docs/tutorial.md", 5);
+}
+
 TEST_F(KvtShown, TheStoryShowsWhatHappens) {
     expectBlocksToHappen(KVT_SOURCE_DIR "/docs/story.md", 5);
 }
@@ -99,7 +103,7 @@ TEST_F(KvtShown, NoOtherPageShowsWhatIsNotRun) {
                                                 KVT_SOURCE_DIR "/CONTRIBUTING.md"};
     for (const auto& entry : std::filesystem::directory_iterator(KVT_SOURCE_DIR "/docs")) {
         const std::string name = entry.path().filename().string();
-        if (name.ends_with(".md") && name != "commands.md" && name != "story.md") {
+        if (name.ends_with(".md") && name != "commands.md" && name != "story.md" && name != "tutorial.md") {
             pages.push_back(entry.path());
         }
     }
@@ -110,13 +114,15 @@ TEST_F(KvtShown, NoOtherPageShowsWhatIsNotRun) {
     }
 }
 
-TEST_F(KvtShown, TheDemoIsTheStory) {
+TEST_F(KvtShown, TheDemoIsTheTutorialAndTheStory) {
     std::string story;
-    for (const Part& part : partsOf(KVT_SOURCE_DIR "/docs/story.md")) {
-        if (part.kind == Part::Block) {
-            story += "\n" + part.text;
-        } else if (part.text.starts_with("## ")) {
-            story += "\n==" + part.text.substr(2) + "\n";
+    for (const char* const page : {KVT_SOURCE_DIR "/docs/tutorial.md", KVT_SOURCE_DIR "/docs/story.md"}) {
+        for (const Part& part : partsOf(page)) {
+            if (part.kind == Part::Block) {
+                story += "\n" + part.text;
+            } else if (part.text.starts_with("## ")) {
+                story += "\n==" + part.text.substr(2) + "\n";
+            }
         }
     }
     const ChildResult result = shell(KVT_SOURCE_DIR "/examples/demo.sh", folder_.string());
@@ -125,7 +131,7 @@ TEST_F(KvtShown, TheDemoIsTheStory) {
     EXPECT_EQ(result.out, story);
     EXPECT_TRUE(names().empty());
     // Each of the commands that it is about has its part in it.
-    for (const char* part : {"$ kvt convert ", "kvt match ", "kvt date parse ", "$ kvt date why ",
+    for (const char* part : {"$ kvt infer ", "$ kvt translate ", "$ kvt convert ", "kvt match ", "kvt date parse ", "$ kvt date why ",
                              "$ kvt sort ", "$ kvt unique ", "losses.jsonl"}) {
         EXPECT_TRUE(contains(story, part)) << part;
     }

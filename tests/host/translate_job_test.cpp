@@ -6,6 +6,8 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
+#include <iterator>
 #include <random>
 #include <string>
 
@@ -105,6 +107,27 @@ TEST(JobFile, IsRefusedWithThePlace) {
     }
     EXPECT_EQ(complaintAbout("[input\n").substr(0, 9), "job.toml:");
     EXPECT_EQ(complaintAbout("a = \"\xFF\"\n").substr(0, 9), "job.toml:");
+}
+
+// The page on job files has every step and argument, in the words of the help.
+TEST(JobFile, IsDescribedByItsPage) {
+    std::ifstream in(KVT_SOURCE_DIR "/docs/jobs.md");
+    const std::string page{std::istreambuf_iterator<char>(in), {}};
+    std::string rows;
+    for (const StepRow& row : stepTable()) {
+        std::string name = "`" + row.name + "`";
+        for (const StepArgument& argument : row.arguments) {
+            std::string help = argument.help;
+            for (std::size_t at = help.find('|'); at != std::string::npos; at = help.find('|', at + 2)) {
+                help.insert(at, 1, '\\');
+            }
+            const std::string quoted = "`" + argument.name + "`";
+            rows += "| " + name + " | " + (argument.isRequired ? quoted : "*" + quoted + "*") + " | " + help +
+                    " |\n";
+            name.clear();
+        }
+    }
+    EXPECT_NE(page.find(rows), std::string::npos) << rows;
 }
 
 // Steps with any texts for arguments, as long as they can be read.
