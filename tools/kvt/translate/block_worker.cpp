@@ -108,10 +108,32 @@ void BlockWorker::decode(const SourceBlock& block) {
     if (!decoder_ || decodes_ != block.encoding) {
         decodes_ = block.encoding;
         decoder_.emplace(decodes_, Encoding::Utf8);
+        byteDecoder_ = ByteDecoder::of(decodes_);
+        validator_.reset();
+        if (decodes_.evaluate() == Encoding::Utf8) {
+            validator_.emplace(decodes_, Encoding::Utf16LE);
+        }
     }
     if (block.isDecoded) {
         text_ = block.bytes;
         return;
+    }
+    if (byteDecoder_) {
+        if (const auto text = byteDecoder_->decode(block.bytes, room_)) {
+            text_ = *text;
+            return;
+        }
+    }
+    if (validator_) {
+        bool isWhole = true;
+        const auto onLoss = [&](const Loss&) { isWhole = false; };
+        room_.clear();
+        validator_->convert(block.bytes, room_, onLoss);
+        validator_->finish(room_, onLoss);
+        if (isWhole) {
+            text_ = block.bytes;
+            return;
+        }
     }
     decoded_.clear();
     const auto onLoss = [&](const Loss& loss) { losses_.push_back({loss, 0}); };
@@ -152,7 +174,7 @@ void BlockWorker::translate(const SourceBlock& block, BlockResult& result) {
         }
     }
     result.rows = row_;
-    rowOutput_.flush();
+    rowOutput_.end();
 }
 
 void BlockWorker::takeHeader(const SourceBlock& block, BlockResult& result) {
@@ -183,7 +205,7 @@ void BlockWorker::takeHeader(const SourceBlock& block, BlockResult& result) {
     if (block.isOfFirstFile) {
         rowOutput_.begin(result.header, text_);
         rowOutput_.writeEachCell(cells_, reader_, block.isMoreToCome || plan_.isOrdered());
-        rowOutput_.flush();
+        rowOutput_.end();
         rowOutput_.begin(result.output, text_);
     }
 }
@@ -225,8 +247,7 @@ void BlockWorker::takeRow(bool needsLineEnd, BlockResult& result) {
         rowOutput_.writeEachCell(cells_, reader_, needsLineEnd);
     }
     if (plan_.isOrdered()) {
-        rowOutput_.flush();
-        result.ordered.back().end = result.output.size();
+        result.ordered.back().end = rowOutput_.size();
     }
 }
 

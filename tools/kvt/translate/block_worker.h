@@ -2,6 +2,7 @@
 // worker of its own; what it gives is the same whichever thread it was.
 #pragma once
 
+#include "translate/byte_decoder.h"
 #include "translate/plan.h"
 #include "translate/row_output.h"
 #include "translate/source_blocks.h"
@@ -86,12 +87,16 @@ private:
     RowCells cells_;
     RowReader reader_;
 
+    std::optional<ByteDecoder> byteDecoder_;
+    std::optional<kvt::ex::StreamTranscoder>
+        validator_; ///< of UTF-8, which need not be decoded where it is whole
     std::optional<kvt::ex::StreamTranscoder> decoder_;
     kvt::ex::Encoding decodes_;
     std::optional<kvt::ex::StreamTranscoder> encoder_;
     std::string encoded_;
     std::string encodedHeader_;
     std::string decoded_;
+    std::string room_;               ///< of byteDecoder_
     std::string_view text_;          ///< of the block, in UTF-8
     std::vector<PlacedLoss> losses_; ///< of decoding it
     std::size_t nextLoss_ = 0;

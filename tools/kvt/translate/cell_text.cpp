@@ -22,10 +22,18 @@ std::string_view textOfCell(std::string_view cell, const RowForm& form, std::str
     return scratch;
 }
 
-bool needsQuotes(std::string_view text, const RowForm& form) {
-    return std::any_of(text.begin(), text.end(), [&](char byte) {
-        return byte == form.delimiter || byte == form.quote || byte == '\n' || byte == '\r';
-    });
+QuoteNeed::QuoteNeed(const RowForm& form) {
+    for (const char byte : {form.delimiter, form.quote, '\n', '\r'}) {
+        special_[static_cast<unsigned char>(byte)] = true;
+    }
+}
+
+void appendCell(std::string& out, std::string_view text, const RowForm& form) {
+    if (QuoteNeed(form)(text)) {
+        appendQuoted(out, text, form);
+    } else {
+        out += text;
+    }
 }
 
 void appendQuoted(std::string& out, std::string_view text, const RowForm& form) {

@@ -3,6 +3,7 @@
 
 #include "translate/row_form.h"
 
+#include <array>
 #include <string>
 #include <string_view>
 
@@ -11,19 +12,26 @@ namespace host {
 /// The text of a cell of a row without fault. A view of the cell, or of `scratch` where quotes within it are doubled.
 std::string_view textOfCell(std::string_view cell, const RowForm& form, std::string& scratch);
 
-/// Whether `text` is another one when it is read as a cell, unless quotes stand around it.
-bool needsQuotes(std::string_view text, const RowForm& form);
+/// Whether a text is another one when it is read as a cell, unless quotes stand around it.
+class QuoteNeed {
+public:
+    explicit QuoteNeed(const RowForm& form);
+    bool operator()(std::string_view text) const {
+        bool isNeeded = false;
+        for (const char byte : text) {
+            isNeeded |= special_[static_cast<unsigned char>(byte)];
+        }
+        return isNeeded;
+    }
+
+private:
+    std::array<bool, 256> special_{};
+};
 
 /// Appends `text` with quotes around it.
 void appendQuoted(std::string& out, std::string_view text, const RowForm& form);
 
 /// Appends `text` as a cell, with quotes where it needs them.
-inline void appendCell(std::string& out, std::string_view text, const RowForm& form) {
-    if (needsQuotes(text, form)) {
-        appendQuoted(out, text, form);
-    } else {
-        out += text;
-    }
-}
+void appendCell(std::string& out, std::string_view text, const RowForm& form);
 
 } // namespace host

@@ -10,6 +10,7 @@
 #include <kvt/datetime/message_numbers.h>
 
 #include <algorithm>
+#include <cstring>
 #include <limits>
 
 namespace host {
@@ -132,84 +133,87 @@ Problem problemOf(const datetime::TextResult& result, std::size_t& fit) {
 // ---- Texts of a fixed length
 
 std::optional<FixedDateForm> FixedDateForm::of(std::string_view pattern) {
-    static constexpr std::array<std::pair<std::string_view, Part>, 6> flags = {
-        {{"%Y", Year}, {"%m", Month}, {"%d", Day}, {"%H", Hour}, {"%M", Minute}, {"%S", Second}}};
+    static constexpr std::array<std::string_view, partCount> flags = {"%Y", "%m", "%d", "%H", "%M", "%S"};
+    constexpr char anyDigit = 0x7F - 9;
+    constexpr char itself = 0x7F;
     FixedDateForm form;
-    std::array<int, 6> counts{};
+    bool isBehindSeconds = false;
     while (!pattern.empty()) {
         const std::string_view element = elementOf(pattern);
         pattern.remove_prefix(element.size());
-        const auto flag =
-            std::find_if(flags.begin(), flags.end(), [&](const auto& row) { return row.first == element; });
-        const auto place = static_cast<std::uint8_t>(form.length_);
-        if (flag != flags.end()) {
-            form.elements_.push_back({flag->second, '\0', place});
-            form.length_ += flag->second == Year ? 4 : 2;
-            ++counts[flag->second];
-        } else {
-            // "." behind seconds is the beginning of a fraction.
-            const bool isPoint =
-                element == "." && !form.elements_.empty() && form.elements_.back().part == Second;
-            if (element.size() != 1 || element[0] < ' ' || element.find_first_of("$*?%") == 0 || isPoint) {
-                return std::nullopt;
-            }
-            form.elements_.push_back({Literal, element[0], place});
-            ++form.length_;
+        const auto part =
+            static_cast<std::size_t>(std::find(flags.begin(), flags.end(), element) - flags.begin());
+        const bool isFlag = part != partCount;
+        // "." behind seconds is the beginning of a fraction.
+        const bool isPlain = element.size() == 1 && element[0] >= ' ' && element[0] < 127 &&
+                             element.find_first_of("$*?%") != 0 && !(element == "." && isBehindSeconds);
+        const std::size_t width = !isFlag ? 1 : part == Year ? 4 : 2;
+        if ((isFlag ? form.given_[part] : !isPlain) || form.length_ + width > longest) {
+            return std::nullopt;
+        }
+        if (isFlag) {
+            form.given_[part] = true;
+            form.places_[part] = static_cast<std::uint8_t>(form.length_);
+        }
+        isBehindSeconds = isFlag && part == Second;
+        for (std::size_t count = 0; count < width; ++count, ++form.length_) {
+            form.expected_[form.length_] = isFlag ? '0' : element[0];
+            form.room_[form.length_] = isFlag ? anyDigit : itself;
         }
     }
-    const bool hasDate = counts[Year] == 1 && counts[Month] == 1 && counts[Day] == 1;
-    const bool hasWholeTime = counts[Hour] == 1 && counts[Minute] <= 1 && counts[Second] <= counts[Minute];
-    form.hasTime_ = counts[Hour] != 0;
-    const bool isPlain = hasDate && (hasWholeTime || (counts[Hour] + counts[Minute] + counts[Second] == 0)) &&
-                         form.length_ < 64;
-    return isPlain ? std::optional(std::move(form)) : std::nullopt;
+    const auto& given = form.given_;
+    form.hasTime_ = given[Hour];
+    const bool hasDate = given[Year] && given[Month] && given[Day];
+    const bool hasTimeInOrder = given[Hour] >= given[Minute] && given[Minute] >= given[Second];
+    return hasDate && hasTimeInOrder ? std::optional(form) : std::nullopt;
+}
+
+// Eight bytes at a time: the distance of each from what is expected, and more than what there is room for sets the
+// highest bit. A carry into the next byte comes from a byte that has that bit already.
+inline bool FixedDateForm::fitsShape(const char* text) const {
+    const auto excess = [&](std::size_t at) {
+        std::uint64_t found = 0;
+        std::uint64_t expected = 0;
+        std::uint64_t room = 0;
+        std::memcpy(&found, text + at, sizeof found);
+        std::memcpy(&expected, expected_.data() + at, sizeof expected);
+        std::memcpy(&room, room_.data() + at, sizeof room);
+        const std::uint64_t distance = found ^ expected;
+        return (distance | (distance + room)) & 0x8080808080808080U;
+    };
+    // A date has eight digits at least.
+    std::uint64_t wrong = excess(length_ - 8);
+    for (std::size_t at = 0; at + 8 < length_; at += 8) {
+        wrong |= excess(at);
+    }
+    return wrong == 0;
 }
 
 bool FixedDateForm::read(std::string_view text, std::string& out) const {
-    if (text.size() != length_) {
+    if (text.size() != length_ || !fitsShape(text.data())) {
         return false;
     }
-    std::array<unsigned, 6> numbers{};
-    unsigned wrong = 0; // has a bit above the lowest four where a character is not a digit
-    const auto digit = [&](std::size_t place) {
-        const unsigned value = static_cast<unsigned char>(text[place]) - unsigned{'0'};
-        wrong |= value > 9 ? 1U : 0U;
-        return value;
+    const auto pairAt = [&](std::size_t at) {
+        return static_cast<unsigned>(text[at] - '0') * 10 + static_cast<unsigned>(text[at + 1] - '0');
     };
-    for (const Element& element : elements_) {
-        const std::size_t at = element.place;
-        if (element.part == Literal) {
-            wrong |= text[at] != element.literal ? 1U : 0U;
-        } else if (element.part == Year) {
-            numbers[Year] = digit(at) * 1000 + digit(at + 1) * 100 + digit(at + 2) * 10 + digit(at + 3);
-        } else {
-            numbers[element.part] = digit(at) * 10 + digit(at + 1);
-        }
-    }
+    const auto number = [&](Part part) { return given_[part] ? pairAt(places_[part]) : 0; };
     static constexpr std::array<unsigned char, 12> days = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    const unsigned year = numbers[Year];
-    if (wrong != 0 || year < 1000 || numbers[Month] - 1 > 11 || numbers[Hour] > 23 || numbers[Minute] > 59 ||
-        numbers[Second] > 59) {
+    const unsigned year = pairAt(places_[Year]) * 100 + pairAt(places_[Year] + std::size_t{2});
+    const unsigned month = pairAt(places_[Month]);
+    if (year < 1000 || month - 1 > 11 || number(Hour) > 23 || number(Minute) > 59 || number(Second) > 59) {
         return false;
     }
     const bool isLeap = year % 4 == 0 && (year % 100 != 0 || year % 400 == 0);
-    const unsigned most = days[numbers[Month] - 1] + (isLeap && numbers[Month] == 2 ? 1U : 0U);
-    if (numbers[Day] - 1 >= most) {
+    const unsigned most = days[month - 1] + (isLeap && month == 2 ? 1U : 0U);
+    if (pairAt(places_[Day]) - 1 >= most) {
         return false;
     }
     out.resize(hasTime_ ? 14 : 8);
-    const auto pair = [&](std::size_t place, unsigned number) {
-        out[place] = static_cast<char>('0' + number / 10);
-        out[place + 1] = static_cast<char>('0' + number % 10);
-    };
-    pair(0, year / 100);
-    pair(2, year % 100);
-    pair(4, numbers[Month]);
-    pair(6, numbers[Day]);
-    if (hasTime_) {
-        pair(8, numbers[Hour]);
-        pair(10, numbers[Minute]);
-        pair(12, numbers[Second]);
+    std::memcpy(out.data(), text.data() + places_[Year], 4);
+    std::memcpy(out.data() + 4, text.data() + places_[Month], 2);
+    std::memcpy(out.data() + 6, text.data() + places_[Day], 2);
+    for (std::size_t part = Hour; hasTime_ && part <= Second; ++part) {
+        std::memcpy(out.data() + 8 + 2 * (part - Hour), given_[part] ? text.data() + places_[part] : "00", 2);
     }
     return true;
 }

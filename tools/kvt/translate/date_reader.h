@@ -28,16 +28,20 @@ public:
     bool read(std::string_view text, std::string& out) const;
 
 private:
-    enum Part : std::uint8_t { Year, Month, Day, Hour, Minute, Second, Literal };
-    struct Element {
-        Part part;
-        char literal;
-        std::uint8_t place; ///< in the text
-    };
+    enum Part : std::uint8_t { Year, Month, Day, Hour, Minute, Second };
+    static constexpr std::size_t partCount = 6;
+    static constexpr std::size_t longest = 64;
 
-    std::vector<Element> elements_;
+    bool fitsShape(const char* text) const;
+
     std::size_t length_ = 0;
     bool hasTime_ = false;
+    std::array<std::uint8_t, partCount> places_{}; ///< of the parts in the text
+    std::array<bool, partCount> given_{};
+    // For each byte of the text: what it is, with "0" for any digit, and by how much it may be more, as the distance to
+    // the highest number of seven bits.
+    std::array<char, longest> expected_{};
+    std::array<char, longest> room_{};
 };
 
 /// Names of months by which texts are looked through.

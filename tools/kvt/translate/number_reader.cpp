@@ -108,6 +108,8 @@ NumberReader::NumberReader(const std::string& language) {
     }
     decimal_ = signs->decimal;
     groups_ = {signs->group};
+    plainDecimal_ = decimal_.size() == 1 ? decimal_.front() : '\0';
+    plainGroup_ = signs->group.size() == 1 ? signs->group.front() : '\0';
     for (const auto* alike : {&spaces, &apostrophes}) {
         if (std::find(alike->begin(), alike->end(), signs->group) != alike->end()) {
             groups_ = *alike;
@@ -115,9 +117,47 @@ NumberReader::NumberReader(const std::string& language) {
     }
 }
 
+// Nearly all numbers: perhaps a minus, one to three digits, groups of three, a fraction. False is no answer.
+bool NumberReader::readPlain(std::string_view text, std::string& out) const {
+    const char* at = text.data();
+    const char* const end = at + text.size();
+    const bool isNegative = at != end && *at == '-';
+    at += isNegative ? 1 : 0;
+    const bool isBelowOne = end - at >= 2 && *at == '0' && at[1] == plainDecimal_ && !isNegative;
+    std::array<char, 64> digits;
+    if (at == end || text.size() > digits.size() || ((*at < '1' || *at > '9') && !isBelowOne)) {
+        return false;
+    }
+    char* to = digits.data();
+    *to = '-';
+    to += isNegative ? 1 : 0;
+    const char* const first = at;
+    while (at != end && isDigit(*at)) {
+        *to++ = *at++;
+    }
+    if (at != end && *at == plainGroup_ && at - first > 3) {
+        return false;
+    }
+    while (end - at >= 4 && *at == plainGroup_ && isDigit(at[1]) && isDigit(at[2]) && isDigit(at[3])) {
+        to = std::copy(at + 1, at + 4, to);
+        at += 4;
+    }
+    if (end - at >= 2 && *at == plainDecimal_) {
+        *to++ = '.';
+        for (++at; at != end && isDigit(*at); ++at) {
+            *to++ = *at;
+        }
+    }
+    out.assign(digits.data(), to);
+    return at == end;
+}
+
 bool NumberReader::read(std::string_view text, std::string& out) const {
+    if (readPlain(text, out)) {
+        return true;
+    }
     bool isNegative = false;
-    if (!isDigit(text.empty() ? '-' : text.front()) || !isDigit(text.back())) {
+    if (text.empty() || !isDigit(text.front()) || !isDigit(text.back())) {
         int signs = 0;
         stripSpaces(text);
         // Sign and currency may stand in either order.

@@ -25,6 +25,10 @@ public:
     bool read(std::string_view text, std::string& out) const;
 
 private:
+    bool readPlain(std::string_view text, std::string& out) const;
+
+    char plainDecimal_ = '\0'; ///< where the signs are single bytes; else no text has them
+    char plainGroup_ = '\0';
     std::string decimal_;
     std::vector<std::string> groups_;
 };

@@ -1,8 +1,35 @@
 #include "translate/row_borders.h"
 
+#include <algorithm>
 #include <cstring>
 
 namespace host {
+
+// What stands outside of quotes from `begin` to `end` in the text that goes on to `textEnd`.
+void RowBorders::takePlain(const char* begin, const char* end, const Text& text) {
+    const auto isBorder = [&](const char* place) {
+        return *place == '\n' || (*place == '\r' && place + 1 != text.end && place[1] != '\n');
+    };
+    for (Watch& watch : watches_) {
+        const char* place =
+            watch.limit <= text.offset + 1
+                ? text.begin
+                : text.begin + std::min<std::uint64_t>(watch.limit - text.offset - 1,
+                                                       static_cast<std::uint64_t>(text.end - text.begin));
+        place = std::max(place, begin);
+        while (!watch.border && place < end) {
+            if (isBorder(place++)) {
+                watch.border = text.offsetOf(place);
+            }
+        }
+    }
+    for (const char* place = end; place != begin;) {
+        if (isBorder(--place)) {
+            border_ = text.offsetOf(place + 1);
+            return;
+        }
+    }
+}
 
 void RowBorders::setBorder(std::uint64_t border) {
     border_ = border;
@@ -22,74 +49,57 @@ std::optional<std::uint64_t> RowBorders::firstBehind(std::uint64_t limit) const 
     return std::nullopt;
 }
 
-void RowBorders::add(std::string_view text) {
-    if (text.empty()) {
+void RowBorders::add(std::string_view bytes) {
+    if (bytes.empty()) {
         return;
     }
-    const char* const begin = text.data();
-    const char* const end = begin + text.size();
-    const auto offsetOf = [&](const char* place) {
-        return size_ + static_cast<std::uint64_t>(place - begin);
-    };
-    const auto isAtCellBegin = [&](const char* place) {
-        if (place == begin) {
-            return state_ == State::CellBegin;
+    const Text text{bytes.data(), bytes.data() + bytes.size(), size_};
+    const char* place = text.begin;
+    if (endsInReturn_) {
+        // The line end that was there is one; a LF behind it is seen below.
+        if (*place != '\n') {
+            setBorder(text.offset);
         }
-        return place[-1] == form_.delimiter || place[-1] == '\n' || place[-1] == '\r';
-    };
-
-    const char* place = begin;
-    if (endsInReturn_ && state_ != State::Quoted) {
-        setBorder(offsetOf(*begin == '\n' ? begin + 1 : begin));
+        endsInReturn_ = false;
     }
     if (state_ == State::AfterQuote) {
-        state_ = *begin == form_.quote ? State::Quoted : State::Plain;
-        place += *begin == form_.quote ? 1 : 0;
+        state_ = *place == form_.quote ? State::Quoted : State::Plain;
+        place += *place == form_.quote ? 1 : 0;
     }
-    places_.restart(place, end);
-    bool isQuoted = state_ == State::Quoted;
-    while (true) {
-        if (isQuoted) {
-            const auto* const quote = static_cast<const char*>(
-                place == end ? nullptr
-                             : std::memchr(place, form_.quote, static_cast<std::size_t>(end - place)));
+    while (place != text.end) {
+        const auto* const quote = static_cast<const char*>(
+            std::memchr(place, form_.quote, static_cast<std::size_t>(text.end - place)));
+        const char* const stop = quote == nullptr ? text.end : quote;
+        if (state_ == State::Quoted) {
             if (quote == nullptr) {
-                state_ = State::Quoted;
                 break;
             }
             place = quote + 1;
-            if (place == end) {
+            if (place == text.end) {
                 state_ = State::AfterQuote;
-                break;
-            }
-            if (*place == form_.quote) {
+            } else if (*place == form_.quote) {
                 ++place;
-                continue;
+            } else {
+                state_ = State::Plain;
             }
-            isQuoted = false;
-            places_.restart(place, end);
+            continue;
         }
-        const char* const found = places_.next();
-        if (found == end) {
-            const char last = end[-1];
-            state_ =
-                last == form_.delimiter || last == '\n' || last == '\r' ? State::CellBegin : State::Plain;
-            break;
+        takePlain(place, stop, text);
+        if (stop != place) {
+            const char last = stop[-1];
+            const bool isCellBegin = last == form_.delimiter || last == '\n' || last == '\r';
+            state_ = isCellBegin ? State::CellBegin : State::Plain;
         }
-        if (*found == form_.quote) {
-            if (isAtCellBegin(found)) {
-                isQuoted = true;
-                openQuote_ = offsetOf(found);
-                place = found + 1;
-            }
-        } else if (*found == '\n') {
-            setBorder(offsetOf(found + 1));
-        } else if (found + 1 != end && found[1] != '\n') {
-            setBorder(offsetOf(found + 1));
+        place = stop;
+        if (quote != nullptr) {
+            const bool opens = state_ == State::CellBegin;
+            openQuote_ = opens ? text.offsetOf(quote) : openQuote_;
+            state_ = opens ? State::Quoted : State::Plain;
+            ++place;
         }
     }
-    endsInReturn_ = state_ == State::CellBegin && end[-1] == '\r';
-    size_ += text.size();
+    endsInReturn_ = state_ == State::CellBegin && text.end[-1] == '\r';
+    size_ += bytes.size();
 }
 
 } // namespace host

@@ -3,7 +3,6 @@
 #pragma once
 
 #include "translate/row_form.h"
-#include "translate/special_bytes.h"
 
 #include <cstdint>
 #include <optional>
@@ -14,7 +13,7 @@ namespace host {
 
 class RowBorders {
 public:
-    explicit RowBorders(const RowForm& form) : form_(form), places_({form.quote, '\n', '\r'}) {}
+    explicit RowBorders(const RowForm& form) : form_(form) {}
 
     /// Goes on by `text`. What border() says is counted in bytes from the beginning of all text.
     void add(std::string_view text);
@@ -43,10 +42,20 @@ private:
         std::optional<std::uint64_t> border;
     };
 
+    struct Text {
+        const char* begin;
+        const char* end;
+        std::uint64_t offset; ///< of its beginning
+
+        std::uint64_t offsetOf(const char* place) const {
+            return offset + static_cast<std::uint64_t>(place - begin);
+        }
+    };
+
     void setBorder(std::uint64_t border);
+    void takePlain(const char* begin, const char* end, const Text& text);
 
     RowForm form_;
-    SpecialPlaces<3> places_;
     std::vector<Watch> watches_;
     State state_ = State::CellBegin;
     bool endsInReturn_ = false;

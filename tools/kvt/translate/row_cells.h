@@ -2,6 +2,7 @@
 // gives it another text. Steps that cannot do their work say so by fail(); the cell is then out of their reach.
 #pragma once
 
+#include "translate/cell_text.h"
 #include "translate/problem.h"
 #include "translate/row_reader.h"
 
@@ -61,7 +62,13 @@ public:
         return states_[slot] == State::AsItStood ? textOfInput(slot) : std::string_view(values_[slot]);
     }
     /// The text may be a view of this cell.
-    void set(std::size_t slot, std::string_view text);
+    void set(std::size_t slot, std::string_view text) {
+        const bool isSame = states_[slot] == State::AsItStood && isOfInput(slot) && text == textOfInput(slot);
+        if (!isSame) {
+            values_[slot].assign(text);
+            touch(slot, State::Changed);
+        }
+    }
     void fail(std::size_t slot, const std::string& column, Problem problem);
     /// Steps pass over a cell that has failed.
     bool hasFailed(std::size_t slot) const {
@@ -71,13 +78,30 @@ public:
     /// Of this row.
     const std::vector<CellFailure>& failures() const { return failures_; }
     /// How many cells have another text than they had.
-    std::size_t changedCount() const;
+    std::size_t changedCount() const {
+        std::size_t count = 0;
+        for (const std::size_t slot : touched_) {
+            count += states_[slot] == State::Changed || states_[slot] == State::FailedAndEmpty ? 1 : 0;
+        }
+        return count;
+    }
 
 private:
     enum class State : std::uint8_t { AsItStood, Changed, FailedAndKept, FailedAndEmpty };
 
-    std::string_view textOfInput(std::size_t slot);
-    void touch(std::size_t slot, State state);
+    std::string_view textOfInput(std::size_t slot) {
+        if (slot >= row_->cellCount()) {
+            return {};
+        }
+        const std::string_view cell = row_->cell(slot);
+        return cell.empty() || cell.front() != form_.quote ? cell : textOfCell(cell, form_, unquoted_[slot]);
+    }
+    void touch(std::size_t slot, State state) {
+        if (states_[slot] == State::AsItStood) {
+            touched_.push_back(slot);
+        }
+        states_[slot] = state;
+    }
 
     RowForm form_;
     OnCellError onError_;

@@ -1,14 +1,20 @@
 #include "translate/row_output.h"
 
-#include "translate/cell_text.h"
-
-#include <algorithm>
+#include <cstring>
 
 namespace host {
 
+namespace {
+
+// So many bytes are copied at once, however few there are.
+constexpr std::size_t slack = 32;
+
+} // namespace
+
 RowOutput::RowOutput(const Plan& plan, const Layout& layout)
-    : in_(plan.in), out_(plan.out), keepsForm_(plan.in == plan.out && !plan.job.output.quoteAll),
-      lineEnds_(plan.lineEnds), quoteAll_(plan.job.output.quoteAll) {
+    : in_(plan.in), out_(plan.out), needsQuotes_(plan.out),
+      keepsForm_(plan.in == plan.out && !plan.job.output.quoteAll), lineEnds_(plan.lineEnds),
+      quoteAll_(plan.job.output.quoteAll) {
     for (const Layout::Column& column : layout.columns()) {
         eachCell_.push_back({column.slot, column.slot, false});
         const bool isCopied = keepsForm_ && !layout.isChanging(column.slot);
@@ -23,13 +29,53 @@ RowOutput::RowOutput(const Plan& plan, const Layout& layout)
 
 void RowOutput::begin(std::string& out, std::string_view text) {
     output_ = &out;
+    out.resize(text.size() + slack);
+    at_ = out.data();
+    limit_ = at_ + out.size();
     runBegin_ = runEnd_ = text.data();
     textEnd_ = text.data() + text.size();
 }
 
-void RowOutput::flush() {
-    output_->append(runBegin_, runEnd_);
+// And a little more.
+inline void RowOutput::makeRoom(std::size_t count) {
+    if (static_cast<std::size_t>(limit_ - at_) < count + slack) {
+        const auto written = static_cast<std::size_t>(at_ - output_->data());
+        output_->resize(output_->size() * 2 + count + slack);
+        at_ = output_->data() + written;
+        limit_ = output_->data() + output_->size();
+    }
+}
+
+inline void RowOutput::append(std::string_view bytes) {
+    makeRoom(bytes.size());
+    if (bytes.size() >= 8 && bytes.size() <= 16) { // as dates have, and many numbers
+        std::memcpy(at_, bytes.data(), 8);
+        std::memcpy(at_ + bytes.size() - 8, bytes.data() + bytes.size() - 8, 8);
+    } else {
+        std::memcpy(at_, bytes.data(), bytes.size());
+    }
+    at_ += bytes.size();
+}
+
+inline void RowOutput::flush() {
+    const auto size = static_cast<std::size_t>(runEnd_ - runBegin_);
+    makeRoom(size);
+    if (size <= slack && static_cast<std::size_t>(textEnd_ - runBegin_) >= slack) {
+        std::memcpy(at_, runBegin_, slack); // what is too much is written over
+    } else {
+        std::memcpy(at_, runBegin_, size);
+    }
+    at_ += size;
     runBegin_ = runEnd_;
+}
+
+std::size_t RowOutput::size() {
+    flush();
+    return static_cast<std::size_t>(at_ - output_->data());
+}
+
+void RowOutput::end() {
+    output_->resize(size());
 }
 
 inline void RowOutput::copy(const char* begin, const char* end) {
@@ -46,33 +92,32 @@ inline void RowOutput::put(char byte) {
         ++runEnd_;
     } else {
         flush();
-        output_->push_back(byte);
+        *at_++ = byte;
     }
 }
 
-void RowOutput::put(std::string_view bytes) {
-    flush();
-    output_->append(bytes);
-}
-
-void RowOutput::putCell(RowCells& cells, std::size_t slot) {
-    if (cells.isAsItStood(slot)) {
+inline void RowOutput::putCell(RowCells& cells, std::size_t slot) {
+    const bool isAsItStood = cells.isAsItStood(slot);
+    if (isAsItStood) {
         const std::string_view cell = cells.asItStood(slot);
         // Quotes that were there protect from any delimiter.
         const bool isQuoted = !cell.empty() && cell.front() == in_.quote;
-        if (keepsForm_ || (isQuoted && in_.quote == out_.quote) ||
-            (!isQuoted && !quoteAll_ && !needsQuotes(cell, out_))) {
+        if (keepsForm_ || (isQuoted && in_.quote == out_.quote && !quoteAll_) ||
+            (!isQuoted && !quoteAll_ && !needsQuotes_(cell))) {
             copy(cell.data(), cell.data() + cell.size());
             return;
         }
     }
     flush();
-    if (quoteAll_) {
-        appendQuoted(*output_, cells.text(slot), out_);
+    const std::string_view text = cells.text(slot);
+    if (quoteAll_ || needsQuotes_(text)) {
+        quoted_.clear();
+        appendQuoted(quoted_, text, out_);
+        append(quoted_);
     } else {
-        appendCell(*output_, cells.text(slot), out_);
+        append(text);
     }
-    if (!cells.isAsItStood(slot) && cells.isOfInput(slot)) {
+    if (!isAsItStood && cells.isOfInput(slot)) {
         // What stands behind the cell may be what is written next.
         const std::string_view cell = cells.asItStood(slot);
         runBegin_ = runEnd_ = cell.data() + cell.size();
@@ -113,7 +158,8 @@ void RowOutput::putLineEnd(const RowReader& row, bool needsLineEnd) {
     if (wanted == end && runEnd_ == end.data()) {
         runEnd_ += end.size();
     } else {
-        put(wanted);
+        flush();
+        append(wanted);
     }
 }
 

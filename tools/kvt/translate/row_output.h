@@ -2,6 +2,7 @@
 // stretch of them with their delimiters, or many rows.
 #pragma once
 
+#include "translate/cell_text.h"
 #include "translate/layout.h"
 #include "translate/plan.h"
 #include "translate/row_cells.h"
@@ -17,13 +18,15 @@ class RowOutput {
 public:
     RowOutput(const Plan& plan, const Layout& layout);
 
-    /// Where the rows go; it and the text of the rows have to stay until flush().
+    /// Where the rows go, in place of what is there; it and the text of the rows have to stay until end().
     void begin(std::string& out, std::string_view text);
     /// Rows without a line end get one, where another row may follow.
     void write(RowCells& cells, const RowReader& row, bool needsLineEnd);
     /// The same for a row in which not only those cells may have changed that steps change.
     void writeEachCell(RowCells& cells, const RowReader& row, bool needsLineEnd);
-    void flush();
+    /// Bytes written so far.
+    std::size_t size();
+    void end();
 
 private:
     struct Stretch {
@@ -32,9 +35,11 @@ private:
         bool isCopied;
     };
 
+    void makeRoom(std::size_t count);
+    void append(std::string_view bytes);
     void copy(const char* begin, const char* end);
     void put(char byte);
-    void put(std::string_view bytes);
+    void flush();
     void putCell(RowCells& cells, std::size_t slot);
     void writeAs(const std::vector<Stretch>& stretches, RowCells& cells, const RowReader& row,
                  bool needsLineEnd);
@@ -42,12 +47,16 @@ private:
 
     RowForm in_;
     RowForm out_;
+    QuoteNeed needsQuotes_;
     bool keepsForm_; ///< cells are written with the quotes that they had
     RowEnds lineEnds_;
     bool quoteAll_;
     std::vector<Stretch> stretches_;
     std::vector<Stretch> eachCell_;
-    std::string* output_ = nullptr;
+    std::string* output_ = nullptr; ///< longer than what is written
+    char* at_ = nullptr;            ///< where it goes on
+    char* limit_ = nullptr;
+    std::string quoted_;
     const char* textEnd_ = nullptr;
     const char* runBegin_ = nullptr; ///< of the text, to be copied
     const char* runEnd_ = nullptr;

@@ -66,45 +66,4 @@ private:
 #endif
 };
 
-/// Goes through the places of such bytes in a text, in order.
-template <std::size_t Count>
-class SpecialPlaces {
-public:
-    explicit SpecialPlaces(const std::array<char, Count>& bytes) : bytes_(bytes) {}
-
-    /// The text has to stay where it is.
-    void restart(const char* begin, const char* end) {
-        block_ = begin;
-        end_ = end;
-        mask_ = begin == end ? 0 : maskAt(begin);
-    }
-
-    /// The next place; the end of the text behind the last one.
-    const char* next() {
-        while (mask_ == 0) {
-            if (end_ - block_ <= width) {
-                return end_;
-            }
-            block_ += width;
-            mask_ = maskAt(block_);
-        }
-        const char* const place = block_ + std::countr_zero(mask_);
-        mask_ &= mask_ - 1;
-        return place;
-    }
-
-private:
-    static constexpr std::ptrdiff_t width = SpecialBytes<Count>::width;
-
-    std::uint64_t maskAt(const char* block) const {
-        return end_ - block >= width ? bytes_.find(block)
-                                     : bytes_.findInLast(block, static_cast<std::size_t>(end_ - block));
-    }
-
-    SpecialBytes<Count> bytes_;
-    const char* block_ = nullptr;
-    const char* end_ = nullptr;
-    std::uint64_t mask_ = 0;
-};
-
 } // namespace host
