@@ -530,8 +530,7 @@ std::size_t characterLength(Side from, std::string_view in) {
     // As many bytes as its first unit announces.
     std::size_t length = unitBytes(from.form);
     if (from.form == Form::utf8 && !in.empty()) {
-        const auto lead = static_cast<unsigned char>(in.front());
-        length = lead < 0xC0 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : 4;
+        length = utf8Length(in.front());
     } else if (isUtf16(from.form) && in.size() >= 2) {
         const auto high = static_cast<unsigned char>(in[from.form == Form::utf16le ? 1 : 0]);
         length = isHighSurrogate(char32_t{high} << 8) ? 4 : 2;

@@ -10,6 +10,7 @@
 #include <kvt/encoding/stream_transcoder.h>
 
 #include <kvt/encoding/detail/icu.h>
+#include <kvt/encoding/detail/known_losses.h>
 #include <kvt/encoding/detail/shortcut.h>
 #include <kvt/foundation/detail/utf.h>
 #include <kvt/foundation/throwable.h>
@@ -35,8 +36,6 @@ constexpr std::size_t bufferUnits = 1024;
 constexpr std::size_t calmBytes = 32;
 // Bytes of earlier input that are kept, to show what a character was that began with them.
 constexpr std::size_t recentBytes = 64;
-// Bytes of a character whose length is known without ICU.
-constexpr std::size_t longestKnown = 4;
 
 Converter open(Encoding encoding) {
     const std::uint32_t id = encoding.evaluate();
@@ -57,6 +56,7 @@ void requireSuccess(const Progress& progress) {
     }
 }
 
+constexpr std::size_t longestKnown = detail::KnownLosses::longestCharacter;
 /// A unit of UTF-16 and the bytes of the stream that it comes from.
 struct Unit {
     char16_t unit;
@@ -102,6 +102,9 @@ public:
             }
             if (block.empty()) {
                 return;
+            }
+            if (canGoOn && loseKnown(block, out, onLoss)) {
+                continue;
             }
             const std::string_view slice = block.substr(0, sliceBytes);
             if (canGoOn && expectsLoss) {
@@ -158,6 +161,8 @@ private:
     bool convertFast(std::string_view slice, std::string& out);
     std::size_t convertTracing(std::string_view slice, std::size_t calm, std::string& out,
                                const LossHandler& onLoss, bool& foundLoss);
+    bool loseKnown(std::string_view& block, std::string& out, const LossHandler& onLoss);
+    void remember(std::string_view character, std::string_view written);
     void convertWatched(std::string_view block, std::string& out, const LossHandler& onLoss);
     void convertTraced(std::string_view byte, bool flush, std::string& out);
     void showCharacters();
@@ -209,6 +214,7 @@ private:
     std::vector<Unit> units_;      // which the target's converter has not settled yet
     CharacterHandler onCharacter_; // empty but while it is watched
     std::vector<Unit> unseen_;     // of which it has not heard
+    detail::KnownLosses known_;
     std::vector<Loss> losses_;     // which have not been reported yet
     std::exception_ptr exception_; // that a callback could not throw through ICU
 };
@@ -266,9 +272,14 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
         const std::size_t length = canTakeCharacters_ && characterBegin_ == position_
                                        ? std::max<std::size_t>(detail::characterLength(fromSide_, rest), 1)
                                        : 1;
+        const bool isAlone = canTakeCharacters_ && holdsNothing();
+        const std::size_t outSize = out.size();
         convertTraced(rest.substr(0, length), false, out);
         showCharacters();
         taken += length;
+        if (isAlone && losses_.size() == 1 && holdsNothing()) {
+            remember(rest.substr(0, length), std::string_view(out).substr(outSize));
+        }
         if (!losses_.empty()) {
             foundLoss = true;
             mayEndAt = isStateless_ ? taken + calm : mayEndAt;
@@ -278,6 +289,40 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
         }
     } while (taken < slice.size() && !(taken >= mayEndAt && holdsNothing()));
     return taken;
+}
+
+// Characters in front that the target is known to lack. What is stateless loses a character that stands alone in the same
+// way each time, so that ICU need not be asked again.
+bool StreamTranscoder::Impl::loseKnown(std::string_view& block, std::string& out, const LossHandler& onLoss) {
+    const std::size_t size = block.size();
+    while (!known_.isEmpty() && holdsNothing()) {
+        // What is known is whole, and the same bytes are the same character.
+        const std::size_t length = fromSide_.form == Form::utf8 && !block.empty()
+                                       ? detail::utf8Length(block.front())
+                                       : detail::characterLength(fromSide_, block.substr(0, longestKnown));
+        const std::string_view character = block.substr(0, length);
+        const detail::KnownLosses::Row* const row = known_.find(character);
+        if (row == nullptr) {
+            break;
+        }
+        const Loss loss{Loss::NotRepresentable, position_, std::string(character), row->codePoint};
+        out += row->written;
+        passOver(character);
+        block.remove_prefix(length);
+        if (onLoss) {
+            onLoss(loss);
+        }
+    }
+    return block.size() < size;
+}
+
+// A character has been converted alone, and was lost.
+void StreamTranscoder::Impl::remember(std::string_view character, std::string_view written) {
+    const Loss& loss = losses_.front();
+    if (loss.kind == Loss::NotRepresentable && loss.bytes == character &&
+        detail::characterLength(fromSide_, character) == character.size()) {
+        known_.add(character, loss.codePoint, written);
+    }
 }
 
 void StreamTranscoder::Impl::convertWatched(std::string_view block, std::string& out,

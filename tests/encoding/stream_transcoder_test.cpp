@@ -347,6 +347,37 @@ TEST(StreamTranscoderLosses, AreExactInLongMixturesOfGoodAndBad) {
     }
 }
 
+// More than are remembered, and each again, so that some are known and others are not any more.
+TEST(StreamTranscoderLosses, OfManyCharactersAreEachTheirOwn) {
+    std::vector<std::pair<std::string, char32_t>> characters;
+    for (char32_t codePoint = 0x3400; codePoint < 0x9F00; ++codePoint) {
+        characters.emplace_back(std::string{static_cast<char>(0xE0 | codePoint >> 12),
+                                            static_cast<char>(0x80 | (codePoint >> 6 & 0x3F)),
+                                            static_cast<char>(0x80 | (codePoint & 0x3F))},
+                                codePoint);
+    }
+    std::mt19937 random(5);
+    std::string text(100, 'a');
+    std::string out = text;
+    std::vector<Loss> losses;
+    for (int round = 0; round < 60000; ++round) {
+        const auto& [bytes, codePoint] = characters[random() % (round % 2 == 0 ? 300 : characters.size())];
+        losses.push_back(lost(text.size(), bytes, codePoint));
+        const std::string behind(random() % 3, 'b');
+        text += bytes + behind;
+        out += "?" + behind;
+    }
+    for (const char* const to : {"windows-1252", "US-ASCII", "KOI8-R"}) {
+        StreamTranscoder stream(Encoding::Utf8, Encoding(to));
+        for (const std::size_t size : {std::size_t{997}, text.size()}) {
+            const Streamed result = streamed(stream, text, {size});
+            EXPECT_TRUE(result.out == out) << to;
+            ASSERT_EQ(result.losses.size(), losses.size()) << to;
+            EXPECT_TRUE(result.losses == losses) << to;
+        }
+    }
+}
+
 TEST(StreamTranscoderLosses, AnUnfinishedCharacterAtTheEndIsOne) {
     struct Row {
         const char* from;

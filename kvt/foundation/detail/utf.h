@@ -29,6 +29,12 @@ constexpr char continuationByte(char32_t bits) noexcept {
 
 constexpr std::size_t longestUtf8 = 4; // bytes
 
+/// The bytes of a character that begins with this one, if it is well-formed.
+constexpr std::size_t utf8Length(char first) noexcept {
+    const auto lead = static_cast<unsigned char>(first);
+    return lead < 0xC0 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : 4;
+}
+
 /// Writes a code point and returns the number of bytes, 1 to 4. A surrogate is written like any other number of its
 /// size.
 constexpr std::size_t encodeUtf8(char32_t codePoint, char* out) noexcept {
