@@ -1,9 +1,11 @@
 // `kvt sort`: the order, for all that lines can be, with memory for all of them and for next to nothing.
 
+#include "encode.h"
 #include "host_test.h"
 #include "line_texts.h"
 
 #include <cctype>
+#include <random>
 #include <string_view>
 
 namespace kvt::test {
@@ -177,6 +179,191 @@ TEST_F(KvtSort, SizesAreNumbersWithAUnit) {
     const ChildResult little = kvt({"sort", "--memory", "63K"}, "a");
     EXPECT_EQ(little.status, 2);
     EXPECT_EQ(little.err, "kvt: --memory takes at least 64K, not '63K'\n");
+}
+
+TEST_F(KvtSort, AFieldMayBeTheKey) {
+    const std::string table = "b\t2\tx\na\t2\ty\nc\t1\nd\n";
+    EXPECT_EQ(sorted(table, {"--key", "2"}), "d\nc\t1\nb\t2\tx\na\t2\ty\n");
+    EXPECT_EQ(sorted(table, {"--key", "2", "--reverse"}), "b\t2\tx\na\t2\ty\nc\t1\nd\n");
+    EXPECT_EQ(sorted(table, {"-k1"}), "a\t2\ty\nb\t2\tx\nc\t1\nd\n");
+    EXPECT_EQ(sorted("x;;b\nx;;a\ny;;\n", {"--key", "2", "--delimiter", ";;"}), "y;;\nx;;a\nx;;b\n");
+    EXPECT_EQ(sorted("1€b\n2€A\n", {"--key", "2", "--delimiter", "€"}), "2€A\n1€b\n");
+    EXPECT_EQ(sorted("1 b\n2 B\n3 a\n", {"--key", "2", "--delimiter", " ", "-i"}), "3 a\n1 b\n2 B\n");
+    EXPECT_EQ(sorted("1\r\tb\n2\ta\xff\n", {"--key", "2"}), "2\ta\xff\n1\r\tb\n");
+    EXPECT_EQ(sorted("\n\t\nb\ta\n", {"--key", "1", "-r"}), "b\ta\n\n\t\n");
+    for (const auto& [options, error] : std::vector<std::pair<std::vector<std::string>, std::string>>{
+             {{"--key", "0"}, "--key takes a number from 1, not '0'"},
+             {{"--key", "-1"},
+              "--key takes a whole number from 0 to 18446744073709551615 in plain digits, not '-1'"},
+             {{"--delimiter", ";"}, "--delimiter goes with --key only"},
+             {{"--key", "1", "--delimiter", ""}, "--delimiter is empty"},
+             {{"--number", "--date", "%Y"}, "--number and --date do not go together"},
+             {{"--number", "-i"}, "--ignore-case does not go with --number or --date"},
+             {{"--date", "%Q"}, "--date: \"%Q\" is no flag (933079); there are"},
+             {{"--date", ""}, "--date: The format is empty. (933074)"}}) {
+        std::vector<std::string> arguments = options;
+        arguments.insert(arguments.begin(), "sort");
+        const ChildResult result = kvt(arguments, "a\n");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_TRUE(result.err.starts_with("kvt: " + error)) << result.err;
+    }
+}
+
+TEST_F(KvtSort, NumbersCompareExactly) {
+    const std::vector<std::string> ascending = {"-inf",
+                                                "-1e400",
+                                                "-100",
+                                                "-12",
+                                                "-1.2",
+                                                "-1.11",
+                                                "-1.1",
+                                                "-1",
+                                                "-0.1",
+                                                "-1e-5",
+                                                "-1e-400",
+                                                "0",
+                                                "1e-400",
+                                                "1e-5",
+                                                "0.1",
+                                                ".2",
+                                                "1",
+                                                "1.1",
+                                                "1.11",
+                                                "2",
+                                                "10",
+                                                "10.5",
+                                                "99",
+                                                "9007199254740992",
+                                                "9007199254740993",
+                                                "1e17",
+                                                "1e400",
+                                                "1e99999999999999",
+                                                "inf"};
+    std::vector<std::string> shuffled = ascending;
+    std::mt19937 random(3);
+    for (int round = 0; round < 20; ++round) {
+        std::shuffle(shuffled.begin(), shuffled.end(), random);
+        EXPECT_EQ(sorted(textOf(shuffled), {"--number"}), textOf(ascending));
+        EXPECT_EQ(sorted(textOf(shuffled), {"-nr"}), textOf({ascending.rbegin(), ascending.rend()}));
+    }
+    const std::string equal = "1\n1.0\n+1\n 1 \n10e-1\n0.1E+1\n01\n1.\n";
+    EXPECT_EQ(sorted(equal + "0\n-0\n0e9\n", {"--number"}), "0\n-0\n0e9\n" + equal);
+    EXPECT_EQ(sorted(equal, {"--number", "--reverse"}), equal);
+}
+
+TEST_F(KvtSort, RandomNumbersAreSortedInAnyMemory) {
+    std::mt19937 random(17);
+    std::vector<std::pair<std::int64_t, std::string>> numbers;
+    for (int count = 0; count < 30000; ++count) {
+        // In thousandths, written in one of several ways.
+        const std::int64_t value = static_cast<std::int64_t>(random() % 2000001) - 1000000;
+        const std::int64_t magnitude = value < 0 ? -value : value;
+        std::string text = value < 0 ? "-" : "";
+        switch (random() % 3) {
+        case 0:
+            text += std::to_string(magnitude) + "e-3";
+            break;
+        case 1:
+            text += "0." + std::string(10, '0') + std::to_string(magnitude) + "e" +
+                    std::to_string(7 + std::to_string(magnitude).size());
+            break;
+        default: {
+            const std::string rest = std::to_string(1000 + magnitude % 1000).substr(1);
+            text += std::to_string(magnitude / 1000) + "." + rest;
+        }
+        }
+        numbers.emplace_back(value, "x" + std::to_string(count) + "\t" + text);
+    }
+    std::vector<std::string> lines;
+    for (const auto& number : numbers) {
+        lines.push_back(number.second);
+    }
+    const std::string text = textOf(lines);
+    for (const bool reverse : {false, true}) {
+        std::stable_sort(numbers.begin(), numbers.end(), [&](const auto& left, const auto& right) {
+            return reverse ? right.first < left.first : left.first < right.first;
+        });
+        std::string expected;
+        for (const auto& number : numbers) {
+            expected += number.second + "\n";
+        }
+        for (const char* memory : {"64K", "256M"}) {
+            std::vector<std::string> options = {"--key", "2", "--number", "--memory", memory};
+            if (reverse) {
+                options.push_back("--reverse");
+            }
+            EXPECT_TRUE(sorted(text, options) == expected) << memory << (reverse ? " reverse" : "");
+        }
+        std::sort(numbers.begin(), numbers.end(), [](const auto& left, const auto& right) {
+            return std::stoi(left.second.substr(1)) < std::stoi(right.second.substr(1));
+        });
+    }
+}
+
+TEST_F(KvtSort, LinesWithoutANumberStandAtTheEndAndAreCounted) {
+    write("in", "name\tsize\nb\t2\n\nc\t0x10\na\t1\nd\tnan\ne\t\n");
+    const ChildResult up = kvt({"sort", "--key", "2", "--number", "in"});
+    EXPECT_EQ(up.status, 1);
+    EXPECT_EQ(up.out, "a\t1\nb\t2\nname\tsize\n\nc\t0x10\nd\tnan\ne\t\n");
+    EXPECT_EQ(up.err,
+              "kvt: 5 lines have no number in field 2, the first is in: line 1; they stand at the end\n");
+    EXPECT_EQ(kvt({"sort", "--key", "2", "-nr", "in"}).out,
+              "b\t2\na\t1\nname\tsize\n\nc\t0x10\nd\tnan\ne\t\n");
+    EXPECT_EQ(kvt({"sort", "--number"}, "2\n1\nx\n").err,
+              "kvt: 1 line has no number, the first is standard input: line 3; it stands at the end\n");
+    const std::string digits(70000, '1');
+    EXPECT_EQ(kvt({"sort", "--number"}, digits + "\n2\n").status, 1);
+    EXPECT_EQ(kvt({"sort", "--number"}, "1e999999999999999999\n-e1\n1e\n.\n-\n+-1\n1 2\n").err.substr(0, 25),
+              "kvt: 7 lines have no numb");
+}
+
+TEST_F(KvtSort, DatesAreReadByAFormat) {
+    EXPECT_EQ(sorted("1;31.01.2020\n2;01.12.2019\n3;31.01.2020\n",
+                     {"--key", "2", "--delimiter", ";", "--date", "%d.%m.%Y"}),
+              "2;01.12.2019\n1;31.01.2020\n3;31.01.2020\n");
+    EXPECT_EQ(
+        sorted("2020-01-01T12:00:00+02:00\n2020-01-01T10:30:00Z\n2020-01-01T12:00:00+01:00\n2020-01-01\n"
+               "2020-01-01T10:15:00.5\n2020-01-01T10:15:00.25\n",
+               {"--date", "ISO"}),
+        "2020-01-01\n2020-01-01T12:00:00+02:00\n2020-01-01T10:15:00.25\n2020-01-01T10:15:00.5\n"
+        "2020-01-01T10:30:00Z\n2020-01-01T12:00:00+01:00\n");
+    EXPECT_EQ(sorted("23:00\n1:00\n", {"--date", "%H:%M"}), "1:00\n23:00\n");
+    const ChildResult some =
+        kvt({"sort", "--date", "%Y-%m-%d", "-r"}, "2020-02-30\n2020-01-01\n2021-01-01\n\xff\n");
+    EXPECT_EQ(some.out, "2021-01-01\n2020-01-01\n2020-02-30\n\xff\n");
+    EXPECT_EQ(some.err,
+              "kvt: 2 lines have no date of that format, the first is standard input: line 1; they stand at "
+              "the end\n");
+    EXPECT_EQ(some.status, 1);
+}
+
+TEST_F(KvtSort, LinesStayInTheirEncoding) {
+    for (const bool big : {false, true}) {
+        const std::string name = big ? "UTF-16BE" : "UTF-16LE";
+        // U+0A0D and U+0D0A are no line ends, and surrogates come behind the private use area, by code points.
+        EXPECT_EQ(sorted(utf16Of(U"\U0001F600\n\uE000\n\u0A0D\n\u0D0Ab\na", big), {"--encoding", name}),
+                  utf16Of(U"a\n\u0A0D\n\u0D0Ab\n\uE000\n\U0001F600\n", big));
+        EXPECT_EQ(sorted(utf16Of(U"\uFEFFb\na\n", big), {"--encoding", "UTF-16"}),
+                  utf16Of(U"\uFEFFa\nb\n", big));
+    }
+    EXPECT_EQ(sorted("\xd1\n\xc1\n\xd1\xc1\n", {"--encoding", "KOI8-R", "-i"}), "\xc1\n\xd1\n\xd1\xc1\n");
+    EXPECT_EQ(sorted("2\xa7"
+                     "3\n1\xa7"
+                     "1\n",
+                     {"--encoding", "ISO-8859-1", "--key", "2", "--delimiter", "§", "-n"}),
+              "1\xa7"
+              "1\n2\xa7"
+              "3\n");
+    EXPECT_EQ(sorted("\x1b$BEl\x1b(B\na\n", {"--encoding", "ISO-2022-JP"}), "a\n\x1b$BEl\x1b(B\n");
+    const ChildResult bad = kvt({"sort", "--encoding", "Shift_JIS"}, "a\n\x85\x39\n");
+    EXPECT_EQ(bad.status, 2);
+    EXPECT_EQ(
+        bad.err,
+        "kvt: standard input: line 2, column 1, byte 2: The bytes \"\\x85\" are not valid Shift_JIS.\n");
+    const std::string text = randomLines({"", "Łódź ", 6, "abc "}, 300000, 8);
+    const std::string wide = convert("UTF-8", "UTF-16BE", text).out;
+    EXPECT_TRUE(sorted(wide, {"--encoding", "UTF-16BE", "--memory", "64K"}) ==
+                convert("UTF-8", "UTF-16BE", sortedSlowly(text)).out);
 }
 
 } // namespace kvt::test

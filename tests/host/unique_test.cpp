@@ -98,4 +98,26 @@ TEST_F(KvtUnique, LinesMayBeLongerThanTheMemory) {
                 "3\t" + same + "b\n2\tshort\n1\t" + same + "a\n1\t" + same + "\n");
 }
 
+TEST_F(KvtUnique, AFieldMayDecide) {
+    EXPECT_EQ(unique("a\t1\nb\t1\nc\t2\nd\n\n", {"--key", "2"}), "a\t1\nc\t2\nd\n");
+    EXPECT_EQ(unique("a;X\nb;x\n", {"--key", "2", "--delimiter", ";", "-i", "--count"}), "2\ta;X\n");
+    EXPECT_EQ(unique("\n\tb\na\n", {"--key", "1"}), "\na\n");
+    const std::string text = randomLines({"", "", 8, "ab\t"}, 300000, 21);
+    const auto second = [](const std::string& line) {
+        const std::size_t begin = std::min(line.find('\t'), line.size());
+        const std::size_t end = std::min(line.find('\t', std::min(begin + 1, line.size())), line.size());
+        return line.substr(std::min(begin + 1, line.size()), end - std::min(begin + 1, end));
+    };
+    for (const char* memory : {"64K", "256M"}) {
+        EXPECT_TRUE(unique(text, {"--memory", memory, "--key", "2", "--count"}) ==
+                    uniqueSlowly(text, true, second))
+            << memory;
+    }
+}
+
+TEST_F(KvtUnique, LinesStayInTheirEncoding) {
+    EXPECT_EQ(unique("\xe9\n\xc9\n\xe9\n", {"--encoding", "windows-1252"}), "\xe9\n\xc9\n");
+    EXPECT_EQ(unique("\xe9\n\xc9\n", {"--encoding", "windows-1252", "-i", "-c"}), "2\t\xe9\n");
+}
+
 } // namespace kvt::test

@@ -90,7 +90,7 @@ const std::map<std::string, std::vector<std::string>>& neighbourRooms() {
         {"convert", {"base/", "cli/", "text/"}},
         {"zone", {"base/", "cli/", "text/"}},
         {"date", {"base/", "cli/", "text/", "zone/"}},
-        {"sort", {"base/", "cli/", "text/"}},
+        {"sort", {"base/", "cli/", "text/", "date/"}},
         {"memory", {"base/", "cli/"}},
         {"translate", {"base/", "cli/", "text/", "convert/", "zone/", "date/", "sort/"}},
         {"infer", {"base/", "cli/", "text/", "translate/"}},

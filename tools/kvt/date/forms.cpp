@@ -1,19 +1,14 @@
 // The functions of `kvt date` that turn one form of a value into another: parse, format, cast.
 
 #include "date/function.h"
+#include "date/pattern_words.h"
 
 #include "base/failure.h"
-#include "base/messages.h"
-#include "base/table.h"
-#include "base/text.h"
-#include "base/text_units.h"
 #include "cli/choices.h"
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/message_numbers.h>
-#include <kvt/datetime/pattern_trace.h>
 
-#include <algorithm>
 #include <limits>
 
 namespace host {
@@ -37,87 +32,6 @@ std::size_t howWellItFits(const DateOutcome& failure) {
                : std::numeric_limits<std::size_t>::max();
 }
 
-// The language of patterns as one of the two functions knows it, for its help.
-std::string patternHelp(const char* heading, UString<0> datetime::PatternElement::*words) {
-    std::vector<std::vector<std::string>> rows;
-    for (const datetime::PatternElement& row : datetime::patternElements()) {
-        if (!(row.*words).isEmpty()) {
-            rows.push_back({" ", row.element.toStdString(), (row.*words).toStdString()});
-        }
-    }
-    return std::string(heading) + "\n" + formatTable({Align::Left, Align::Left, Align::Left}, rows) + "\n";
-}
-
-// Whether one of the words between "|" is a keyword, in any case.
-bool hasKeyword(const std::string& format) {
-    for (std::size_t begin = 0; begin <= format.size();) {
-        const std::size_t end = std::min(format.find('|', begin), format.size());
-        std::string word = withoutBlanks(std::string_view(format).substr(begin, end - begin));
-        std::transform(word.begin(), word.end(), word.begin(), asciiLower);
-        if (word == "zqt" || word == "iso") {
-            return true;
-        }
-        begin = end + 1;
-    }
-    return false;
-}
-
-// The first flag of a pattern that `words` does not have; what is wrong with the format, in words.
-std::string wrongInFormat(const std::string& typed, UString<0> datetime::PatternElement::*words) {
-    namespace message_number = datetime::message_number;
-    const std::string format = withoutBlanks(typed);
-    const auto saying = [](std::uint32_t number, const std::vector<std::string>& parameters) {
-        return describe(number, parameters) + " (" + std::to_string(number) + ")";
-    };
-    if (format.empty()) {
-        return saying(message_number::formatEmpty, {});
-    }
-    if (format.find('%') == std::string::npos) {
-        return hasKeyword(format) ? "" : saying(message_number::noKnownKeyword, {printable(format)});
-    }
-    std::vector<std::string> known;
-    for (const datetime::PatternElement& row : datetime::patternElements()) {
-        const std::string element = row.element.toStdString();
-        if (element.starts_with('%') && !(row.*words).isEmpty()) {
-            known.push_back(element);
-        }
-    }
-    for (std::size_t at = format.find('%'); at != std::string::npos; at = format.find('%', at)) {
-        if (at + 1 == format.size()) {
-            return saying(message_number::formatEndsInPercent, {});
-        }
-        const auto element = std::find_if(known.begin(), known.end(), [&](const std::string& flag) {
-            return format.compare(at, flag.size(), flag) == 0;
-        });
-        if (element == known.end()) {
-            std::string flags;
-            for (const std::string& flag : known) {
-                flags += " " + flag;
-            }
-            std::size_t end = at + 2;
-            while (end < format.size() && isContinuation(format[end])) {
-                ++end;
-            }
-            return "\"" + printable(format.substr(at, end - at)) + "\" is no flag (" +
-                   std::to_string(message_number::unknownFlag) + "); there are" + flags;
-        }
-        at += element->size();
-    }
-    return {};
-}
-
-} // namespace
-
-std::string wrongInReadFormat(const std::string& format) {
-    return wrongInFormat(format, &datetime::PatternElement::reads);
-}
-
-std::string wrongInWrittenFormat(const std::string& format) {
-    return wrongInFormat(format, &datetime::PatternElement::writes);
-}
-
-namespace {
-
 class ParseFunction : public ValueFunction {
 public:
     ParseFunction()
@@ -138,10 +52,7 @@ private:
         syntax.flag("--lenient", lenient_,
                     "Let parts run over into the next larger one: 30 February is in March");
     }
-    std::string ownNotes() const override {
-        return patternHelp("What a pattern reads; --lenient lifts a bound in brackets:",
-                           &datetime::PatternElement::reads);
-    }
+    std::string ownNotes() const override { return readPatternHelp(); }
     std::string whatIsWrongWith(const std::string& format) const override {
         std::string wrong = wrongInReadFormat(format);
         for (auto other = others_.begin(); wrong.empty() && other != others_.end(); ++other) {
@@ -197,9 +108,7 @@ kvt date format 20200131123000+01:00 ISO)",
                          "VALUE", "FORMAT", "A pattern such as '%d.%m.%Y', or the keyword ZQT or ISO"}) {}
 
 private:
-    std::string ownNotes() const override {
-        return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
-    }
+    std::string ownNotes() const override { return writtenPatternHelp(); }
     std::string whatIsWrongWith(const std::string& format) const override {
         return wrongInWrittenFormat(format);
     }

@@ -113,13 +113,6 @@ void ZoneDatabaseOption::use() const {
     kvt::ex::datetime::setInstallPathWrapper(folder());
 }
 
-std::string withoutBlanks(std::string_view text) {
-    constexpr std::string_view blanks = " \t\r\n\f\v";
-    const std::size_t begin = std::min(text.find_first_not_of(blanks), text.size());
-    const std::size_t end = text.find_last_not_of(blanks) + 1;
-    return std::string(text.substr(begin, std::max(end, begin) - begin));
-}
-
 bool isValue(const std::string& text) {
     return outcomeOf(kvt::ex::datetime::timezoneRemove(toUString(text))).isGood();
 }

@@ -8,6 +8,7 @@
 #include "base/diagnostics.h"
 #include "cli/syntax.h"
 #include "date/outcome.h"
+#include "date/pattern_words.h"
 #include "text/value_lines.h"
 
 #include <kvt/string/ustring.h>
@@ -115,15 +116,8 @@ private:
 /// The text of an argument. Throws what the library throws where it is no UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
 
-/// What is wrong with a format for whatever value, in words; empty where nothing is.
-std::string wrongInReadFormat(const std::string& format);
-std::string wrongInWrittenFormat(const std::string& format);
-
 /// Whether it is a date, a time or both in canonical form.
 bool isValue(const std::string& text);
-
-/// Without what the library strips from values and formats.
-std::string withoutBlanks(std::string_view text);
 
 /// What the help of every function says about input and exit statuses.
 extern const char* const valueNotes;

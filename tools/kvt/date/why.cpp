@@ -1,6 +1,7 @@
 // `kvt date why`: how a value was read, as a table of steps.
 
 #include "date/function.h"
+#include "date/pattern_words.h"
 
 #include "base/output.h"
 #include "base/table.h"

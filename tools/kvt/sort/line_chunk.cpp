@@ -37,7 +37,9 @@ bool LineChunk::add(const LineRecord& record) {
     *--first_ = {ordered(prefixOf(record.key)), filled_};
     char* out = encodeHeader(block_.get() + filled_, record);
     out = std::copy(record.key.begin(), record.key.end(), out);
-    out = std::copy(record.payload.begin(), record.payload.end(), out);
+    if (record.payload) {
+        out = std::copy(record.payload->begin(), record.payload->end(), out);
+    }
     filled_ = static_cast<std::uint64_t>(out - block_.get());
     return true;
 }

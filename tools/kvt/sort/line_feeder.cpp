@@ -1,11 +1,10 @@
 #include "sort/line_feeder.h"
 
-#include "base/text_units.h"
+#include "text/line_counter.h"
 #include "text/line_reader.h"
 #include "text/source.h"
-#include "text/text_operation.h"
 
-#include <algorithm>
+#include <kvt/encoding/stream_transcoder.h>
 
 namespace host {
 
@@ -13,82 +12,82 @@ namespace {
 
 using kvt::ex::Encoding;
 
-// The folded form of a piece of valid UTF-8.
-void fold(std::string_view text, std::string& out) {
-    if (!std::all_of(text.begin(), text.end(), isAscii)) {
-        appendFolded(text, out);
-        return;
-    }
-    std::transform(text.begin(), text.end(), std::back_inserter(out), asciiLower);
-}
-
-// Bytes at the front of `text` that are whole characters, at most `most` of them.
-std::size_t wholeCharacters(std::string_view text, std::size_t most) {
-    if (text.size() <= most) {
-        return text.size();
-    }
-    std::size_t size = most;
-    while (isContinuation(text[size])) {
-        --size;
-    }
-    return size;
-}
-
-// Looks whether a file is UTF-8, block by block, and refuses it when it is not.
-class Utf8Check {
+// The blocks of a file as UTF-8; refuses what is no text. What is UTF-8 already passes as it is.
+class BlockDecoder {
 public:
-    /// `skipped` bytes of the file precede what is looked at.
-    Utf8Check(const std::string& file, std::uint64_t skipped)
-        : decoder_(Encoding::Utf8, Encoding::Utf8), places_(Encoding::Utf8),
-          onLoss_([this, file, skipped](kvt::ex::Loss loss) {
-              loss.offset += skipped;
-              throw badTextFailure(file, loss, places_, std::string(Encoding(Encoding::Utf8).getName()));
+    explicit BlockDecoder(Source& source)
+        : isUtf8_(source.encoding() == Encoding(Encoding::Utf8)), decoder_(source.encoding(), Encoding::Utf8),
+          places_(source.encoding()), onLoss_([this, &source](kvt::ex::Loss loss) {
+              loss.offset += source.skipped();
+              throw badTextFailure(source.input().name(), loss, places_,
+                                   std::string(source.encoding().getName()));
           }) {
-        places_.restart(skipped);
+        places_.restart(source.skipped());
     }
 
-    void take(std::string_view block) {
+    std::string_view take(std::string_view block) {
+        decoded_.clear();
         places_.beginBlock(block);
         decoder_.convert(block, decoded_, onLoss_);
         places_.endBlock();
-        decoded_.clear();
+        return isUtf8_ ? block : decoded_;
     }
 
-    void finish() {
+    std::string_view finish() {
+        decoded_.clear();
         places_.beginBlock({});
         decoder_.finish(decoded_, onLoss_);
         places_.endBlock();
+        return isUtf8_ ? std::string_view() : decoded_;
     }
 
 private:
+    bool isUtf8_;
     kvt::ex::StreamTranscoder decoder_;
     LineCounter places_;
     kvt::ex::StreamTranscoder::LossHandler onLoss_;
     std::string decoded_;
 };
 
+// Where the mark cannot be cut off as bytes, it is there when the text is decoded.
+bool takeMark(std::string_view& text) {
+    const std::string_view mark = byteOrderMark(Encoding::Utf8);
+    const bool isThere = text.starts_with(mark);
+    text.remove_prefix(isThere ? mark.size() : 0);
+    return isThere;
+}
+
 } // namespace
 
 LineFeeder::LineFeeder(const FeedRule& rule, LineSorter& sorter, Workspace& workspace)
-    : rule_(rule), sorter_(sorter), workspace_(workspace), line_(workspace, rule.memory / 2),
-      key_(workspace, rule.memory / 2) {}
+    : rule_(rule), sorter_(sorter), workspace_(workspace), keys_(rule.key, workspace, rule.memory / 2),
+      line_(workspace, rule.memory / 2) {}
 
 void LineFeeder::read(const std::string& path, Progress& progress) {
-    Source source(path, Encoding::Utf8, MarkPolicy::Skip);
+    Source source(path, rule_.encoding, MarkPolicy::Skip);
+    encoding_ = encoding_.value_or(source.encoding());
     hasMark_ = hasMark_ || source.skipped() != 0;
-    std::optional<Utf8Check> check;
-    if (rule_.fold) {
-        check.emplace(source.input().name(), source.skipped());
+    file_ = source.input().name();
+    linesOfFile_ = 0;
+    const bool isUtf8 = source.encoding() == Encoding(Encoding::Utf8);
+    std::optional<BlockDecoder> decoder;
+    if (!isUtf8 || rule_.key.by == KeyRule::By::FoldedText) {
+        decoder.emplace(source);
     }
-    for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
-        if (check) {
-            check->take(block);
+    bool mayBeMarked = !isUtf8 && source.skipped() == 0;
+    const auto takeDecoded = [&](std::string_view text) {
+        if (mayBeMarked && !text.empty()) {
+            hasMark_ = takeMark(text) || hasMark_;
+            mayBeMarked = false;
         }
-        takeBlock(block);
+        takeBlock(text);
+    };
+    for (std::string_view block = source.next(); !block.empty(); block = source.next()) {
+        takeDecoded(decoder ? decoder->take(block) : block);
         progress.advance(block.size());
     }
-    if (check) {
-        check->finish();
+    if (decoder) {
+        takeDecoded(decoder->finish());
     }
     if (!line_.empty()) {
         takeLine(line_.view());
@@ -115,32 +114,26 @@ void LineFeeder::takeBlock(std::string_view block) {
 }
 
 void LineFeeder::takeLine(std::string_view line) {
+    ++linesOfFile_;
     LineRecord record;
     record.key = line;
     record.place = rule_.places ? lines_ : 0;
-    if (rule_.fold) {
-        makeKey(line);
-        record.key = key_.view();
-        // A line that is its own key is not kept twice.
-        if (record.key.size() != line.size() || compareFrom(record.key, line, 0, workspace_) != 0) {
-            record.payload = line;
-        }
+    if (!rule_.key.takesLines()) {
+        takeKeyed(line, record);
     }
     sorter_.add(record);
     ++lines_;
     size_ += line.size() + 1;
 }
 
-void LineFeeder::makeKey(std::string_view line) {
-    constexpr std::size_t foldedAtOnce = 64 * 1024;
-    key_.clear();
-    while (!line.empty()) {
-        const std::size_t size = wholeCharacters(line, foldedAtOnce);
-        folded_.clear();
-        fold(line.substr(0, size), folded_);
-        key_.append(folded_);
-        workspace_.letGo(line.substr(0, size));
-        line.remove_prefix(size);
+void LineFeeder::takeKeyed(std::string_view line, LineRecord& record) {
+    record.key = keys_.of(line);
+    // A line that is its own key is not kept twice.
+    if (record.key.size() != line.size() || compareFrom(record.key, line, 0, workspace_) != 0) {
+        record.payload = line;
+    }
+    if (!keys_.wasFound() && ++withoutKey_ == 1) {
+        firstWithoutKey_ = file_ + ": line " + std::to_string(linesOfFile_);
     }
 }
 

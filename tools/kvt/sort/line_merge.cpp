@@ -114,7 +114,8 @@ void RunWriter::take(const LineRecord& record) {
     char header[mostHeaderBytes];
     append({header, static_cast<std::size_t>(encodeHeader(header, record) - header)});
     forEachPiece(workspace_, record.key, [this](std::string_view piece) { append(piece); });
-    forEachPiece(workspace_, record.payload, [this](std::string_view piece) { append(piece); });
+    forEachPiece(workspace_, record.payload.value_or(std::string_view()),
+                 [this](std::string_view piece) { append(piece); });
 }
 
 void RunWriter::append(std::string_view bytes) {

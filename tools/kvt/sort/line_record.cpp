@@ -13,7 +13,7 @@ constexpr std::size_t longKey = 4 * 1024 * 1024;
 constexpr std::size_t comparedAtOnce = 256 * 1024;
 
 bool hasFields(const LineRecord& record) {
-    return !record.payload.empty() || record.count != 1 || record.place != 0;
+    return record.payload || record.count != 1 || record.place != 0;
 }
 
 std::uint64_t varintSize(std::uint64_t value) {
@@ -39,12 +39,20 @@ const char* readVarint(const char* in, std::uint64_t& value) {
     }
 }
 
+std::uint64_t payloadSize(const LineRecord& record) {
+    return record.payload ? record.payload->size() : 0;
+}
+
+std::uint64_t payloadNumber(const LineRecord& record) {
+    return record.payload ? record.payload->size() + 1 : 0;
+}
+
 } // namespace
 
 std::uint64_t encodedSize(const LineRecord& record) {
     const std::uint64_t size = varintSize(record.key.size() * 2) + record.key.size();
-    return hasFields(record) ? size + varintSize(record.payload.size()) + varintSize(record.count) +
-                                   varintSize(record.place) + record.payload.size()
+    return hasFields(record) ? size + varintSize(payloadNumber(record)) + varintSize(record.count) +
+                                   varintSize(record.place) + payloadSize(record)
                              : size;
 }
 
@@ -52,7 +60,7 @@ char* encodeHeader(char* out, const LineRecord& record) {
     const bool more = hasFields(record);
     out = writeVarint(out, record.key.size() * 2 + (more ? 1 : 0));
     if (more) {
-        out = writeVarint(out, record.payload.size());
+        out = writeVarint(out, payloadNumber(record));
         out = writeVarint(out, record.count);
         out = writeVarint(out, record.place);
     }
@@ -71,8 +79,13 @@ const char* decode(const char* in, LineRecord& record) {
         in = readVarint(in, record.place);
     }
     record.key = {in, first / 2};
-    record.payload = {in + first / 2, payload};
-    return in + first / 2 + payload;
+    in += first / 2;
+    record.payload.reset();
+    if (payload == 0) {
+        return in;
+    }
+    record.payload = std::string_view(in, payload - 1);
+    return in + payload - 1;
 }
 
 int compareFrom(std::string_view left, std::string_view right, std::size_t depth,

@@ -3,7 +3,7 @@
 //
 // A record is written as
 //     varint  size of the key * 2, and 1 more when the fields of the next line are there
-//     varint  size of the payload; varint count; varint place
+//     varint  size of the payload and 1 more, 0 where there is none; varint count; varint place
 //     the key, the payload
 // where a varint has seven bits in each byte, lowest first, and the top bit set in all but the last.
 #pragma once
@@ -12,6 +12,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <optional>
 #include <string_view>
 
 namespace host {
@@ -20,9 +21,12 @@ class Workspace;
 
 struct LineRecord {
     std::string_view key;
-    std::string_view payload; ///< what is written in place of the key, where it has to be something else
-    std::uint64_t count = 1;  ///< how many equal ones it stands for
-    std::uint64_t place = 0;  ///< where it stood among all, where that matters
+    std::optional<std::string_view> payload =
+        {};                  ///< what is written in place of the key, where that is not the line
+    std::uint64_t count = 1; ///< how many equal ones it stands for
+    std::uint64_t place = 0; ///< where it stood among all, where that matters
+
+    std::string_view line() const { return payload.value_or(key); }
 };
 
 /// The most bytes that a record has before its key.

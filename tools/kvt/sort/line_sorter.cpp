@@ -27,7 +27,7 @@ public:
         }
         LineRecord turned = record;
         turned.key = {place.data(), place.size()};
-        turned.payload = record.payload.empty() ? record.key : record.payload;
+        turned.payload = record.line();
         next_.add(turned);
     }
 
@@ -42,8 +42,8 @@ public:
 
     void take(const LineRecord& record) override {
         LineRecord line = record;
-        line.key = record.payload;
-        line.payload = {};
+        line.key = record.line();
+        line.payload.reset();
         sink_.take(line);
     }
 
@@ -157,8 +157,8 @@ void LineSorter::finishByPlace(RecordSink& sink) {
         chunk_->sortByPlace();
         chunk_->forEach([&](const LineRecord& record) {
             LineRecord line = record;
-            line.key = record.payload.empty() ? record.key : record.payload;
-            line.payload = {};
+            line.key = record.line();
+            line.payload.reset();
             sink.take(line);
         });
         return;

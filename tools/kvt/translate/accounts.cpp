@@ -42,7 +42,7 @@ public:
 
     void take(const LineRecord& record) override {
         ++count_;
-        rows_ += record.payload.empty() ? record.key : record.payload;
+        rows_ += record.line();
         if (rows_.size() >= SourceBlocks::blockSize) {
             flush();
         }
