@@ -101,7 +101,8 @@ TEST_F(KvtDate, AFailureSaysWhyWithItsNumber) {
         {{"parse", " ", "%Y"}, "The value is empty."},
         {{"zone", "set", "120000", "local"},
          "\"120000\" has no date, and without one the offset of this machine's zone is not known. (933096)"},
-        {{"interval", "negate", "1"}, "\"1\" is no interval. (933064)"},
+        {{"interval", "negate", "1"},
+         "\"1\" is no interval, whose form is [-]P[nY][nM][nD][T[nH][nM][nS]]. (933064)"},
     };
     for (const Row& row : rows) {
         const ChildResult result = date(row.arguments);
@@ -238,7 +239,7 @@ TEST_F(KvtDate, WhatIsWrongWithTheCommandLineIsSaidOnceAndFirst) {
          {Row{{"parse", "%Y-%Q"}, "\"%Q\" is no flag (933079); there are %$ "},
           Row{{"parse", "%\u00e9"}, "\"%\u00e9\" is no flag"}, Row{{"parse", "%Y %"}, "(933076)"},
           Row{{"parse", ""}, "(933074)"}, Row{{"parse", "ISO|x", "--or", "x"}, "(933075)"},
-          Row{{"format", "%Y%U%*"}, "\"%*\" is no flag"}, Row{{"add", "P1"}, "Its form is [-]P[nY]"},
+          Row{{"format", "%Y%U%*"}, "\"%*\" is no flag"}, Row{{"add", "P1"}, "whose form is [-]P[nY]"},
           Row{{"diff", "x"}, "(933063)"}, Row{{"compare", "20200230"}, "(933065)"},
           Row{{"parse", "%Y", "--encoding", "x"}, "\"x\" is not the name of an encoding"},
           Row{{"parse", "%Y", "--max-errors", "-1"}, "--max-errors takes a whole number"},

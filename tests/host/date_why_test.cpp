@@ -191,4 +191,11 @@ TEST_F(KvtDateWhy, KeywordsAreToldFormByForm) {
     EXPECT_EQ(told["tries"][1]["tried"], false);
 }
 
+TEST_F(KvtDateWhy, AnUnknownFlagIsAnsweredWithThoseThatThereAre) {
+    const ChildResult result = kvt({"date", "why", "2020", "%Q"});
+    EXPECT_TRUE(contains(result.out, "\"%Q\" is no flag that 'parse' knows. There are %")) << result.out;
+    const ChildResult record = kvt({"date", "why", "2020", "%Q", "--json"});
+    EXPECT_FALSE(contains(record.out, "@")) << record.out;
+}
+
 } // namespace kvt::test

@@ -156,8 +156,11 @@ TEST_F(KvtMatch, ALineThatTakesTooLongEndsItWithItsPlace) {
 }
 
 TEST_F(KvtMatch, ArgumentsAreLookedAt) {
-    EXPECT_EQ(match({"\xff"}, "a").err, "kvt: The bytes \"\\xFF\" are not valid UTF-8.\n");
+    EXPECT_EQ(match({"\xff"}, "a").err,
+              "kvt: REGEX is not UTF-8: \"\\xFF\" ends in a byte of no character\n");
     EXPECT_EQ(match({"\xff"}, "a").status, 2);
+    EXPECT_EQ(match({"a", "--replace", "é\xe2\x82"}, "a").err,
+              "kvt: TEXT is not UTF-8: \"é\\xE2\\x82\" ends in bytes of no character\n");
     EXPECT_EQ(match({"a", "--dialect", "lgacy"}, "a").err,
               "kvt: --dialect takes one of perl, legacy, not 'lgacy'. Did you mean 'legacy'?\n");
     EXPECT_EQ(match({"a", "--encoding", "BINARY"}, "").status, 2);

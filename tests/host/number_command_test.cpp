@@ -162,4 +162,19 @@ TEST_F(KvtNumber, FailuresOfTheOutputAreAsElsewhere) {
     EXPECT_EQ(result.err, "");
 }
 
+TEST_F(KvtNumber, NumbersMayBeRecords) {
+    const ChildResult lines = number({"--json"}, "1.50\nx\xff\n1e5\n");
+    EXPECT_EQ(lines.out,
+              "{\"line\":1,\"value\":\"1.50\",\"result\":\"1.5\"}\n"
+              "{\"line\":2,\"value\":\"x\ufffd\",\"result\":null,\"message\":\"\\\"x\\\\xFF\\\" is not a "
+              "number\"}\n"
+              "{\"line\":3,\"value\":\"1e5\",\"result\":\"100000\"}\n");
+    EXPECT_EQ(lines.err, "");
+    EXPECT_EQ(lines.status, 1);
+    const ChildResult given = number({"--json", "2.0", "y"});
+    EXPECT_EQ(given.out, "{\"value\":\"2.0\",\"result\":\"2\"}\n"
+                         "{\"value\":\"y\",\"result\":null,\"message\":\"\\\"y\\\" is not a number\"}\n");
+    EXPECT_EQ(given.status, 2);
+}
+
 } // namespace kvt::test

@@ -253,8 +253,9 @@ TEST_F(KvtText, ArgumentsAreLookedAt) {
         EXPECT_EQ(text(arguments, "a").status, 2);
     }
     for (const Strings& arguments : {Strings{"find", "\xff"}, {"replace", "a", "\xff"}, {"strip", "\xff"}}) {
-        EXPECT_EQ(text(arguments, "a").err, "kvt: The bytes \"\\xFF\" are not valid UTF-8.\n")
-            << arguments[0];
+        const std::string name = arguments[0] == "find" ? "NEEDLE" : arguments[0] == "strip" ? "SET" : "TO";
+        EXPECT_EQ(text(arguments, "a").err,
+                  "kvt: " + name + " is not UTF-8: \"\\xFF\" ends in a byte of no character\n");
         EXPECT_EQ(text(arguments, "a").status, 2);
     }
     // Words that mean something elsewhere, and what looks like an option.
@@ -414,6 +415,17 @@ TEST_F(KvtText, EveryOperationHasAHelpThatBeginsWithAnExample) {
         const bool ignores = name == "find" || name == "replace" || name == "split" || name == "hash";
         EXPECT_EQ(contains(result.out, "--ignore-case "), ignores) << result.out;
     }
+}
+
+TEST_F(KvtText, StatementsMayBeRecords) {
+    EXPECT_EQ(text({"find", "é", "--json", "--encoding", "ISO-8859-1"}, "a\nb\xe9\xe9\n").out,
+              "{\"file\":\"standard input\",\"line\":2,\"column\":2,\"offset\":3,\"text\":\"é\"}\n"
+              "{\"file\":\"standard input\",\"line\":2,\"column\":3,\"offset\":4,\"text\":\"é\"}\n");
+    EXPECT_EQ(text({"find", "STRASSE", "-i", "--json"}, "Straße").out,
+              "{\"file\":\"standard input\",\"line\":1,\"column\":1,\"offset\":0,\"text\":\"Straße\"}\n");
+    const std::string hash = text({"hash"}, "a\n").out.substr(0, 16);
+    EXPECT_EQ(text({"hash", "--json"}, "a\n").out,
+              "{\"file\":\"standard input\",\"line\":1,\"hash\":\"" + hash + "\"}\n");
 }
 
 } // namespace kvt::test

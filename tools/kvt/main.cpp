@@ -21,11 +21,13 @@ int main(int argc, char** argv) {
         // Nobody listens, so there is nothing to say. All that was temporary is gone by now.
         host::dieOfClosedPipe();
     } catch (const kvt::ex::Throwable& failure) {
-        diagnostics.say(host::describe(failure));
+        diagnostics.fail(host::describe(failure));
     } catch (const std::bad_alloc&) {
-        diagnostics.say("out of memory");
+        diagnostics.fail("out of memory");
+    } catch (const host::Failure& failure) {
+        diagnostics.fail(failure.what());
     } catch (const std::exception& failure) {
-        diagnostics.say(failure.what());
+        diagnostics.fail(host::describe(failure));
     }
     return host::NotDone;
 }

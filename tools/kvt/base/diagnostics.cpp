@@ -43,21 +43,28 @@ Diagnostics::~Diagnostics() {
     flush();
 }
 
-void Diagnostics::say(std::string_view text) {
-    append(colour_ ? "\x1b[1;31mkvt:\x1b[0m " : "kvt: ");
-    line(text);
+void Diagnostics::fail(std::string_view text) {
+    held_ += colour_ ? "\x1b[1;31mkvt:\x1b[0m " : "kvt: ";
+    appendLine(text);
 }
 
-void Diagnostics::line(std::string_view text) {
-    append(text);
-    append("\n");
-    if (held_.size() >= heldBytes) {
-        flush();
+void Diagnostics::say(std::string_view text) {
+    if (!quiet_) {
+        fail(text);
     }
 }
 
-void Diagnostics::append(std::string_view text) {
-    held_.append(text);
+void Diagnostics::line(std::string_view text) {
+    if (!quiet_) {
+        appendLine(text);
+    }
+}
+
+void Diagnostics::appendLine(std::string_view text) {
+    held_.append(text) += '\n';
+    if (held_.size() >= heldBytes) {
+        flush();
+    }
 }
 
 void Diagnostics::flush() {

@@ -38,7 +38,9 @@ std::optional<std::uint64_t> remainingOf(int descriptor) {
 } // namespace
 
 Input::Input(const std::string& path)
-    : name_(path == standardInput ? "standard input" : printable(path)),
+    : name_(path == standardInput ? "standard input"
+            : path.empty()        ? "''"
+                                  : printable(path)),
       descriptor_(openForReading(path, name_)), owned_(path != standardInput), buffer_(blockSize) {
     ::posix_fadvise(descriptor_, 0, 0, POSIX_FADV_SEQUENTIAL);
 }

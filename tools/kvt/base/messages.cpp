@@ -5,6 +5,10 @@
 #include <kvt/foundation/throwable.h>
 
 #include <algorithm>
+#include <cstdlib>
+#include <cxxabi.h>
+#include <memory>
+#include <typeinfo>
 
 namespace host {
 
@@ -46,6 +50,14 @@ std::string cut(const std::string& parameter) {
     return printable(text) + "...";
 }
 
+// The name of a class as it is written in C++.
+std::string kindOf(const std::type_info& type) {
+    int status = 0;
+    const std::unique_ptr<char, void (*)(void*)> name(
+        abi::__cxa_demangle(type.name(), nullptr, nullptr, &status), std::free);
+    return status == 0 ? name.get() : type.name();
+}
+
 } // namespace
 
 const std::vector<Message>& messages() {
@@ -60,7 +72,7 @@ const std::vector<Message>& messages() {
         {933060,
          "\"%0\" is a time of day, and \"%1\" has years, months or days, which cannot be added to it."},
         {933063, "\"%0\" is no date, time or datetime in canonical form."},
-        {933064, "\"%0\" is no interval."},
+        {933064, "\"%0\" is no interval, whose form is [-]P[nY][nM][nD][T[nH][nM][nS]]."},
         {933065, "%0 is out of range for the %1, which goes from %2 to %3."},
         {933067, "The value fits the format up to \"%0\" but not where the format goes on with \"%1\"."},
         {933068, "It failed for a reason that has no message of its own."},
@@ -140,7 +152,11 @@ std::string describe(const kvt::ex::Throwable& failure) {
                             }
                             add(describe(static_cast<std::uint32_t>(number), shown));
                         });
-    return text.empty() ? failure.what().toStdString() : text;
+    return text.empty() ? "a failure of the kind " + kindOf(typeid(failure)) + " without a message" : text;
+}
+
+std::string describe(const std::exception& failure) {
+    return "an unforeseen failure of the kind " + kindOf(typeid(failure)) + ": " + printable(failure.what());
 }
 
 } // namespace host

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <exception>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -34,7 +35,11 @@ std::string fill(std::string_view text, const std::vector<std::string>& paramete
 /// The sentence for a number, or the number and its parameters where there is no text.
 std::string describe(std::uint32_t number, const std::vector<std::string>& parameters);
 
-/// Everything that a failure of the library says, for a line on standard error. Long parameters are cut.
+/// Everything that a failure of the library says, for a line on standard error. Long parameters are cut. Of one that
+/// says nothing, what kind it is.
 std::string describe(const kvt::ex::Throwable& failure);
+
+/// The same for a failure that nobody foresaw.
+std::string describe(const std::exception& failure);
 
 } // namespace host

@@ -276,10 +276,10 @@ std::unique_ptr<Output> openOutput(const std::string& path) {
     return std::make_unique<AtomicFile>(followLinks(path), existing.st_mode & 07777, path);
 }
 
-void print(std::string_view text) {
-    StandardOutput output;
-    output.write(text);
-    output.commit();
+void print(std::string_view text, const std::string& path) {
+    const std::unique_ptr<Output> output = openOutput(path);
+    output->write(text);
+    output->commit();
 }
 
 } // namespace host

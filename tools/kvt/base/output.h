@@ -30,7 +30,7 @@ bool isSamePlace(const std::string& left, const std::string& right);
 
 std::unique_ptr<Output> openOutput(const std::string& path);
 
-/// Writes `text` to standard output.
-void print(std::string_view text);
+/// Writes `text` to standard output, or to where `path` leads.
+void print(std::string_view text, const std::string& path = {});
 
 } // namespace host

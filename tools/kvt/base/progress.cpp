@@ -23,8 +23,9 @@ std::string amount(std::uint64_t bytes) {
 
 Progress::Progress(Diagnostics& diagnostics, std::optional<std::uint64_t> total, Show show, std::string what)
     : diagnostics_(diagnostics), total_(total), what_(std::move(what)),
-      active_(show == Show::Always ||
-              (show != Show::Never && diagnostics.canDraw() && (!total || *total >= longInput))),
+      active_(!diagnostics.isQuiet() &&
+              (show == Show::Always ||
+               (show != Show::Never && diagnostics.canDraw() && (!total || *total >= longInput)))),
       always_(show == Show::Always) {}
 
 Progress::~Progress() {

@@ -1,5 +1,7 @@
 #include "base/text.h"
 
+#include "base/failure.h"
+#include "base/text_units.h"
 #include "base/unicode_data.h"
 
 #include <kvt/encoding/stream_transcoder.h>
@@ -101,6 +103,17 @@ std::string printable(std::u32string_view text) {
         appendPrintable(out, character);
     }
     return out;
+}
+
+void requireUtf8(const std::string& what, std::string_view text) {
+    if (std::all_of(text.begin(), text.end(), isAscii)) {
+        return;
+    }
+    convertWhole(text, Encoding::Utf8, Encoding::Utf32LE, [&](const kvt::ex::Loss& loss) {
+        throw Failure(what + " is not UTF-8: \"" +
+                      printable(text.substr(0, loss.offset + loss.bytes.size())) + "\" ends in " +
+                      (loss.bytes.size() == 1 ? "a byte" : "bytes") + " of no character");
+    });
 }
 
 std::string toUtf8(std::u32string_view text) {

@@ -20,6 +20,9 @@ std::string codePointName(char32_t character);
 std::string printable(std::string_view utf8);
 std::string printable(std::u32string_view text);
 
+/// Throws Failure where the text of the argument `what` is not UTF-8; it names the argument and the place.
+void requireUtf8(const std::string& what, std::string_view text);
+
 /// Whole texts, substitutions in place of what does not convert.
 std::string toUtf8(std::u32string_view text);
 std::u32string toUtf32(std::string_view bytes, kvt::ex::Encoding from);

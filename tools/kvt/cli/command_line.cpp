@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/output.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "base/unicode_data.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
@@ -12,6 +13,7 @@
 #include <boost/version.hpp>
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <vector>
 
 namespace host {
@@ -26,9 +28,12 @@ constexpr const char* examples = R"(kvt convert --from Shift_JIS --to UTF-8 old.
 kvt encodings latin1
 kvt COMMAND --help)";
 
+constexpr const char* summary = "kvt converts text between character encodings and accounts for every loss";
+
 constexpr const char* notes =
     R"(Data goes to standard output, everything else to standard error, both of which
-are UTF-8 but for the text that 'convert', 'text' and 'match' write. A set
+are UTF-8 but for text that stays in the encoding in which it was read. With
+--quiet, of the latter only the reason why something is not done is left. A set
 NO_COLOR keeps colours away.
 
 Exit status, of every command:
@@ -89,47 +94,106 @@ std::string listed(const std::vector<std::string>& names) {
     return list;
 }
 
+// The option or operand about which `error` is; null where it is about none.
+const CLI::Option* concerned(const CLI::App& app, const CLI::ParseError& error) {
+    const std::string text = error.what();
+    const std::string name = text.substr(0, text.find_first_of(": "));
+    for (const CLI::Option* option : app.get_options()) {
+        if (option->get_name() == name || option->check_name(name) || option->check_name("--" + name) ||
+            option->check_name("-" + name)) {
+            return option;
+        }
+    }
+    return nullptr;
+}
+
+// What is wrong where all words are known.
+std::string complaintAboutKnown(const CLI::App& place, const CLI::ParseError& error) {
+    const CLI::Option* option = concerned(place, error);
+    if (option == nullptr) {
+        return "the options do not go together";
+    }
+    const std::string name = option->get_name();
+    if (dynamic_cast<const CLI::RequiredError*>(&error) != nullptr) {
+        return name + " is required";
+    }
+    if (option->get_items_expected_max() == 0) {
+        return name + " takes no value";
+    }
+    return option->count() > 1 ? name + " is given more than once"
+                               : name + " takes a value: " + name + " " + option->get_type_name();
+}
+
+// Of short options in one word, the first that there is not.
+std::string firstUnknown(const std::string& word, const CLI::App& app) {
+    const bool isCluster = word.size() > 2 && word[0] == '-' && word[1] != '-';
+    const std::vector<std::string> names = optionNames(app);
+    for (std::size_t at = 1; isCluster && at < word.size(); ++at) {
+        const std::string name = std::string("-") + word[at];
+        if (std::find(names.begin(), names.end(), name) == names.end()) {
+            return isAscii(word[at]) ? name : word;
+        }
+    }
+    return word;
+}
+
+// What is wrong about a word that is neither an option nor wanted.
+std::string complaintAbout(const std::string& word, const CLI::App& place) {
+    const std::vector<std::string> commands = commandNames(place);
+    if (!word.starts_with("-") || word == "-") {
+        return commands.empty() ? "unexpected argument '" + printable(word) + "'"
+                                : "unknown command '" + printable(word) + "'." + didYouMean(word, commands);
+    }
+    const std::string option = firstUnknown(word, place);
+    return "unknown option '" + printable(option) + "'." + didYouMean(option, optionNames(place));
+}
+
 // What was wrong with the command line. An unknown word is the likely cause of everything else that is missing.
 std::string complaint(const CLI::App& app, const CLI::ParseError& error) {
-    const std::vector<std::string> unknown = app.remaining(true);
+    std::vector<std::string> unknown = app.remaining(true);
+    std::erase(unknown, "--"); // which is in it where nothing stands behind
     const CLI::App& place = innermost(app);
-    if (unknown.empty() && place.get_require_subcommand_min() != 0) {
-        return "which command? There are " + listed(commandNames(place)) + ".";
+    if (!unknown.empty()) {
+        return complaintAbout(unknown.front().substr(0, unknown.front().find('=')), place);
     }
-    if (unknown.empty()) {
-        return error.what();
-    }
-    const std::string word = unknown.front().substr(0, unknown.front().find('='));
-    if (word.starts_with("-")) {
-        return "unknown option '" + printable(word) + "'." + didYouMean(word, optionNames(place));
-    }
-    const std::vector<std::string> commands = commandNames(place);
-    return commands.empty() ? "unexpected argument '" + printable(word) + "'"
-                            : "unknown command '" + printable(word) + "'." + didYouMean(word, commands);
+    return place.get_require_subcommand_min() != 0
+               ? "which command? There are " + listed(commandNames(place)) + "."
+               : complaintAboutKnown(place, error);
 }
 
 int refuse(const CLI::App& app, const CLI::ParseError& error, Diagnostics& diagnostics) {
-    diagnostics.say(complaint(app, error));
+    diagnostics.fail(complaint(app, error));
     diagnostics.line("Try '" + fullName(innermost(app)) + " --help'.");
     return NotDone;
 }
 
+// The program with all its commands, as it is declared.
+struct Program {
+    CLI::App app{summary, "kvt"};
+    Syntax root{app};
+    bool showVersions = false;
+    bool isQuiet = false;
+    std::vector<CommandInfo> commands = allCommands();
+    std::vector<const Syntax*> syntaxes;
+
+    Program() {
+        root.setHelp(examples, notes);
+        root.flag("--version", showVersions, "Print the versions of kvt, ICU and Boost");
+        for (const CommandInfo& command : commands) {
+            Syntax& its = root.subcommand(command.name, command.summary);
+            its.setHelp(command.examples, command.notes);
+            command.command->declare(its);
+            syntaxes.push_back(&its);
+        }
+        root.flagForAll("-q,--quiet", isQuiet, "Say nothing but why it is not done");
+    }
+};
+
 } // namespace
 
 int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) {
-    CLI::App app("kvt converts text between character encodings and accounts for every loss", "kvt");
-    Syntax root(app);
-    root.setHelp(examples, notes);
-    bool showVersions = false;
-    app.add_flag("--version", showVersions, "Print the versions of kvt, ICU and Boost");
-    const std::vector<CommandInfo> commands = allCommands();
-    std::vector<const Syntax*> syntaxes;
-    for (const CommandInfo& command : commands) {
-        Syntax& its = root.subcommand(command.name, command.summary);
-        its.setHelp(command.examples, command.notes);
-        command.command->declare(its);
-        syntaxes.push_back(&its);
-    }
+    Program program;
+    CLI::App& app = program.app;
     try {
         app.parse(argc, argv);
     } catch (const CLI::CallForHelp& call) {
@@ -141,7 +205,7 @@ int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) 
         print(app.help());
         return Done;
     } catch (const CLI::ParseError& error) {
-        if (showVersions && app.remaining(true).empty() && app.get_subcommands().empty()) {
+        if (program.showVersions && app.remaining(true).empty() && app.get_subcommands().empty()) {
             print(versions());
             return Done;
         }
@@ -151,12 +215,19 @@ int runCommandLine(int argc, const char* const* argv, Diagnostics& diagnostics) 
         }
         return refuse(app, error, diagnostics);
     }
-    for (std::size_t index = 0; index < commands.size(); ++index) {
-        if (syntaxes[index]->isChosen()) {
-            return commands[index].command->run(diagnostics);
+    if (program.isQuiet) {
+        diagnostics.beQuiet();
+    }
+    for (std::size_t index = 0; index < program.commands.size(); ++index) {
+        if (program.syntaxes[index]->isChosen()) {
+            return program.commands[index].command->run(diagnostics);
         }
     }
     return NotDone;
+}
+
+SyntaxPage describeCommandLine() {
+    return Program().root.page();
 }
 
 } // namespace host

@@ -6,6 +6,7 @@
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 
 #include <charconv>
 
@@ -48,6 +49,7 @@ public:
     void declare(Syntax& syntax) override {
         syntax.operand("NUMBER", number_, "Number of a message").required();
         syntax.operand("PARAMETER", parameters_, "What takes the places of %0, %1 and so on");
+        declareOutput(syntax, output_);
     }
 
     int run(Diagnostics&) override {
@@ -57,13 +59,17 @@ public:
             throw Failure("message " + number_ + " takes " + counted(most, "parameter", "parameters") +
                           ", not " + std::to_string(parameters_.size()));
         }
-        print(fill(message.text, parameters_) + "\n");
+        for (const std::string& parameter : parameters_) {
+            requireUtf8("PARAMETER", parameter);
+        }
+        print(fill(message.text, parameters_) + "\n", output_);
         return Done;
     }
 
 private:
     std::string number_;
     std::vector<std::string> parameters_;
+    std::string output_;
 };
 
 } // namespace

@@ -4,7 +4,10 @@
 // this header, and nowhere else, is the library that reads command lines, whose own headers take long to compile.
 #pragma once
 
+#include "cli/syntax_page.h"
+
 #include <functional>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -16,21 +19,26 @@ class Option;
 
 namespace host {
 
+class Syntax;
+
 /// An option or operand that was declared. A copy is the same option.
 class Option {
 public:
     Option() = default;
-    explicit Option(CLI::Option& option) : option_(&option) {}
+    Option(CLI::Option& option, Syntax& syntax) : option_(&option), syntax_(&syntax) {}
 
     /// It has to be given.
     Option& required();
     /// Help says nothing of it.
     Option& hidden();
+    /// Its value is one of these words. For completions: who reads the value has to look at it all the same.
+    Option& takes(std::vector<std::string> words);
     /// Whether it was declared and the command line has it.
     bool isGiven() const;
 
 private:
     CLI::Option* option_ = nullptr;
+    Syntax* syntax_ = nullptr;
 };
 
 class Syntax {
@@ -60,6 +68,9 @@ public:
     /// The same for the last one, which may be there any number of times.
     Option operand(const std::string& name, std::vector<std::string>& values, const std::string& help);
 
+    /// The same flag for all commands below this one that do something, or for this one where there are none.
+    void flagForAll(const std::string& names, bool& isGiven, const std::string& help);
+
     /// A command below this one, which lives as long as this one. One of them is required.
     Syntax& subcommand(const std::string& name, const std::string& summary);
     /// Whether the command line names it.
@@ -68,9 +79,16 @@ public:
     /// The help begins with `examples`, command lines with one on each line, and ends with `notes`.
     void setHelp(const std::string& examples, const std::string& notes);
 
+    /// All that was declared, but for what is hidden.
+    SyntaxPage page() const;
+
 private:
+    friend class Option;
+
     CLI::App& app_;
     std::vector<std::unique_ptr<Syntax>> subcommands_;
+    std::string examples_;
+    std::map<const CLI::Option*, std::vector<std::string>> words_;
 };
 
 } // namespace host

@@ -248,7 +248,7 @@ void Conversion::explainStop(const Stopped& stopped) {
     const std::string sentence =
         bad ? describe(910002, {escaped(loss.bytes), fromName_})
             : describe(910003, {printable(std::u32string_view(&loss.codePoint, 1)), fromName_, toName_});
-    diagnostics_.say(describe(stopped.place) + ": " + sentence);
+    diagnostics_.fail(describe(stopped.place) + ": " + sentence);
     diagnostics_.line("     lost:        " + describeLost(loss));
     diagnostics_.line("     would read:  " +
                       printable(through(stopped.line ? withChanges(*stopped.line) : lineAtLoss(), to_)));

@@ -4,6 +4,7 @@
 #include "base/table.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 #include "text/encoding_catalogue.h"
 
 #include <nlohmann/json.hpp>
@@ -62,6 +63,7 @@ public:
     void declare(Syntax& syntax) override {
         syntax.operand("NAME", names_, "Encodings to list, by any of their names; all without one");
         syntax.flag("--json", json_, "Print a JSON array of objects");
+        declareOutput(syntax, output_);
     }
 
     int run(Diagnostics& diagnostics) override {
@@ -71,7 +73,7 @@ public:
         for (const std::string& name : names_) {
             const kvt::ex::Encoding encoding = namedEncoding(name);
             if (encoding.id() == kvt::ex::Encoding::Unknown) {
-                diagnostics.say(unknownEncoding(name, catalogue));
+                diagnostics.fail(unknownEncoding(name, catalogue));
                 status = NotDone;
             } else {
                 entries.push_back(catalogue.entry(encoding));
@@ -81,9 +83,9 @@ public:
             entries = catalogue.all();
         }
         if (json_) {
-            print(asJson(entries));
+            print(asJson(entries), output_);
         } else if (!entries.empty()) {
-            print(asTable(entries));
+            print(asTable(entries), output_);
         }
         return status;
     }
@@ -91,6 +93,7 @@ public:
 private:
     std::vector<std::string> names_;
     bool json_ = false;
+    std::string output_;
 };
 
 } // namespace

@@ -6,6 +6,7 @@
 #include "cli/choices.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 #include "cli/sizes.h"
 #include "date/lines.h"
 
@@ -36,7 +37,7 @@ kvt date add 20200131120000 -PT90M)",
 private:
     std::string whatIsWrongWith(const std::string& interval) const override {
         const DateOutcome negated = outcomeOf(datetime::intervalNegate(toUString(interval)));
-        return negated.isGood() ? "" : failureText(negated) + " Its form is [-]P[nY][nM][nD][T[nH][nM][nS]].";
+        return negated.isGood() ? "" : failureText(negated);
     }
     std::string exampleFor(const std::string& value) const override { return isValue(value) ? "P1D" : ""; }
     void prepare(const std::string& operand) override { interval_ = toUString(operand); }
@@ -61,8 +62,10 @@ kvt date diff 20200301 20200131 --unit days)",
 
 private:
     void declareOptions(Syntax& syntax) override {
-        syntax.option("--unit", unitName_, "UNIT",
-                      "Print one number, in years, months, weeks, days, hours, minutes or seconds");
+        syntax
+            .option("--unit", unitName_, "UNIT",
+                    "Print one number, in years, months, weeks, days, hours, minutes or seconds")
+            .takes(wordsOf(unitChoices));
     }
     std::string whatIsWrongWith(const std::string& second) const override { return wrongInSecond(second); }
     void prepare(const std::string& operand) override {
@@ -134,6 +137,7 @@ public:
         syntax_->option("--seconds", seconds_, "N", "Seconds, which may have a fraction");
         syntax_->flag("--negative", negative_, "Give it a minus sign");
         syntax_->flag("--json", json_, "Print a JSON object on a line");
+        declareOutput(*syntax_, output_);
         syntax_->setHelp("kvt date interval create --days 3 --minutes 90", createNotes);
     }
     bool isChosen() const override { return syntax_->isChosen(); }
@@ -142,7 +146,7 @@ public:
             number("--years", years_), number("--months", months_), number("--days", days_),
             number("--hours", hours_), number("--minutes", minutes_),
             parseDecimal("--seconds", unsignedText("--seconds", seconds_)), negative_);
-        return showOutcome(outcomeOf(datetime::intervalCreate(parts)), json_, diagnostics);
+        return showOutcome(outcomeOf(datetime::intervalCreate(parts)), json_, output_, diagnostics);
     }
 
 private:
@@ -164,6 +168,7 @@ private:
     std::string hours_ = "0";
     std::string minutes_ = "0";
     std::string seconds_ = "0";
+    std::string output_;
     bool negative_ = false;
     bool json_ = false;
 };

@@ -4,6 +4,7 @@
 #include "date/pattern_words.h"
 
 #include "base/failure.h"
+#include "base/text.h"
 #include "cli/choices.h"
 
 #include <kvt/datetime/datetime.h>
@@ -17,8 +18,6 @@ namespace {
 
 namespace datetime = kvt::ex::datetime;
 using kvt::ex::UString;
-
-constexpr const char* emptyValue = "The value is empty.";
 
 // How well a value fits a format that it failed by, for the choice among several: by how much of a pattern it fits, and
 // best where the pattern is not what it failed by, as on 30 February.
@@ -56,6 +55,7 @@ private:
     std::string whatIsWrongWith(const std::string& format) const override {
         std::string wrong = wrongInReadFormat(format);
         for (auto other = others_.begin(); wrong.empty() && other != others_.end(); ++other) {
+            requireUtf8("--or", *other);
             wrong = wrongInReadFormat(*other);
         }
         return wrong;
@@ -90,7 +90,6 @@ private:
     };
     DateOutcome read(const UString<0>& value, const Format& format) const {
         DateOutcome outcome = outcomeOf(datetime::parse(value, format.text, lenient_));
-        outcome.withoutMessage = emptyValue;
         outcome.format = format.typed;
         return outcome;
     }
@@ -115,9 +114,7 @@ private:
     std::string exampleFor(const std::string& value) const override { return isValue(value) ? "ISO" : ""; }
     void prepare(const std::string& operand) override { format_ = toUString(operand); }
     DateOutcome apply(const UString<0>& value) override {
-        DateOutcome outcome = outcomeOf(datetime::format(value, format_));
-        outcome.withoutMessage = emptyValue;
-        return outcome;
+        return outcomeOf(datetime::format(value, format_));
     }
 
     UString<0> format_;

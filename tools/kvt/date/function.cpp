@@ -59,6 +59,7 @@ int ValueFunction::run(Diagnostics& diagnostics) {
         throw Failure(std::string(words_.operand) + " is required");
     }
     const std::string operand = hasOperand ? arguments.back() : std::string();
+    requireUtf8(words_.operand, operand);
     const bool isAlone = hasOperand && arguments.size() < most;
     if (const std::string wrong = whatIsWrongWith(operand); !wrong.empty()) {
         throw Failure(isAlone && !lines_.isAsked() ? wrong + likelyMeant(operand) : wrong);
@@ -68,7 +69,16 @@ int ValueFunction::run(Diagnostics& diagnostics) {
     if (!fromInput && lines_.isAsked()) {
         throw Failure("VALUE and the options for lines do not go together; put '-' for the value");
     }
-    const ApplyToValue applyTo = [&](const kvt::ex::UString<0>& value) { return apply(value); };
+    if (!fromInput && !json_) {
+        requireUtf8(words_.value, arguments.front());
+    }
+    const ApplyToValue applyTo = [&](const kvt::ex::UString<0>& value) {
+        DateOutcome outcome = apply(value);
+        if (withoutBlanks(value.toStdString()).empty()) {
+            outcome.withoutMessage = "The value is empty.";
+        }
+        return outcome;
+    };
     return fromInput ? runLines(applyTo, json_, lines_, diagnostics)
                      : runValue(arguments.front(), applyTo, json_, lines_.output(), diagnostics);
 }

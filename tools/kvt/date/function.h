@@ -55,7 +55,7 @@ protected:
     virtual std::string ownNotes() const { return {}; }
     /// What is wrong with the operand, whatever the value is; empty where nothing is.
     virtual std::string whatIsWrongWith(const std::string&) const { return {}; }
-    /// For a `value` that stands without an operand: one with which it would do. Empty where `value` is no value.
+    /// For a `value` that stands without an operand: one with which it would do. Empty where `value` is not one.
     virtual std::string exampleFor(const std::string&) const { return {}; }
     /// Looks at the operand and the options once, before all values. Throws Failure.
     virtual void prepare(const std::string& operand) = 0;
@@ -113,7 +113,7 @@ private:
     std::string named_;
 };
 
-/// The text of an argument. Throws what the library throws where it is no UTF-8.
+/// The text of an argument. Throws what the library throws where it is not UTF-8.
 kvt::ex::UString<0> toUString(const std::string& utf8);
 
 /// Whether it is a date, a time or both in canonical form.

@@ -30,8 +30,8 @@ DateOutcome outcomeFor(const std::string& value, const ApplyToValue& apply) {
     }
 }
 
-void sayFailure(const DateOutcome& outcome, const std::string& place, Diagnostics& diagnostics) {
-    diagnostics.say(place + failureText(outcome));
+void sayFailure(const DateOutcome& outcome, Diagnostics& diagnostics) {
+    diagnostics.fail(failureText(outcome));
     for (const std::string& line : markedFormat(outcome)) {
         diagnostics.line("     " + line);
     }
@@ -79,19 +79,17 @@ int runValue(const std::string& value, const ApplyToValue& apply, bool json, con
              Diagnostics& diagnostics) {
     const DateOutcome outcome = outcomeFor(value, apply);
     if (!json && !outcome.isGood()) {
-        sayFailure(outcome, "", diagnostics);
+        sayFailure(outcome, diagnostics);
         return NotDone;
     }
-    const std::unique_ptr<Output> output = openOutput(outputPath);
     if (json) {
         nlohmann::ordered_json object;
         object["value"] = value;
         addTo(object, outcome);
-        output->write(jsonLine(object));
+        print(jsonLine(object), outputPath);
     } else {
-        output->write(resultText(outcome) + "\n");
+        print(resultText(outcome) + "\n", outputPath);
     }
-    output->commit();
     return outcome.isGood() ? Done : NotDone;
 }
 
@@ -100,15 +98,16 @@ int runLines(const ApplyToValue& apply, bool json, ValueLines& lines, Diagnostic
     return lines.run(work, json, diagnostics);
 }
 
-int showOutcome(const DateOutcome& outcome, bool json, Diagnostics& diagnostics) {
+int showOutcome(const DateOutcome& outcome, bool json, const std::string& outputPath,
+                Diagnostics& diagnostics) {
     if (json) {
         nlohmann::ordered_json object;
         addTo(object, outcome);
-        print(jsonLine(object));
+        print(jsonLine(object), outputPath);
     } else if (outcome.isGood()) {
-        print(resultText(outcome) + "\n");
+        print(resultText(outcome) + "\n", outputPath);
     } else {
-        sayFailure(outcome, "", diagnostics);
+        sayFailure(outcome, diagnostics);
     }
     return outcome.isGood() ? Done : NotDone;
 }

@@ -24,6 +24,7 @@ int runValue(const std::string& value, const ApplyToValue& apply, bool json, con
 int runLines(const ApplyToValue& apply, bool json, ValueLines& lines, Diagnostics& diagnostics);
 
 /// Prints one outcome that has no value to it, as of now().
-int showOutcome(const DateOutcome& outcome, bool json, Diagnostics& diagnostics);
+int showOutcome(const DateOutcome& outcome, bool json, const std::string& outputPath,
+                Diagnostics& diagnostics);
 
 } // namespace host

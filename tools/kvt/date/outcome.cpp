@@ -2,10 +2,12 @@
 
 #include "base/messages.h"
 #include "base/text.h"
+#include "date/pattern_words.h"
 
 #include <kvt/datetime/message_numbers.h>
 
 #include <charconv>
+#include <utility>
 
 namespace host {
 
@@ -14,6 +16,19 @@ namespace {
 using kvt::ex::datetime::LogMessageInfo;
 using kvt::ex::datetime::ReturnState;
 namespace message_number = kvt::ex::datetime::message_number;
+
+// The library names its functions as a host's language does.
+constexpr std::pair<const char*, const char*> functionNames[] = {{"@DateTimeParse()", "'parse'"},
+                                                                 {"@DateTimeFormat()", "'format'"}};
+
+std::string inUsersWords(const std::string& parameter) {
+    for (const auto& [name, word] : functionNames) {
+        if (parameter == name) {
+            return word;
+        }
+    }
+    return parameter;
+}
 
 template <typename Result>
 DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json value) {
@@ -24,7 +39,7 @@ DateOutcome outcomeWithMessage(const Result& result, nlohmann::ordered_json valu
     if (const auto& message = std::get<2>(result)) {
         DateMessage& copy = outcome.message.emplace(DateMessage{message->messageNumber, {}});
         for (const kvt::ex::UString<0>& parameter : message->parameters) {
-            copy.parameters.push_back(parameter.toStdString());
+            copy.parameters.push_back(inUsersWords(parameter.toStdString()));
         }
     }
     return outcome;
@@ -77,18 +92,22 @@ std::string resultText(const DateOutcome& outcome) {
 
 std::string failureSentence(const DateOutcome& outcome) {
     if (!outcome.message) {
-        return outcome.withoutMessage;
+        return outcome.withoutMessage.empty() ? "It failed without a message about why, in the state " +
+                                                    std::string(stateName(outcome.state)) + "."
+                                              : outcome.withoutMessage;
     }
     if (!outcome.message->text.empty()) {
         return outcome.message->text;
     }
     std::vector<std::string> shown;
     for (const std::string& parameter : outcome.message->parameters) {
-        shown.push_back(parameter == "@DateTimeParse()"    ? "'parse'"
-                        : parameter == "@DateTimeFormat()" ? "'format'"
-                                                           : printable(parameter));
+        shown.push_back(printable(parameter));
     }
-    return describe(outcome.message->number, shown);
+    const std::string text = describe(outcome.message->number, shown);
+    if (outcome.message->number != message_number::unknownFlag || shown.size() != 2) {
+        return text;
+    }
+    return text + " There are " + (shown[1] == functionNames[0].second ? readFlags() : writtenFlags()) + ".";
 }
 
 std::string failureText(const DateOutcome& outcome) {

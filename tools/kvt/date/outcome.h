@@ -25,8 +25,8 @@ struct DateOutcome {
     std::optional<DateMessage> message;
     /// The format by which a value failed, where it was read by one of several; valid as long as these.
     std::string_view format = {};
-    /// What is said about a failure for which the library has no message.
-    std::string withoutMessage = "It failed, and there is no message about why.";
+    /// What is said about a failure for which the library has no message; empty where nothing more is known.
+    std::string withoutMessage = {};
 
     bool isGood() const {
         return state == kvt::ex::datetime::ReturnState::Success ||
@@ -57,7 +57,7 @@ std::vector<std::string> markedFormat(const DateOutcome& outcome);
 /// "state", "result" and, for a failure, "message" as members of `object`.
 void addTo(nlohmann::ordered_json& object, const DateOutcome& outcome);
 
-/// The object as one line. Bytes that are no UTF-8 become U+FFFD.
+/// The object as one line. Bytes that are not UTF-8 become U+FFFD.
 std::string jsonLine(const nlohmann::ordered_json& object);
 
 } // namespace host

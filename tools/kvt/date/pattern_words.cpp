@@ -46,6 +46,25 @@ std::string patternHelp(const char* heading, Words words) {
     return std::string(heading) + "\n" + formatTable({Align::Left, Align::Left, Align::Left}, rows) + "\n";
 }
 
+std::vector<std::string> flags(Words words) {
+    std::vector<std::string> known;
+    for (const datetime::PatternElement& row : datetime::patternElements()) {
+        const std::string element = row.element.toStdString();
+        if (element.starts_with('%') && !(row.*words).isEmpty()) {
+            known.push_back(element);
+        }
+    }
+    return known;
+}
+
+std::string listed(const std::vector<std::string>& known) {
+    std::string list;
+    for (const std::string& flag : known) {
+        list += (list.empty() ? "" : " ") + flag;
+    }
+    return list;
+}
+
 std::string wrongInFormat(const std::string& typed, Words words) {
     namespace message_number = datetime::message_number;
     const std::string format = withoutBlanks(typed);
@@ -58,13 +77,7 @@ std::string wrongInFormat(const std::string& typed, Words words) {
     if (format.find('%') == std::string::npos) {
         return hasKeyword(format) ? "" : saying(message_number::noKnownKeyword, {printable(format)});
     }
-    std::vector<std::string> known;
-    for (const datetime::PatternElement& row : datetime::patternElements()) {
-        const std::string element = row.element.toStdString();
-        if (element.starts_with('%') && !(row.*words).isEmpty()) {
-            known.push_back(element);
-        }
-    }
+    const std::vector<std::string> known = flags(words);
     for (std::size_t at = format.find('%'); at != std::string::npos; at = format.find('%', at)) {
         if (at + 1 == format.size()) {
             return saying(message_number::formatEndsInPercent, {});
@@ -73,16 +86,12 @@ std::string wrongInFormat(const std::string& typed, Words words) {
             return format.compare(at, flag.size(), flag) == 0;
         });
         if (element == known.end()) {
-            std::string flags;
-            for (const std::string& flag : known) {
-                flags += " " + flag;
-            }
             std::size_t end = at + 2;
             while (end < format.size() && isContinuation(format[end])) {
                 ++end;
             }
             return "\"" + printable(format.substr(at, end - at)) + "\" is no flag (" +
-                   std::to_string(message_number::unknownFlag) + "); there are" + flags;
+                   std::to_string(message_number::unknownFlag) + "); there are " + listed(known);
         }
         at += element->size();
     }
@@ -98,6 +107,14 @@ std::string readPatternHelp() {
 
 std::string writtenPatternHelp() {
     return patternHelp("What a pattern writes:", &datetime::PatternElement::writes);
+}
+
+std::string readFlags() {
+    return listed(flags(&datetime::PatternElement::reads));
+}
+
+std::string writtenFlags() {
+    return listed(flags(&datetime::PatternElement::writes));
 }
 
 std::string wrongInReadFormat(const std::string& format) {

@@ -10,6 +10,10 @@ namespace host {
 std::string readPatternHelp();
 std::string writtenPatternHelp();
 
+/// The flags alone, with blanks between them.
+std::string readFlags();
+std::string writtenFlags();
+
 /// What is wrong with a format for whatever value, in words; empty where nothing is. Where a flag is unknown, the words
 /// list those that there are.
 std::string wrongInReadFormat(const std::string& format);

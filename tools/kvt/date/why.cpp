@@ -8,6 +8,7 @@
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 
 #include <kvt/datetime/datetime.h>
 #include <kvt/datetime/pattern_trace.h>
@@ -171,16 +172,19 @@ nlohmann::ordered_json jsonOf(const Traces& traces) {
 class WhyFunction : public DateFunction {
 public:
     void declare(Syntax& parent) override {
-        syntax_ = &parent.subcommand("why", "Tell step by step how 'parse' reads a value");
+        syntax_ = &parent.subcommand("why", "Show step by step how 'parse' reads a value");
         syntax_->operand("VALUE", value_, "The value").required();
         syntax_->operand("FORMAT", format_, "A pattern or keywords, as for 'parse'").required();
         syntax_->flag("--lenient", lenient_, "Let parts run over into the next larger one, as for 'parse'");
         syntax_->flag("--json", json_, "Print a JSON object on a line");
+        declareOutput(*syntax_, output_);
         syntax_->setHelp(examples, notes);
     }
     bool isChosen() const override { return syntax_->isChosen(); }
 
     int run(Diagnostics&) override {
+        requireUtf8("VALUE", value_);
+        requireUtf8("FORMAT", format_);
         const auto value = toUString(value_);
         const auto format = toUString(format_);
         const std::string shownValue = withoutBlanks(value_);
@@ -193,13 +197,13 @@ public:
             object["steps"] = jsonOf(trace);
             object["end"] = trace.end ? nlohmann::ordered_json(*trace.end) : nullptr;
             addTo(object, outcomeOfTrace(trace));
-            print(json_ ? jsonLine(object) : shown(shownValue, trace));
+            print(json_ ? jsonLine(object) : shown(shownValue, trace), output_);
         } else {
             DateOutcome outcome = outcomeOf(kvt::ex::datetime::parse(value, format, lenient_));
             outcome.withoutMessage = "The value is empty.";
             object["tries"] = jsonOf(traces);
             addTo(object, outcome);
-            print(json_ ? jsonLine(object) : shown(shownValue, traces) + shownOutcome(outcome));
+            print(json_ ? jsonLine(object) : shown(shownValue, traces) + shownOutcome(outcome), output_);
         }
         return Done;
     }
@@ -208,6 +212,7 @@ private:
     Syntax* syntax_ = nullptr;
     std::string value_;
     std::string format_;
+    std::string output_;
     bool lenient_ = false;
     bool json_ = false;
 };

@@ -6,6 +6,7 @@
 #include "cli/choices.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 #include "date/lines.h"
 #include "date/zone_setting.h"
 
@@ -35,7 +36,8 @@ kvt date zone get 120000-03:30 --as seconds)",
 
 private:
     void declareOptions(Syntax& syntax) override {
-        syntax.option("--as", as_, "WHAT", "'text' (default), or its 'minutes' or 'seconds'");
+        syntax.option("--as", as_, "WHAT", "'text' (default), or its 'minutes' or 'seconds'")
+            .takes(wordsOf(offsetChoices));
     }
     void prepare(const std::string&) override { type_ = choose("--as", as_, offsetChoices); }
     DateOutcome apply(const UString<0>& value) override {
@@ -111,6 +113,7 @@ public:
         syntax_->flag("--no-offset", noOffset_, "Without the offset");
         database_.declare(*syntax_);
         syntax_->flag("--json", json_, "Print a JSON object on a line");
+        declareOutput(*syntax_, output_);
         syntax_->setHelp("kvt date now --utc", nowNotes);
     }
     bool isChosen() const override { return syntax_->isChosen(); }
@@ -124,7 +127,7 @@ public:
         const datetime::ZoneMode mode = utc_        ? datetime::ZoneMode::Utc
                                         : noOffset_ ? datetime::ZoneMode::LocalWithoutOffset
                                                     : datetime::ZoneMode::LocalWithOffset;
-        return showOutcome(outcomeOf(datetime::now(mode)), json_, diagnostics);
+        return showOutcome(outcomeOf(datetime::now(mode)), json_, output_, diagnostics);
     }
 
 private:
@@ -132,6 +135,7 @@ private:
     bool utc_ = false;
     bool noOffset_ = false;
     bool json_ = false;
+    std::string output_;
     ZoneDatabaseOption database_;
 };
 

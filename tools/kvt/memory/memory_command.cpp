@@ -7,6 +7,7 @@
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 #include "cli/sizes.h"
 #include "memory/memory_file.h"
 
@@ -187,6 +188,7 @@ public:
         inspect.flag("--json", json_, "Print a JSON object");
         inspect.option("--segment-size", segmentSize_, "SIZE",
                        "Bytes of a segment that the file was made with");
+        declareOutput(inspect, output_);
         inspect.operand("FILE", path_, "The file").required();
         inspect.setHelp(examples, inspectNotes);
     }
@@ -194,7 +196,7 @@ public:
     int run(Diagnostics& diagnostics) override {
         const FileBytes bytes(path_);
         const MemoryFileReport report = inspect(bytes);
-        print(json_ ? asJson(path_, report) : asText(report));
+        print(json_ ? asJson(path_, report) : asText(report), output_);
         int status = Done;
         for (std::size_t index = 0; index < report.segments.size(); ++index) {
             const SegmentState state = report.segments[index].state;
@@ -224,6 +226,7 @@ private:
 
     std::string path_;
     std::string segmentSize_;
+    std::string output_;
     bool json_ = false;
 };
 

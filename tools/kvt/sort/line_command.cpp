@@ -111,8 +111,8 @@ and NUL are characters as any other. Lines and files may have any size.
 
 Lines are compared as bytes of UTF-8, which is by code points, and with --key by
 one of their fields; a field that is not there is empty. With --ignore-case, what
-differs in case only is equal; case is that of full Unicode case folding, whatever
-the locale. Lines are written as they were read in any case, in the encoding of
+differs in case only is equal; case is that of full Unicode case folding, in any
+locale. Lines are written as they were read in any case, in the encoding of
 --encoding. Bytes that are no text in it end the command with their place; but in
 UTF-8 and without --ignore-case, any bytes are compared as they are.
 
@@ -163,6 +163,7 @@ KeyRule LineCommand::keyRule(KeyRule rule) const {
         if (rule.field == 0) {
             throw Failure("--delimiter goes with --key only");
         }
+        requireUtf8("--delimiter", delimiter_);
         if (delimiter_.empty()) {
             throw Failure("--delimiter is empty");
         }

@@ -12,7 +12,7 @@ namespace {
 
 using kvt::ex::Encoding;
 
-// The blocks of a file as UTF-8; refuses what is no text. What is UTF-8 already passes as it is.
+// The blocks of a file as UTF-8; refuses what is not text. What is UTF-8 already passes as it is.
 class BlockDecoder {
 public:
     explicit BlockDecoder(Source& source)

@@ -1,7 +1,7 @@
 // The lines of files on their way into a sorter.
 //
-// A line ends with LF, which does not belong to it; the last one of a file need not end so. Lines are of any length, and
-// UTF-8, into which other encodings are decoded. Bytes that are no text are refused with their place, but for UTF-8
+// A line ends with LF, which does not belong to it; the last one of a file need not end so. Lines are of any length,
+// and UTF-8, into which other encodings are decoded. Bytes that are not text are refused with their place, but for UTF-8
 // whose lines are compared as they are: there they are bytes as any others.
 #pragma once
 

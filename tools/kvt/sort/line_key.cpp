@@ -1,6 +1,6 @@
-// The key of a number is its class, in which negative ones are before zero and zero before positive ones; then, for what
-// is neither zero nor infinite, its exponent as eight bytes, highest first, and its digits without zeros around them. Of
-// negative numbers, the bytes are turned round, and closed by one that is above all others.
+// The key of a number is its class, in which negative ones are before zero and zero before positive ones; then, for
+// what is neither zero nor infinite, its exponent as eight bytes, highest first, and its digits without zeros around
+// them. Of negative numbers, the bytes are turned round, and closed by one that is above all others.
 #include "sort/line_key.h"
 
 #include "base/text_units.h"
@@ -81,7 +81,7 @@ bool isWord(std::string_view text, std::string_view word) {
                       [](char left, char right) { return asciiLower(left) == right; });
 }
 
-// What stands behind "e"; false where that is no exponent.
+// What stands behind "e"; false where that is not an exponent.
 bool readExponent(std::string_view text, std::int64_t& exponent) {
     constexpr std::size_t mostDigits = 17;
     const bool isNegative = text.starts_with('-');
@@ -243,7 +243,7 @@ bool appendDateKey(std::string_view text, const kvt::ex::UString<0>& format, std
         key += isTime ? TimeOfDay : Date;
         key += value;
         return true;
-    } catch (const kvt::ex::Throwable&) { // of bytes that are no text
+    } catch (const kvt::ex::Throwable&) { // of bytes that are not text
         return false;
     }
 }

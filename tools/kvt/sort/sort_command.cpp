@@ -1,6 +1,7 @@
 // `kvt sort`: the lines of files in order, however many there are.
 
 #include "base/failure.h"
+#include "base/text.h"
 #include "date/pattern_words.h"
 #include "sort/line_command.h"
 
@@ -44,6 +45,7 @@ public:
         if (number_) {
             plan.key.by = KeyRule::By::Number;
         } else if (dateOption_.isGiven()) {
+            requireUtf8("--date", format_);
             if (const std::string wrong = wrongInReadFormat(format_); !wrong.empty()) {
                 throw Failure("--date: " + wrong);
             }

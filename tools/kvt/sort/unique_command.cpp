@@ -15,8 +15,8 @@ kvt unique --memory 1G huge.log -o huge.log)";
 
 constexpr const char* ownNotes =
     R"(The first of equal lines stays where it is, and the others go, wherever they are:
-the input need not be sorted. With --key, lines are equal whose fields are. With --count each line has before it how many there
-were, and a tab.
+the input need not be sorted. With --key, lines are equal whose fields are. With
+--count each line has before it how many there were, and a tab.
 
 )";
 

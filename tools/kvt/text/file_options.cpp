@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/output.h"
 #include "cli/choices.h"
+#include "cli/output_option.h"
 #include "text/encoding_catalogue.h"
 
 #include <unistd.h>
@@ -23,12 +24,13 @@ void FileOptions::declare(Syntax& syntax, const std::string& meaning) {
 }
 
 void FileOptions::declareOutput(Syntax& syntax) {
-    syntax.option("-o,--output", output_, "FILE",
-                  "Where the output goes; '-' is standard output, the default");
-    syntax.flag(
-        "--progress", "always", progress_, "WHEN",
-        "Say on standard error how far it is: 'auto' (default) on a terminal and for long inputs, 'always', "
-        "which is meant without WHEN, or 'never'");
+    host::declareOutput(syntax, output_);
+    syntax
+        .flag("--progress", "always", progress_, "WHEN",
+              "Say on standard error how far it is: 'auto' (default) on a terminal and for long inputs, "
+              "'always', "
+              "which is meant without WHEN, or 'never'")
+        .takes(wordsOf(progressChoices));
 }
 
 void FileOptions::declareEncoding(Syntax& syntax) {

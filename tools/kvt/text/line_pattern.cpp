@@ -102,7 +102,7 @@ std::unique_ptr<LinePattern> compileByLibrary(const std::string& pattern, Dialec
 
 std::unique_ptr<LinePattern> compilePattern(const std::string& pattern, Dialect dialect,
                                             LetterCase letterCase) {
-    Utf8String(View(pattern)).getAsUtf32(); // which looks at every byte
+    requireUtf8("REGEX", pattern);
     return dialect == Dialect::Unicode ? compileUnicodePattern(pattern, letterCase)
                                        : compileByLibrary(pattern, dialect, letterCase);
 }

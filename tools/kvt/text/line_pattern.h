@@ -45,7 +45,7 @@ enum class Dialect { Perl, Legacy, Unicode };
 enum class LetterCase { Distinguish, Ignore };
 
 /// Letters in either case are the same in all dialects but the legacy one. Throws Failure for a pattern that cannot be
-/// compiled, and kvt::ex::UStringBadEncodingException for one that is not UTF-8.
+/// compiled or is not UTF-8.
 std::unique_ptr<LinePattern> compilePattern(const std::string& pattern, Dialect dialect,
                                             LetterCase letterCase);
 

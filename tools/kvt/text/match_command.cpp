@@ -12,8 +12,6 @@
 #include "text/line_pattern.h"
 #include "text/match_print.h"
 
-#include <kvt/string/ustring.h>
-
 #include <cstdint>
 #include <memory>
 #include <stdexcept>
@@ -199,8 +197,10 @@ public:
         syntax.flag("--groups", groups_, "Print where the groups of the first match stand");
         syntax.flag("--json", records_, "Print a JSON object on a line for each match");
         syntax.flag("--unicode", unicode_, "Take REGEX for one of ICU's, which knows whole characters");
-        dialectOption_ = syntax.option("--dialect", dialect_, "WHICH",
-                                       "How REGEX is to be read: 'perl' (default) or 'legacy'");
+        dialectOption_ = syntax
+                             .option("--dialect", dialect_, "WHICH",
+                                     "How REGEX is to be read: 'perl' (default) or 'legacy'")
+                             .takes(wordsOf(dialectChoices));
         files_.declareEncoding(syntax);
         files_.declare(syntax);
     }
@@ -258,8 +258,7 @@ private:
     std::unique_ptr<MatchPrinter> makePrinter(std::size_t groupCount) const {
         const MatchLabels labels{false, numbers_};
         if (replaceOption_.isGiven()) {
-            kvt::ex::Utf8String(kvt::ex::UStringView<0>(replacement_))
-                .getAsUtf32(); // which looks at every byte
+            requireUtf8("TEXT", replacement_);
             Replacement text(replacement_, groupCount);
             return only_ ? printReplacements(labels, std::move(text))
                          : printReplaced(labels, std::move(text));

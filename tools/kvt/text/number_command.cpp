@@ -10,10 +10,13 @@
 
 #include <kvt/codec/float_text.h>
 
+#include <nlohmann/json.hpp>
+
 #include <array>
 #include <charconv>
 #include <cmath>
 #include <memory>
+#include <optional>
 
 namespace host {
 
@@ -80,37 +83,62 @@ public:
         syntax.flag("--xml", xml_, "Spell the special values as XML Schema does: INF, -INF and NaN");
         syntax.flag("--single", single_, "Read and print single-precision numbers");
         lines_.declare(syntax);
+        syntax.flag("--json", json_, "Print a JSON object on a line for each number, failures included");
         syntax.operand("NUMBER", numbers_, "Numbers to print; those of standard input without any");
     }
 
     int run(Diagnostics& diagnostics) override {
         if (numbers_.empty()) {
-            return lines_.run(*this, false, diagnostics);
+            return lines_.run(*this, json_, diagnostics);
         }
         const std::unique_ptr<Output> output = openOutput(lines_.output());
+        bool isGood = true;
         for (std::size_t index = 0; index < numbers_.size(); ++index) {
-            try {
-                output->write(shortest(numbers_[index]) + "\n");
-            } catch (const Failure& failure) {
-                throw Failure("argument " + std::to_string(index + 1) + ": " + failure.what());
+            std::string out;
+            if (!append(numbers_[index], std::nullopt, out)) {
+                if (!json_) {
+                    throw Failure("argument " + std::to_string(index + 1) + ": " + reason_);
+                }
+                isGood = false;
             }
+            output->write(out);
         }
         output->commit();
-        return Done;
+        return isGood ? Done : NotDone;
     }
 
 private:
     // The lines of files.
     bool apply(const TextLine& line, std::string& out) override {
-        try {
-            out += shortest(line.text) + "\n";
-            return true;
-        } catch (const Failure& failure) {
-            out += "\n";
-            reason_ = failure.what();
-            return false;
-        }
+        return append(line.text, line.number, out);
     }
+
+    // Appends what becomes of a number. Whether it is one.
+    bool append(std::string_view text, std::optional<std::uint64_t> line, std::string& out) {
+        std::optional<std::string> result;
+        try {
+            result = shortest(text);
+        } catch (const Failure& failure) {
+            reason_ = failure.what();
+        }
+        if (json_) {
+            nlohmann::ordered_json object;
+            if (line) {
+                object["line"] = *line;
+            }
+            object["value"] = text;
+            object["result"] = result ? nlohmann::ordered_json(*result) : nullptr;
+            if (!result) {
+                object["message"] = reason_;
+            }
+            out += object.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace);
+        } else {
+            out += result.value_or("");
+        }
+        out += '\n';
+        return result.has_value();
+    }
+
     std::string_view kind() const override {
         return reason_.ends_with("numbers") ? "outside the range" : "not a number";
     }
@@ -139,6 +167,7 @@ private:
     std::string reason_;
     bool xml_ = false;
     bool single_ = false;
+    bool json_ = false;
 };
 
 } // namespace

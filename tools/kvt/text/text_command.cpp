@@ -1,6 +1,7 @@
 // `kvt text`: the string operations of the library on the lines of a text.
 
 #include "base/failure.h"
+#include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "text/file_options.h"
@@ -83,6 +84,12 @@ private:
         throw Failure("no operation");
     }
 
+    Statements form() const {
+        return records_                     ? Statements::Records
+               : files_.inputs().size() > 1 ? Statements::LinesWithFile
+                                            : Statements::Lines;
+    }
+
     CaseRule rule() const { return ignoreCase_ ? CaseRule::Ignore : CaseRule::Distinguish; }
 
     // An operation with what all have. Its own arguments stand before the files.
@@ -97,7 +104,12 @@ private:
         files_.declareEncoding(operation);
         files_.declare(operation);
         operation.setHelp(itsExamples, itsNotes.empty() ? notes : itsNotes + "\n\n" + notes);
-        operations_.emplace_back(&operation, make);
+        operations_.emplace_back(&operation, [arguments, make] {
+            for (const auto& [argument, value] : arguments) {
+                requireUtf8(argument, *value);
+            }
+            return make();
+        });
     }
 
     static std::string argumentMeaning(const std::string& argument) {
@@ -110,6 +122,10 @@ private:
 
     void declareIgnoreCase(const std::string& meaning) {
         operations_.back().first->flag("-i,--ignore-case", ignoreCase_, meaning);
+    }
+
+    void declareRecords(const std::string& meaning) {
+        operations_.back().first->flag("--json", records_, meaning);
     }
 
     void declareCase(Syntax& syntax, const std::string& name, const std::string& summary, CaseChange change) {
@@ -127,9 +143,9 @@ before; FILE: before it when there are several FILEs. Lines and columns are
 counted from 1, columns in characters, and a byte order mark is none. BYTE is
 where the place begins in the file as it is, whatever ENC is, from 0. Nothing is
 printed when nothing is found.)",
-                         {{"NEEDLE", &first_}},
-                         [this] { return findText(first_, rule(), files_.inputs().size() > 1); });
+                         {{"NEEDLE", &first_}}, [this] { return findText(first_, rule(), form()); });
         declareIgnoreCase("Find it in upper and lower case alike");
+        declareRecords("Print a JSON object on a line for each place");
     }
 
     void declareReplace(Syntax& syntax) {
@@ -173,8 +189,9 @@ kvt text hash --ignore-case --encoding UTF-16LE names.txt)",
                          R"(Prints 16 hexadecimal digits for each line: the hash that the library's UTF-8
 strings have, 64-bit FNV-1a. The same text has the same hash in every encoding.
 It is quick and not made to withstand anybody who wants two texts to agree.)",
-                         {}, [this] { return hashText(rule()); });
+                         {}, [this] { return hashText(rule(), form()); });
         declareIgnoreCase("Give texts that differ in case only the same hash");
+        declareRecords("Print a JSON object on a line for each line");
     }
 
     std::vector<std::pair<Syntax*, Make>> operations_;
@@ -182,6 +199,7 @@ It is quick and not made to withstand anybody who wants two texts to agree.)",
     std::string first_;
     std::string second_;
     bool ignoreCase_ = false;
+    bool records_ = false;
     bool skipEmpty_ = false;
     bool front_ = false;
     bool back_ = false;

@@ -6,6 +6,8 @@
 #include <kvt/string/ustring.h>
 #include <kvt/string/ustring_array.h>
 
+#include <nlohmann/json.hpp>
+
 #include <cstdint>
 #include <utility>
 
@@ -17,18 +19,11 @@ using kvt::ex::Utf32String;
 using kvt::ex::Utf8String;
 using View = kvt::ex::UStringView<kvt::ex::Encoding::Utf8>;
 
-// Text from the command line, which is only bytes until it has been looked at.
-Utf8String checked(const std::string& argument) {
-    const Utf8String text{View(argument)};
-    Utf32String{text};
-    return text;
-}
-
-Utf8String checkedNeedle(const std::string& argument, const char* name) {
+Utf8String needleOf(const std::string& argument, const char* name) {
     if (argument.empty()) {
         throw Failure(std::string(name) + " must not be empty");
     }
-    return checked(argument);
+    return Utf8String(View(argument));
 }
 
 std::size_t trailingZeros(std::string_view text) {
@@ -166,11 +161,22 @@ private:
 
 class Find : public TextOperation {
 public:
-    Find(Utf8String needle, CaseRule rule, bool showFile)
-        : matcher_(std::move(needle), rule), showFile_(showFile) {}
+    Find(Utf8String needle, CaseRule rule, Statements form)
+        : matcher_(std::move(needle), rule), form_(form) {}
     void apply(const TextLine& line, std::string& out) const override {
-        matcher_.forEach(line.text, [&](std::size_t position, std::size_t) {
-            appendPlace(line.placeOf(position), showFile_, out);
+        matcher_.forEach(line.text, [&](std::size_t position, std::size_t size) {
+            const Place place = line.placeOf(position);
+            if (form_ == Statements::Records) {
+                nlohmann::ordered_json record;
+                record["file"] = place.file;
+                record["line"] = place.line;
+                record["column"] = place.column;
+                record["offset"] = place.offset;
+                record["text"] = line.text.substr(position, size);
+                out += record.dump();
+            } else {
+                appendPlace(place, form_ == Statements::LinesWithFile, out);
+            }
             out += '\n';
         });
     }
@@ -179,7 +185,7 @@ public:
 
 private:
     Matcher matcher_;
-    bool showFile_;
+    Statements form_;
 };
 
 class Replace : public TextOperation {
@@ -238,20 +244,29 @@ private:
 
 class Hash : public TextOperation {
 public:
-    explicit Hash(CaseRule rule) : rule_(rule) {}
+    Hash(CaseRule rule, Statements form) : rule_(rule), form_(form) {}
     void apply(const TextLine& line, std::string& out) const override {
         const Utf8String text =
             rule_ == CaseRule::Ignore ? mapped(CaseChange::Fold, line.text) : Utf8String(View(line.text));
         const std::uint64_t hash = text.hash();
+        std::string digits;
         for (int shift = 60; shift >= 0; shift -= 4) {
-            out += "0123456789abcdef"[hash >> shift & 15];
+            digits += "0123456789abcdef"[hash >> shift & 15];
         }
-        out += '\n';
+        if (form_ == Statements::Records) {
+            nlohmann::ordered_json record;
+            record["file"] = line.file;
+            record["line"] = line.number;
+            record["hash"] = digits;
+            digits = record.dump();
+        }
+        out.append(digits) += '\n';
     }
     bool givesText() const override { return false; }
 
 private:
     CaseRule rule_;
+    Statements form_;
 };
 
 } // namespace
@@ -260,24 +275,24 @@ std::unique_ptr<TextOperation> changeCase(CaseChange change) {
     return std::make_unique<Case>(change);
 }
 
-std::unique_ptr<TextOperation> findText(const std::string& needle, CaseRule rule, bool showFile) {
-    return std::make_unique<Find>(checkedNeedle(needle, "NEEDLE"), rule, showFile);
+std::unique_ptr<TextOperation> findText(const std::string& needle, CaseRule rule, Statements form) {
+    return std::make_unique<Find>(needleOf(needle, "NEEDLE"), rule, form);
 }
 
 std::unique_ptr<TextOperation> replaceText(const std::string& from, const std::string& to, CaseRule rule) {
-    return std::make_unique<Replace>(checkedNeedle(from, "FROM"), checked(to), rule);
+    return std::make_unique<Replace>(needleOf(from, "FROM"), Utf8String(View(to)), rule);
 }
 
 std::unique_ptr<TextOperation> splitText(const std::string& delimiter, CaseRule rule, bool skipEmpty) {
-    return std::make_unique<Split>(checkedNeedle(delimiter, "DELIMITER"), rule, skipEmpty);
+    return std::make_unique<Split>(needleOf(delimiter, "DELIMITER"), rule, skipEmpty);
 }
 
 std::unique_ptr<TextOperation> stripText(const std::string& set, Side side) {
-    return std::make_unique<Strip>(Utf32String(checked(set)), side);
+    return std::make_unique<Strip>(Utf32String(Utf8String(View(set))), side);
 }
 
-std::unique_ptr<TextOperation> hashText(CaseRule rule) {
-    return std::make_unique<Hash>(rule);
+std::unique_ptr<TextOperation> hashText(CaseRule rule, Statements form) {
+    return std::make_unique<Hash>(rule, form);
 }
 
 void appendFolded(std::string_view text, std::string& out) {

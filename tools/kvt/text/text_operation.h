@@ -25,16 +25,18 @@ public:
 enum class CaseChange { Upper, Lower, Fold };
 enum class CaseRule { Distinguish, Ignore };
 enum class Side { Both, Front, Back };
+/// How what is found out about lines is written: as text on a line, places with the name of their file or without it, or
+/// as a JSON object on a line.
+enum class Statements { Lines, LinesWithFile, Records };
 
-/// All texts are UTF-8; these throw kvt::ex::UStringBadEncodingException for one that is not, and Failure for
-/// an empty one where something has to be found.
+/// All texts are UTF-8; these throw Failure for an empty one where something has to be found.
 std::unique_ptr<TextOperation> changeCase(CaseChange change);
 /// "LINE:COLUMN:BYTE" for each place, with "FILE:" before it if that is wanted.
-std::unique_ptr<TextOperation> findText(const std::string& needle, CaseRule rule, bool showFile);
+std::unique_ptr<TextOperation> findText(const std::string& needle, CaseRule rule, Statements form);
 std::unique_ptr<TextOperation> replaceText(const std::string& from, const std::string& to, CaseRule rule);
 std::unique_ptr<TextOperation> splitText(const std::string& delimiter, CaseRule rule, bool skipEmpty);
 std::unique_ptr<TextOperation> stripText(const std::string& set, Side side);
-std::unique_ptr<TextOperation> hashText(CaseRule rule);
+std::unique_ptr<TextOperation> hashText(CaseRule rule, Statements form);
 
 /// Appends the form that texts share which differ in case only, by full Unicode case folding. Each character folds
 /// for itself, so that a text may be folded in pieces.

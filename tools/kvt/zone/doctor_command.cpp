@@ -6,6 +6,7 @@
 #include "base/text.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
+#include "cli/output_option.h"
 #include "zone/machine_zone.h"
 #include "zone/zone_files.h"
 #include "zone/zone_folder.h"
@@ -32,7 +33,7 @@ namespace {
 namespace fs = std::filesystem;
 namespace datetime = kvt::ex::datetime;
 
-// Below this a folder is no place for a backing file of any size.
+// Below this a folder is not a place for a backing file of any size.
 constexpr std::uint64_t littleSpace = std::uint64_t{1} << 30;
 
 constexpr const char* examples = R"(kvt doctor
@@ -268,6 +269,7 @@ public:
                       "Folder with the zone database; without this option ~/Downloads/tzdata, or else one "
                       "that the command keeps in the cache");
         syntax.flag("--json", json_, "Print a JSON array of objects");
+        declareOutput(syntax, output_);
     }
 
     int run(Diagnostics&) override {
@@ -279,7 +281,7 @@ public:
             databaseFolder(zones), databaseVersion(folder), databaseFiles(folder),
             localTime(),           temporarySpace(),        freeSpace(".", "for files in this folder"),
         };
-        print(json_ ? asJson(findings) : asTable(findings));
+        print(json_ ? asJson(findings) : asTable(findings), output_);
         for (const Finding& finding : findings) {
             if (!finding.warning.empty()) {
                 return DoneWithLosses;
@@ -290,6 +292,7 @@ public:
 
 private:
     std::string folder_;
+    std::string output_;
     bool json_ = false;
 };
 
