@@ -59,6 +59,10 @@ versioned() {
 
 command() {
     "$prefix/bin/kvt" --version
+    for page in man/man1/kvt.1 man/man1/kvt-convert.1 bash-completion/completions/kvt zsh/site-functions/_kvt \
+        fish/vendor_completions.d/kvt.fish; do
+        [[ -s $prefix/share/$page ]]
+    done
 }
 
 case $6 in

@@ -234,7 +234,7 @@ void Accounts::finish() {
 
 void Accounts::printSummary(Diagnostics& diagnostics) const {
     if (isStopped_) {
-        diagnostics.say(stopReason_);
+        diagnostics.fail(stopReason_);
     }
     diagnostics.say(counted(counts_.read, "row", "rows") + " read, " + std::to_string(counts_.written) +
                     " written, " + std::to_string(counts_.rejected) + " rejected, " +
