@@ -103,7 +103,7 @@ public:
             if (block.empty()) {
                 return;
             }
-            if (canGoOn && loseKnown(block, out, onLoss)) {
+            if (canGoOn && holdsNothing() && loseKnown(block, out, onLoss)) {
                 continue;
             }
             const std::string_view slice = block.substr(0, sliceBytes);
@@ -295,7 +295,7 @@ std::size_t StreamTranscoder::Impl::convertTracing(std::string_view slice, std::
 // way each time, so that ICU need not be asked again.
 bool StreamTranscoder::Impl::loseKnown(std::string_view& block, std::string& out, const LossHandler& onLoss) {
     const std::size_t size = block.size();
-    while (!known_.isEmpty() && holdsNothing()) {
+    while (!known_.isEmpty()) {
         // What is known is whole, and the same bytes are the same character.
         const std::size_t length = fromSide_.form == Form::utf8 && !block.empty()
                                        ? detail::utf8Length(block.front())
