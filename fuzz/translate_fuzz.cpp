@@ -110,6 +110,9 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
         requireTable(plan, whole.output, whole.counts.written, worker->layout().columns().size());
     }
 
+    if (host::unitsOf(plan.from.encoding).width != 1) {
+        return 0;
+    }
     host::RowBorders borders(plan.in);
     borders.add(text.substr(0, text.size() / 2));
     const auto cut = static_cast<std::size_t>(borders.border());

@@ -375,6 +375,39 @@ TEST_F(KvtTranslateLarge, PartsInOrderAreTheWhole) {
     }
 }
 
+TEST_F(KvtTranslateLarge, WideUnitsAndCharactersOfTwoBytesAreCutAsWell) {
+    write("in.csv", makeInput(5));
+    ASSERT_EQ(kvt({"convert", "--from", "windows-1252", "--to", "UTF-8", "--on-error", "replace",
+                   path("in.csv"), "-o", path("utf8.csv")})
+                  .status,
+              0);
+    for (const std::string encoding : {"UTF-16LE", "UTF-16BE", "UTF-32LE", "UTF-32BE", "GB18030", "EUC-JP"}) {
+        ASSERT_LE(kvt({"convert", "--from", "UTF-8", "--to", encoding, "--on-error", "replace",
+                       path("utf8.csv"), "-o", path("wide.csv")})
+                      .status,
+                  1);
+        const auto run = [&](const std::string& name, std::vector<std::string> more) {
+            more.insert(more.begin(), {"--from", encoding, "--delimiter", ";", "--date", "day=%d.%m.%Y",
+                                       "--reject", path(name + ".bad"), "--report", path(name + ".jsonl"),
+                                       "-o", path(name + ".csv"), path("wide.csv")});
+            const ChildResult result = translate("", more);
+            EXPECT_LE(result.status, 1) << encoding << result.err;
+            return read(name + ".csv") + read(name + ".bad") + read(name + ".jsonl");
+        };
+        const std::string whole = run("whole", {"--threads", "1"});
+        EXPECT_TRUE(run("four", {"--threads", "4"}) == whole) << encoding;
+        std::string outputs;
+        std::string rest[2];
+        for (const std::string number : {"1", "2", "3"}) {
+            run("part", {"--part", number + "/3"});
+            outputs += read("part.csv");
+            rest[0] += read("part.bad");
+            rest[1] += read("part.jsonl");
+        }
+        EXPECT_TRUE(outputs + rest[0] + rest[1] == whole) << encoding;
+    }
+}
+
 TEST_F(KvtTranslateLarge, MorePartsThanRows) {
     write("small.csv", "a,b\n1,2\n3,4\n");
     std::string output;

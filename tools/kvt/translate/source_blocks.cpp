@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <array>
+#include <limits>
 
 namespace host {
 
@@ -27,7 +28,7 @@ std::string decoded(Encoding encoding, std::string_view bytes) {
 
 // Tried out: each of the bytes alone, and behind each byte that may begin a longer character.
 bool isCutUndecoded(Encoding encoding, const RowForm& form) {
-    if (encoding.evaluate() == Encoding::Utf8) {
+    if (encoding.evaluate() == Encoding::Utf8 || unitsOf(encoding).width != 1) {
         return true;
     }
     const std::string name(encoding.getName());
@@ -46,6 +47,21 @@ bool isCutUndecoded(Encoding encoding, const RowForm& form) {
         }
     }
     return true;
+}
+
+Units unitsOf(Encoding encoding) {
+    switch (encoding.evaluate()) {
+    case Encoding::Utf16LE:
+        return {2, 0};
+    case Encoding::Utf16BE:
+        return {2, 1};
+    case Encoding::Utf32LE:
+        return {4, 0};
+    case Encoding::Utf32BE:
+        return {4, 3};
+    default:
+        return {1, 0};
+    }
 }
 
 SourceBlocks::SourceBlocks(const Plan& plan, std::vector<std::string> paths, const std::optional<Part>& part,
@@ -69,7 +85,9 @@ bool SourceBlocks::open() {
     }
     encoding_ = source_->encoding();
     const std::uint64_t size = part_ ? totalSize({path}).value_or(0) : 0;
+    units_ = unitsOf(encoding_);
     borders_.emplace(plan_.in);
+    partOfUnit_.clear();
     decoder_.reset();
     if (!isCutUndecoded(encoding_, plan_.in)) {
         decoder_.emplace(encoding_, Encoding::Utf8);
@@ -93,8 +111,9 @@ bool SourceBlocks::open() {
         };
         partBegin_ = cut(part_->number - 1);
         partEnd_ = cut(part_->number);
-        borders_->watch(partBegin_);
-        borders_->watch(partEnd_);
+        for (const std::uint64_t limit : {partBegin_, partEnd_}) {
+            borders_->watch((limit + units_.width - 1) / units_.width);
+        }
     }
     return true;
 }
@@ -102,7 +121,7 @@ bool SourceBlocks::open() {
 void SourceBlocks::take(std::string_view bytes) {
     if (!decoder_) {
         text_ += bytes;
-        borders_->add(bytes);
+        seekBorders(bytes);
         return;
     }
     const std::size_t before = text_.size();
@@ -116,6 +135,32 @@ void SourceBlocks::take(std::string_view bytes) {
     }
     undecoded_ += bytes;
     borders_->add(std::string_view(text_).substr(before));
+}
+
+// Of wider units, a byte is enough: what is not ASCII is none of the characters that count.
+void SourceBlocks::seekBorders(std::string_view bytes) {
+    if (units_.width == 1) {
+        borders_->add(bytes);
+        return;
+    }
+    partOfUnit_ += bytes;
+    unitBytes_.clear();
+    std::size_t at = 0;
+    for (; at + units_.width <= partOfUnit_.size(); at += units_.width) {
+        char low = partOfUnit_[at + units_.lowest];
+        for (std::size_t index = 0; index < units_.width; ++index) {
+            low = index != units_.lowest && partOfUnit_[at + index] != '\0' ? '\xFF' : low;
+        }
+        unitBytes_ += low;
+    }
+    partOfUnit_.erase(0, at);
+    borders_->add(unitBytes_);
+}
+
+// The first border there; none yet is beyond everything. No border is counted at 0, where a row begins.
+std::uint64_t SourceBlocks::borderBehind(std::uint64_t limit) const {
+    const auto border = borders_->firstBehind((limit + units_.width - 1) / units_.width);
+    return limit == 0 ? 0 : border ? *border * units_.width : std::numeric_limits<std::uint64_t>::max();
 }
 
 // Nothing is the end of the file.
@@ -137,7 +182,7 @@ void SourceBlocks::decode(std::string_view bytes) {
 // Reads on until there is a block, or the end.
 void SourceBlocks::fill() {
     for (;;) {
-        if (isAtEnd_ || (borders_->border() > begin_ && text_.size() >= blockSize)) {
+        if (isAtEnd_ || (border() > begin_ && text_.size() >= blockSize)) {
             return;
         }
         if (text_.size() > longestRow + 2 * blockSize) {
@@ -148,7 +193,7 @@ void SourceBlocks::fill() {
         taken_ += bytes.size();
         isAtEnd_ = bytes.empty();
         take(bytes);
-        if (borders_->border() > begin_ && bytes.size() < Input::blockSize) {
+        if (border() > begin_ && bytes.size() < Input::blockSize) {
             return; // somebody may be typing
         }
     }
@@ -158,7 +203,8 @@ void SourceBlocks::refuseLongRow() const {
     const std::string limit = std::to_string(longestRow / 1024 / 1024) + " MiB";
     if (borders_->isWithinQuotes()) {
         throw Failure(name_ + ": the quote that opens at byte " +
-                      std::to_string(skipped_ + borders_->openQuote()) + " is not closed within " + limit);
+                      std::to_string(skipped_ + borders_->openQuote() * units_.width) +
+                      " is not closed within " + limit);
     }
     throw Failure(name_ + ": the row that begins at byte " + std::to_string(skipped_ + begin_) +
                   " is longer than " + limit);
@@ -200,21 +246,18 @@ bool SourceBlocks::next(SourceBlock& block) {
             }
         }
         fill();
-        std::uint64_t end = isAtEnd_ ? begin_ + text_.size() : borders_->border();
+        std::uint64_t end = isAtEnd_ ? begin_ + text_.size() : border();
         block.isOutside = false;
         if (part_) {
-            // Borders are counted from behind the mark, and so the limits may be. No border is at 0, where a row begins.
-            const auto borderAt = [&](std::uint64_t limit) {
-                return limit == 0 ? std::optional<std::uint64_t>(0) : borders_->firstBehind(limit);
-            };
-            const auto first = borderAt(partBegin_);
-            const auto last = borderAt(partEnd_);
-            block.isOutside = !first || begin_ < *first;
-            if (!block.isOutside && last && begin_ >= *last) {
+            // Borders are counted from behind the mark, and so the limits may be.
+            const std::uint64_t first = borderBehind(partBegin_);
+            const std::uint64_t last = borderBehind(partEnd_);
+            block.isOutside = begin_ < first;
+            if (!block.isOutside && begin_ >= last) {
                 source_.reset();
                 return false;
             }
-            end = block.isOutside ? std::min(end, first.value_or(end)) : std::min(end, last.value_or(end));
+            end = std::min(end, block.isOutside ? first : last);
         }
         if (end != begin_) {
             give(block, end);

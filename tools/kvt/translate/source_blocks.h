@@ -49,6 +49,13 @@ struct SourceBlock {
 /// Whether blocks of a text in that encoding are bytes as they were read.
 bool isCutUndecoded(kvt::ex::Encoding encoding, const RowForm& form);
 
+/// The units of an encoding, as far as ASCII goes: of one byte, but for the forms of Unicode that have wider ones.
+struct Units {
+    std::size_t width;  ///< bytes
+    std::size_t lowest; ///< which of them has the lowest bits
+};
+Units unitsOf(kvt::ex::Encoding encoding);
+
 class SourceBlocks {
 public:
     /// A part is that of the one input. No file is read that `output`, if there is one, writes to in place. Throws Failure.
@@ -68,6 +75,10 @@ private:
     bool open();
     void fill();
     void take(std::string_view bytes);
+    void seekBorders(std::string_view bytes);
+    /// In bytes.
+    std::uint64_t border() const { return borders_->border() * units_.width; }
+    std::uint64_t borderBehind(std::uint64_t limit) const;
     void decode(std::string_view bytes);
     void give(SourceBlock& block, std::uint64_t end);
     [[noreturn]] void refuseLongRow() const;
@@ -81,7 +92,10 @@ private:
     kvt::ex::Encoding encoding_;
 
     std::optional<Source> source_;
-    std::optional<RowBorders> borders_;
+    Units units_{1, 0};
+    std::optional<RowBorders> borders_; ///< counted in units
+    std::string unitBytes_;             ///< the lowest bytes of units
+    std::string partOfUnit_;            ///< with which the text ends so far
     std::optional<kvt::ex::StreamTranscoder> decoder_;
     std::uint64_t skipped_ = 0; ///< bytes of the mark
     std::string text_;          ///< that was read and not given out
