@@ -161,11 +161,12 @@ words kvt sort -o fir
 words kvt --ver
 words kvt nosuch ''
 words kvt match sort --dia
+words kvt convert --bom ''
 )";
     const ChildResult result = run({"bash", "--norc", "-c", script});
     EXPECT_EQ(result.err, "");
     const std::vector<std::string> lines = linesOf(result.out);
-    ASSERT_EQ(lines.size(), 19u) << result.out;
+    ASSERT_EQ(lines.size(), 20u) << result.out;
     EXPECT_EQ(lines[0], "complete -F _kvt kvt");
     EXPECT_EQ(lines[1], "match");
     EXPECT_EQ(lines[2], "zone");
@@ -186,6 +187,7 @@ words kvt match sort --dia
     EXPECT_EQ(lines[16], "--version");
     EXPECT_TRUE(contains(lines[17], "convert|")) << lines[17];
     EXPECT_EQ(lines[18], "--dialect");
+    EXPECT_EQ(lines[19], "skip|keep|strip|add");
 }
 
 TEST_F(KvtPages, ZshReadsItsCompletion) {

@@ -75,15 +75,19 @@ public:
                     "Encoding of the output; with --dry-run, several with commas between them")
             .required();
         onErrorOption_ =
-            syntax.option("--on-error", onError_, "WHAT",
-                          "What a loss does: 'stop' ends the conversion without a result (default), "
-                          "'replace' puts a substitution in its place, 'report' does so too and tells "
-                          "of every loss, 'transliterate' writes what --to lacks in Latin letters where it "
-                          "has those, and else replaces it");
+            syntax
+                .option("--on-error", onError_, "WHAT",
+                        "What a loss does: 'stop' ends the conversion without a result (default), "
+                        "'replace' puts a substitution in its place, 'report' does so too and tells "
+                        "of every loss, 'transliterate' writes what --to lacks in Latin letters where it "
+                        "has those, and else replaces it")
+                .takes(wordsOf(errorChoices));
         syntax.option("--fallback", fallback_, "ENC",
                       "Read a line that is not valid in --from in this encoding");
-        syntax.option("--normalize", normalization_, "FORM",
-                      "Bring the text into a form of Unicode normalization: 'nfc' or 'nfkc'");
+        syntax
+            .option("--normalize", normalization_, "FORM",
+                    "Bring the text into a form of Unicode normalization: 'nfc' or 'nfkc'")
+            .takes(wordsOf(normalizationChoices));
         syntax.option("--report", options_.report, "FILE",
                       "Write the report to FILE, one JSON object on each line, instead of to standard error; "
                       "implies --on-error report");
@@ -92,7 +96,8 @@ public:
         syntax.flag("--dry-run", dryRun_,
                     "Write nothing; print the encodings of --to, best first, with what each "
                     "would lose");
-        syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'skip' (default), 'keep', 'strip' or 'add'");
+        syntax.option("--bom", mark_, "WHAT", "Byte order marks: 'skip' (default), 'keep', 'strip' or 'add'")
+            .takes(wordsOf(markChoices));
         files_.declare(syntax, "Files to convert; '-' is standard input, the default");
     }
 
