@@ -78,8 +78,8 @@ public:
             syntax
                 .option("--on-error", onError_, "WHAT",
                         "What a loss does: 'stop' ends the conversion without a result (default), "
-                        "'replace' puts a substitution in its place, 'report' does so too and tells "
-                        "of every loss, 'transliterate' writes what --to lacks in Latin letters where it "
+                        "'replace' puts a substitution in its place, 'report' does so too and reports "
+                        "every loss, 'transliterate' writes what --to lacks in Latin letters where it "
                         "has those, and else replaces it")
                 .takes(wordsOf(errorChoices));
         syntax.option("--fallback", fallback_, "ENC",

@@ -26,14 +26,14 @@ public:
         Place place;
         std::uint64_t count = 0;
         std::uint64_t order = 0;               ///< how many entries came before it
-        std::optional<std::u32string> written; ///< in its place, where that is no substitution
+        std::optional<std::u32string> written; ///< in its place; empty where a substitution was
     };
     static constexpr std::size_t mostEntries = 1000;
 
     /// Adds a loss. Places cost time, so `place` is called only for a first one.
     void add(const kvt::ex::Loss& loss, const std::function<Place()>& place,
              const std::optional<std::u32string>& written = std::nullopt);
-    /// Adds lines that were read in another encoding, which is no loss.
+    /// Adds lines that were read in another encoding. That is not a loss.
     void addFallbackLines(std::uint64_t count, const Place& first);
     std::uint64_t fallbackLines() const { return fallbackLines_; }
     const Place& firstFallback() const { return firstFallback_; }

@@ -24,7 +24,7 @@ public:
     struct Change {
         kvt::ex::Loss loss;
         std::size_t source;                    ///< of the character, in the piece
-        std::optional<std::u32string> written; ///< in its place, where that is no substitution
+        std::optional<std::u32string> written; ///< in its place; empty for a substitution
     };
     /// All that is lost, bad input with it, in order; replaces in the piece's text what is transliterated.
     std::vector<Change> changes(TextPiece& piece);

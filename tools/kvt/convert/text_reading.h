@@ -85,7 +85,7 @@ private:
     std::string bytes_; ///< from bytesBegin_ on: of what is undecided or undelivered
     std::uint64_t bytesBegin_ = 0;
     ReadCharacters undecided_; ///< from the beginning of a line on
-    std::size_t searched_ = 0; ///< how many of them are no line end
+    std::size_t searched_ = 0; ///< how many of them are known not to end a line
     bool isLong_ = false;      ///< the line under way is not read again
     ReadCharacters decided_;
     std::vector<kvt::ex::Loss> undecidedBad_;

@@ -21,7 +21,7 @@ public:
 
     /// Whether what begins with the character is the same whatever stands before it.
     bool hasBoundaryBefore(char32_t character) const;
-    /// Whether a text has the character in any case, and unchanged.
+    /// Whether the character stays as it is, whatever stands around it.
     bool isInert(char32_t character) const;
     std::u32string normalized(std::u32string_view text) const;
 
