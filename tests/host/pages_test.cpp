@@ -80,7 +80,7 @@ TEST_F(KvtPages, EveryCommandHasAManualPageWithAllItsOptions) {
         ASSERT_TRUE(help.starts_with("Example:")) << file;
         for (auto found = std::sregex_iterator(help.begin(), help.end(), option);
              found != std::sregex_iterator(); ++found) {
-            for (const int group : {2, 3}) {
+            for (const std::size_t group : {2u, 3u}) {
                 const std::string name = (*found)[group];
                 if (!name.empty()) {
                     ++options;
