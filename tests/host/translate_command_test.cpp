@@ -250,6 +250,13 @@ TEST_F(KvtTranslate, RejectedRowsGoThroughTheSameJobOnceTheyAreMended) {
     EXPECT_EQ(out("", job), "k;d\nü;20200302\n");
 }
 
+TEST_F(KvtTranslate, RejectedRowsOfSeveralFilesStayApart) {
+    write("one", "k,d\n1,x");
+    write("two", "k,d\n2,y");
+    EXPECT_EQ(translate("", {"--date", "d=ISO", "--reject", path("bad"), path("one"), path("two")}).status, 1);
+    EXPECT_EQ(read("bad"), "k,d\n1,x\n2,y");
+}
+
 TEST_F(KvtTranslate, PlacesAreThoseInTheFile) {
     // Two bytes of UTF-8 for one of the file, and the other way round.
     const auto offset = [&](const std::string& from, const std::string& input) {

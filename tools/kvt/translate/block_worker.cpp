@@ -29,6 +29,14 @@ std::string shownRow(std::string_view row) {
     return std::string(row.substr(0, length));
 }
 
+std::string encoded(std::string_view text, Encoding to) {
+    std::string out;
+    kvt::ex::StreamTranscoder encoder(Encoding::Utf8, to);
+    encoder.convert(text, out, {});
+    encoder.finish(out, {});
+    return out;
+}
+
 std::string escaped(std::string_view bytes) {
     std::string text;
     for (const char byte : bytes) {
@@ -381,8 +389,12 @@ void BlockWorker::placeFailures(const SourceBlock& block, BlockResult& result) {
         failure.offset += block.offset;
     }
     for (std::size_t index = 0; index < rows.size(); ++index) {
-        (rejectedRows_[index].isHeader ? result.rejectedHeader : result.rejected) +=
-            asItStood(block, rows[index].first, rows[index].second);
+        std::string& to = rejectedRows_[index].isHeader ? result.rejectedHeader : result.rejected;
+        to += asItStood(block, rows[index].first, rows[index].second);
+        const char last = rejectedRows_[index].end[-1];
+        if (block.isMoreToCome && last != '\n' && last != '\r') {
+            to += encoded("\n", block.encoding);
+        }
     }
 }
 
@@ -393,11 +405,7 @@ std::string BlockWorker::asItStood(const SourceBlock& block, std::uint64_t begin
     if (!block.isDecoded) {
         return std::string(text);
     }
-    std::string source;
-    kvt::ex::StreamTranscoder back(Encoding::Utf8, block.encoding);
-    back.convert(text, source, {});
-    back.finish(source, {});
-    return source;
+    return encoded(text, block.encoding);
 }
 
 } // namespace host

@@ -96,7 +96,7 @@ private:
     std::string encoded_;
     std::string encodedHeader_;
     std::string decoded_;
-    std::string room_;               ///< of byteDecoder_
+    std::string room_;               ///< of byteDecoder_ and validator_
     std::string_view text_;          ///< of the block, in UTF-8
     std::vector<PlacedLoss> losses_; ///< of decoding it
     std::size_t nextLoss_ = 0;

@@ -295,20 +295,23 @@ DateReader::Form DateReader::makeForm(const std::string& typed) const {
 }
 
 bool DateReader::read(std::string_view text, std::string& out, Problem& problem) {
+    const bool isOnly = forms_.size() == 1;
+    Misfit best;
     for (const Form& form : forms_) {
-        if ((form.fixed && form.fixed->read(text, out)) || readBy(form, text, out, nullptr)) {
+        if ((form.fixed && form.fixed->read(text, out)) ||
+            readBy(form, text, out, isOnly ? &best : nullptr)) {
             return true;
         }
     }
-    std::size_t best = 0;
-    for (const Form& form : forms_) {
+    // Why is asked when nothing fits.
+    for (auto form = forms_.begin(); !isOnly && form != forms_.end(); ++form) {
         Misfit misfit;
-        readBy(form, text, out, &misfit);
-        if (misfit.fit > best || problem.text.empty()) {
-            best = misfit.fit;
-            problem = std::move(misfit.problem);
+        readBy(*form, text, out, &misfit);
+        if (misfit.fit > best.fit || form == forms_.begin()) {
+            best = std::move(misfit);
         }
     }
+    problem = std::move(best.problem);
     return false;
 }
 
