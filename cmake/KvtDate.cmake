@@ -32,3 +32,4 @@ set_target_properties(kvt_date PROPERTIES
     POSITION_INDEPENDENT_CODE ON
     CXX_VISIBILITY_PRESET hidden
     VISIBILITY_INLINES_HIDDEN ON)
+kvt_harden(kvt_date)

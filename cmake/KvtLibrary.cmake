@@ -27,6 +27,7 @@ target_link_libraries(kvt_objects PRIVATE kvt_highway_headers)
 # What the library exports and calls itself is not replaced by a program, and may be inlined.
 target_compile_options(kvt_objects PRIVATE -fno-semantic-interposition)
 kvt_warnings(kvt_objects)
+kvt_harden(kvt_objects)
 
 add_library(kvt SHARED)
 add_library(kvt::kvt ALIAS kvt)
@@ -41,6 +42,7 @@ target_link_options(kvt PRIVATE
     LINKER:-Bsymbolic-functions
     # The system calls back into it at the end of each thread that has converted text.
     LINKER:-z,nodelete)
+kvt_harden(kvt)
 if(NOT KVT_SANITIZE) # a sanitizer's run-time is in the program, not in its libraries
     target_link_options(kvt PRIVATE LINKER:--no-undefined)
 endif()
