@@ -87,6 +87,13 @@ TEST_F(InferCommand, ProposesAJobThatTranslateTakes) {
               "name;born;paid\r\nM\xC3\xBCller;1999-12-31;1234.50\r\nJ\xC3\xB6rg;2020-01-02;12.5\r\n");
 }
 
+TEST_F(InferCommand, ProposesAPivotForYearsOfTwoDigits) {
+    write("a.csv", "day,n\n31.12.99,x\n01.02.03,y\n");
+    ASSERT_EQ(kvt({"infer", path("a.csv"), "-o", path("job.toml")}).status, 0);
+    EXPECT_EQ(kvt({"translate", "--job", path("job.toml"), path("a.csv")}).out,
+              "day,n\n1999-12-31,x\n2003-02-01,y\n");
+}
+
 TEST_F(InferCommand, TranslateExplainsWhatAJobDoes) {
     write("a.csv", "d,n\n01.02.2020,x\nbad,y\n1.1.2021,z\n");
     const auto result =

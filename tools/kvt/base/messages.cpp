@@ -1,6 +1,7 @@
 #include "base/messages.h"
 
 #include "base/text.h"
+#include "base/text_units.h"
 
 #include <kvt/foundation/throwable.h>
 
@@ -13,10 +14,6 @@
 namespace host {
 
 namespace {
-
-bool isDigit(char character) {
-    return character >= '0' && character <= '9';
-}
 
 // Calls onText for the pieces of `text` and onPlaceholder for the numbers between them, in order.
 template <typename OnText, typename OnPlaceholder>

@@ -1,15 +1,10 @@
 #include "infer/column_guess.h"
 
+#include "base/text_units.h"
+
 namespace host {
 
 namespace {
-
-std::string_view trimmed(std::string_view text) {
-    constexpr std::string_view blanks = " \t";
-    const std::size_t first = text.find_first_not_of(blanks);
-    return first == std::string_view::npos ? std::string_view()
-                                           : text.substr(first, text.find_last_not_of(blanks) + 1 - first);
-}
 
 void keepFirst(std::string& example, std::string_view cell) {
     constexpr std::size_t longest = 60;

@@ -1,5 +1,7 @@
 #include "infer/date_guess.h"
 
+#include "base/text_units.h"
+
 #include <kvt/datetime/datetime.h>
 
 #include <algorithm>
@@ -12,13 +14,6 @@ namespace host {
 namespace {
 
 using kvt::ex::UString;
-
-bool isDigit(char c) {
-    return c >= '0' && c <= '9';
-}
-bool isLetter(char c) {
-    return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z');
-}
 
 // The runs of a text: "2/Jan/2020 13:14:15.5" is "d/a/y d:d:d.f". A number of one or two digits is d, of four y, of
 // others n; behind a point that follows seconds it is f, which no form names. Letters are a; T and Z alone stay.

@@ -1,14 +1,12 @@
 #include "infer/number_guess.h"
 
+#include "base/text_units.h"
+
 #include <algorithm>
 
 namespace host {
 
 namespace {
-
-bool isDigit(char c) {
-    return c >= '0' && c <= '9';
-}
 
 std::size_t digitsOf(std::string_view text) {
     return static_cast<std::size_t>(std::find_if_not(text.begin(), text.end(), isDigit) - text.begin());

@@ -235,6 +235,11 @@ private:
         }
         beginStep("date", index);
         set("format", list(formats));
+        if (std::any_of(formats.begin(), formats.end(),
+                        [](const std::string& format) { return format.find("%y") != std::string::npos; })) {
+            remark("Years of two digits: those from this one on are of the last century.");
+            set("pivot", "50");
+        }
         out_ += "[[step]]\n";
         set("do", tomlString("write-date"));
         set("column", tomlString(columnName(index)));

@@ -57,10 +57,6 @@ std::size_t wholeCharacters(std::string_view text, std::size_t most) {
     return size;
 }
 
-bool isDigit(char byte) {
-    return byte >= '0' && byte <= '9';
-}
-
 std::string_view withoutBlanks(std::string_view text) {
     constexpr std::string_view blanks = " \t\r";
     const std::size_t first = std::min(text.find_first_not_of(blanks), text.size());

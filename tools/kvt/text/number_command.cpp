@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/output.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "cli/command.h"
 #include "cli/exit_status.h"
 #include "text/line_reader.h"
@@ -44,13 +45,6 @@ Exit status:
   0  done
   1  done, but some lines failed
   2  not done)";
-
-std::string_view trimmed(std::string_view text) {
-    constexpr std::string_view blanks = " \t";
-    const std::size_t first = text.find_first_not_of(blanks);
-    return first == std::string_view::npos ? std::string_view()
-                                           : text.substr(first, text.find_last_not_of(blanks) + 1 - first);
-}
 
 // Throws Failure, with the text but no place.
 template <typename Number>

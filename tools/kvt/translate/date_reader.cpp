@@ -2,6 +2,7 @@
 
 #include "base/failure.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "date/function.h"
 #include "date/outcome.h"
 #include "translate/icu_data.h"
@@ -23,14 +24,6 @@ namespace message_number = datetime::message_number;
 constexpr std::array<const char*, 12> englishMonths = {"January",   "February", "March",    "April",
                                                        "May",       "June",     "July",     "August",
                                                        "September", "October",  "November", "December"};
-
-constexpr bool isDigit(char byte) {
-    return byte >= '0' && byte <= '9';
-}
-
-constexpr bool isLetter(char byte) {
-    return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z');
-}
 
 // The first element of a pattern: a flag, or a character.
 std::string_view elementOf(std::string_view pattern) {

@@ -2,6 +2,7 @@
 
 #include "base/failure.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "translate/icu_data.h"
 
 #include <algorithm>
@@ -15,10 +16,6 @@ namespace {
 const std::vector<std::string> spaces = {" ", "\u00A0", "\u2007", "\u2009", "\u202F"};
 const std::vector<std::string> apostrophes = {"'", "\u2019"};
 constexpr std::string_view minusSign = "\u2212";
-
-constexpr bool isDigit(char byte) {
-    return byte >= '0' && byte <= '9';
-}
 
 constexpr bool isCapital(char byte) {
     return byte >= 'A' && byte <= 'Z';
