@@ -170,10 +170,12 @@ TEST_F(KvtConvert, OptionsThatContradictEachOtherAreRefused) {
     };
     const std::vector<Row> rows = {
         {{"--on-error", "stpo"},
-         "kvt: --on-error takes one of stop, replace, report, transliterate, not 'stpo'. Did you mean 'stop'?\n"},
+         "kvt: --on-error takes one of stop, replace, report, transliterate, not 'stpo'. Did you mean "
+         "'stop'?\n"},
         {{"--bom", "remove"}, "kvt: --bom takes one of skip, keep, strip, add, not 'remove'.\n"},
         {{"--bom", "\x1B[2J"}, "kvt: --bom takes one of skip, keep, strip, add, not '\\x1B[2J'.\n"},
-        {{"--report", "r", "--on-error", "stop"}, "kvt: --report goes with --on-error report or transliterate only\n"},
+        {{"--report", "r", "--on-error", "stop"},
+         "kvt: --report goes with --on-error report or transliterate only\n"},
         {{"--report", "-"}, "kvt: the report goes to a file or, without --report, to standard error\n"},
         {{"--report", "same", "-o", "same"}, "kvt: the report needs a file of its own: same\n"},
         {{"--report", "./in", "in"}, "kvt: the report needs a file of its own: ./in\n"},

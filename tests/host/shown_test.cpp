@@ -131,8 +131,9 @@ TEST_F(KvtShown, TheDemoIsTheTutorialAndTheStory) {
     EXPECT_EQ(result.out, story);
     EXPECT_TRUE(names().empty());
     // Each of the commands that it is about has its part in it.
-    for (const char* part : {"$ kvt infer ", "$ kvt translate ", "$ kvt convert ", "kvt match ", "kvt date parse ", "$ kvt date why ",
-                             "$ kvt sort ", "$ kvt unique ", "losses.jsonl"}) {
+    for (const char* part :
+         {"$ kvt infer ", "$ kvt translate ", "$ kvt convert ", "kvt match ", "kvt date parse ",
+          "$ kvt date why ", "$ kvt sort ", "$ kvt unique ", "losses.jsonl"}) {
         EXPECT_TRUE(contains(story, part)) << part;
     }
 }

@@ -15,8 +15,8 @@ using ex::Encoding;
 
 TEST(ByteDecoder, GivesWhatTheTranscoderGives) {
     std::mt19937 random(5);
-    for (const char* name : {"windows-1252", "ISO-8859-1", "KOI8-R", "windows-1255", "windows-874", "windows-1251",
-                             "macintosh", "ISO-8859-8", "US-ASCII"}) {
+    for (const char* name : {"windows-1252", "ISO-8859-1", "KOI8-R", "windows-1255", "windows-874",
+                             "windows-1251", "macintosh", "ISO-8859-8", "US-ASCII"}) {
         const Encoding encoding(name);
         const auto decoder = host::ByteDecoder::of(encoding);
         ASSERT_TRUE(decoder) << name;
@@ -40,7 +40,8 @@ TEST(ByteDecoder, GivesWhatTheTranscoderGives) {
 }
 
 TEST(ByteDecoder, IsForNoOtherEncodings) {
-    for (const char* name : {"UTF-8", "UTF-16LE", "Shift_JIS", "IBM037", "IBM437", "IBM437", "UTF-7", "ISO-2022-JP"}) {
+    for (const char* name :
+         {"UTF-8", "UTF-16LE", "Shift_JIS", "IBM037", "IBM437", "IBM437", "UTF-7", "ISO-2022-JP"}) {
         EXPECT_FALSE(host::ByteDecoder::of(Encoding(name))) << name;
     }
 }

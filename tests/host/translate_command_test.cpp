@@ -253,7 +253,8 @@ TEST_F(KvtTranslate, RejectedRowsGoThroughTheSameJobOnceTheyAreMended) {
 TEST_F(KvtTranslate, RejectedRowsOfSeveralFilesStayApart) {
     write("one", "k,d\n1,x");
     write("two", "k,d\n2,y");
-    EXPECT_EQ(translate("", {"--date", "d=ISO", "--reject", path("bad"), path("one"), path("two")}).status, 1);
+    EXPECT_EQ(translate("", {"--date", "d=ISO", "--reject", path("bad"), path("one"), path("two")}).status,
+              1);
     EXPECT_EQ(read("bad"), "k,d\n1,x\n2,y");
 }
 

@@ -43,12 +43,23 @@ public:
     using CellStep::CellStep;
 
 protected:
-    virtual DateOutcome make(const UString<0>& value) const = 0;
-
-    void applyTo(std::string_view text, RowCells& row) override {
+    const UString<0>& valueOf(std::string_view text) {
         value_.clear();
         value_.append(kvt::ex::UStringView<0>(text));
-        const DateOutcome outcome = make(value_);
+        return value_;
+    }
+
+    // Nearly all cells are good, and need no outcome that words a failure.
+    void take(const datetime::TextResult& result, RowCells& row) {
+        const UString<0>& text = std::get<1>(result);
+        if (std::get<0>(result) == datetime::ReturnState::Success && !text.isEmpty()) {
+            set(row, {text.rawData(), text.size()});
+        } else {
+            take(outcomeOf(result), row);
+        }
+    }
+
+    void take(const DateOutcome& outcome, RowCells& row) {
         if (outcome.isGood()) {
             set(row, resultText(outcome));
         } else {
@@ -66,8 +77,8 @@ public:
         : CanonicalStep(std::move(column)), format_(toUString(format)) {}
 
 protected:
-    DateOutcome make(const UString<0>& value) const override {
-        return outcomeOf(datetime::format(value, format_));
+    void applyTo(std::string_view text, RowCells& row) override {
+        take(datetime::format(valueOf(text), format_), row);
     }
 
 private:
@@ -80,8 +91,8 @@ public:
         : CanonicalStep(std::move(column)), interval_(toUString(interval)) {}
 
 protected:
-    DateOutcome make(const UString<0>& value) const override {
-        return outcomeOf(datetime::add(value, interval_));
+    void applyTo(std::string_view text, RowCells& row) override {
+        take(datetime::add(valueOf(text), interval_), row);
     }
 
 private:
@@ -94,7 +105,7 @@ public:
         : CanonicalStep(std::move(column)), setting_(std::move(setting)) {}
 
 protected:
-    DateOutcome make(const UString<0>& value) const override { return setting_.apply(value); }
+    void applyTo(std::string_view text, RowCells& row) override { take(setting_.apply(valueOf(text)), row); }
 
 private:
     ZoneSetting setting_;
