@@ -46,29 +46,28 @@ Exit status:
   1  done, but some lines failed
   2  not done)";
 
-// Throws Failure, with the text but no place.
+enum class NumberFault { None, NotANumber, OutsideTheRange };
+
+// Lines that are not numbers may be many: nothing is thrown, and nothing worded.
 template <typename Number>
-Number parsed(std::string_view text) {
+NumberFault read(std::string_view text, Number& number) {
     // std::from_chars knows no plus sign, and it takes the payload of a NaN, which would be lost.
     std::string_view unsignedText = trimmed(text);
     const bool plus = unsignedText.starts_with('+');
     unsignedText.remove_prefix(plus ? 1 : 0);
     const char* const end = unsignedText.data() + unsignedText.size();
-    Number number = 0;
+    number = 0;
     const std::from_chars_result result = std::from_chars(unsignedText.data(), end, number);
     if (result.ec == std::errc::invalid_argument || result.ptr != end || unsignedText.ends_with(')') ||
         (plus && unsignedText.starts_with('-'))) {
-        throw Failure("\"" + printable(text) + "\" is not a number");
+        return NumberFault::NotANumber;
     }
     // Not all run-times report what has become infinite or zero.
     const std::string_view digits = unsignedText.substr(0, unsignedText.find_first_of("eE"));
     const bool spelt = digits.find_first_of("0123456789") == std::string_view::npos;
     const bool vanished = number == 0 && digits.find_first_of("123456789") != std::string_view::npos;
-    if (result.ec != std::errc() || vanished || (std::isinf(number) && !spelt)) {
-        throw Failure("\"" + printable(text) + "\" is outside the range of " +
-                      (sizeof(Number) == sizeof(float) ? "single" : "double") + "-precision numbers");
-    }
-    return number;
+    const bool isOutside = result.ec != std::errc() || vanished || (std::isinf(number) && !spelt);
+    return isOutside ? NumberFault::OutsideTheRange : NumberFault::None;
 }
 
 class NumberCommand : public Command, private LineWork {
@@ -91,7 +90,7 @@ public:
             std::string out;
             if (!append(numbers_[index], std::nullopt, out)) {
                 if (!json_) {
-                    throw Failure("argument " + std::to_string(index + 1) + ": " + reason_);
+                    throw Failure("argument " + std::to_string(index + 1) + ": " + reason());
                 }
                 isGood = false;
             }
@@ -109,11 +108,11 @@ private:
 
     // Appends what becomes of a number. Whether it is one.
     bool append(std::string_view text, std::optional<std::uint64_t> line, std::string& out) {
-        std::optional<std::string> result;
-        try {
-            result = shortest(text);
-        } catch (const Failure& failure) {
-            reason_ = failure.what();
+        const std::size_t before = out.size();
+        fault_ = appendShortest(text, out);
+        const bool isNumber = fault_ == NumberFault::None;
+        if (!isNumber) {
+            failed_ = text;
         }
         if (json_) {
             nlohmann::ordered_json object;
@@ -121,44 +120,58 @@ private:
                 object["line"] = *line;
             }
             object["value"] = text;
-            object["result"] = result ? nlohmann::ordered_json(*result) : nullptr;
-            if (!result) {
-                object["message"] = reason_;
+            object["result"] = isNumber ? nlohmann::ordered_json(out.substr(before)) : nullptr;
+            if (!isNumber) {
+                object["message"] = reason();
             }
+            out.resize(before);
             out += object.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace);
-        } else {
-            out += result.value_or("");
         }
         out += '\n';
-        return result.has_value();
+        return isNumber;
     }
 
     std::string_view kind() const override {
-        return reason_.ends_with("numbers") ? "outside the range" : "not a number";
+        return fault_ == NumberFault::NotANumber ? "not a number" : "outside the range";
     }
-    std::string reason() const override { return reason_; }
+    std::string reason() const override {
+        const std::string value = "\"" + printable(failed_) + "\" is ";
+        return fault_ == NumberFault::NotANumber
+                   ? value + "not a number"
+                   : value + "outside the range of " + (single_ ? "single" : "double") + "-precision numbers";
+    }
 
-    std::string shortest(std::string_view text) const {
-        if (!single_) {
-            const auto number = parsed<double>(text);
-            return shown(xml_ ? kvt::ex::double_to_string_xml : kvt::ex::double_to_string, number);
-        }
-        const auto number = parsed<float>(text);
-        // There is no form for XML in single precision, and only values without digits would differ in it.
-        return xml_ && !std::isfinite(number)
-                   ? shown(kvt::ex::double_to_string_xml, static_cast<double>(number))
-                   : shown(kvt::ex::float_to_string, number);
+    NumberFault appendShortest(std::string_view text, std::string& out) const {
+        return single_ ? appendShortest<float>(text, out) : appendShortest<double>(text, out);
     }
 
     template <typename Number>
-    static std::string shown(std::uint64_t (*write)(Number, char*), Number number) {
-        std::array<char, kvt::ex::floatTextBuffer> buffer;
-        return {buffer.data(), write(number, buffer.data())};
+    NumberFault appendShortest(std::string_view text, std::string& out) const {
+        Number number = 0;
+        const NumberFault fault = read(text, number);
+        if (fault != NumberFault::None) {
+            return fault;
+        }
+        std::array<char, kvt::ex::floatTextBuffer> digits;
+        out.append(digits.data(), write(number, digits.data()));
+        return NumberFault::None;
+    }
+
+    std::uint64_t write(double number, char* digits) const {
+        return xml_ ? kvt::ex::double_to_string_xml(number, digits)
+                    : kvt::ex::double_to_string(number, digits);
+    }
+    // There is no form for XML in single precision, and only values without digits would differ in it.
+    std::uint64_t write(float number, char* digits) const {
+        return xml_ && !std::isfinite(number)
+                   ? kvt::ex::double_to_string_xml(static_cast<double>(number), digits)
+                   : kvt::ex::float_to_string(number, digits);
     }
 
     std::vector<std::string> numbers_;
     ValueLines lines_;
-    std::string reason_;
+    NumberFault fault_ = NumberFault::None;
+    std::string failed_; ///< the value that failed last
     bool xml_ = false;
     bool single_ = false;
     bool json_ = false;
