@@ -25,10 +25,11 @@ namespace host {
 namespace {
 
 constexpr const char* examples = R"(kvt convert --from Shift_JIS --to UTF-8 old.txt -o new.txt
-kvt encodings latin1
+kvt infer people.csv -o people.toml
+kvt translate --job people.toml people.csv -o clean.csv
 kvt COMMAND --help)";
 
-constexpr const char* summary = "kvt converts text between character encodings and accounts for every loss";
+constexpr const char* summary = "kvt translates text, dates and tables, and accounts for every loss";
 
 constexpr const char* notes =
     R"(Data goes to standard output, everything else to standard error, both of which
