@@ -148,7 +148,7 @@ complete -F _kvt kvt
 
 namespace {
 
-// Within a specification of _arguments, in single quotes.
+// Within what _arguments is told of an option, in single quotes.
 std::string zshText(const std::string& text) {
     std::string out = text;
     for (const char* special : {"\\", "[", "]", ":"}) {
