@@ -98,4 +98,10 @@ foreach(place RANGE 0 ${last} 2)
         DESTINATION "${CMAKE_INSTALL_DATADIR}/doc/${package}" COMPONENT ${component})
 endforeach()
 
+# Manual pages are compressed there.
+install(CODE "
+    file(GLOB pages \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_MANDIR}/man1/*.1\")
+    execute_process(COMMAND gzip -9nf \${pages} COMMAND_ERROR_IS_FATAL ANY)"
+    COMPONENT command)
+
 include(CPack)

@@ -84,7 +84,6 @@ private:
         }
         bool isBlock = true;
         if (begun_ != 0) { // the first was read before
-
             try {
                 isBlock = source_.next(work->block);
             } catch (...) {
