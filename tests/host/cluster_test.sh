@@ -93,7 +93,7 @@ munged --force --socket="$work/run/munge.socket" --key-file="$work/run/munge.key
 slurmctld -L "$work/log/slurmctld.log" || leave_out "slurmctld does not start"
 for node in n1 n2 n3; do
     mkdir -p "$work/spool/$node"
-    slurmd -N "$node" -L "$work/log/$node.log" || leave_out "slurmd does not start"
+    slurmd -N "$node" -L "$work/log/$node.log" || leave_out "slurmd does not start: $(tail -n 1 "$work/log/$node.log")"
 done
 idle=0
 for ((wait = 0; wait < 60 && idle < 3; ++wait)); do

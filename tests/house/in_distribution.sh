@@ -44,6 +44,7 @@ fi
 # minbase has no names of hosts of its own, and the kernel's file systems are not in it.
 cp -- /etc/resolv.conf /etc/hosts "$root/etc/"
 mount -t proc proc "$root/proc"
+mount --rbind /sys "$root/sys"
 mount -t devpts -o newinstance,ptmxmode=0666 devpts "$root/dev/pts"
 mount -t tmpfs tmpfs "$root/dev/shm"
 
