@@ -12,6 +12,14 @@ namespace {
 using namespace std::string_literals;
 using Strings = std::vector<std::string>;
 
+// What a command line prints for an input.
+struct InputRow {
+    int line;
+    Strings arguments;
+    std::string input;
+    std::string output;
+};
+
 } // namespace
 
 class KvtMatch : public HostTest {
@@ -23,13 +31,7 @@ protected:
 };
 
 TEST_F(KvtMatch, PrintsTheLinesOrTheGroups) {
-    struct Row {
-        int line;
-        Strings arguments;
-        std::string input;
-        std::string output;
-    };
-    const Row rows[] = {
+    const InputRow rows[] = {
         {__LINE__, {"b"}, "abc\nxyz\nb\n", "abc\nb\n"},
         {__LINE__, {"z"}, "abc\n", ""},
         {__LINE__, {"^b"}, "ab\nba\n", "ba\n"},
@@ -61,7 +63,7 @@ TEST_F(KvtMatch, PrintsTheLinesOrTheGroups) {
         {__LINE__, {"--dialect", "legacy", "x*"}, "\na\n", "a\n"},
         {__LINE__, {"--dialect", "legacy", "{2}$"}, "a{2}\naa\n", "a{2}\n"},
     };
-    for (const Row& row : rows) {
+    for (const InputRow& row : rows) {
         SCOPED_TRACE(row.line);
         const ChildResult result = match(row.arguments, row.input);
         EXPECT_EQ(result.status, 0);
@@ -237,13 +239,7 @@ TEST_F(KvtMatch, LinesAreCountedNumberedAndTurnedRound) {
 }
 
 TEST_F(KvtMatch, WhatMatchedIsPrintedAlone) {
-    struct Row {
-        int line;
-        Strings arguments;
-        std::string input;
-        std::string output;
-    };
-    const Row rows[] = {
+    const InputRow rows[] = {
         {__LINE__, {"a"}, "banana\nx\na", "a\na\na\na\n"},
         {__LINE__, {"^a"}, "aaa\r\n", "a\r\n"},
         {__LINE__, {"\\ba"}, "aa a\n", "a\na\n"},
@@ -257,7 +253,7 @@ TEST_F(KvtMatch, WhatMatchedIsPrintedAlone) {
         {__LINE__, {"--unicode", "^.*$"}, "a b\n", "a b\n"},
         {__LINE__, {"--unicode", "(?<=😀)\\w+"}, "😀Ła\n", "Ła\n"},
     };
-    for (const Row& row : rows) {
+    for (const InputRow& row : rows) {
         Strings arguments = row.arguments;
         arguments.insert(arguments.begin(), "--only-matching");
         const ChildResult result = match(arguments, row.input);
