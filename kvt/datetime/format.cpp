@@ -90,11 +90,7 @@ TextResult formatByPattern(const UString<0>& value, const CanonicalRecord& recor
 
 TextResult formatByKeywords(const UString<0>& value, const CanonicalRecord& record,
                             std::string_view keywords) {
-    std::optional<Keyword> first;
-    forEachKeyword(keywords, [&](Keyword keyword) {
-        first = keyword;
-        return true;
-    });
+    const std::optional<Keyword> first = KeywordList(keywords).nextKeyword();
     if (!first) {
         return formatByPattern(value, record, keywords); // a text without any flag
     }

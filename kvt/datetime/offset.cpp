@@ -3,21 +3,6 @@
 
 namespace kvt::ex::datetime::detail {
 
-namespace {
-
-constexpr char digitOf(int number) noexcept {
-    return static_cast<char>('0' + number);
-}
-
-constexpr OffsetForm formOf(bool isNegative, int hours, int minutes) noexcept {
-    const std::int32_t magnitude = hours * minutesPerHour + minutes;
-    return {isNegative ? -magnitude : magnitude,
-            {isNegative ? '-' : '+', digitOf(hours / 10), digitOf(hours % 10), ':', digitOf(minutes / 10),
-             digitOf(minutes % 10)}};
-}
-
-} // namespace
-
 std::optional<OffsetForm> offsetOfText(std::string_view text) noexcept {
     OffsetForm form;
     return readOffset(text, form) ? std::optional(form) : std::nullopt;
@@ -28,8 +13,12 @@ std::optional<OffsetForm> offsetOfMinutes(std::int32_t minutes) noexcept {
     if (minutes <= -end || minutes >= end) {
         return std::nullopt;
     }
-    const std::int32_t magnitude = minutes < 0 ? -minutes : minutes;
-    return formOf(minutes < 0, magnitude / minutesPerHour, magnitude % minutesPerHour);
+    const bool isNegative = minutes < 0;
+    const auto magnitude = static_cast<unsigned>(isNegative ? -minutes : minutes);
+    OffsetForm form{minutes, {isNegative ? '-' : '+', '0', '0', ':', '0', '0'}};
+    writePair(form.text.data() + 1, magnitude / minutesPerHour);
+    writePair(form.text.data() + 4, magnitude % minutesPerHour);
+    return form;
 }
 
 } // namespace kvt::ex::datetime::detail

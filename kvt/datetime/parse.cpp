@@ -107,7 +107,7 @@ TextResult failedBy(const PatternFailure& failure, std::string_view format, std:
 
 // By the first form of ISO 8601 that fits.
 bool readIso(std::string_view value, bool lenient, PatternReading& reading) {
-    if (!ex::detail::isAllAscii(value)) {
+    if (!isSystemUtf8() && !ex::detail::isAllAscii(value)) {
         return false; // all of the value has to match, and the patterns are ASCII
     }
     const SystemBytes bytes(value);
@@ -127,23 +127,20 @@ bool readIso(std::string_view value, bool lenient, PatternReading& reading) {
 
 // By the first keyword that fits the value.
 TextResult parseByKeywords(const UString<0>& value, const UString<0>& format, bool lenient) {
-    std::optional<TextResult> found;
-    const auto use = [&](Keyword keyword) {
-        if (keyword == Keyword::Iso) {
+    bool anyKnown = false;
+    KeywordList keywords(viewOf(format));
+    while (const std::optional<Keyword> keyword = keywords.nextKeyword()) {
+        anyKnown = true;
+        if (*keyword == Keyword::Iso) {
             PatternReading reading;
             if (readIso(trimmed(viewOf(value)), lenient, reading)) {
-                found = resultOf(reading);
+                return resultOf(reading);
             }
         } else if (const Outcome<CanonicalRecord> record = parseCanonical(viewOf(value), lenient); !record) {
-            found = makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
+            return makeDateTimeResult(ReturnState::Failure, UString<0>(), *messageOf(record.failure()));
         } else if (record->type != TemporalType::Unsupported) {
-            found = resultOf(answerOf(*record));
+            return resultOf(answerOf(*record));
         }
-        return found.has_value();
-    };
-    const bool anyKnown = forEachKeyword(viewOf(format), use);
-    if (found) {
-        return std::move(*found);
     }
     return anyKnown ? failed<UString<0>>(message_number::noKeywordMatched, {viewOf(value)})
                     : failed<UString<0>>(message_number::noKnownKeyword, {viewOf(format)});

@@ -12,22 +12,22 @@ constexpr std::uint64_t shortestMonth = 28;
 
 using Problem = std::optional<ParseValidation>;
 
-Problem incompleteness(const PatternFields& fields, bool wantsOffset) {
-    const bool hasYear = fields.has(Field::Year);
-    const bool hasMonth = fields.has(Field::Month);
-    const bool hasDay = fields.has(Field::Day);
-    const bool hasOrdinal = fields.has(Field::Ordinal);
-    const bool hasHours = fields.has(Field::Hours);
-    const bool hasMinutes = fields.has(Field::Minutes);
-    const bool hasSeconds = fields.has(Field::Seconds);
-    if (hasOrdinal && !hasYear) {
+constexpr unsigned bitOf(Field field) {
+    return 1u << static_cast<unsigned>(field);
+}
+
+constexpr Problem incompleteness(unsigned given, bool wantsOffset) {
+    const auto has = [given](Field field) { return (given & bitOf(field)) != 0; };
+    const bool hasOrdinal = has(Field::Ordinal);
+    if (hasOrdinal && !has(Field::Year)) {
         return ParseValidation::OrdinalWithoutYear;
     }
-    const bool anyOfDate = hasYear || hasMonth || hasDay;
-    if (!hasOrdinal && anyOfDate && !(hasYear && hasMonth && hasDay)) {
+    const bool anyOfDate = has(Field::Year) || has(Field::Month) || has(Field::Day);
+    if (!hasOrdinal && anyOfDate && !(has(Field::Year) && has(Field::Month) && has(Field::Day))) {
         return ParseValidation::DateIncomplete;
     }
-    if (hasHours ? hasSeconds && !hasMinutes : hasMinutes || hasSeconds) {
+    const bool hasHours = has(Field::Hours);
+    if (hasHours ? has(Field::Seconds) && !has(Field::Minutes) : has(Field::Minutes) || has(Field::Seconds)) {
         return ParseValidation::TimeIncomplete;
     }
     if (!hasHours && wantsOffset) {
@@ -38,6 +38,16 @@ Problem incompleteness(const PatternFields& fields, bool wantsOffset) {
     }
     return std::nullopt;
 }
+
+// For each set of fields whether it makes up a value, with an offset at [1].
+constexpr auto isComplete = [] {
+    std::array<std::array<bool, 1u << fieldCount>, 2> complete{};
+    for (unsigned given = 0; given < complete[0].size(); ++given) {
+        complete[0][given] = !incompleteness(given, false);
+        complete[1][given] = !incompleteness(given, true);
+    }
+    return complete;
+}();
 
 // With the time of day of `time`, which may run over.
 DateTimeFields fieldsOn(std::int64_t days, const DateTimeFields& time) {
@@ -86,8 +96,9 @@ std::optional<PatternFailure> makeUp(PatternReading& reading, const PatternField
         return FormatStringBadCombo{fields.epochFlag, "%z"};
     }
     if (!fields.isEpoch()) {
-        if (const Problem problem = incompleteness(fields, (reading.parts & offsetPart) != 0)) {
-            return *problem;
+        const bool wantsOffset = (reading.parts & offsetPart) != 0;
+        if (!isComplete[wantsOffset ? 1 : 0][fields.given()]) {
+            return *incompleteness(fields.given(), wantsOffset);
         }
     }
     std::int32_t hours = fields.get(Field::Hours);

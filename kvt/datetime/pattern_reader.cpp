@@ -53,6 +53,43 @@ std::optional<std::int32_t> monthOf(std::string_view name, std::size_t significa
     return std::nullopt;
 }
 
+// ---- Plain numbers
+
+// What is needed of the row of a number that has two or four digits, side by side.
+struct PlainNumber {
+    std::uint8_t width = 0; // 0 where the flag is not such a number
+    bool hasFraction = false;
+    Field field = Field::Year;
+    Parts gives = noPart;
+    std::int16_t lowest = 0;
+    std::int16_t highest = 0;
+};
+
+// By the character behind "%".
+constexpr auto plainNumbers = [] {
+    std::array<PlainNumber, 256> numbers{};
+    for (const PatternRow& row : patternRows) {
+        const ReadRule& rule = row.reads;
+        const bool hasFraction = rule.reading == Reading::Seconds;
+        if (row.element.size() == 2 && (hasFraction || rule.reading == Reading::Number) &&
+            rule.width % 2 == 0) {
+            numbers[static_cast<unsigned char>(row.element.back())] = {rule.width, hasFraction, rule.field,
+                                                                       rule.gives, rule.lowest, rule.highest};
+        }
+    }
+    return numbers;
+}();
+
+// The number of two or four digits; negative where there are not.
+inline std::int32_t digitsOf(const char* digits, std::uint8_t width) noexcept {
+    const std::int32_t high = digitPair(digits);
+    if (width == 2 || high < 0) {
+        return high;
+    }
+    const std::int32_t low = digitPair(digits + 2);
+    return low < 0 ? low : high * 100 + low;
+}
+
 // ---- Words of unknown length
 
 // What such a word has to end in: the format behind the "*", up to white space or "$".
@@ -140,20 +177,6 @@ std::string_view PatternReader::takeWhile(Predicate predicate) noexcept {
 // Up to `width` digits, or exactly that many; negative where there are not.
 inline std::int32_t PatternReader::takeNumber(unsigned width, bool exactWidth) noexcept {
     const char* const begin = at_;
-    // Nearly always all the digits are there.
-    if (const std::ptrdiff_t left = valueEnd_ - begin; width == 2 && left >= 2) {
-        if (const std::int32_t pair = digitPair(begin); pair >= 0) {
-            at_ = begin + 2;
-            return pair;
-        }
-    } else if (width == 4 && left >= 4) {
-        const std::int32_t high = digitPair(begin);
-        const std::int32_t low = digitPair(begin + 2);
-        if (high >= 0 && low >= 0) {
-            at_ = begin + 4;
-            return high * 100 + low;
-        }
-    }
     const char* const end =
         valueEnd_ - begin > static_cast<std::ptrdiff_t>(width) ? begin + width : valueEnd_;
     const char* place = begin;
@@ -175,7 +198,19 @@ inline std::int32_t PatternReader::takeNumber(unsigned width, bool exactWidth) n
 
 // "." and digits, as many as there are, in nanoseconds; 0 without them.
 std::int64_t PatternReader::takeFraction() noexcept {
-    return take('.') ? static_cast<std::int64_t>(fractionNanoseconds(takeWhile(isDigit))) : 0;
+    if (!take('.')) {
+        return 0;
+    }
+    const std::string_view digits = takeBytes(countDigits({at_, static_cast<std::size_t>(valueEnd_ - at_)}));
+    return static_cast<std::int64_t>(fractionNanoseconds(digits));
+}
+
+// With seconds since 1970 in the format, those of the minute do not count.
+inline void PatternReader::readFraction() noexcept {
+    const std::int64_t nanoseconds = takeFraction();
+    if (!fields_.isEpoch()) {
+        fields_.nanoseconds = nanoseconds;
+    }
 }
 
 inline bool PatternReader::stop(StopReason reason) noexcept {
@@ -259,8 +294,55 @@ bool PatternReader::readNext() {
     return true;
 }
 
+// Most patterns are numbers of two or four digits with plain characters between them. These are read here, with both
+// places at hand; the first element that is more than that, or does not fit, is left to the general way.
+void PatternReader::readPlainRun() noexcept {
+    const char* at = at_;
+    const char* next = next_;
+    const char* const valueEnd = valueEnd_;
+    const char* const formatEnd = formatEnd_;
+    unsigned parts = parts_;
+    bool afterNumber = afterNumber_;
+    while (next != formatEnd && at != valueEnd) {
+        if (*next != '%') {
+            if (*at != *next || rowOfCharacter(*next) != nullptr) {
+                break;
+            }
+            ++at;
+            ++next;
+            afterNumber = false;
+            continue;
+        }
+        if (formatEnd - next < 2) {
+            break;
+        }
+        const PlainNumber& rule = plainNumbers[static_cast<unsigned char>(next[1])];
+        if (rule.width == 0 || valueEnd - at < rule.width) {
+            break;
+        }
+        const std::int32_t number = digitsOf(at, rule.width);
+        if (number < rule.lowest || number > rule.highest) {
+            break;
+        }
+        fields_.set(rule.field, number);
+        parts |= rule.gives;
+        at += rule.width;
+        if (rule.hasFraction) {
+            at_ = at;
+            readFraction();
+            at = at_;
+        }
+        next += 2;
+        afterNumber = true;
+    }
+    at_ = at;
+    next_ = next;
+    parts_ = static_cast<Parts>(parts);
+    afterNumber_ = afterNumber;
+}
+
 std::optional<PatternFailure> PatternReader::readAll(PatternReading& reading) {
-    while (!isDone()) {
+    for (readPlainRun(); !isDone(); readPlainRun()) {
         if (!readNext()) {
             return failure();
         }
@@ -348,15 +430,11 @@ Parts PatternReader::parts() const noexcept {
 
 // ---- The flags
 
-// With seconds since 1970 in the format, those of the minute do not count.
 bool PatternReader::readSeconds(const ReadRule& rule, bool isInRow) {
     if (!readNumber(rule, isInRow)) {
         return false;
     }
-    const std::int64_t nanoseconds = takeFraction();
-    if (!fields_.isEpoch()) {
-        fields_.nanoseconds = nanoseconds;
-    }
+    readFraction();
     return true;
 }
 

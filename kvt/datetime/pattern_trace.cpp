@@ -240,7 +240,7 @@ bool isGood(const TextResult& result) {
     return std::get<0>(result) == ReturnState::Success;
 }
 
-// Whether a result ends the search: a part that is out of range does, and only what is no such form goes on to the next
+// Whether a result ends the search. A part that is out of range does; only what is not such a form goes on to the next
 // keyword.
 bool isLast(const TextResult& result) {
     const auto& message = std::get<2>(result);
@@ -312,10 +312,10 @@ vector<PatternTrace> traceParse(const UString<0>& value, const UString<0>& forma
     const std::string_view list = trimmed(viewOf(format));
     if (isKeywordList(list)) {
         KeywordTracer tracer(value, lenient);
-        forEachItem(list, [&](std::string_view item) {
-            tracer.add(item);
-            return false;
-        });
+        KeywordList items(list);
+        while (const std::optional<std::string_view> item = items.nextItem()) {
+            tracer.add(*item);
+        }
         return tracer.take();
     }
     vector<PatternTrace> traces(1);

@@ -6,8 +6,6 @@
 
 #include <algorithm>
 #include <array>
-#include <bit>
-#include <cstring>
 #include <optional>
 
 namespace kvt::ex::datetime::detail {
@@ -67,18 +65,6 @@ bool split(std::string_view text, CanonicalRecord& record) noexcept {
     }
     record.digits = digits;
     return true;
-}
-
-// Eight digits as four numbers of two digits, the first one in the lowest sixteen bits.
-std::uint64_t pairsOf(const char* digits) noexcept {
-    constexpr std::uint64_t everyPair = 0x0001000100010001;
-    std::uint64_t bytes = 0;
-    std::memcpy(&bytes, digits, sizeof bytes);
-    if constexpr (std::endian::native == std::endian::big) {
-        bytes = __builtin_bswap64(bytes);
-    }
-    bytes &= everyPair * 0x0F0F;
-    return (bytes * 10 + (bytes >> 8)) & everyPair * 0xFF; // each byte stays below 100
 }
 
 std::int64_t pairAt(std::uint64_t pairs, unsigned index) noexcept {

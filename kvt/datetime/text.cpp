@@ -71,6 +71,12 @@ bool allDigits(std::string_view text) noexcept {
 
 std::uint64_t digitsValue(std::string_view digits) noexcept {
     std::uint64_t value = 0;
+    for (; digits.size() >= 8; digits.remove_prefix(8)) {
+        // Two pairs are below 10,000, so that no sum reaches the one beside it.
+        const std::uint64_t pairs = pairsOf(digits.data());
+        const std::uint64_t quarters = (pairs * 100 + (pairs >> 16)) & 0x0000FFFF0000FFFF;
+        value = value * 100'000'000 + (quarters & 0xFFFF) * 10'000 + (quarters >> 32);
+    }
     for (const char c : digits) {
         value = value * 10 + static_cast<std::uint64_t>(c - '0');
     }

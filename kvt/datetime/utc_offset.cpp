@@ -1,4 +1,4 @@
-// The public face of offset.h. It alone takes the empty text, which is no offset and zero minutes.
+// The public face of offset.h. It alone takes the empty text, which is not an offset and counts as zero minutes.
 #include <kvt/datetime/detail/offset.h>
 #include <kvt/datetime/detail/text.h>
 #include <kvt/datetime/utc_offset.h>

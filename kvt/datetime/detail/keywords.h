@@ -34,28 +34,36 @@ inline std::optional<Keyword> keywordOf(std::string_view item) noexcept {
                                  : std::nullopt;
 }
 
-/// Calls `use` with each item of a list, in order, until it answers true.
-template <typename Use>
-void forEachItem(std::string_view list, Use use) {
-    while (true) {
-        const std::size_t end = std::min(list.find('|'), list.size());
-        if (use(list.substr(0, end)) || end == list.size()) {
-            return;
-        }
-        list.remove_prefix(end + 1);
-    }
-}
+/// The items of a list, from the first to the last. Even an empty list has one.
+class KeywordList {
+public:
+    explicit KeywordList(std::string_view list) noexcept : rest_(list) {}
 
-/// Calls `use` with each known keyword of a list, in order, until it answers true; whether any was known.
-template <typename Use>
-bool forEachKeyword(std::string_view list, Use use) {
-    bool anyKnown = false;
-    forEachItem(list, [&](std::string_view item) {
-        const std::optional<Keyword> keyword = keywordOf(item);
-        anyKnown |= keyword.has_value();
-        return keyword && use(*keyword);
-    });
-    return anyKnown;
-}
+    /// The next item; none behind the last.
+    std::optional<std::string_view> nextItem() noexcept {
+        if (isAtEnd_) {
+            return std::nullopt;
+        }
+        const std::size_t end = rest_.find('|');
+        isAtEnd_ = end == std::string_view::npos;
+        const std::string_view item = rest_.substr(0, end);
+        rest_.remove_prefix(isAtEnd_ ? rest_.size() : end + 1);
+        return item;
+    }
+
+    /// The next keyword, unknown ones being passed over; none behind the last.
+    std::optional<Keyword> nextKeyword() noexcept {
+        while (const std::optional<std::string_view> item = nextItem()) {
+            if (const std::optional<Keyword> keyword = keywordOf(*item)) {
+                return keyword;
+            }
+        }
+        return std::nullopt;
+    }
+
+private:
+    std::string_view rest_;
+    bool isAtEnd_ = false;
+};
 
 } // namespace kvt::ex::datetime::detail

@@ -26,6 +26,9 @@ public:
         given_ = static_cast<std::uint8_t>(given_ | 1u << static_cast<unsigned>(field));
     }
 
+    /// A bit for each field that is given.
+    std::uint8_t given() const noexcept { return given_; }
+
     bool isEpoch() const noexcept { return !epochFlag.empty(); }
 
     std::int64_t nanoseconds = 0;  ///< to be added; up to 1,000,000,000, and negative where `epochSeconds` is

@@ -68,6 +68,7 @@ public:
     Parts parts() const noexcept;
 
 private:
+    void readPlainRun() noexcept;
     bool readSpecial(const PatternRow& row);
     bool readWord(std::string_view tail);
 
@@ -91,6 +92,7 @@ private:
     std::string_view takeWhile(Predicate predicate) noexcept;
     std::int32_t takeNumber(unsigned width, bool exactWidth) noexcept;
     std::int64_t takeFraction() noexcept;
+    void readFraction() noexcept;
 
     bool stop(StopReason reason) noexcept;
     // Made in its place in what is returned.

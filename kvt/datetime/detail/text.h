@@ -5,6 +5,7 @@
 #include <kvt/string/ustring.h>
 
 #include <array>
+#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -40,6 +41,18 @@ constexpr bool isDigit(char c) noexcept {
 /// The number of two digits, or a negative one where they are none.
 constexpr int digitPair(const char* digits) noexcept {
     return isDigit(digits[0]) && isDigit(digits[1]) ? (digits[0] - '0') * 10 + (digits[1] - '0') : -1;
+}
+
+/// Eight digits as four numbers of two digits, the first one in the lowest sixteen bits.
+inline std::uint64_t pairsOf(const char* digits) noexcept {
+    constexpr std::uint64_t everyPair = 0x0001000100010001;
+    std::uint64_t bytes = 0;
+    std::memcpy(&bytes, digits, sizeof bytes);
+    if constexpr (std::endian::native == std::endian::big) {
+        bytes = __builtin_bswap64(bytes);
+    }
+    bytes &= everyPair * 0x0F0F;
+    return (bytes * 10 + (bytes >> 8)) & everyPair * 0xFF; // each byte stays below 100
 }
 
 /// How many digits a text begins with.
