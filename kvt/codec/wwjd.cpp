@@ -214,8 +214,8 @@ UString<2> wwjdToUtf16(std::string_view text) {
     return UString<2>(out.data(), out.size());
 }
 
-// Nothing here depends on where the ">" of something stands that is no name, so a look at the bytes of the longest name
-// is enough at each "<". No result is longer than its text.
+// Nothing here depends on where the ">" of something stands that is not a name. So a look at the bytes of the longest
+// name is enough at each "<". No result is longer than its text.
 std::string wwjdToBytes(std::string_view text) {
     std::string out(text.size(), '\0');
     char* target = out.data();

@@ -133,7 +133,7 @@ public:
     /// gets the next index, from 0. The file gets longer, but takes no room on the disk until memory is written to.
     ///
     /// When the file cannot be made longer, the segment has the offset -1, and so has its row in the table: loading it
-    /// throws. Loading also throws when the file's length was no multiple of the page size, since somebody else has
+    /// throws. Loading also throws when the file's length was not a multiple of the page size, since somebody else has
     /// written to it: this segment lies at a crooked offset, and so do all after it. Throws
     /// boost::interprocess::bad_alloc when the header has no room for the row; the file has then grown for nothing.
     mapped_region_segment create_segment(future::optional<unsigned long long> size = {}) {

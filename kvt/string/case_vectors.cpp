@@ -69,7 +69,7 @@ HWY_INLINE Step copyBytes(CaseState& s, std::size_t size) {
 template <CaseMapping mapping>
 HWY_INLINE Step mapOne(const CaseTable& table, CaseState& s) {
     const std::size_t length = wellFormedLength(s.p, s.end);
-    if (length <= 1) { // ASCII, or bytes that are no character
+    if (length <= 1) { // ASCII, or bytes that are not a character
         const Step step = copyBytes(s, 1);
         if (step == Step::done) {
             s.q[-1] = Letters<mapping>::ascii(s.q[-1]);

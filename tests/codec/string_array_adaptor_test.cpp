@@ -63,7 +63,7 @@ TYPED_TEST(ArrayAdaptor, Slot1AppendsTheUnitsOfAString) {
 }
 
 TYPED_TEST(ArrayAdaptor, Slot1ConvertsNothing) {
-    // 0x80 is no UTF-8, no ASCII, and a zero half of a wide unit.
+    // 0x80 is neither UTF-8 nor ASCII, and in a wide unit a zero byte stands beside it.
     auto text = this->string("a");
     text[0] = static_cast<typename UString<TypeParam::value>::value_type>(0x80);
     slotOf<AddString>(this->host, 1)(this->host, &text.getAsIZQTString());

@@ -72,7 +72,7 @@ TEST(ParseLiterals, AMismatchWithinACharacterIsOneOfTheCharacter) {
         {"2020\xE5\xB9\xB4", "%Y\xE5\xB9\xB5%m", mismatch("%Y", "\xE5\xB9\xB5%m")},
         {"2020\xC3\xA4", "%Y\xC3\xA4\xC3\xB6", mismatch("%Y\xC3\xA4", "\xC3\xB6")},
     });
-    // A format that is no text is told byte by byte, and what was read stays read.
+    // A format that is not text is shown byte by byte, and what was read stays read.
     EXPECT_EQ(answerOf(parse(ustring("2020"), ustring("%Y\xB5"), false)), mismatch("%Y", "\xB5"));
 }
 

@@ -150,7 +150,7 @@ TEST(TimezoneSet, AttachesOrConverts) {
         // The offset is written from its minutes.
         {__LINE__, "20200101120000", "+1075", automatic, "20200101120000+11:15"},
         {__LINE__, "20200101120000", "-00:00", automatic, "20200101120000+00:00"},
-        // What is no offset takes it away, after the way to UTC where there was one.
+        // What is not an offset takes it away, after the way to UTC where there was one.
         {__LINE__, "20200101120000", "Europe/Berlin", automatic, "20200101120000"},
         {__LINE__, "20200101120000+01:00", "+1", replace, "20200101120000"},
         {__LINE__, "20200101120000+01:00", "+1", convert, "20200101110000"},

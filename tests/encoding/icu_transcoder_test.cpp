@@ -222,7 +222,7 @@ TEST(IcuTranscoder, AReplacementCharacterIsNoNewLoss) {
 }
 
 TEST(IcuTranscoder, TheConvertersOwnSubstitutionInTheInputIsNoNewLoss) {
-    // These cannot write "?", so that their own substitution stays: bytes that are no character of theirs.
+    // These cannot write "?", so that their own substitution stays: bytes that are not a character of theirs.
     const std::pair<const char*, const char*> rows[] = {{"ibm-971_P100-1995", "\xAF\xFE"},
                                                         {"ibm-16684_P110-2003", "\xFE\xFE"}};
     for (const auto& [name, substitution] : rows) {

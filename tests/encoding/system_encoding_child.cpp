@@ -4,7 +4,7 @@
 //     system_encoding_child NAME TEXT OUTSIDE BAD
 //
 // NAME is an encoding to compare with; TEXT is UTF-8 text of the system encoding's repertoire, OUTSIDE UTF-8 text
-// that is not, BAD bytes that are no text in it; each as hexadecimal bytes.
+// that is not, BAD bytes that are not text in it; each as hexadecimal bytes.
 #include <foundation/items.h>
 
 #include <kvt/encoding/encoding.h>

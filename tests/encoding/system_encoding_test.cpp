@@ -55,7 +55,7 @@ struct Row {
     /// UTF-8 text and its bytes in the encoding.
     const char* text;
     const char* bytes;
-    /// UTF-8 text around one character that the encoding does not have, and bytes that are no text in it; empty where
+    /// UTF-8 text around one character that the encoding does not have, and bytes that are not text in it; empty where
     /// there are none.
     const char* outside;
     const char* bad;

@@ -340,7 +340,7 @@ TEST_F(KvtSort, DatesAreReadByAFormat) {
 TEST_F(KvtSort, LinesStayInTheirEncoding) {
     for (const bool big : {false, true}) {
         const std::string name = big ? "UTF-16BE" : "UTF-16LE";
-        // U+0A0D and U+0D0A are no line ends, and surrogates come behind the private use area, by code points.
+        // U+0A0D and U+0D0A are not line ends, and surrogates come behind the private use area, by code points.
         EXPECT_EQ(sorted(utf16Of(U"\U0001F600\n\uE000\n\u0A0D\n\u0D0Ab\na", big), {"--encoding", name}),
                   utf16Of(U"a\n\u0A0D\n\u0D0Ab\n\uE000\n\U0001F600\n", big));
         EXPECT_EQ(sorted(utf16Of(U"\uFEFFb\na\n", big), {"--encoding", "UTF-16"}),

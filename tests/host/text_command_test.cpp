@@ -144,7 +144,7 @@ TEST_F(KvtText, CaseCanBeIgnored) {
               "\u212a Weg\u00df Weg\n");
     EXPECT_EQ(text({"split", "-i", "x"}, "aXbxc\n").out, "a\nb\nc\n");
     EXPECT_EQ(text({"hash", "-i"}, "Stra\u00dfe\nSTRASSE\n").out, text({"hash"}, "strasse\nstrasse\n").out);
-    // Half of a character is no match.
+    // Half of a character is not a match.
     EXPECT_EQ(text({"find", "-i", "s"}, "\u00df s\n").out, "1:3:3\n");
     EXPECT_EQ(text({"replace", "-i", "s", "-"}, "\u00dfs\u00df\n").out, "\u00df-\u00df\n");
 }
@@ -299,7 +299,7 @@ TEST_F(KvtText, FindSaysWhereAPlaceIsInTheFileAsItIs) {
         const std::string bytes = convert("UTF-8", row.encoding, utf8Of(sample)).out;
         EXPECT_EQ(text({"find", "x", "--encoding", row.encoding}, bytes).out, row.places) << row.encoding;
     }
-    // A mark is no character, but it has bytes.
+    // A mark is not a character, but it has bytes.
     EXPECT_EQ(text({"find", "x", "--encoding", "UTF-16"}, "\xff\xfe" + utf16Of(U"ax\nx", false)).out,
               "1:2:4\n2:1:8\n");
     std::string lines;

@@ -49,7 +49,7 @@ Raw convertWithIcu(const std::string& from, const std::string& to, std::string_v
 /// text in two steps.
 struct Losses {
     std::string bytes;                 ///< the text with its substitutions
-    std::vector<std::string> badInput; ///< the bytes of each place that is no text
+    std::vector<std::string> badInput; ///< the bytes of each place that is not text
     std::vector<char32_t> characters;  ///< that the target lacks, substitutions for bad input not among them
 };
 Losses lossesOfIcu(const std::string& from, const std::string& to, std::string_view bytes);

@@ -569,7 +569,7 @@ std::string offsetText(long long minutes) {
     std::snprintf(text, sizeof text, "%c%02lld:%02lld", minutes < 0 ? '-' : '+', magnitude / 60,
                   magnitude % 60);
     const std::string offset = text;
-    return offset.size() == 6 ? offset : ""; // other lengths are no offsets
+    return offset.size() == 6 ? offset : ""; // other lengths are not offsets
 }
 
 } // namespace

@@ -51,7 +51,7 @@ std::string transcoded(const std::string& from, const std::string& to, std::stri
 }
 
 /// Whether ICU drops the last bytes of a text without a word, though they begin something. How the text would go on shows
-/// it: "!" is no character of its own in HZ, nor the first half of one, and "-" makes a "+" of the one before it in
+/// it: "!" is not a character of its own in HZ, nor the first half of one, and "-" makes a "+" of the one before it in
 /// UTF-7, where bits of 0 that were left over become a third character with the 42 of seven "A".
 bool forgetsTheEnd(const std::string& from, const std::string& text) {
     const auto decoded = [&](const std::string& more) {

@@ -122,7 +122,7 @@ INSTANTIATE_TEST_SUITE_P(Each, CaseTable, testing::ValuesIn(vectorTargets()), ve
 TEST_P(CaseTable, AllCodePoints) {
     std::string text;
     for (char32_t c = 0; c <= 0x10FFFF; ++c) {
-        text += utf8(c); // surrogates as well, which are no characters then
+        text += utf8(c); // surrogates as well, which are not characters then
         if (text.size() > 20000) {
             check(text);
             text.clear();

@@ -67,7 +67,7 @@ TEST(FailureParameters, AStringOfFixedEncodingFailsInTheSameWay) {
 }
 
 TEST(FailureParameters, ALossyTextThatCannotBeUtf8IsGivenWithSubstitutes) {
-    // The target spells the surrogate, so that only the bad byte counts, but what was converted is no UTF-8.
+    // The target spells the surrogate, so that only the bad byte counts, but what was converted is not UTF-8.
     const std::string bytes = "a+2AA-z\xFF";
     UString<30> target{Encoding("CESU-8")};
     const FailureRecord failure =

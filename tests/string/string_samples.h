@@ -1,6 +1,6 @@
 // Texts for the tests of storage and conversion: the eight string types in the order of their table, raw
 // bytes into strings and back, and for each type texts that convert, texts that lose something and units that
-// are no text.
+// are not text.
 #pragma once
 
 #include <kvt/string/ustring.h>

@@ -106,7 +106,7 @@ TYPED_TEST(UStringGuarantee, AStringOutlivesAnOutOfMemoryAtEachAllocation) {
     for (const auto& edit : this->edits()) {
         SCOPED_TRACE(edit.name);
         auto expected = this->make(text);
-        edit.run(expected); // also opens the converters, which are no part of the operation
+        edit.run(expected); // also opens the converters, which are not part of the operation
         EXPECT_NE(shown(this->textOf(expected)), shown(text));
 
         auto string = this->make(text);

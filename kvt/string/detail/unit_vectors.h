@@ -17,7 +17,7 @@ struct Place {
 /// be read: those at `text` number `places + length - 1`. Neither number is 0.
 ///
 /// The first and the last unit of the needle are compared at once, for a whole register of places. The search gives
-/// up where both keep standing at places that are no match, for then another way may be the better one; only the one
+/// up where both keep standing at places that are not matches, for then another way may be the better one; only the one
 /// for bytes does.
 Place findSequence(const char* text, std::size_t places, const char* needle, std::size_t length);
 Place findSequence(const char16_t* text, std::size_t places, const char16_t* needle, std::size_t length);

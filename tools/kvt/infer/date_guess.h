@@ -1,7 +1,7 @@
 // Which forms of dates and times occur among the cells of a column, and which of them read all of it.
 //
 // The library's own parse() says whether a form reads a cell. Which forms are tried is known from the shape of the
-// cell, its runs of digits and letters, so that a cell which is no date costs next to nothing.
+// cell, its runs of digits and letters, so that a cell which is not a date costs next to nothing.
 #pragma once
 
 #include <cstdint>

@@ -161,7 +161,7 @@ private:
         return xml_ ? kvt::ex::double_to_string_xml(number, digits)
                     : kvt::ex::double_to_string(number, digits);
     }
-    // There is no form for XML in single precision, and only values without digits would differ in it.
+    // XML has no form in single precision, and only values without digits would differ in it.
     std::uint64_t write(float number, char* digits) const {
         return xml_ && !std::isfinite(number)
                    ? kvt::ex::double_to_string_xml(static_cast<double>(number), digits)

@@ -17,14 +17,14 @@ public:
     /// Nothing for an encoding that is not of this kind, or does not have ASCII as its own bytes.
     static std::optional<ByteDecoder> of(kvt::ex::Encoding encoding);
 
-    /// The text, in `room`, which is made as large as it has to be. Nothing where some byte is no character; the
+    /// The text, in `room`, which is made as large as it has to be. Nothing where some byte is not a character; the
     /// transcoder knows what that is.
     std::optional<std::string_view> decode(std::string_view bytes, std::string& room) const;
 
 private:
     struct Row {
         std::array<char, 3> utf8;
-        std::uint8_t size; ///< 0 for what is no character
+        std::uint8_t size; ///< 0 for what is not a character
     };
 
     std::array<Row, 128> rows_{}; ///< from 0x80
