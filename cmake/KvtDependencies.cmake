@@ -16,8 +16,8 @@ endmacro()
 
 kvt_find(NAME "POSIX threads" INSTALL "libc6-dev" PACKAGE Threads)
 kvt_find(NAME "ICU 58 or later (its uc library)" INSTALL "libicu-dev" PACKAGE ICU 58 COMPONENTS uc)
-# From 1.76 on, Boost.Regex is headers only, so that nothing of Boost is linked against. Who uses an installed kvt needs
-# the same (kvtConfig.cmake.in).
+# From 1.76 on, Boost.Regex is headers only, so that nothing of Boost is linked against. The users of an installed
+# kvt need the same (kvtConfig.cmake.in).
 set(KVT_BOOST_VERSION 1.76)
 kvt_find(NAME "the Boost headers, ${KVT_BOOST_VERSION} or later" INSTALL "libboost1.81-dev (or libboost-dev)"
     PACKAGE Boost ${KVT_BOOST_VERSION} CONFIG)

@@ -191,7 +191,7 @@ TEST_F(KvtText, TextIsReadAndWrittenInItsEncoding) {
     for (const bool big : {false, true}) {
         const std::string sixteen = big ? "UTF-16BE" : "UTF-16LE";
         const std::string thirtyTwo = big ? "UTF-32BE" : "UTF-32LE";
-        // U+0A0D and U+0D0A look like line ends to who counts bytes.
+        // U+0A0D and U+0D0A look like line ends to code that counts bytes.
         EXPECT_EQ(
             text({"strip", " ", "--encoding", sixteen}, utf16Of(U" \u0a0d\u0d0a\U0001F600 \r\n b", big)).out,
             utf16Of(U"\u0a0d\u0d0a\U0001F600\r\nb", big));

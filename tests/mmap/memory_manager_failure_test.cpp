@@ -179,8 +179,8 @@ TEST_F(MemoryManagerFailure, NewFileWithoutRoomForItsHeaderFailsAtItsFirstUseAnd
     EXPECT_TRUE(scratch.isEmpty());
 }
 
-// What opening a manager comes to for a user who is not root, who has all rights, and who gets none to new files. It
-// runs in a process apart.
+// What opening a manager comes to for a user who is not root, for one who has all rights, and for one who gets none to
+// new files. It runs in a process apart.
 bool isDenied(const std::string& path, bool persists) {
     const pid_t child = ::fork();
     if (child == 0) {

@@ -1,5 +1,5 @@
 // The engine behind the patterns of parse(): reads a value by a pattern, on bytes, element by element. readAll() reads
-// all of it; who wants to see what each element takes goes on by readNext().
+// all of it; to see what each element takes, call readNext().
 #pragma once
 
 #include <kvt/datetime/detail/pattern_failure.h>

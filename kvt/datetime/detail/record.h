@@ -51,7 +51,7 @@ struct CanonicalRecord {
 /// is let through.
 Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient);
 
-/// The same without `lenient`, for who takes values only: a wrong shape fails by ValueUnsupported.
+/// The same without `lenient`, where only values are taken: a wrong shape fails by ValueUnsupported.
 Outcome<CanonicalRecord> readValue(std::string_view text);
 
 /// The instant of a record, without its offset a wall clock. Not for `Unsupported`, which has none.

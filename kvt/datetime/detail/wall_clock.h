@@ -1,4 +1,4 @@
-// A date and the time of its day: a place on the time line for who goes by the calendar. To compare two of them, or to
+// A date and the time of its day: a place on the time line for work by the calendar. To compare two of them, or to
 // move one within its day, takes no count of days.
 #pragma once
 

@@ -15,7 +15,7 @@
 
 namespace kvt::ex::datetime::detail {
 
-/// Thrown for a line that is not good, and caught by who reads the file.
+/// Thrown for a line that is not good, and caught where the file is read.
 struct BadZoneLine {
     std::string reason;
 };

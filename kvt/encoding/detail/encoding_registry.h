@@ -48,12 +48,12 @@ private:
     const NameTable staticIds_;
     const std::array<std::string_view, firstDynamic> typeNames_;
 
-    // Held by who writes the members below, also across the calls into ICU for a new name, so that two threads with one
-    // new name cannot be given two ids. Nothing that runs under it takes another lock of the library. What is in the
-    // members never changes or moves, and is read without it.
+    // Held while the members below are written, also across the calls into ICU for a new name, so that two threads with
+    // one new name cannot be given two ids. Nothing that runs under it takes another lock of the library. What is in
+    // the members never changes or moves, and is read without it.
     std::mutex mutex_;
     NameTable dynamicIds_;
-    std::deque<std::string> dynamicNames_; // for who writes, and for debuggers
+    std::deque<std::string> dynamicNames_; // for writers, and for debuggers
     // The same names for all others: as many as the count says, which is set before an id can be found.
     StableArray<std::string_view> dynamicViews_;
     std::atomic<std::uint32_t> dynamicCount_{0};

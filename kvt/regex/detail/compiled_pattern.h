@@ -14,7 +14,7 @@
 
 namespace kvt::ex::detail {
 
-/// Never changes for who uses it; any number of threads may.
+/// Never changes for its users; any number of threads may be.
 class CompiledPattern {
 public:
     /// Throws boost::regex_error, std::bad_alloc.

@@ -1,4 +1,4 @@
-// The commands, one line for each, in the order in which the help lists them. Who wants the list defines
+// The commands, one line for each, in the order in which the help lists them. Whoever wants the list defines
 // KVT_COMMAND(name) and includes this, perhaps more than once; hence no include guard.
 
 KVT_COMMAND(convert)

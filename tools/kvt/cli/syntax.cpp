@@ -18,7 +18,7 @@ public:
             examples_ += "  " + line + "\n";
         }
         column_width(24);
-        // In the words of who types a command line.
+        // In the words of those who type a command line.
         label("SUBCOMMAND", "COMMAND");
         label("Subcommands", "Commands");
         label("Positionals", "Arguments");

@@ -31,7 +31,7 @@ public:
     Option& required();
     /// Help says nothing of it.
     Option& hidden();
-    /// Its value is one of these words. For completions: who reads the value has to look at it all the same.
+    /// Its value is one of these words. For completions: the reader of the value has to look at it all the same.
     Option& takes(std::vector<std::string> words);
     /// Whether it was declared and the command line has it.
     bool isGiven() const;

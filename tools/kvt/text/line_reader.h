@@ -46,7 +46,7 @@ Failure badTextFailure(const std::string& file, const kvt::ex::Loss& loss, LineC
 class LineReader {
 public:
     /// Reads the beginning. Throws Failure when the file cannot be read, or its mark is not one of the encoding.
-    /// UTF-8 may pass unchecked, for who looks at each line anyway.
+    /// UTF-8 may pass unchecked, where each line is looked at anyway.
     enum class BadText { EndsIt, Passes };
     LineReader(const std::string& path, const TextEncoding& encoding, BadText badText = BadText::EndsIt);
 

@@ -88,7 +88,7 @@ ZoneFolder zoneFolder(const std::string& named) {
             makeFolder(cached);
         }
     } catch (const std::exception&) {
-        // No rules to make it of, or no room to keep it. Who needs the database is told that there is none.
+        // No rules to make it of, or no room to keep it. Whatever needs the database reports that there is none.
     }
     return isGood(cached) ? ZoneFolder{cached.string(), ZoneFolder::Origin::Cached}
                           : ZoneFolder{usual.string(), ZoneFolder::Origin::Usual};
