@@ -277,7 +277,8 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
         out[i] = static_cast<char>(code);
         return code;
     };
-    std::size_t i = keepsAscii_ ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
+    const bool isWorthACall = keepsAscii_ && count > vectors::shortText;
+    std::size_t i = isWorthACall ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
     for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
         for (std::size_t place = i; place < i + block; ++place) {
             areKnown = put(place) != noCode && areKnown;

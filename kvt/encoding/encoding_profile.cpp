@@ -2,7 +2,6 @@
 #include <kvt/encoding/detail/encoding_profile.h>
 
 #include <kvt/encoding/detail/icu.h>
-#include <kvt/encoding/detail/stable_array.h>
 
 namespace kvt::ex::detail {
 namespace {
@@ -16,14 +15,9 @@ bool hasSingleBytes(Form form) {
     return form == Form::singleByte || form == Form::asciiSingleByte;
 }
 
-/// Never destroyed: destructors of static objects convert text, too.
-struct Profiles {
-    std::mutex making;
-    StableArray<EncodingProfile> byId;
-    EncodingProfile ofNobody;
-};
-
 } // namespace
+
+constinit Profiles profiles;
 
 EncodingProfile::~EncodingProfile() {
     delete decoding();
@@ -34,13 +28,10 @@ Encoding EncodingProfile::itself() const {
     return static_cast<Encoding::Type>(id_.load(std::memory_order_relaxed));
 }
 
-Form EncodingProfile::form() {
+Form EncodingProfile::findForm() {
     // Whoever comes first asks; others who come meanwhile ask too and find the same.
-    Form form = form_.load(std::memory_order_relaxed);
-    if (form == unknownForm) {
-        form = icu::Converter(itself()).form();
-        form_.store(form, std::memory_order_relaxed);
-    }
+    const Form form = icu::Converter(itself()).form();
+    form_.store(form, std::memory_order_relaxed);
     return form;
 }
 
@@ -67,18 +58,15 @@ bool EncodingProfile::build(Lazy<Table>& lazy, std::size_t bytes) {
 template bool EncodingProfile::build(Lazy<DecodingTable>&, std::size_t);
 template bool EncodingProfile::build(Lazy<EncodingTable>&, std::size_t);
 
-EncodingProfile& profileOf(Encoding encoding) {
-    static auto& profiles = *new Profiles();
+EncodingProfile& makeProfile(Encoding encoding) {
+    static auto& making = *new std::mutex();
+    static auto& ofNobody = *new EncodingProfile();
     const std::uint32_t id = encoding.evaluate();
-    EncodingProfile* const known = profiles.byId.find(id);
-    if (known != nullptr && known->id_.load(std::memory_order_relaxed) == id) {
-        return *known;
-    }
     // An id that was never handed out has no name. A place for each of these would be more than there is room for.
     if (id == Encoding::Unknown || encoding.getName().empty()) {
-        return profiles.ofNobody;
+        return ofNobody;
     }
-    const std::lock_guard lock(profiles.making);
+    const std::lock_guard lock(making);
     EncodingProfile& made = profiles.byId.make(id);
     made.id_.store(id, std::memory_order_relaxed);
     return made;

@@ -17,6 +17,7 @@
 #include <kvt/encoding/detail/shortcut.h>
 
 #include <kvt/encoding/detail/encoding_profile.h>
+#include <kvt/encoding/detail/short_text.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
 #include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/utf.h>
@@ -43,49 +44,6 @@ constexpr std::size_t onePiece = 256; // Less than this is taken at once.
 constexpr std::size_t pieceFactor = 4;
 constexpr std::size_t longestPiece = 8192;
 
-constexpr bool isLittle = std::endian::native == std::endian::little;
-constexpr Form nativeUtf16 = isLittle ? Form::utf16le : Form::utf16be;
-constexpr Form nativeUtf32 = isLittle ? Form::utf32le : Form::utf32be;
-
-std::size_t unitBytes(Form form) {
-    switch (form) {
-    case Form::utf16le:
-    case Form::utf16be:
-        return 2;
-    case Form::utf32le:
-    case Form::utf32be:
-        return 4;
-    default:
-        return 1;
-    }
-}
-
-bool hasTables(Form form) {
-    return form >= Form::asciiSingleByte && form <= Form::severalBytes;
-}
-
-bool isUtf16(Form form) {
-    return form == Form::utf16le || form == Form::utf16be;
-}
-
-bool isUtf32(Form form) {
-    return form == Form::utf32le || form == Form::utf32be;
-}
-
-bool keepsAscii(Form form) {
-    return form != Form::other && form != Form::singleByte && form != Form::severalBytes;
-}
-
-/// Whether ASCII text of the two forms is the same bytes.
-bool isAsciiBytes(Form form) {
-    return keepsAscii(form) && unitBytes(form) == 1;
-}
-
-/// Whether the target can say every character.
-bool isUnicode(Form form) {
-    return form >= Form::utf8;
-}
-
 /// Copies units with their bytes reversed. The loop is one that compilers make vector code of.
 template <typename Unit>
 void copySwapped(const char* from, char* to, std::size_t units) {
@@ -99,84 +57,6 @@ void copySwapped(const char* from, char* to, std::size_t units) {
         }
         std::memcpy(to + i * sizeof unit, &unit, sizeof unit);
     }
-}
-
-// ---- Short texts of ASCII ----------------------------------------------------------------------------------------
-
-// For these a call into vector code costs more than the text.
-constexpr std::size_t shortText = 64; // bytes
-
-template <typename Unit>
-bool isAscii(const char* text, std::size_t units) {
-    constexpr std::uint64_t beyond = sizeof(Unit) == 1   ? 0x8080808080808080U
-                                     : sizeof(Unit) == 2 ? 0xFF80FF80FF80FF80U
-                                                         : 0xFFFFFF80FFFFFF80U;
-    const std::size_t bytes = units * sizeof(Unit);
-    std::uint64_t all = 0;
-    std::uint64_t word = 0;
-    if (bytes < sizeof word) {
-        if (bytes != 0) { // no text may be a null pointer
-            std::memcpy(&word, text, bytes);
-        }
-        return (word & beyond) == 0;
-    }
-    for (std::size_t i = 0; i + sizeof word < bytes; i += sizeof word) {
-        std::memcpy(&word, text + i, sizeof word);
-        all |= word;
-    }
-    // The last word overlaps the one before.
-    std::memcpy(&word, text + bytes - sizeof word, sizeof word);
-    return ((all | word) & beyond) == 0;
-}
-
-template <typename From, typename To>
-void copyAscii(const char* from, char* to, std::size_t units) {
-    constexpr std::size_t block = 8;
-    const auto copy = [=](std::size_t begin, std::size_t count) {
-        for (std::size_t i = begin; i < begin + count; ++i) {
-            From unit;
-            std::memcpy(&unit, from + i * sizeof unit, sizeof unit);
-            const auto same = static_cast<To>(unit);
-            std::memcpy(to + i * sizeof same, &same, sizeof same);
-        }
-    };
-    if (units < block) {
-        copy(0, units);
-        return;
-    }
-    for (std::size_t i = 0; i + block < units; i += block) {
-        copy(i, block);
-    }
-    copy(units - block, block);
-}
-
-template <typename From, typename CharOut>
-bool convertShortAscii(Form to, std::string_view in, std::basic_string<CharOut>& out) {
-    const std::size_t units = in.size() / sizeof(From);
-    if (in.size() % sizeof(From) != 0 || !isAscii<From>(in.data(), units)) {
-        return false;
-    }
-    const auto copy = to == nativeUtf16   ? copyAscii<From, std::uint16_t>
-                      : to == nativeUtf32 ? copyAscii<From, std::uint32_t>
-                                          : copyAscii<From, std::uint8_t>;
-    const std::size_t written = units * unitBytes(to) / sizeof(CharOut);
-    appendInPlace(out, written, [&](CharOut* place) {
-        copy(in.data(), reinterpret_cast<char*>(place), units);
-        return written;
-    });
-    return true;
-}
-
-/// Converts a short text that is nothing but ASCII; returns whether it was one, between forms that have the same units.
-template <typename CharOut>
-bool convertShortAscii(Form from, Form to, std::string_view in, std::basic_string<CharOut>& out) {
-    if (!isAsciiBytes(to) && to != nativeUtf16 && to != nativeUtf32) {
-        return false;
-    }
-    return isAsciiBytes(from)    ? convertShortAscii<std::uint8_t>(to, in, out)
-           : from == nativeUtf16 ? convertShortAscii<std::uint16_t>(to, in, out)
-           : from == nativeUtf32 ? convertShortAscii<std::uint32_t>(to, in, out)
-                                 : false;
 }
 
 // ---- How much there is to convert --------------------------------------------------------------------------------
@@ -487,7 +367,7 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
         (sizeof(CharOut) != 1 && sizeof(CharOut) != unitBytes(to.form))) {
         return 0;
     }
-    if (in.size() <= shortText && convertShortAscii(from.form, to.form, in, out)) {
+    if (convertShort(from, to, in, out)) {
         return in.size();
     }
     from = lacksDecoding(from) ? withoutTables(from) : from;

@@ -1,15 +1,14 @@
 // Well-formed text from one Unicode form to another (see detail/unicode_vectors.h): one source, compiled for each
 // instruction set that Highway knows for this processor family, and chosen when it is first called.
 //
-// Reading UTF-8 computes, at each byte, what a character that begins there would be, and then drops the places where
-// none begins. Writing UTF-8 lays out the bytes of each character in a lane of their own, and one shuffle from a table,
-// chosen by the lengths, moves them together. Characters beyond U+FFFF go one by one, but for those from UTF-8 to
-// UTF-16.
+// Characters beyond U+FFFF go one by one, but for those from UTF-8 to UTF-16.
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "kvt/encoding/unicode_convert.cpp"
 #include <hwy/foreach_target.h> // must come before highway.h
 
 #include <kvt/encoding/detail/unicode_characters-inl.h>
+#include <kvt/encoding/detail/unicode_from_utf8-inl.h>
+#include <kvt/encoding/detail/unicode_to_utf8-inl.h>
 #include <kvt/encoding/detail/unicode_vectors.h>
 
 #include <kvt/platform/vector_targets.h>
@@ -21,208 +20,10 @@
 #include <bit>
 #include <iterator>
 
-// What does not depend on the instruction set.
-#ifndef KVT_UNICODE_CONVERT_ONCE
-#define KVT_UNICODE_CONVERT_ONCE
-namespace kvt::ex::detail::vectors {
-
-/// For each set of eight lanes of two bytes, the order that moves the lanes of the set to the front.
-constexpr auto shufflesOfLanes = [] {
-    std::array<std::array<std::uint8_t, 16>, 256> table{};
-    for (std::size_t mask = 0; mask < table.size(); ++mask) {
-        std::size_t length = 0;
-        for (std::size_t lane = 0; lane < 8; ++lane) {
-            if ((mask >> lane & 1) != 0) {
-                table[mask][length++] = static_cast<std::uint8_t>(2 * lane);
-                table[mask][length++] = static_cast<std::uint8_t>(2 * lane + 1);
-            }
-        }
-    }
-    return table;
-}();
-
-/// For each set of lanes that have two bytes of two, the order that moves the bytes of eight lanes together.
-constexpr auto shufflesOfTwo = [] {
-    std::array<std::array<std::uint8_t, 16>, 256> table{};
-    for (std::size_t mask = 0; mask < table.size(); ++mask) {
-        std::size_t length = 0;
-        for (std::size_t lane = 0; lane < 8; ++lane) {
-            table[mask][length++] = static_cast<std::uint8_t>(2 * lane);
-            if ((mask >> lane & 1) != 0) {
-                table[mask][length++] = static_cast<std::uint8_t>(2 * lane + 1);
-            }
-        }
-    }
-    return table;
-}();
-
-/// The same for four lanes of four bytes, which hold the last byte of the character first: the lower half of the
-/// index says which lanes have at least two bytes, the upper half which have three.
-constexpr auto shufflesOfThree = [] {
-    std::array<std::array<std::uint8_t, 16>, 256> table{};
-    for (std::size_t mask = 0; mask < table.size(); ++mask) {
-        std::size_t length = 0;
-        for (std::size_t lane = 0; lane < 4; ++lane) {
-            const std::size_t bytes = 1 + (mask >> lane & 1) + (mask >> (lane + 4) & 1);
-            for (std::size_t i = bytes; i-- > 0;) {
-                table[mask][length++] = static_cast<std::uint8_t>(4 * lane + i);
-            }
-        }
-    }
-    return table;
-}();
-
-} // namespace kvt::ex::detail::vectors
-#endif
-
 HWY_BEFORE_NAMESPACE();
 namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
 
 // ---- From UTF-8
-
-#if KVT_HAS_VECTORS
-/// Stores units of UTF-16 as they are, or widened.
-template <class D>
-HWY_INLINE void storeUnits(D d, hn::Vec<D> units, std::uint16_t* q) {
-    hn::StoreU(units, d, q);
-}
-template <class D>
-HWY_INLINE void storeUnits(D, hn::Vec<D> units, std::uint32_t* q) {
-    const hn::Half<D> half;
-    const hn::Rebind<std::uint32_t, hn::Half<D>> wide;
-    hn::StoreU(hn::PromoteTo(wide, hn::LowerHalf(half, units)), wide, q);
-    hn::StoreU(hn::PromoteTo(wide, hn::UpperHalf(half, units)), wide, q + hn::Lanes(half));
-}
-
-using Eight16 = hn::FixedTag<std::uint16_t, 8>;
-using Sixteen8 = hn::FixedTag<std::uint8_t, 16>;
-
-/// The lanes of a mask as bits, the first one lowest.
-template <class D>
-HWY_INLINE std::uint64_t maskOf(D d, hn::Mask<D> mask) {
-    std::uint8_t bytes[8] = {};
-    hn::StoreMaskBits(d, mask, bytes);
-    std::uint64_t bits;
-    std::memcpy(&bits, bytes, sizeof bits);
-    return bits;
-}
-
-/// Stores the lanes of `units` whose bits are set in `mask`, and moves behind them; more may be written.
-template <class D, typename Unit>
-HWY_INLINE void storeSome(D d, hn::Vec<D> units, std::uint64_t mask, Unit*& q) {
-    if constexpr (hn::MaxLanes(d) == 8) {
-        const Sixteen8 bytes;
-        const auto order = hn::LoadU(bytes, shufflesOfLanes[mask & 0xFF].data());
-        storeUnits(d, hn::BitCast(d, hn::TableLookupBytes(hn::BitCast(bytes, units), order)), q);
-        q += std::popcount(mask & 0xFF);
-#if HWY_TARGET <= HWY_AVX3_DL
-    } else if constexpr (hn::MaxLanes(d) == 32) {
-        const std::uint32_t bits = static_cast<std::uint32_t>(mask);
-        storeUnits(d, hn::Compress(units, hn::LoadMaskBits(d, reinterpret_cast<const std::uint8_t*>(&bits))),
-                   q);
-        q += std::popcount(bits);
-#endif
-    } else {
-        const hn::Half<D> half;
-        storeSome(half, hn::LowerHalf(half, units), mask, q);
-        storeSome(half, hn::UpperHalf(half, units), mask >> hn::MaxLanes(half), q);
-    }
-}
-
-/// What the longest character of a block is.
-enum class Longest { two, three, four };
-
-/// The unit of UTF-16 that belongs to each of the bytes from `p` on: to the first byte of a character, and of one of
-/// four bytes to the second as well.
-template <Longest longest, class D>
-HWY_INLINE hn::Vec<D> unitsAt(D d, const std::uint8_t* p) {
-    const hn::Rebind<std::uint8_t, D> narrow;
-    const hn::RebindToSigned<D> isSigned;
-    const auto b0 = hn::PromoteTo(d, hn::LoadU(narrow, p));
-    const auto b1 = hn::And(hn::PromoteTo(d, hn::LoadU(narrow, p + 1)), hn::Set(d, 0x3F));
-    const auto isAscii = hn::RebindMask(d, hn::Lt(hn::BitCast(isSigned, b0), hn::Set(isSigned, 0x80)));
-    const auto two = hn::Or(hn::And(hn::ShiftLeft<6>(b0), hn::Set(d, 0x7C0)), b1);
-    if constexpr (longest == Longest::two) {
-        return hn::IfThenElse(isAscii, b0, two);
-    } else {
-        const auto b2 = hn::And(hn::PromoteTo(d, hn::LoadU(narrow, p + 2)), hn::Set(d, 0x3F));
-        const auto three = hn::Or(hn::Or(hn::ShiftLeft<12>(b0), hn::ShiftLeft<6>(b1)), b2);
-        const auto isThree = hn::RebindMask(d, hn::Gt(hn::BitCast(isSigned, b0), hn::Set(isSigned, 0xDF)));
-        const auto upToThree = hn::IfThenElse(isAscii, b0, hn::IfThenElse(isThree, three, two));
-        if constexpr (longest == Longest::three) {
-            return upToThree;
-        } else {
-            // The halves of a surrogate pair, from bits 20 to 10 and 9 to 0 of the code point without 0x10000.
-            const auto before = hn::PromoteTo(d, hn::LoadU(narrow, p - 1));
-            const auto isFour = hn::RebindMask(d, hn::Gt(hn::BitCast(isSigned, b0), hn::Set(isSigned, 0xEF)));
-            const auto followsFour =
-                hn::RebindMask(d, hn::Gt(hn::BitCast(isSigned, before), hn::Set(isSigned, 0xEF)));
-            const auto bits =
-                hn::Or(hn::Or(hn::ShiftLeft<8>(hn::And(b0, hn::Set(d, 0x07))), hn::ShiftLeft<2>(b1)),
-                       hn::ShiftRight<4>(b2));
-            const auto high = hn::Add(bits, hn::Set(d, 0xD7C0));
-            const auto low =
-                hn::Or(hn::Or(hn::ShiftLeft<6>(hn::And(b1, hn::Set(d, 0x0F))), b2), hn::Set(d, 0xDC00));
-            return hn::IfThenElse(followsFour, low, hn::IfThenElse(isFour, high, upToThree));
-        }
-    }
-}
-
-template <Longest longest, class D, typename Unit>
-HWY_INLINE void putBlock(D d, std::uint64_t mask, const std::uint8_t*& p, Unit*& q) {
-    const std::size_t N = hn::Lanes(d);
-    storeSome(d, unitsAt<longest>(d, p), mask, q);
-    storeSome(d, unitsAt<longest>(d, p + N), mask >> (N - 1) >> 1, q);
-    p += 2 * N;
-}
-
-/// Converts blocks of twice as many bytes as there are units in a register. A block of four-byte characters may end
-/// behind the first byte of one, of which only the high half has been written then.
-template <class D, typename Unit>
-HWY_INLINE void fromUtf8Blocks(D d, const std::uint8_t* first, const std::uint8_t*& p,
-                               const std::uint8_t* end, Unit*& q, const Unit* outEnd) {
-    const hn::Rebind<std::uint8_t, D> narrow;
-    const hn::Repartition<std::uint8_t, D> dBytes;
-    const hn::RebindToSigned<decltype(dBytes)> dSigned;
-    const std::size_t N = hn::Lanes(d);
-    while (static_cast<std::size_t>(end - p) >= 2 * N + 2 && static_cast<std::size_t>(outEnd - q) >= 2 * N) {
-        const auto all = hn::LoadU(dBytes, p);
-        if (hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0x80)))) {
-            storeUnits(d, hn::PromoteTo(d, hn::LowerHalf(narrow, all)), q);
-            storeUnits(d, hn::PromoteTo(d, hn::UpperHalf(narrow, all)), q + N);
-            p += 2 * N;
-            q += 2 * N;
-            continue;
-        }
-        const std::uint64_t begins =
-            maskOf(dSigned, hn::Gt(hn::BitCast(dSigned, all), hn::Set(dSigned, -65)));
-        const bool hasFours =
-            !hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0xF0))) || (p != first && p[-1] >= 0xF0);
-        if (HWY_LIKELY(!hasFours)) {
-            if (hn::AllTrue(dBytes, hn::Lt(all, hn::Set(dBytes, 0xE0)))) {
-                putBlock<Longest::two>(d, begins, p, q);
-            } else {
-                putBlock<Longest::three>(d, begins, p, q);
-            }
-            continue;
-        }
-        if (sizeof(Unit) == 2 && p != first) {
-            const auto before = hn::LoadU(dBytes, p - 1);
-            const auto isFour = hn::Eq(hn::Max(before, hn::Set(dBytes, 0xF0)), before);
-            putBlock<Longest::four>(d, begins | maskOf(dBytes, isFour), p, q);
-            continue;
-        }
-        const std::uint8_t* const stop = p + 2 * N;
-        while (p < stop) {
-            if (isTrail(*p)) {
-                ++p;
-            } else {
-                put(q, takeUtf8(p));
-            }
-        }
-    }
-}
-#endif
 
 #if KVT_HAS_VECTORS
 /// Converts the last bytes of a text, fewer than two narrow registers, as a register or two with zeros behind them.
@@ -293,50 +94,6 @@ std::size_t utf8ToUtf32(const char* text, std::size_t bytes, char* out, std::siz
 }
 
 // ---- To UTF-8
-
-#if KVT_HAS_VECTORS
-/// Eight units below U+0800. Sixteen bytes are written.
-HWY_INLINE void putEightTwos(hn::Vec<Eight16> units, std::uint8_t*& q) {
-    const Eight16 d;
-    const Sixteen8 bytes;
-    const auto isTwo = hn::Gt(units, hn::Set(d, 0x7F));
-    const auto lead = hn::Or(hn::ShiftRight<6>(units), hn::Set(d, 0x80C0));
-    const auto two = hn::Or(lead, hn::ShiftLeft<8>(hn::And(units, hn::Set(d, 0x3F))));
-    const auto mask = static_cast<unsigned>(maskOf(d, isTwo));
-    const auto laid = hn::BitCast(bytes, hn::IfThenElse(isTwo, two, units));
-    hn::StoreU(hn::TableLookupBytes(laid, hn::LoadU(bytes, shufflesOfTwo[mask].data())), bytes, q);
-    q += 8 + std::popcount(mask);
-}
-
-/// Eight units none of which is a surrogate. Up to 28 bytes are written, 24 of them kept.
-HWY_INLINE void putEightThrees(hn::Vec<Eight16> units, std::uint8_t*& q) {
-    const Eight16 d;
-    const Sixteen8 bytes;
-    const auto isTwo = hn::Gt(units, hn::Set(d, 0x7F));
-    const auto isThree = hn::Gt(units, hn::Set(d, 0x7FF));
-    const auto two = static_cast<unsigned>(maskOf(d, isTwo));
-    const auto three = static_cast<unsigned>(maskOf(d, isThree));
-    const auto middle = hn::ShiftRight<6>(units);
-    const auto last =
-        hn::IfThenElse(isTwo, hn::Or(hn::And(units, hn::Set(d, 0x3F)), hn::Set(d, 0x80)), units);
-    const auto second = hn::IfThenElse(isThree, hn::Or(hn::And(middle, hn::Set(d, 0x3F)), hn::Set(d, 0x80)),
-                                       hn::Or(middle, hn::Set(d, 0xC0)));
-    const auto lower = hn::Or(last, hn::ShiftLeft<8>(second));
-    const auto upper = hn::Or(hn::ShiftRight<12>(units), hn::Set(d, 0xE0));
-    const auto first = hn::BitCast(bytes, hn::InterleaveLower(d, lower, upper));
-    const auto rest = hn::BitCast(bytes, hn::InterleaveUpper(d, lower, upper));
-    const unsigned firstKey = (two & 0x0F) | (three & 0x0F) << 4;
-    const unsigned restKey = two >> 4 | (three & 0xF0);
-    hn::StoreU(hn::TableLookupBytes(first, hn::LoadU(bytes, shufflesOfThree[firstKey].data())), bytes, q);
-    q += 4 + std::popcount(firstKey);
-    hn::StoreU(hn::TableLookupBytes(rest, hn::LoadU(bytes, shufflesOfThree[restKey].data())), bytes, q);
-    q += 4 + std::popcount(restKey);
-}
-
-// Bytes that may be written behind the last one of a block of eight.
-constexpr std::size_t blockRoom = 32;
-
-#endif
 
 std::size_t utf16ToUtf8(const char* text, std::size_t units, char* out, std::size_t room) {
     const auto* p = reinterpret_cast<const std::uint16_t*>(text);

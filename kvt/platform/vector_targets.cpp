@@ -2,8 +2,6 @@
 // the instruction sets that it is compiled with (hwy/ops/set_macros-inl.h).
 #include <kvt/platform/vector_targets.h>
 
-#include <atomic>
-
 #if HWY_ARCH_X86 && __has_include(<sys/platform/x86.h>)
 #ifdef __clang__
 #define _Bool bool // as the header of the C library calls it
@@ -50,17 +48,13 @@ std::int64_t detectedTargets() noexcept {
 #endif
 }
 
-// 0 until it is known.
-std::atomic<std::int64_t> knownTargets = 0;
-
 } // namespace
 
-std::int64_t processorTargets() noexcept {
-    std::int64_t targets = knownTargets.load(std::memory_order_relaxed);
-    if (targets == 0) {
-        targets = detectedTargets();
-        knownTargets.store(targets, std::memory_order_relaxed);
-    }
+constinit std::atomic<std::int64_t> knownTargets = 0;
+
+std::int64_t detectProcessorTargets() noexcept {
+    const std::int64_t targets = detectedTargets();
+    knownTargets.store(targets, std::memory_order_relaxed);
     return targets;
 }
 

@@ -12,14 +12,24 @@
 
 #include <hwy/highway.h>
 
+#include <atomic>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
 
 namespace kvt::platform {
 
-/// The targets that this processor can run, a bit for each as Highway numbers them.
-std::int64_t processorTargets() noexcept;
+/// Finds out what the processor has.
+std::int64_t detectProcessorTargets() noexcept;
+
+/// 0 until it is known.
+extern std::atomic<std::int64_t> knownTargets;
+
+/// The targets that this processor can run, a bit for each as Highway numbers them. Short texts notice what this takes.
+inline std::int64_t processorTargets() noexcept {
+    const std::int64_t targets = knownTargets.load(std::memory_order_relaxed);
+    return targets != 0 ? targets : detectProcessorTargets();
+}
 
 /// Takes `targets` for those of the processor, for tests; 0 ends that. Not while another thread converts or searches.
 void forceProcessorTargets(std::int64_t targets) noexcept;

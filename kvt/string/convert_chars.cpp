@@ -25,12 +25,12 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     }
 }
 
-// A short text is converted before anything is asked about the converters of this thread, which would cost more than
-// the text. One that needs ICU is done again from its beginning.
+// A text that is not long is converted before anything is asked about the converters of this thread, which would cost
+// more than the text. One that needs ICU is done again from its beginning.
 template <typename CharOut>
 void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
-    constexpr std::size_t shortText = 1024;
-    if (bytes.size() <= shortText && from != to) {
+    constexpr std::size_t longText = 1024;
+    if (bytes.size() <= longText && from != to) {
         const Side source = sideOf(from);
         const Side target = sideOf(to);
         if (source.form != Form::other && target.form != Form::other) {

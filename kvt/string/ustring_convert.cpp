@@ -3,9 +3,10 @@
 #include <kvt/string/detail/instantiate.h>
 
 #include <kvt/codec/wwjd.h>
+#include <kvt/encoding/detail/short_ascii.h>
 #include <kvt/foundation/throwable.h>
 
-#include <array>
+#include <bit>
 
 namespace kvt::ex {
 namespace {
@@ -78,6 +79,15 @@ std::string_view bytesOf(const CharT* units, std::size_t count) {
     return {reinterpret_cast<const char*>(units), count * sizeof(CharT)};
 }
 
+/// Whether a string type has ASCII characters as units of their numbers on this machine.
+constexpr bool keepsAscii(std::uint32_t type) {
+    return type <= Encoding::UsAscii ||
+           (type <= Encoding::Utf32LE && std::endian::native == std::endian::little);
+}
+
+// The units of a text that is short enough to be looked at before anything else.
+constexpr std::size_t shortText = 64;
+
 } // namespace
 
 template <std::uint32_t N>
@@ -119,6 +129,15 @@ void UString<N>::init(const UString<M>& other) {
 template <std::uint32_t N>
 template <std::uint32_t M>
 UString<N>& UString<N>::assign(const UString<M>& other) {
+    if constexpr (N != M && keepsAscii(N) && keepsAscii(M)) {
+        const auto* const text = reinterpret_cast<const char*>(other.rawData());
+        const std::size_t units = other.size();
+        if (units <= shortText && detail::isAscii<detail::CodeUnit<M>>(text, units)) {
+            this->storage_.clear();
+            detail::appendAscii<detail::CodeUnit<M>, detail::CodeUnit<N>>(text, units, this->storage_);
+            return *this;
+        }
+    }
     convertAlong(grid[gridIndex(M)][gridIndex(N)], other.encoding(), encoding(),
                  bytesOf(other.rawData(), other.size()), this->storage_);
     return *this;

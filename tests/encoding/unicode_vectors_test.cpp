@@ -10,7 +10,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstring>
+#include <optional>
 #include <random>
 #include <string>
 #include <string_view>
@@ -151,6 +153,30 @@ protected:
         ASSERT_TRUE(std::string_view(out, wanted.size()) == wanted) << hex(from, 400);
     }
 
+    // Of a short text all is converted, or nothing: `expected` is empty then.
+    template <typename Unit, typename Convert>
+    void checkShort(std::string_view from, std::size_t units,
+                    const std::optional<std::basic_string<Unit>>& expected, Convert convert) {
+        if (units > vectors::shortText) {
+            return;
+        }
+        char* const in = input_.end() - from.size();
+        std::memcpy(in, from.data(), from.size());
+        char* const out = output_.end() - vectors::shortRoom * sizeof(Unit);
+        const std::size_t written = convert(in, units, out);
+        ASSERT_EQ(written, expected ? expected->size() : vectors::notWhole) << hex(from);
+        ASSERT_TRUE(!expected || std::string_view(out, written * sizeof(Unit)) == bytesOf(*expected))
+            << hex(from, 400);
+    }
+
+    template <typename Unit>
+    static std::optional<std::basic_string<Unit>> ifWhole(bool isWhole, std::basic_string<Unit> text) {
+        return isWhole ? std::optional(std::move(text)) : std::nullopt;
+    }
+    static bool hasOnlyUnits(const std::u32string& text) {
+        return std::all_of(text.begin(), text.end(), [](char32_t c) { return c < 0x10000; });
+    }
+
     static void checkExtent(const Extent& extent, const Decoded& decoded, std::string_view from) {
         ASSERT_EQ(extent.taken, decoded.taken) << hex(from, 400);
         ASSERT_EQ(extent.utf8, encodeUtf8(decoded.text).size()) << hex(from, 400);
@@ -166,6 +192,9 @@ protected:
         const std::string_view good = text.substr(0, decoded.taken);
         checkConversion(good, good.size(), encodeUtf16(decoded.text), vectors::utf8ToUtf16);
         checkConversion(good, good.size(), decoded.text, vectors::utf8ToUtf32);
+        const bool isWhole = decoded.taken == text.size();
+        checkShort(text, text.size(), ifWhole(isWhole, encodeUtf16(decoded.text)), vectors::shortUtf8ToUtf16);
+        checkShort(text, text.size(), ifWhole(isWhole, decoded.text), vectors::shortUtf8ToUtf32);
     }
 
     void checkUtf16(const std::u16string& text) {
@@ -177,6 +206,9 @@ protected:
         const std::string_view good = bytes.substr(0, decoded.taken * 2);
         checkConversion(good, decoded.taken, encodeUtf8(decoded.text), vectors::utf16ToUtf8);
         checkConversion(good, decoded.taken, decoded.text, vectors::utf16ToUtf32);
+        const bool isWhole = decoded.taken == text.size() && hasOnlyUnits(decoded.text);
+        checkShort(bytes, text.size(), ifWhole(isWhole, encodeUtf8(decoded.text)), vectors::shortUtf16ToUtf8);
+        checkShort(bytes, text.size(), ifWhole(isWhole, decoded.text), vectors::shortUtf16ToUtf32);
     }
 
     void checkUtf32(const std::u32string& text) {
@@ -188,6 +220,9 @@ protected:
         const std::string_view good = bytes.substr(0, decoded.taken * 4);
         checkConversion(good, decoded.taken, encodeUtf8(decoded.text), vectors::utf32ToUtf8);
         checkConversion(good, decoded.taken, encodeUtf16(decoded.text), vectors::utf32ToUtf16);
+        const bool isWhole = decoded.taken == text.size() && hasOnlyUnits(decoded.text);
+        checkShort(bytes, text.size(), ifWhole(isWhole, encodeUtf16(decoded.text)),
+                   vectors::shortUtf32ToUtf16);
     }
 
     void checkAll(const std::u32string& text) {

@@ -6,6 +6,7 @@
 
 #include <kvt/encoding/detail/conversion_tables.h>
 #include <kvt/encoding/detail/shortcut.h>
+#include <kvt/encoding/detail/stable_array.h>
 #include <kvt/encoding/encoding.h>
 
 #include <atomic>
@@ -23,7 +24,10 @@ public:
     ~EncodingProfile();
 
     /// Found out at the first call; `other` when ICU cannot open the encoding.
-    Form form();
+    Form form() {
+        const Form form = form_.load(std::memory_order_relaxed);
+        return form != unknownForm ? form : findForm();
+    }
 
     /// Null as long as they are not built.
     const DecodingTable* decoding() const { return decoding_.table.load(std::memory_order_acquire); }
@@ -36,6 +40,7 @@ public:
 
 private:
     friend EncodingProfile& profileOf(Encoding encoding);
+    friend EncodingProfile& makeProfile(Encoding encoding);
 
     template <typename Table>
     struct Lazy {
@@ -46,6 +51,7 @@ private:
     bool build(Lazy<Table>& lazy, std::size_t bytes);
 
     Encoding itself() const;
+    Form findForm();
 
     // `Unknown` until the object is somebody's.
     std::atomic<std::uint32_t> id_{Encoding::Unknown};
@@ -56,7 +62,24 @@ private:
     Lazy<EncodingTable> encoding_;
 };
 
+/// Never destroyed: destructors of static objects convert text, too.
+union Profiles {
+    constexpr Profiles() : byId() {}
+    ~Profiles() {}
+
+    StableArray<EncodingProfile> byId;
+};
+extern Profiles profiles;
+
+/// For an encoding that is not among them yet.
+EncodingProfile& makeProfile(Encoding encoding);
+
 /// The object of an encoding, which lives as long as the process. Throws std::bad_alloc.
-EncodingProfile& profileOf(Encoding encoding);
+inline EncodingProfile& profileOf(Encoding encoding) {
+    const std::uint32_t id = encoding.evaluate();
+    EncodingProfile* const known = profiles.byId.find(id);
+    return known != nullptr && known->id_.load(std::memory_order_relaxed) == id ? *known
+                                                                                : makeProfile(encoding);
+}
 
 } // namespace kvt::ex::detail

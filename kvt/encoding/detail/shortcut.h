@@ -10,48 +10,14 @@
 // character boundary in the initial state of both converters, so ICU can go on from there.
 #pragma once
 
+#include <kvt/encoding/detail/form.h>
 #include <kvt/encoding/encoding.h>
 
 #include <cstddef>
-#include <cstdint>
 #include <string>
 #include <string_view>
 
 namespace kvt::ex::detail {
-
-/// How the bytes of an encoding can be read and written without ICU.
-enum class Form : std::uint8_t {
-    other,             ///< only by ICU
-    asciiCompatible,   ///< stateless, and a byte below 128 where a character begins is that ASCII character
-    asciiSingleByte,   ///< the same, with tables; all characters have one byte
-    asciiSeveralBytes, ///< the same, with tables
-    singleByte, ///< stateless, with tables; all characters have one byte, and ASCII has other ones than in ASCII
-    severalBytes, ///< the same, but for the number of bytes
-    utf8,
-    utf16le,
-    utf16be,
-    utf32le,
-    utf32be,
-};
-
-/// The form of UTF-8, UTF-16 and UTF-32 with a stated byte order, which their numbers tell; `other` for all encodings
-/// whose converter has to be asked.
-inline Form unicodeForm(Encoding encoding) {
-    switch (encoding.evaluate()) {
-    case Encoding::Utf8:
-        return Form::utf8;
-    case Encoding::Utf16LE:
-        return Form::utf16le;
-    case Encoding::Utf16BE:
-        return Form::utf16be;
-    case Encoding::Utf32LE:
-        return Form::utf32le;
-    case Encoding::Utf32BE:
-        return Form::utf32be;
-    default:
-        return Form::other;
-    }
-}
 
 class EncodingProfile;
 

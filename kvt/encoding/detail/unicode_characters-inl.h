@@ -119,6 +119,21 @@ using Bytes = hn::ScalableTag<std::uint8_t>;
 using Units16 = hn::ScalableTag<std::uint16_t>;
 using Units32 = hn::ScalableTag<std::uint32_t>;
 
+#if KVT_HAS_VECTORS
+using Eight16 = hn::FixedTag<std::uint16_t, 8>;
+using Sixteen8 = hn::FixedTag<std::uint8_t, 16>;
+
+/// The lanes of a mask as bits, the first one lowest.
+template <class D>
+HWY_INLINE std::uint64_t maskOf(D d, hn::Mask<D> mask) {
+    std::uint8_t bytes[8] = {};
+    hn::StoreMaskBits(d, mask, bytes);
+    std::uint64_t bits;
+    std::memcpy(&bits, bytes, sizeof bits);
+    return bits;
+}
+#endif
+
 } // namespace kvt::ex::detail::vectors::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 

@@ -1,0 +1,20 @@
+// Short texts without ICU, which are mostly what a conversion costs before it begins: taken as a whole, or not at all.
+#pragma once
+
+#include <kvt/encoding/detail/shortcut.h>
+
+#include <string>
+#include <string_view>
+
+namespace kvt::ex::detail {
+
+/// Converts a text that is short, and for which ICU is not needed, and appends it to `out`; returns whether it was such a
+/// text. The rules for the two sides and for `out` are those of convertPrefix().
+template <typename CharOut>
+bool convertShort(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
+
+extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char>&);
+extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char16_t>&);
+extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char32_t>&);
+
+} // namespace kvt::ex::detail
