@@ -10,7 +10,6 @@
 #include <kvt/datetime/detail/system_bytes.h>
 #include <kvt/datetime/message_numbers.h>
 
-#include <algorithm>
 #include <array>
 #include <string>
 #include <string_view>
@@ -50,9 +49,7 @@ std::string expanded(std::string_view format) {
 
 // Whether there is one, or what looks like one behind "%%".
 bool hasTimeFlag(std::string_view format) {
-    return std::adjacent_find(format.begin(), format.end(), [](char first, char second) {
-               return first == '%' && second == 'T';
-           }) != format.end();
+    return format.find("%T") != std::string_view::npos;
 }
 
 // Made in place, since a value that does not fit is nothing rare.

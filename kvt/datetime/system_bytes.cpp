@@ -51,7 +51,8 @@ std::string_view wholeCharacters(std::string_view bytes, std::size_t length) {
 }
 
 std::size_t placeBetweenCharacters(std::string_view bytes, std::size_t place) noexcept {
-    if (isSystemUtf8()) {
+    // Nearly always there is nothing to do: the next byte begins a character.
+    if (place < bytes.size() && isContinuation(bytes[place]) && isSystemUtf8()) {
         while (place > 0 && place < bytes.size() && isContinuation(bytes[place]) &&
                !isAscii(bytes[place - 1])) {
             --place;
