@@ -26,6 +26,25 @@ TEST_F(InferCommand, PrintsAJobWithItsEvidence) {
     EXPECT_NE(job.find("# Column 3, \"paid\": text; 3 cells are numbers.\n"), std::string::npos) << job;
 }
 
+// Each job is proof of itself: translate reads by it what is in the file.
+TEST_F(InferCommand, ProposesMonthsInTheLanguageOfTheColumn) {
+    write("a.csv", "id,day\n1,3. M\xC3\xA4rz 2020\n2,14. Okt. 2021\n3,1.2.2003\n4,24. Dezember 1999\n");
+    const auto result = kvt({"infer", path("a.csv"), "-o", path("job.toml")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    const std::string job = read("job.toml");
+    EXPECT_NE(job.find("# Column 2, \"day\": 4 dates or times.\n"
+                       "#   3 as %d. %B %Y, such as \"3. M\xC3\xA4rz 2020\"\n"
+                       "#   1 as %d.%m.%Y, such as \"1.2.2003\"\n"
+                       "#   The names of months are those of language 'de'.\n"
+                       "[[step]]\ndo = \"date\"\ncolumn = \"day\"\n"
+                       "format = [\"%d. %B %Y\", \"%d.%m.%Y\"]\nmonths = \"de\"\n"),
+              std::string::npos)
+        << job;
+    const auto translated = kvt({"translate", "--job", path("job.toml"), path("a.csv")});
+    EXPECT_EQ(translated.status, 0) << translated.err;
+    EXPECT_EQ(translated.out, "id,day\n1,2020-03-03\n2,2021-10-14\n3,2003-02-01\n4,1999-12-24\n");
+}
+
 TEST_F(InferCommand, ReadsStandardInput) {
     const auto result = kvt({"infer"}, "a,b\n1,2\n");
     EXPECT_EQ(result.status, 0) << result.err;

@@ -70,6 +70,69 @@ TEST(DateGuess, IsNoneForWhatParseRefuses) {
     }
 }
 
+TEST(DateGuess, KnowsMonthsInOtherLanguages) {
+    const struct {
+        std::vector<std::string> cells;
+        const char* format;
+        const char* language;
+    } rows[] = {
+        {{"3. M\xC3\xA4rz 2020", "5. April 2020", "1. MAI 2021"}, "%d. %B %Y", "de"},
+        {{"3. Okt. 2020", "5. Dez. 2020"}, "%d. %B %Y", "de"},
+        {{"14 juillet 1789", "1 ao\xC3\xBBt 2001"}, "%d %b %Y", "fr"},
+        {{"14 juil. 1789", "1 f\xC3\xA9vr. 2001 12:30"}, "%d %b %Y", "fr"},
+        {{"3 de enero de 2020", "24 de abril de 2021"}, "%d de %B de %Y", "es"},
+        {{"12 \xD1\x8F\xD0\xBD\xD0\xB2\xD0\xB0\xD1\x80\xD1\x8F 2020"}, "%d %b %Y", "ru"},
+        {{"12-pa\xC5\xBA-19", "13-lis-20"}, "%d-%b-%y", "pl"},
+    };
+    for (const auto& row : rows) {
+        DateGuess guess;
+        for (const std::string& cell : row.cells) {
+            EXPECT_TRUE(guess.add(cell)) << cell;
+        }
+        EXPECT_EQ(guess.cells(), row.cells.size()) << row.cells[0];
+        ASSERT_FALSE(guess.forms().empty()) << row.cells[0];
+        EXPECT_EQ(guess.forms()[0].format, row.format) << row.cells[0];
+        ASSERT_FALSE(guess.months().empty()) << row.cells[0];
+        EXPECT_EQ(guess.months()[0], row.language) << row.cells[0];
+        std::uint64_t sum = 0;
+        for (const DateForm& form : guess.forms()) {
+            sum += form.cells;
+        }
+        EXPECT_EQ(sum, guess.cells()) << row.cells[0];
+    }
+}
+
+TEST(DateGuess, PrefersEnglishMonthsWhereTheyDo) {
+    DateGuess guess;
+    for (const char* const cell : {"3 April 2020", "5 August 2020", "31.12.2020"}) {
+        EXPECT_TRUE(guess.add(cell));
+    }
+    EXPECT_TRUE(guess.months().empty());
+    EXPECT_EQ(guess.cells(), 3U);
+}
+
+TEST(DateGuess, TakesTheLanguageOfMostCells) {
+    ColumnGuess guess;
+    for (int i = 0; i < 20; ++i) {
+        guess.add("3. Oktober 2020");
+    }
+    guess.add("3 October 2020");
+    guess.add("31.12.2020");
+    EXPECT_EQ(guess.type(), ColumnGuess::Type::Date);
+    EXPECT_EQ(guess.dates().cells(), 21U);
+    EXPECT_EQ(guess.others(), 1U);
+    EXPECT_EQ(guess.exampleOfOthers(), "3 October 2020");
+    ASSERT_FALSE(guess.dates().months().empty());
+    EXPECT_EQ(guess.dates().months().front(), "de");
+}
+
+TEST(DateGuess, TakesNoOtherWordForAMonth) {
+    for (const char* const cell : {"3. Hafer 2020", "3. M\xC3\xA4rzen 2020", "M\xC3\xA4rz",
+                                   "M\xC3\xA4rz 2020 kam er", "32. M\xC3\xA4rz 2020"}) {
+        EXPECT_TRUE(formatsOf({cell}).empty()) << cell;
+    }
+}
+
 // What one day above 12 decides, it decides for the column.
 TEST(DateGuess, TellsDayFromMonthByTheColumn) {
     EXPECT_EQ(formatsOf({"01/02/2020", "03/31/2020"}), Formats{"%m/%d/%Y"});

@@ -55,8 +55,8 @@ std::uint64_t ColumnGuess::others() const {
     }
 }
 
-const std::string& ColumnGuess::exampleOfOthers() const {
-    return type() == Type::Date ? noDate_ : noNumber_;
+std::string ColumnGuess::exampleOfOthers() const {
+    return type() != Type::Date ? noNumber_ : noDate_.empty() ? dates_.exampleOfOthers() : noDate_;
 }
 
 } // namespace host

@@ -27,7 +27,7 @@ public:
     std::uint64_t padded() const { return padded_; }
     /// Cells that are not of the column's type, and the first of them.
     std::uint64_t others() const;
-    const std::string& exampleOfOthers() const;
+    std::string exampleOfOthers() const;
 
 private:
     DateGuess dates_;

@@ -1,6 +1,7 @@
 #include "infer/date_guess.h"
 
 #include "base/text_units.h"
+#include "infer/month_words.h"
 
 #include <kvt/datetime/datetime.h>
 
@@ -47,6 +48,10 @@ struct Form {
     std::string format;
     std::string shape;
     std::size_t yearAt; ///< which run of digits is the year of two digits; npos for none
+
+    bool hasMonthName() const {
+        return format.find("%b") != std::string::npos || format.find("%B") != std::string::npos;
+    }
 };
 
 constexpr std::size_t npos = std::string::npos;
@@ -61,15 +66,16 @@ const std::vector<Form>& allForms() {
             std::size_t yearAt;
         };
         static constexpr Date dates[] = {
-            {"%Y-%m-%d", "y-d-d", npos},   {"%d.%m.%Y", "d.d.y", npos}, {"%d/%m/%Y", "d/d/y", npos},
-            {"%m/%d/%Y", "d/d/y", npos},   {"%d-%m-%Y", "d-d-y", npos}, {"%m-%d-%Y", "d-d-y", npos},
-            {"%Y/%m/%d", "y/d/d", npos},   {"%Y.%m.%d", "y.d.d", npos}, {"%Y%m%d", "8", npos},
-            {"%d %m %Y", "d d y", npos},   {"%d %b %Y", "d a y", npos}, {"%d %B %Y", "d a y", npos},
-            {"%d-%b-%Y", "d-a-y", npos},   {"%d/%b/%Y", "d/a/y", npos}, {"%b %d, %Y", "a d, y", npos},
-            {"%B %d, %Y", "a d, y", npos}, {"%b %d %Y", "a d y", npos}, {"%B %d %Y", "a d y", npos},
-            {"%Y-%j", "y-n", npos},        {"%d.%m.%y", "d.d.d", 2},    {"%d/%m/%y", "d/d/d", 2},
-            {"%m/%d/%y", "d/d/d", 2},      {"%d-%m-%y", "d-d-d", 2},    {"%y-%m-%d", "d-d-d", 0},
-            {"%d %b %y", "d a d", 1},      {"%d-%b-%y", "d-a-d", 1},
+            {"%Y-%m-%d", "y-d-d", npos}, {"%d.%m.%Y", "d.d.y", npos},   {"%d/%m/%Y", "d/d/y", npos},
+            {"%m/%d/%Y", "d/d/y", npos}, {"%d-%m-%Y", "d-d-y", npos},   {"%m-%d-%Y", "d-d-y", npos},
+            {"%Y/%m/%d", "y/d/d", npos}, {"%Y.%m.%d", "y.d.d", npos},   {"%Y%m%d", "8", npos},
+            {"%d %m %Y", "d d y", npos}, {"%d. %B %Y", "d. a y", npos}, {"%d de %B de %Y", "d a a a y", npos},
+            {"%d %b %Y", "d a y", npos}, {"%d %B %Y", "d a y", npos},   {"%d-%b-%Y", "d-a-y", npos},
+            {"%d/%b/%Y", "d/a/y", npos}, {"%b %d, %Y", "a d, y", npos}, {"%B %d, %Y", "a d, y", npos},
+            {"%b %d %Y", "a d y", npos}, {"%B %d %Y", "a d y", npos},   {"%Y-%j", "y-n", npos},
+            {"%d.%m.%y", "d.d.d", 2},    {"%d/%m/%y", "d/d/d", 2},      {"%m/%d/%y", "d/d/d", 2},
+            {"%d-%m-%y", "d-d-d", 2},    {"%y-%m-%d", "d-d-d", 0},      {"%d %b %y", "d a d", 1},
+            {"%d-%b-%y", "d-a-d", 1},
         };
         using Pair = std::array<const char*, 2>;
         static constexpr Pair times[] = {{"%H:%M:%S", "d:d:d"},
@@ -149,15 +155,56 @@ bool reads(const Form& form, std::string_view cell) {
 
 } // namespace
 
+// The forms that read the cell with a month of another language in place of the given word. Short names and long ones are
+// read by %B as well as by %b, of which one is enough.
+void DateGuess::addReaders(std::string_view cell, std::size_t word, std::size_t length, Readers& readers) {
+    for (const MonthMeaning& meaning : monthsOfWord(cell.substr(word, length))) {
+        const auto inEnglish = [&](std::size_t letters) {
+            return std::string(cell).replace(word, length, englishMonth(meaning.month).substr(0, letters));
+        };
+        const std::string whole = inEnglish(npos);
+        const std::string brief = inEnglish(3);
+        bool isRead = false;
+        for (const std::size_t form : formsOf(shapeOf(whole))) {
+            const bool takesWhole = allForms()[form].format.find("%B") != std::string::npos;
+            if (!allForms()[form].hasMonthName() || isRead ||
+                !reads(allForms()[form], takesWhole ? whole : brief)) {
+                continue;
+            }
+            isRead = true;
+            for (std::size_t language = 0; language < monthLanguages().size(); ++language) {
+                if ((meaning.languages >> language & 1U) != 0) {
+                    readers.push_back({form, language + 1});
+                }
+            }
+        }
+    }
+}
+
 bool DateGuess::add(std::string_view cell) {
     constexpr std::size_t longest = 48;
     if (cell.size() > longest) {
         return false;
     }
-    std::vector<std::size_t> readers;
+    Readers readers;
     for (const std::size_t form : formsOf(shapeOf(cell))) {
         if (reads(allForms()[form], cell)) {
-            readers.push_back(form);
+            readers.push_back({form, 0});
+        }
+    }
+    const auto isLetterByte = [](char byte) { return isLetter(byte) || !isAscii(byte); };
+    const bool hasDigit = std::any_of(cell.begin(), cell.end(), isDigit);
+    for (std::size_t at = 0; hasDigit && at < cell.size(); ++at) {
+        const std::size_t begin = at;
+        while (at < cell.size() && isLetterByte(cell[at])) {
+            ++at;
+        }
+        if (at - begin < 3) {
+            continue;
+        }
+        addReaders(cell, begin, at - begin, readers);
+        if (at < cell.size() && cell[at] == '.') {
+            addReaders(cell, begin, at + 1 - begin, readers);
         }
     }
     if (readers.empty()) {
@@ -167,19 +214,78 @@ bool DateGuess::add(std::string_view cell) {
     if (++seen.cells == 1) {
         seen.example = cell;
     }
-    ++cells_;
     return true;
+}
+
+bool DateGuess::isIn(const Reader& reader, std::size_t language) {
+    return reader.language == language || !allForms()[reader.form].hasMonthName();
+}
+
+bool DateGuess::isReadIn(const Readers& readers, std::size_t language) {
+    return std::any_of(readers.begin(), readers.end(),
+                       [&](const Reader& reader) { return isIn(reader, language); });
+}
+
+std::uint64_t DateGuess::cellsIn(std::size_t language) const {
+    std::uint64_t count = 0;
+    for (const auto& [readers, seen] : seen_) {
+        count += isReadIn(readers, language) ? seen.cells : 0;
+    }
+    return count;
+}
+
+// That in which most cells are read, the first one of equals.
+std::size_t DateGuess::language() const {
+    std::size_t best = 0;
+    std::uint64_t most = cellsIn(0);
+    for (std::size_t language = 1; language <= monthLanguages().size(); ++language) {
+        if (const std::uint64_t count = cellsIn(language); count > most) {
+            most = count;
+            best = language;
+        }
+    }
+    return best;
+}
+
+std::vector<std::string> DateGuess::months() const {
+    std::vector<std::string> found;
+    const std::size_t best = language();
+    for (std::size_t language = best; best != 0 && language <= monthLanguages().size(); ++language) {
+        if (cellsIn(language) == cellsIn(best)) {
+            found.push_back(monthLanguages()[language - 1]);
+        }
+    }
+    return found;
+}
+
+std::string DateGuess::exampleOfOthers() const {
+    for (const auto& [readers, seen] : seen_) {
+        if (!isReadIn(readers, language())) {
+            return seen.example;
+        }
+    }
+    return {};
 }
 
 // The form that reads most of the cells, then the one that reads most of those that are left, and so on.
 std::vector<DateForm> DateGuess::forms() const {
     std::vector<DateForm> found;
-    std::map<std::vector<std::size_t>, Seen> left = seen_;
+    std::map<Readers, Seen> left;
+    for (const auto& [readers, seen] : seen_) {
+        Readers those;
+        std::copy_if(readers.begin(), readers.end(), std::back_inserter(those),
+                     [best = language()](const Reader& reader) { return isIn(reader, best); });
+        if (!those.empty()) {
+            Seen& all = left[those];
+            all.cells += seen.cells;
+            all.example = all.example.empty() ? seen.example : all.example;
+        }
+    }
     while (!left.empty()) {
         std::map<std::size_t, std::uint64_t> counts;
         for (const auto& [readers, seen] : left) {
-            for (const std::size_t form : readers) {
-                counts[form] += seen.cells;
+            for (const Reader& reader : readers) {
+                counts[reader.form] += seen.cells;
             }
         }
         const auto best =
@@ -195,7 +301,8 @@ std::vector<DateForm> DateGuess::forms() const {
             }
         }
         for (auto it = left.begin(); it != left.end();) {
-            const bool isRead = std::find(it->first.begin(), it->first.end(), best.first) != it->first.end();
+            const bool isRead = std::any_of(it->first.begin(), it->first.end(),
+                                            [&](const Reader& reader) { return reader.form == best.first; });
             form.example = isRead && form.example.empty() ? it->second.example : form.example;
             it = isRead ? left.erase(it) : std::next(it);
         }

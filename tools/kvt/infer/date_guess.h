@@ -4,6 +4,8 @@
 // cell, its runs of digits and letters, so that a cell which is not a date costs next to nothing.
 #pragma once
 
+#include <compare>
+#include <cstddef>
 #include <cstdint>
 #include <map>
 #include <string>
@@ -25,10 +27,14 @@ public:
     /// Whether any form reads the cell.
     bool add(std::string_view cell);
 
-    /// Cells that a form has read.
-    std::uint64_t cells() const { return cells_; }
+    /// Cells that a form reads; of those with names of months, the ones in the language of most.
+    std::uint64_t cells() const { return cellsIn(language()); }
     /// The forms that read them all, the most frequent one first.
     std::vector<DateForm> forms() const;
+    /// The languages by which they are read, all just as well; none where English will do.
+    std::vector<std::string> months() const;
+    /// A cell that could be read in another language only; empty where there is none.
+    std::string exampleOfOthers() const;
 
 private:
     struct Seen {
@@ -36,9 +42,21 @@ private:
         std::string example;
     };
 
-    /// By the forms that read a cell, which are places in a list.
-    std::map<std::vector<std::size_t>, Seen> seen_;
-    std::uint64_t cells_ = 0;
+    /// A form and a language of its months, of which 0 is English, and also that of forms without names.
+    struct Reader {
+        std::size_t form;
+        std::size_t language;
+        friend auto operator<=>(const Reader&, const Reader&) = default;
+    };
+    using Readers = std::vector<Reader>;
+
+    static void addReaders(std::string_view cell, std::size_t word, std::size_t length, Readers& readers);
+    static bool isIn(const Reader& reader, std::size_t language);
+    static bool isReadIn(const Readers& readers, std::size_t language);
+    std::uint64_t cellsIn(std::size_t language) const;
+    std::size_t language() const;
+
+    std::map<Readers, Seen> seen_; ///< by all that read a cell
 };
 
 } // namespace host

@@ -233,8 +233,16 @@ private:
             remark("  " + grouped(form.cells) + " as " + form.format + ", such as " + shown(form.example) +
                    (form.alternative.empty() ? "" : "; " + form.alternative + " reads them as well"));
         }
+        const std::vector<std::string> months = guess.dates().months();
+        if (!months.empty()) {
+            remark("  The names of months are those of language '" + months[0] + "'" +
+                   (months.size() > 1 ? "; '" + months[1] + "' has the same ones" : "") + ".");
+        }
         beginStep("date", index);
         set("format", list(formats));
+        if (!months.empty()) {
+            set("months", tomlString(months[0]));
+        }
         if (std::any_of(formats.begin(), formats.end(),
                         [](const std::string& format) { return format.find("%y") != std::string::npos; })) {
             remark("Years of two digits: those from this one on are of the last century.");
