@@ -23,6 +23,19 @@ TEST_F(KvtExplain, EveryMessageOfTheLibraryHasAText) {
     }
 }
 
+TEST_F(KvtExplain, EveryMessageOfTheCommandHasAText) {
+    EXPECT_EQ(kvt({"explain", "920001"}).out, "The quote that opens here is never closed.\n");
+    EXPECT_EQ(kvt({"explain", "920002"}).out, "There is text behind the closing quote.\n");
+    EXPECT_EQ(kvt({"explain", "920003"}).out, "The row has a byte of zero.\n");
+    EXPECT_EQ(kvt({"explain", "920004", "1 cell", "2 columns"}).out,
+              "The row has 1 cell, but the table has 2 columns.\n");
+    EXPECT_EQ(kvt({"explain", "920005", "n/a", "de"}).out,
+              "\"n/a\" is not a number as it is written in de.\n");
+    EXPECT_EQ(kvt({"explain", "920006", "a-b-c", "3 pieces", "2"}).out,
+              "\"a-b-c\" gives 3 pieces, but there are columns for 2.\n");
+    EXPECT_EQ(kvt({"explain", "920007", "aaa"}).out, "The regular expression takes too long on \"aaa\".\n");
+}
+
 // The numbers as the library declares them, ordered.
 std::vector<std::string> dateNumbers() {
     std::ifstream header(KVT_SOURCE_DIR "/kvt/datetime/message_numbers.h");
@@ -88,11 +101,14 @@ TEST_F(KvtExplain, ParametersAreNotLookedAtAgain) {
 
 TEST_F(KvtExplain, UnknownNumbersAreRefusedWithTheKnownOnes) {
     std::string numbers = "910002, 910003, 910004, 910005";
+    for (int own = 920001; own <= 920007; ++own) {
+        numbers += ", " + std::to_string(own);
+    }
     for (const std::string& known : dateNumbers()) {
         numbers += ", " + known;
     }
     for (const std::string number :
-         {"1", "910006", "933051", "933098", "91000", "910002x", "", "99999999999999999999"}) {
+         {"1", "910006", "920008", "933051", "933098", "91000", "910002x", "", "99999999999999999999"}) {
         const ChildResult result = kvt({"explain", number});
         EXPECT_EQ(result.status, 2) << number;
         EXPECT_EQ(result.out, "");

@@ -162,11 +162,13 @@ words kvt --ver
 words kvt nosuch ''
 words kvt match sort --dia
 words kvt convert --bom ''
+words kvt translate --on-error ''
+words kvt translate --line-ends c
 )";
     const ChildResult result = run({"bash", "--norc", "-c", script});
     EXPECT_EQ(result.err, "");
     const std::vector<std::string> lines = linesOf(result.out);
-    ASSERT_EQ(lines.size(), 20u) << result.out;
+    ASSERT_EQ(lines.size(), 22u) << result.out;
     EXPECT_EQ(lines[0], "complete -F _kvt kvt");
     EXPECT_EQ(lines[1], "match");
     EXPECT_EQ(lines[2], "zone");
@@ -188,6 +190,8 @@ words kvt convert --bom ''
     EXPECT_TRUE(contains(lines[17], "convert|")) << lines[17];
     EXPECT_EQ(lines[18], "--dialect");
     EXPECT_EQ(lines[19], "skip|keep|strip|add");
+    EXPECT_EQ(lines[20], "stop|keep|empty|skip");
+    EXPECT_EQ(lines[21], "crlf");
 }
 
 TEST_F(KvtPages, ZshReadsItsCompletion) {

@@ -1,5 +1,5 @@
 // The catalogue of message texts. The library names its failures by number and parameters; this is where a number
-// becomes a sentence. Placeholders are %0, %1 and so on; each may stand anywhere and more than once.
+// becomes a sentence. Numbers from 920001 are the command's own, for what only the rows and cells of tables have. Placeholders are %0, %1 and so on; each may stand anywhere and more than once.
 #pragma once
 
 #include <cstdint>

@@ -4,6 +4,7 @@
 #include "base/input.h"
 #include "base/text.h"
 #include "cli/suggest.h"
+#include "translate/plan.h"
 #include "translate/step_table.h"
 
 namespace host {
@@ -81,13 +82,13 @@ private:
     void readOutput(const toml::table& output) {
         forEach(output, {{"encoding", text(job_.output.encoding)},
                          {"delimiter", character(job_.output.delimiter)},
-                         {"line-ends", word(job_.output.lineEnds, {"keep", "lf", "crlf"})},
+                         {"line-ends", word(job_.output.lineEnds, rowEndWords())},
                          {"quote-all", flag(job_.output.quoteAll)}});
     }
 
     void readFailures(const toml::table& failures) {
-        forEach(failures, {{"on-error", word(job_.onError, {"stop", "keep", "empty", "skip"})},
-                           {"max-errors", number(job_.mostErrors)}});
+        forEach(failures,
+                {{"on-error", word(job_.onError, onErrorWords())}, {"max-errors", number(job_.mostErrors)}});
     }
 
     void readSteps(const toml::node& node) {

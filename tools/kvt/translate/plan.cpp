@@ -30,6 +30,14 @@ RowForm formOf(const std::string& delimiterOption, const std::string& delimiter,
 
 } // namespace
 
+std::vector<std::string> rowEndWords() {
+    return wordsOf(rowEndChoices);
+}
+
+std::vector<std::string> onErrorWords() {
+    return wordsOf(errorChoices);
+}
+
 Plan::Plan(const Job& wanted)
     : job(wanted), from(inputEncoding(job.input.encoding)), to(textEncoding(job.output.encoding)),
       in(formOf("--delimiter", job.input.delimiter, job.input.quote)),

@@ -20,6 +20,10 @@ namespace host {
 
 enum class RowEnds { Keep, Lf, CrLf };
 
+/// The words of a job for RowEnds and OnCellError.
+std::vector<std::string> rowEndWords();
+std::vector<std::string> onErrorWords();
+
 struct Plan {
     /// Throws Failure for whatever is wrong with the job as such.
     explicit Plan(const Job& job);

@@ -8,6 +8,7 @@
 #include "text/file_options.h"
 #include "translate/explanation.h"
 #include "translate/job_file.h"
+#include "translate/plan.h"
 #include "translate/step_table.h"
 #include "translate/translation.h"
 
@@ -67,8 +68,10 @@ public:
         syntax.flag("--header", hasHeader_, "The first row names the columns, the default");
         syntax.flag("--no-header", hasNoHeader_, "There is no such row; columns have numbers");
         declareSteps(syntax);
-        onErrorOption_ = syntax.option("--on-error", job_.onError, "WHAT",
-                                       "What a failure does: 'stop' (default), 'keep', 'empty' or 'skip'");
+        onErrorOption_ = syntax
+                             .option("--on-error", job_.onError, "WHAT",
+                                     "What a failure does: 'stop' (default), 'keep', 'empty' or 'skip'")
+                             .takes(onErrorWords());
         field(onErrorOption_, [](Job& to, const Job& from) { to.onError = from.onError; });
         syntax.option(
             "--report", options_.report, "FILE",
@@ -134,8 +137,10 @@ private:
         field(syntax.option("--out-delimiter", job_.output.delimiter, "CHAR",
                             "The delimiter of the output, if it is another"),
               [](Job& to, const Job& from) { to.output.delimiter = from.output.delimiter; });
-        field(syntax.option("--line-ends", job_.output.lineEnds, "WHAT",
-                            "'keep' the ends of rows (default), or write 'lf' or 'crlf'"),
+        field(syntax
+                  .option("--line-ends", job_.output.lineEnds, "WHAT",
+                          "'keep' the ends of rows (default), or write 'lf' or 'crlf'")
+                  .takes(rowEndWords()),
               [](Job& to, const Job& from) { to.output.lineEnds = from.output.lineEnds; });
         field(syntax.flag("--quote-all", job_.output.quoteAll, "Put quotes around all cells"),
               [](Job& to, const Job& from) { to.output.quoteAll = from.output.quoteAll; });
