@@ -3,7 +3,7 @@
 #
 #   real_tables.sh TEST FOLDER
 #
-# Ends with 77, which is a test that was left out, where there is no npm or it cannot fetch.
+# Ends with 77, which is a test that was left out, where npm cannot fetch, or ctest is run where nobody installed it.
 
 set -euo pipefail
 
