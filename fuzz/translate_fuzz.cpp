@@ -66,7 +66,7 @@ host::SourceBlock blockOf(const host::Plan& plan, std::string_view bytes, std::u
     return block;
 }
 
-void requireTable(const host::Plan& plan, const std::string& output, std::size_t rows, std::size_t columns) {
+void requireTable(const host::Plan& plan, std::string_view output, std::size_t rows, std::size_t columns) {
     std::string text;
     kvt::ex::StreamTranscoder decoder(plan.to, kvt::ex::Encoding::Utf8);
     decoder.convert(output, text, {});
@@ -98,8 +98,9 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
         return 0;
     }
 
+    const host::SourceBlock block = blockOf(plan, text, 0);
     host::BlockResult whole;
-    worker->process(blockOf(plan, text, 0), whole);
+    worker->process(block, whole);
     requireEqual(whole.counts.read, whole.counts.written + whole.counts.rejected + whole.counts.skipped,
                  "rows read");
     for (const host::CellFailure& failure : whole.failures) {
@@ -116,16 +117,19 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     host::RowBorders borders(plan.in);
     borders.add(text.substr(0, text.size() / 2));
     const auto cut = static_cast<std::size_t>(borders.border());
+    const host::SourceBlock firstBlock = blockOf(plan, text.substr(0, cut), 0);
+    const host::SourceBlock secondBlock = blockOf(plan, text.substr(cut), cut);
     host::BlockResult first;
     host::BlockResult second;
-    worker->process(blockOf(plan, text.substr(0, cut), 0), first);
-    worker->process(blockOf(plan, text.substr(cut), cut), second);
+    worker->process(firstBlock, first);
+    worker->process(secondBlock, second);
     requireEqual(first.rows + second.rows, whole.rows, "rows of both pieces");
     requireEqual(first.rejected + second.rejected, whole.rejected, "rejected rows of both pieces");
     requireEqual(first.failures.size() + second.failures.size(), whole.failures.size(),
                  "failures of both pieces");
     if (host::isCutUndecoded(plan.to, plan.out)) {
-        requireEqual(first.output + second.output, whole.output, "output of both pieces");
+        requireEqual(std::string(first.output).append(second.output), std::string(whole.output),
+                     "output of both pieces");
     }
     for (std::size_t index = 0; index < second.failures.size(); ++index) {
         requireEqual(second.failures[index].offset, whole.failures[first.failures.size() + index].offset,

@@ -210,7 +210,7 @@ void Accounts::keepRows(const BlockResult& result) {
     for (const OrderedRow& row : result.ordered) {
         LineRecord record;
         record.key = row.key;
-        record.payload = std::string_view(result.output).substr(begin, row.end - begin);
+        record.payload = result.output.substr(begin, row.end - begin);
         record.place = plan_.isUnique ? place_++ : 0;
         sorter_->add(record);
         begin = row.end;

@@ -7,6 +7,7 @@
 #include "base/text.h"
 #include "base/text_units.h"
 #include "convert/loss_report.h"
+#include "translate/utf8_check.h"
 
 #include <algorithm>
 
@@ -58,7 +59,7 @@ RowCounts& RowCounts::operator+=(const RowCounts& other) {
 
 void BlockResult::clear() {
     header.clear();
-    output.clear();
+    output = {};
     ordered.clear();
     rejected.clear();
     rejectedHeader.clear();
@@ -83,7 +84,7 @@ BlockWorker::BlockWorker(const Plan& plan, bool keepsRejected)
 
 void BlockWorker::process(const SourceBlock& block, BlockResult& result) {
     result.clear();
-    decode(block);
+    decode(block, result);
     if (block.isOutside) {
         reader_.restart(text_);
         while (reader_.next()) {
@@ -105,49 +106,39 @@ void BlockWorker::process(const SourceBlock& block, BlockResult& result) {
         }
         result.header.swap(encodedHeader_);
         if (!plan_.isOrdered()) {
-            result.output.swap(encoded_);
+            result.room.swap(encoded_);
+            result.output = result.room;
         }
     }
     placeFailures(block, result);
 }
 
-void BlockWorker::decode(const SourceBlock& block) {
+void BlockWorker::decode(const SourceBlock& block, BlockResult& result) {
     losses_ = block.losses;
     if (!decoder_ || decodes_ != block.encoding) {
         decodes_ = block.encoding;
         decoder_.emplace(decodes_, Encoding::Utf8);
         byteDecoder_ = ByteDecoder::of(decodes_);
-        validator_.reset();
-        if (decodes_.evaluate() == Encoding::Utf8) {
-            validator_.emplace(decodes_, Encoding::Utf16LE);
-        }
     }
     if (block.isDecoded) {
         text_ = block.bytes;
         return;
     }
     if (byteDecoder_) {
-        if (const auto text = byteDecoder_->decode(block.bytes, room_)) {
+        if (const auto text = byteDecoder_->decode(block.bytes, result.text)) {
             text_ = *text;
             return;
         }
     }
-    if (validator_) {
-        bool isWhole = true;
-        const auto onLoss = [&](const Loss&) { isWhole = false; };
-        room_.clear();
-        validator_->convert(block.bytes, room_, onLoss);
-        validator_->finish(room_, onLoss);
-        if (isWhole) {
-            text_ = block.bytes;
-            return;
-        }
+    if (decodes_.evaluate() == Encoding::Utf8 && isUtf8(block.bytes)) {
+        text_ = block.bytes;
+        return;
     }
-    decoded_.clear();
+    result.text.clear();
     const auto onLoss = [&](const Loss& loss) { losses_.push_back({loss, 0}); };
-    decoder_->convert(block.bytes, decoded_, onLoss);
-    decoder_->finish(decoded_, onLoss);
-    text_ = decoded_;
+    decoder_->convert(block.bytes, result.text, onLoss);
+    decoder_->finish(result.text, onLoss);
+    text_ = result.text;
 }
 
 // Each loss left a U+FFFD, but not each of those is one.
@@ -172,7 +163,7 @@ void BlockWorker::translate(const SourceBlock& block, BlockResult& result) {
     rejectedRows_.clear();
     nextLoss_ = 0;
     row_ = 0;
-    rowOutput_.begin(result.output, text_);
+    rowOutput_.begin(result.room, text_);
     reader_.restart(text_);
     for (; !result.isStopped && reader_.next(); ++row_) {
         if (row_ == 0 && block.beginsFile && plan_.job.input.hasHeader) {
@@ -182,7 +173,7 @@ void BlockWorker::translate(const SourceBlock& block, BlockResult& result) {
         }
     }
     result.rows = row_;
-    rowOutput_.end();
+    result.output = rowOutput_.end();
 }
 
 void BlockWorker::takeHeader(const SourceBlock& block, BlockResult& result) {
@@ -211,17 +202,17 @@ void BlockWorker::takeHeader(const SourceBlock& block, BlockResult& result) {
     takeFailures(result);
     result.isStopped = plan_.onError == OnCellError::Stop && !result.failures.empty();
     if (block.isOfFirstFile) {
-        rowOutput_.begin(result.header, text_);
         rowOutput_.writeEachCell(cells_, reader_, block.isMoreToCome || plan_.isOrdered());
-        rowOutput_.end();
-        rowOutput_.begin(result.output, text_);
+        result.header = rowOutput_.end();
+        rowOutput_.begin(result.room, text_);
     }
 }
 
 void BlockWorker::takeRow(bool needsLineEnd, BlockResult& result) {
     ++result.counts.read;
     cells_.begin(reader_);
-    if (!isWhole(result)) {
+    if (reader_.fault() != RowFault::None || reader_.cellCount() != plan_.names.size()) {
+        rejectRow(result);
         return;
     }
     if (nextLoss_ != losses_.size()) {
@@ -259,8 +250,8 @@ void BlockWorker::takeRow(bool needsLineEnd, BlockResult& result) {
     }
 }
 
-// Whether the row is one of the table.
-bool BlockWorker::isWhole(BlockResult& result) {
+// A row that is none of the table.
+void BlockWorker::rejectRow(BlockResult& result) {
     Problem problem;
     const char* place = reader_.row().data();
     if (reader_.fault() != RowFault::None) {
@@ -268,15 +259,12 @@ bool BlockWorker::isWhole(BlockResult& result) {
                               : reader_.fault() == RowFault::TextBehindQuote ? problem_number::textBehindQuote
                                                                              : problem_number::nul);
         place = reader_.faultPlace();
-    } else if (reader_.cellCount() != plan_.names.size()) {
+    } else {
         problem = makeProblem(problem_number::cellCount, {counted(reader_.cellCount(), "cell", "cells"),
                                                           counted(plan_.names.size(), "column", "columns")});
-    } else {
-        return true;
     }
     result.failures.push_back({row_, place, 0, "", shownRow(reader_.row()), std::move(problem)});
     reject(result);
-    return false;
 }
 
 // The cells of this row that have something that could not be decoded.
@@ -347,7 +335,7 @@ void BlockWorker::addKey(BlockResult& result) {
 }
 
 // Whether nothing was lost.
-bool BlockWorker::encode(const std::string& text, std::string& out) {
+bool BlockWorker::encode(std::string_view text, std::string& out) {
     bool isWhole = true;
     const auto onLoss = [&](const Loss&) { isWhole = false; };
     out.clear();

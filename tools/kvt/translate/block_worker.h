@@ -16,6 +16,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace host {
@@ -39,7 +40,10 @@ struct OrderedRow {
 
 struct BlockResult {
     std::string header; ///< the names of the columns, as a row; for the first file only
-    std::string output; ///< in the encoding of the output, or in UTF-8 where rows are ordered
+    std::string_view
+        output; ///< in the encoding of the output, or in UTF-8 where rows are ordered; of the block, or:
+    std::string text; ///< the block decoded, where it had to be
+    std::string room; ///< of rows that changed
     std::vector<OrderedRow> ordered;
     std::string rejected;                      ///< the rows as they stood in the input
     std::string rejectedHeader;                ///< and their header
@@ -57,24 +61,25 @@ public:
     /// `plan` has names, and outlives the worker. Throws Failure.
     explicit BlockWorker(const Plan& plan, bool keepsRejected);
 
-    /// Throws Failure where a header is not that of the first file.
+    /// The block has to stay for as long as the result is used. Throws Failure where a header is not that of the first
+    /// file.
     void process(const SourceBlock& block, BlockResult& result);
 
     const Layout& layout() const { return layout_; }
 
 private:
-    void decode(const SourceBlock& block);
+    void decode(const SourceBlock& block, BlockResult& result);
     void placeLosses(const SourceBlock& block);
     void translate(const SourceBlock& block, BlockResult& result);
     void takeHeader(const SourceBlock& block, BlockResult& result);
     void takeRow(bool needsLineEnd, BlockResult& result);
-    bool isWhole(BlockResult& result);
+    void rejectRow(BlockResult& result);
     void failLostCells(BlockResult& result);
     void failUnwritableCells(BlockResult& result);
     void takeFailures(BlockResult& result);
     void reject(BlockResult& result);
     void addKey(BlockResult& result);
-    bool encode(const std::string& text, std::string& out);
+    bool encode(std::string_view text, std::string& out);
     void placeFailures(const SourceBlock& block, BlockResult& result);
     std::string asItStood(const SourceBlock& block, std::uint64_t begin, std::uint64_t end) const;
 
@@ -88,15 +93,11 @@ private:
     RowReader reader_;
 
     std::optional<ByteDecoder> byteDecoder_;
-    std::optional<kvt::ex::StreamTranscoder>
-        validator_; ///< of UTF-8, which need not be decoded where it is whole
     std::optional<kvt::ex::StreamTranscoder> decoder_;
     kvt::ex::Encoding decodes_;
     std::optional<kvt::ex::StreamTranscoder> encoder_;
     std::string encoded_;
     std::string encodedHeader_;
-    std::string decoded_;
-    std::string room_;               ///< of byteDecoder_ and validator_
     std::string_view text_;          ///< of the block, in UTF-8
     std::vector<PlacedLoss> losses_; ///< of decoding it
     std::size_t nextLoss_ = 0;

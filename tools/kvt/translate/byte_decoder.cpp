@@ -20,14 +20,16 @@ using kvt::ex::Encoding;
 
 constexpr std::ptrdiff_t step = 16;
 
-// How many of 16 bytes are ASCII before the first that is not.
-inline std::ptrdiff_t asciiBefore(const char* bytes) {
+// A bit for each of 16 bytes that is not ASCII.
+inline unsigned othersIn(const char* bytes) {
 #ifdef __SSE2__
-    const auto others =
-        static_cast<unsigned>(_mm_movemask_epi8(_mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes))));
-    return std::countr_zero(others | 0x10000U);
+    return static_cast<unsigned>(_mm_movemask_epi8(_mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes))));
 #else
-    return std::find_if_not(bytes, bytes + step, isAscii) - bytes;
+    unsigned others = 0;
+    for (unsigned index = 0; index < step; ++index) {
+        others |= isAscii(bytes[index]) ? 0U : 1U << index;
+    }
+    return others;
 #endif
 }
 
@@ -79,6 +81,7 @@ std::optional<ByteDecoder> ByteDecoder::of(Encoding encoding) {
     return text && decoded(encoding, pairs) == *text ? std::optional(decoder) : std::nullopt;
 }
 
+// Where the next 16 bytes begin does not depend on what is in these, so that the processor looks at them ahead.
 std::optional<std::string_view> ByteDecoder::decode(std::string_view bytes, std::string& room) const {
     constexpr std::size_t mostBytes = sizeof(Row::utf8);
     if (room.size() < bytes.size() * mostBytes + step) {
@@ -87,25 +90,34 @@ std::optional<std::string_view> ByteDecoder::decode(std::string_view bytes, std:
     const char* from = bytes.data();
     const char* const end = from + bytes.size();
     char* to = room.data();
-    while (from != end) {
-        if (end - from >= step) {
-            const std::ptrdiff_t count = asciiBefore(from);
-            std::memcpy(to, from, step); // what is too much is written over
-            from += count;
-            to += count;
-            if (count == step) {
-                continue;
-            }
-        } else if (isAscii(*from)) {
-            *to++ = *from++;
-            continue;
-        }
-        const Row& row = rows_[static_cast<unsigned char>(*from++) - 0x80U];
-        if (row.size == 0) {
-            return std::nullopt;
-        }
+    bool isWhole = true;
+    const auto putRow = [&](char byte) {
+        const Row& row = rows_[static_cast<unsigned char>(byte) - 0x80U];
+        isWhole = isWhole && row.size != 0;
         std::memcpy(to, &row, sizeof row);
         to += row.size;
+    };
+    for (; end - from >= 2 * step; from += step) {
+        const char* rest = from;
+        for (unsigned others = othersIn(from); others != 0; others &= others - 1) {
+            const char* const other = from + std::countr_zero(others);
+            std::memcpy(to, rest, step); // what is too much is written over
+            to += other - rest;
+            putRow(*other);
+            rest = other + 1;
+        }
+        std::memcpy(to, rest, step);
+        to += from + step - rest;
+    }
+    for (; from != end; ++from) {
+        if (isAscii(*from)) {
+            *to++ = *from;
+        } else {
+            putRow(*from);
+        }
+    }
+    if (!isWhole) {
+        return std::nullopt;
     }
     return std::string_view(room.data(), static_cast<std::size_t>(to - room.data()));
 }

@@ -22,12 +22,6 @@ std::string_view textOfCell(std::string_view cell, const RowForm& form, std::str
     return scratch;
 }
 
-QuoteNeed::QuoteNeed(const RowForm& form) {
-    for (const char byte : {form.delimiter, form.quote, '\n', '\r'}) {
-        special_[static_cast<unsigned char>(byte)] = true;
-    }
-}
-
 void appendCell(std::string& out, std::string_view text, const RowForm& form) {
     if (QuoteNeed(form)(text)) {
         appendQuoted(out, text, form);

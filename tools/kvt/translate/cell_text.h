@@ -2,8 +2,8 @@
 #pragma once
 
 #include "translate/row_form.h"
+#include "translate/special_bytes.h"
 
-#include <array>
 #include <string>
 #include <string_view>
 
@@ -15,17 +15,11 @@ std::string_view textOfCell(std::string_view cell, const RowForm& form, std::str
 /// Whether a text is another one when it is read as a cell, unless quotes stand around it.
 class QuoteNeed {
 public:
-    explicit QuoteNeed(const RowForm& form);
-    bool operator()(std::string_view text) const {
-        bool isNeeded = false;
-        for (const char byte : text) {
-            isNeeded |= special_[static_cast<unsigned char>(byte)];
-        }
-        return isNeeded;
-    }
+    explicit QuoteNeed(const RowForm& form) : special_({form.delimiter, form.quote, '\n', '\r'}) {}
+    bool operator()(std::string_view text) const { return special_.isIn(text); }
 
 private:
-    std::array<bool, 256> special_{};
+    SpecialBytes<4> special_;
 };
 
 /// Appends `text` with quotes around it.

@@ -3,12 +3,12 @@
 // another language.
 #pragma once
 
+#include "translate/fixed_date.h"
 #include "translate/problem.h"
 
 #include <kvt/string/ustring.h>
 
-#include <array>
-#include <cstdint>
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -16,33 +16,6 @@
 #include <vector>
 
 namespace host {
-
-/// Patterns whose texts have a fixed length, of digits and single characters of ASCII: such texts are read without the
-/// library, with the same results. Whatever they do not fit is left to it.
-class FixedDateForm {
-public:
-    /// Nothing for patterns of another kind.
-    static std::optional<FixedDateForm> of(std::string_view pattern);
-
-    /// False where the library has to look.
-    bool read(std::string_view text, std::string& out) const;
-
-private:
-    enum Part : std::uint8_t { Year, Month, Day, Hour, Minute, Second };
-    static constexpr std::size_t partCount = 6;
-    static constexpr std::size_t longest = 64;
-
-    bool fitsShape(const char* text) const;
-
-    std::size_t length_ = 0;
-    bool hasTime_ = false;
-    std::array<std::uint8_t, partCount> places_{}; ///< of the parts in the text
-    std::array<bool, partCount> given_{};
-    // For each byte of the text: what it is, with "0" for any digit, and by how much it may be more, as the distance to
-    // the highest number of seven bits.
-    std::array<char, longest> expected_{};
-    std::array<char, longest> room_{};
-};
 
 /// Names of months by which texts are looked through.
 class MonthNames {

@@ -74,15 +74,22 @@ private:
 class WriteDateStep : public CanonicalStep {
 public:
     WriteDateStep(std::string column, const std::string& format)
-        : CanonicalStep(std::move(column)), format_(toUString(format)) {}
+        : CanonicalStep(std::move(column)), format_(toUString(format)),
+          fixed_(FixedDateForm::toWrite(format)) {}
 
 protected:
     void applyTo(std::string_view text, RowCells& row) override {
-        take(datetime::format(valueOf(text), format_), row);
+        if (fixed_ && fixed_->write(text, written_)) {
+            set(row, written_);
+        } else {
+            take(datetime::format(valueOf(text), format_), row);
+        }
     }
 
 private:
     UString<0> format_;
+    std::optional<FixedDateForm> fixed_;
+    std::string written_;
 };
 
 class AddStep : public CanonicalStep {

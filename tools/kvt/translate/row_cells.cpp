@@ -12,7 +12,7 @@ void RowCells::fail(std::size_t slot, const std::string& column, Problem problem
     failure.problem = std::move(problem);
     failure.place = isOfInput ? row_->cell(slot).data() : row_->row().data();
     if (onError_ == OnCellError::Empty) {
-        values_[slot].clear();
+        values_[slot].assign({});
         touch(slot, State::FailedAndEmpty);
     } else {
         values_[slot].assign(isOfInput ? textOfInput(slot) : std::string_view());

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "translate/cell_text.h"
+#include "translate/cell_value.h"
 #include "translate/problem.h"
 #include "translate/row_reader.h"
 
@@ -59,7 +60,7 @@ public:
 
     /// Valid until the cell gets another one.
     std::string_view text(std::size_t slot) {
-        return states_[slot] == State::AsItStood ? textOfInput(slot) : std::string_view(values_[slot]);
+        return states_[slot] == State::AsItStood ? textOfInput(slot) : values_[slot].text();
     }
     /// The text may be a view of this cell.
     void set(std::size_t slot, std::string_view text) {
@@ -107,7 +108,7 @@ private:
     OnCellError onError_;
     const RowReader* row_ = nullptr;
     std::vector<State> states_;
-    std::vector<std::string> values_;
+    std::vector<CellValue> values_;
     std::vector<std::string> unquoted_;
     std::vector<std::size_t> touched_;
     std::vector<CellFailure> failures_;

@@ -6,8 +6,8 @@ namespace host {
 
 namespace {
 
-// So many bytes are copied at once, however few there are.
-constexpr std::size_t slack = 32;
+// So many bytes are copied at once, however few there are: what stands between two cells that change is mostly shorter.
+constexpr std::size_t slack = 64;
 
 } // namespace
 
@@ -27,11 +27,13 @@ RowOutput::RowOutput(const Plan& plan, const Layout& layout)
     }
 }
 
-void RowOutput::begin(std::string& out, std::string_view text) {
-    output_ = &out;
-    out.resize(text.size() + slack);
-    at_ = out.data();
-    limit_ = at_ + out.size();
+void RowOutput::begin(std::string& room, std::string_view text) {
+    room_ = &room;
+    if (room.size() < text.size() + slack) {
+        room.resize(text.size() + slack);
+    }
+    at_ = room.data();
+    limit_ = at_ + room.size();
     runBegin_ = runEnd_ = text.data();
     textEnd_ = text.data() + text.size();
 }
@@ -39,21 +41,16 @@ void RowOutput::begin(std::string& out, std::string_view text) {
 // And a little more.
 inline void RowOutput::makeRoom(std::size_t count) {
     if (static_cast<std::size_t>(limit_ - at_) < count + slack) {
-        const auto written = static_cast<std::size_t>(at_ - output_->data());
-        output_->resize(output_->size() * 2 + count + slack);
-        at_ = output_->data() + written;
-        limit_ = output_->data() + output_->size();
+        const auto written = static_cast<std::size_t>(at_ - room_->data());
+        room_->resize(room_->size() * 2 + count + slack);
+        at_ = room_->data() + written;
+        limit_ = room_->data() + room_->size();
     }
 }
 
 inline void RowOutput::append(std::string_view bytes) {
     makeRoom(bytes.size());
-    if (bytes.size() >= 8 && bytes.size() <= 16) { // as dates have, and many numbers
-        std::memcpy(at_, bytes.data(), 8);
-        std::memcpy(at_ + bytes.size() - 8, bytes.data() + bytes.size() - 8, 8);
-    } else {
-        std::memcpy(at_, bytes.data(), bytes.size());
-    }
+    copyText(at_, bytes);
     at_ += bytes.size();
 }
 
@@ -71,11 +68,15 @@ inline void RowOutput::flush() {
 
 std::size_t RowOutput::size() {
     flush();
-    return static_cast<std::size_t>(at_ - output_->data());
+    return static_cast<std::size_t>(at_ - room_->data());
 }
 
-void RowOutput::end() {
-    output_->resize(size());
+std::string_view RowOutput::end() {
+    if (at_ == room_->data()) {
+        return {runBegin_, static_cast<std::size_t>(runEnd_ - runBegin_)};
+    }
+    const std::size_t length = size();
+    return std::string_view(*room_).substr(0, length);
 }
 
 inline void RowOutput::copy(const char* begin, const char* end) {

@@ -18,15 +18,17 @@ class RowOutput {
 public:
     RowOutput(const Plan& plan, const Layout& layout);
 
-    /// Where the rows go, in place of what is there; it and the text of the rows have to stay until end().
-    void begin(std::string& out, std::string_view text);
+    /// `room`, of which nothing is kept, is for rows that are not as they stood; it and the text of the rows have to stay
+    /// for as long as what end() gives is used.
+    void begin(std::string& room, std::string_view text);
     /// Rows without a line end get one, where another row may follow.
     void write(RowCells& cells, const RowReader& row, bool needsLineEnd);
     /// The same for a row in which not only those cells may have changed that steps change.
     void writeEachCell(RowCells& cells, const RowReader& row, bool needsLineEnd);
     /// Bytes written so far.
     std::size_t size();
-    void end();
+    /// What was written: in the room, or in the text where it stands there in one piece.
+    std::string_view end();
 
 private:
     struct Stretch {
@@ -53,8 +55,8 @@ private:
     bool quoteAll_;
     std::vector<Stretch> stretches_;
     std::vector<Stretch> eachCell_;
-    std::string* output_ = nullptr; ///< longer than what is written
-    char* at_ = nullptr;            ///< where it goes on
+    std::string* room_ = nullptr; ///< longer than what is written
+    char* at_ = nullptr;          ///< where it goes on
     char* limit_ = nullptr;
     std::string quoted_;
     const char* textEnd_ = nullptr;

@@ -1,5 +1,5 @@
-// The text is looked at 64 bytes at a time. Between two bytes of another kind, all delimiters end cells, and are taken
-// from their mask without a look at the text.
+// The text is looked at 64 bytes at a time. Each byte that is none of the text is taken for the end of a cell, until it is
+// seen to be of another kind than a delimiter, which happens once in a row of a plain table.
 
 #include "translate/row_reader.h"
 
@@ -16,15 +16,16 @@ void RowReader::restart(std::string_view text) {
     lookAt(next_);
 }
 
-void RowReader::lookAt(const char* block) {
+inline void RowReader::lookAt(const char* block) {
     block_ = block;
+    ahead_ = 0;
     if (end_ - block >= width) {
-        delimiters_ = delimiter_.find(block);
         others_ = other_.find(block);
+        ahead_ = others_ | delimiter_.find(block);
     } else if (block != end_) {
         const auto rest = static_cast<std::size_t>(end_ - block);
-        delimiters_ = delimiter_.findInLast(block, rest);
         others_ = other_.findInLast(block, rest);
+        ahead_ = others_ | delimiter_.findInLast(block, rest);
     }
 }
 
@@ -39,24 +40,28 @@ bool RowReader::next() {
         if (ends_.size() - count_ <= static_cast<std::size_t>(width)) {
             ends_.resize(ends_.size() * 2 + static_cast<std::size_t>(2 * width));
         }
-        std::uint64_t cellEnds = delimiters_ & ((others_ & (0 - others_)) - 1);
-        delimiters_ ^= cellEnds;
-        for (; cellEnds != 0; cellEnds &= cellEnds - 1) {
-            ends_[count_++] = block_ + std::countr_zero(cellEnds);
+        const char** cellEnd = ends_.data() + count_;
+        const char* const block = block_;
+        const char* place = nullptr;
+        std::uint64_t ahead = ahead_;
+        const std::uint64_t others = others_;
+        bool isOther = false;
+        while (ahead != 0 && !isOther) {
+            place = block + std::countr_zero(ahead);
+            *cellEnd++ = place;
+            isOther = (ahead & (0 - ahead) & others) != 0;
+            ahead &= ahead - 1;
         }
-        if (others_ == 0) {
+        ahead_ = ahead;
+        count_ = static_cast<std::size_t>(cellEnd - ends_.data()) - (isOther ? 1 : 0);
+        if (!isOther) {
             if (end_ - block_ <= width) {
                 return endRow(end_);
             }
             lookAt(block_ + width);
-            continue;
-        }
-        const char* const place = block_ + std::countr_zero(others_);
-        others_ &= others_ - 1;
-        if (*place == '\n' || *place == '\r') {
+        } else if (*place == '\n' || *place == '\r') {
             return endRow(place);
-        }
-        if (*place == '\0') {
+        } else if (*place == '\0') {
             blame(RowFault::Nul, place);
         } else if (place == (count_ == 0 ? begin_ : ends_[count_ - 1] + 1) && !takeQuoted(place)) {
             return endRow(end_);
@@ -64,17 +69,19 @@ bool RowReader::next() {
     }
 }
 
-// The next byte that is none of the text and not a delimiter; the end of the text behind the last one.
+// The next byte that is none of the text and not a delimiter; the end of the text behind the last one. Delimiters before
+// it are passed over.
 const char* RowReader::nextOther() {
-    while (others_ == 0) {
+    while ((ahead_ & others_) == 0) {
         if (end_ - block_ <= width) {
+            ahead_ = 0;
             return end_;
         }
         lookAt(block_ + width);
     }
-    const char* const place = block_ + std::countr_zero(others_);
-    others_ &= others_ - 1;
-    return place;
+    const std::uint64_t others = ahead_ & others_;
+    ahead_ &= ~(others ^ (others - 1));
+    return block_ + std::countr_zero(others);
 }
 
 // Goes on to the quote that closes the cell; false where there is none.
@@ -99,7 +106,6 @@ bool RowReader::takeQuoted(const char* quote) {
         if (behind != end_ && *behind != form_.delimiter && *behind != '\n' && *behind != '\r') {
             blame(RowFault::TextBehindQuote, behind);
         }
-        delimiters_ &= ~std::uint64_t{0} << (place - block_); // those within the quotes are text
         return true;
     }
 }

@@ -70,10 +70,10 @@ private:
 
     RowForm form_;
     SpecialBytes<1> delimiter_;
-    SpecialBytes<4> other_;        ///< quote, line ends and NUL
-    const char* block_ = nullptr;  ///< the 64 bytes of the text that the masks are about
-    std::uint64_t delimiters_ = 0; ///< those of the block that are still ahead
-    std::uint64_t others_ = 0;
+    SpecialBytes<4> other_;       ///< quote, line ends and NUL
+    const char* block_ = nullptr; ///< the 64 bytes of the text that the masks are about
+    std::uint64_t others_ = 0;    ///< all of the block
+    std::uint64_t ahead_ = 0;     ///< these and the delimiters, so far as they are still ahead
     const char* begin_ = nullptr; ///< of this row
     const char* next_ = nullptr;  ///< of the next one
     const char* end_ = nullptr;   ///< of the text
