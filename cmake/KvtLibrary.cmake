@@ -28,6 +28,7 @@ target_link_libraries(kvt_objects PRIVATE kvt_highway_headers)
 target_compile_options(kvt_objects PRIVATE -fno-semantic-interposition)
 kvt_warnings(kvt_objects)
 kvt_harden(kvt_objects)
+kvt_count_lines(kvt_objects)
 
 add_library(kvt SHARED)
 add_library(kvt::kvt ALIAS kvt)

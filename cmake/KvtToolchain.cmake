@@ -18,6 +18,16 @@ endif()
 
 set(CMAKE_CXX_EXTENSIONS OFF)
 
+# Counts, in what is compiled of a target, how often each line is run.
+function(kvt_count_lines target)
+    if(KVT_COVERAGE)
+        target_compile_options(${target} PRIVATE --coverage -fprofile-update=atomic)
+    endif()
+endfunction()
+if(KVT_COVERAGE)
+    add_link_options(--coverage)
+endif()
+
 if(KVT_SANITIZE)
     add_compile_options(-fsanitize=${KVT_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
     add_link_options(-fsanitize=${KVT_SANITIZE})
