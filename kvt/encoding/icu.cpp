@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <array>
+#include <new>
 #include <optional>
 #include <vector>
 
@@ -100,6 +101,10 @@ class Trial {
 public:
     explicit Trial(Encoding encoding)
         : converter_(ucnv_open(encoding.getName().data(), &openError_), &ucnv_close) {
+        // It is open once already, so that nothing but memory can be missing.
+        if (converter_ == nullptr) {
+            throw std::bad_alloc();
+        }
         UErrorCode error = U_ZERO_ERROR;
         ucnv_setFromUCallBack(converter_.get(), UCNV_FROM_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
         ucnv_setToUCallBack(converter_.get(), UCNV_TO_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &error);
@@ -189,6 +194,10 @@ private:
 std::string standardName(const char* name) {
     UErrorCode error = U_ZERO_ERROR;
     const std::unique_ptr<UConverter, decltype(&ucnv_close)> converter(ucnv_open(name, &error), &ucnv_close);
+    // What is said of a name is kept for good, and another time there may be memory.
+    if (error == U_MEMORY_ALLOCATION_ERROR) {
+        throw std::bad_alloc();
+    }
     if (converter == nullptr) {
         return {};
     }
@@ -291,7 +300,12 @@ Converter::Nature Converter::nature() const {
 std::vector<Converter::Range> Converter::characters() const {
     const std::unique_ptr<USet, decltype(&uset_close)> set(uset_openEmpty(), &uset_close);
     UErrorCode error = U_ZERO_ERROR;
-    ucnv_getUnicodeSet(converter_.get(), set.get(), UCNV_ROUNDTRIP_AND_FALLBACK_SET, &error);
+    if (set != nullptr) {
+        ucnv_getUnicodeSet(converter_.get(), set.get(), UCNV_ROUNDTRIP_AND_FALLBACK_SET, &error);
+    }
+    if (set == nullptr || error == U_MEMORY_ALLOCATION_ERROR) {
+        throw std::bad_alloc(); // and not a part of the characters, of which a table would be made for good
+    }
     std::vector<Range> ranges;
     for (std::int32_t i = 0; U_SUCCESS(error) && i < uset_getItemCount(set.get()); ++i) {
         UChar32 first = 0;
