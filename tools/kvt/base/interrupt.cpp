@@ -8,24 +8,35 @@
 #include <csignal>
 #include <cstring>
 #include <fcntl.h>
+#include <string_view>
 #include <unistd.h>
 
 namespace host {
 
 namespace {
 
-// SIGXCPU comes when a limit on the processor's time is reached, SIGBUS when the disk under a mapped file fails.
+// SIGXCPU comes when a limit on the processor's time is reached, SIGBUS when a mapped file is cut short or the disk under
+// it fails.
 constexpr std::array endingSignals = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGXCPU, SIGBUS};
 
 // Read by the signal handler: paths of files to remove, null where a slot is free.
 std::array<std::atomic<const char*>, 4> removals{};
 static_assert(std::atomic<const char*>::is_always_lock_free, "the handler must not wait for a lock");
 
-extern "C" void removeAndDie(int number) {
+// Nothing but calls that a signal handler may make.
+extern "C" void removeAndDie(int number, siginfo_t* info, void*) {
     for (const auto& path : removals) {
         if (const char* name = path.load(); name != nullptr) {
             ::unlink(name);
         }
+    }
+    // A page of a mapped file that is not there any more, and not somebody who sent the signal.
+    if (number == SIGBUS && info->si_code == BUS_ADRERR) {
+        constexpr std::string_view said =
+            "kvt: a file that is in use was cut short, or the disk under it fails\n";
+        constexpr int notDone = 2;
+        [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, said.data(), said.size());
+        ::_exit(notDone);
     }
     std::signal(number, SIG_DFL);
     std::raise(number);
@@ -45,7 +56,8 @@ sigset_t endingSet() {
 
 void catchEndingSignals() {
     struct sigaction action {};
-    action.sa_handler = removeAndDie;
+    action.sa_sigaction = removeAndDie;
+    action.sa_flags = SA_SIGINFO;
     action.sa_mask = endingSet();
     for (const int number : endingSignals) {
         struct sigaction before {};
