@@ -1,19 +1,22 @@
 #!/usr/bin/env bash
 # `kvt translate` beside what a user would write: `iconv` piped into Miller, and `iconv` alone.
 #
-#   bench/translate_bench.sh KVT [MEBIBYTES [ROUNDS]]
+#   bench/translate_bench.sh KVT [MEBIBYTES [ROUNDS [FIGURES]]]
 #
 # KVT is the program, built as for release. A file of MEBIBYTES (1024) is made from a fixed seed: eight columns, two of
 # them dates, one a number with a decimal comma, text of western Europe in windows-1252. It becomes UTF-8, with dates in
-# the form of ISO 8601 and plain decimals. The best of ROUNDS (3) counts. That both say the same is checked. Miller
-# (package miller) is left out where it is not installed; it gets a part of the file, since it takes so long.
+# the form of ISO 8601 and plain decimals. The best of ROUNDS (3) counts, which take turns, so that a machine that is busy for
+# a while is so for all. That both say the same is checked. Miller (package miller) is left out where it is not installed; it
+# gets a part of the file, and one round, since it takes so long. Rates are by the clock and by the time of processors, which
+# says more on a machine that has other work; FIGURES gets the latter, as docs/pictures/speed.tsv has them.
 
 set -euo pipefail
 export LC_ALL=C
 
-kvt=$(realpath -- "${1:?usage: translate_bench.sh KVT [MEBIBYTES [ROUNDS]]}")
+kvt=$(realpath -- "${1:?usage: translate_bench.sh KVT [MEBIBYTES [ROUNDS [FIGURES]]]}")
 bytes=$((${2:-1024} * 1024 * 1024))
 rounds=${3:-3}
+figures=$(realpath -m -- "${4:-/dev/null}")
 folder=$(mktemp -d)
 trap 'rm -rf -- "$folder"' EXIT
 cd -- "$folder"
@@ -52,36 +55,49 @@ miller() {
             $amount = sub(gsub($amount, "[.]", ""), ",", ".")'
 }
 
-# Seconds of the fastest round.
-best() {
-    local round before after
-    for ((round = 0; round < rounds; ++round)); do
-        before=$(date +%s%N)
-        "$@" >out 2>/dev/null
-        after=$(date +%s%N)
-        echo $((after - before))
-    done | sort -n | head -n 1
+# One round: seconds of the clock, and of processors, go to a file called by the name.
+TIMEFORMAT='%R %U %S'
+take() {
+    local name=$1
+    shift
+    { time "$@" >out 2>/dev/null; } 2>>"times of $name"
 }
 
 row() {
-    awk -v name="$1" -v size="$2" -v time="$3" -v base="$4" 'BEGIN {
-        printf "%-34s  %9.1f  %9.1f  %12.2f\n", name, time / 1e6, size / time * 1e3, (size / time) / base
-    }'
+    awk -v name="$1" -v size="$2" -v base="$base" '
+        { cpu = $2 + $3 }
+        NR == 1 || $1 < clock { clock = $1 }
+        NR == 1 || cpu < least { least = cpu }
+        END {
+            printf "%-28s  %9.0f  %9.0f  %12.2f\n", name, size / clock / 1e6, size / least / 1e6, size / least / 1e6 / base
+            if (name !~ /threads/) {
+                printf "%s\t%.0f\n", name, size / least / 1e6 >>"rates"
+            }
+        }' "times of $1"
 }
 
 size=$(stat -c %s in.csv)
-iconv_time=$(best iconv -f WINDOWS-1252 -t UTF-8 in.csv)
-rate=$(awk -v size="$size" -v time="$iconv_time" 'BEGIN { print size / time }')
-printf '%-34s  %9s  %9s  %12s\n' what ms MB/s 'times iconv'
-row 'iconv alone' "$size" "$iconv_time" "$rate"
-row 'kvt, one thread' "$size" "$(best "$kvt" "${canonical[@]}" --threads 1 in.csv)" "$rate"
-row 'kvt, two threads' "$size" "$(best "$kvt" "${canonical[@]}" --threads 2 in.csv)" "$rate"
-row 'kvt, dates written as ISO' "$size" "$(best "$kvt" "${job[@]}" --threads 1 in.csv)" "$rate"
 iconv -f WINDOWS-1252 -t UTF-8 in.csv >utf8.csv
-row 'kvt, rows alone' "$(stat -c %s utf8.csv)" "$(best "$kvt" translate --threads 1 --delimiter ';' utf8.csv)" "$rate"
+for ((round = 0; round < rounds; ++round)); do
+    take 'iconv alone' iconv -f WINDOWS-1252 -t UTF-8 in.csv
+    take 'kvt, one thread' "$kvt" "${canonical[@]}" --threads 1 in.csv
+    take 'kvt, two threads' "$kvt" "${canonical[@]}" --threads 2 in.csv
+    take 'kvt, dates written as ISO' "$kvt" "${job[@]}" --threads 1 in.csv
+    take 'kvt, rows alone' "$kvt" translate --threads 1 --delimiter ';' utf8.csv
+done
+base=$(awk -v size="$size" 'NR == 1 || $2 + $3 < least { least = $2 + $3 } END { print size / least / 1e6 }' \
+    'times of iconv alone')
+printf '%-28s  %9s  %9s  %12s\n' what MB/s 'MB/s CPU' 'CPU of iconv'
+row 'kvt, rows alone' "$(stat -c %s utf8.csv)"
+row 'kvt, two threads' "$size"
+row 'kvt, one thread' "$size"
+row 'kvt, dates written as ISO' "$size"
+row 'iconv alone' "$size"
 if command -v mlr >/dev/null; then
-    row 'iconv | Miller' "$(stat -c %s small.csv)" "$(rounds=1 best miller small.csv)" "$rate"
+    take 'iconv | Miller' miller small.csv
+    row 'iconv | Miller' "$(stat -c %s small.csv)"
     miller small.csv >theirs
     "$kvt" "${job[@]}" small.csv >ours 2>/dev/null
     cmp ours theirs
 fi
+cp -- rates "$figures"
