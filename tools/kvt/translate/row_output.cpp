@@ -25,6 +25,9 @@ RowOutput::RowOutput(const Plan& plan, const Layout& layout)
             stretches_.push_back({column.slot, column.slot, isCopied});
         }
     }
+    const Stretch& first = stretches_.front();
+    keepsRows_ = stretches_.size() == 1 && first.isCopied && first.first == 0 &&
+                 first.last + 1 == layout.inputCount() && lineEnds_ == RowEnds::Keep;
 }
 
 void RowOutput::begin(std::string& room, std::string_view text) {
@@ -126,6 +129,10 @@ inline void RowOutput::putCell(RowCells& cells, std::size_t slot) {
 }
 
 void RowOutput::write(RowCells& cells, const RowReader& row, bool needsLineEnd) {
+    if (keepsRows_ && !row.lineEnd().empty()) {
+        copy(row.row().data(), row.lineEnd().data() + row.lineEnd().size());
+        return;
+    }
     writeAs(stretches_, cells, row, needsLineEnd);
 }
 
@@ -152,12 +159,10 @@ void RowOutput::writeAs(const std::vector<Stretch>& stretches, RowCells& cells, 
 
 void RowOutput::putLineEnd(const RowReader& row, bool needsLineEnd) {
     const std::string_view end = row.lineEnd();
-    const std::string_view wanted = lineEnds_ == RowEnds::Lf      ? "\n"
-                                    : lineEnds_ == RowEnds::CrLf  ? "\r\n"
-                                    : end.empty() && needsLineEnd ? "\n"
-                                                                  : end;
-    if (wanted == end && runEnd_ == end.data()) {
-        runEnd_ += end.size();
+    const bool isKept = lineEnds_ == RowEnds::Keep && (!end.empty() || !needsLineEnd);
+    const std::string_view wanted = isKept ? end : lineEnds_ == RowEnds::CrLf ? "\r\n" : "\n";
+    if (isKept || wanted == end) {
+        copy(end.data(), end.data() + end.size());
     } else {
         flush();
         append(wanted);

@@ -53,6 +53,7 @@ private:
     bool keepsForm_; ///< cells are written with the quotes that they had
     RowEnds lineEnds_;
     bool quoteAll_;
+    bool keepsRows_ = false; ///< rows are written as they were read
     std::vector<Stretch> stretches_;
     std::vector<Stretch> eachCell_;
     std::string* room_ = nullptr; ///< longer than what is written
