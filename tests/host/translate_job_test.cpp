@@ -24,6 +24,23 @@ std::string complaintAbout(const std::string& text) {
     }
 }
 
+TEST(JobFile, HasAsciiOnlyOutsideOfStringsAndComments) {
+    const std::string about = "a character that is not ASCII stands outside of strings and comments";
+    EXPECT_EQ(complaintAbout("[input]\nheader \xC3\xBC= true\n"), "job.toml:2:8: " + about);
+    EXPECT_EQ(complaintAbout("[input]\n\xEF\xBB\xBBheader = true\n"), "job.toml:2:1: " + about);
+    EXPECT_EQ(complaintAbout("[input] # \xC3\xBC\nquote = \"'\" \xC3\xBC\n"), "job.toml:2:13: " + about);
+    EXPECT_EQ(complaintAbout("\xFF"), "job.toml:1:1: " + about);
+    for (const char* text : {"\"\xC3\xBC\"", "'\xC3\xBC'", "\"\\\"\xC3\xBC\"", "'\\' # \xC3\xBC",
+                             "\"\"\"\n\xC3\xBC\"\"\xC3\xBC\"\"\"\"\"", "\'\'\'\xC3\xBC\'\n\xC3\xBC\'\'\'",
+                             "\"\" # \"\xC3\xBC"}) {
+        const std::string complaint =
+            complaintAbout("[[step]]\ndo = \"drop\"\ncolumns = " + std::string(text) + "\n");
+        EXPECT_EQ(complaint.find("ASCII"), std::string::npos) << text << ": " << complaint;
+        EXPECT_EQ(complaint.find("rror while parsing"), std::string::npos) << text << ": " << complaint;
+    }
+    EXPECT_EQ(complaintAbout("\xEF\xBB\xBF[input]\nheader = true\n"), "none");
+}
+
 TEST(JobFile, SaysAllThatAJobHas) {
     const Job job = readJob(R"(
 [input]

@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/input.h"
 #include "base/text.h"
+#include "base/text_units.h"
 #include "cli/suggest.h"
 #include "translate/plan.h"
 #include "translate/step_table.h"
@@ -27,6 +28,7 @@ struct TomlSurprise {};
 #include <algorithm>
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string_view>
 #include <utility>
 #include <vector>
@@ -48,6 +50,52 @@ std::string contents(const std::string& path) {
         }
     }
     return text;
+}
+
+// Behind the string that begins with the quote at `at`: of one line, or of several between three quotes.
+std::size_t behindString(std::string_view text, std::size_t at) {
+    const char quote = text[at];
+    const bool isLong = text.substr(at).starts_with(std::string(3, quote));
+    const std::string end(isLong ? 3 : 1, quote);
+    for (at += end.size(); at < text.size(); ++at) {
+        if (text.substr(at).starts_with(end)) {
+            at += end.size();
+            while (isLong && at < text.size() && text[at] == quote) {
+                ++at; // one or two more are text
+            }
+            return at;
+        }
+        if (text[at] == '\n' && !isLong) {
+            return at;
+        }
+        at += quote == '"' && text[at] == '\\' ? 1 : 0;
+    }
+    return text.size();
+}
+
+// The first character beyond ASCII that is neither in a string nor in a comment, where TOML has none. The reader of TOML
+// is undefined for some of them.
+std::optional<std::size_t> strayCharacter(std::string_view text) {
+    for (std::size_t at = text.starts_with("\xEF\xBB\xBF") ? 3 : 0; at < text.size();) {
+        if (text[at] == '"' || text[at] == '\'') {
+            at = behindString(text, at);
+        } else if (text[at] == '#') {
+            at = std::min(text.find('\n', at), text.size());
+        } else if (!isAscii(text[at])) {
+            return at;
+        } else {
+            ++at;
+        }
+    }
+    return std::nullopt;
+}
+
+toml::source_position positionOf(std::string_view text, std::size_t at) {
+    const std::string_view before = text.substr(0, at);
+    const std::string_view line = before.substr(before.rfind('\n') + 1); // npos + 1 is 0
+    const auto continued = std::count_if(line.begin(), line.end(), isContinuation);
+    return {static_cast<toml::source_index>(1 + std::count(before.begin(), before.end(), '\n')),
+            static_cast<toml::source_index>(1 + line.size() - static_cast<std::size_t>(continued))};
 }
 
 class JobReader {
@@ -247,6 +295,10 @@ private:
 
 Job readJob(std::string_view text, const std::string& file, const std::string& zoneDatabase) {
     JobReader reader(file, zoneDatabase);
+    if (const auto stray = strayCharacter(text)) {
+        reader.refuse(positionOf(text, *stray),
+                      "a character that is not ASCII stands outside of strings and comments");
+    }
     try {
         return reader.read(toml::parse(text));
     } catch (const toml::parse_error& error) {
