@@ -11,20 +11,7 @@
 
 namespace host {
 
-namespace {
-
 using kvt::ex::Encoding;
-
-// What a fresh decoder makes of a few bytes.
-std::string decoded(Encoding encoding, std::string_view bytes) {
-    std::string out;
-    kvt::ex::StreamTranscoder decoder(encoding, Encoding::Utf8);
-    decoder.convert(bytes, out, {});
-    decoder.finish(out, {});
-    return out;
-}
-
-} // namespace
 
 // Tried out: each of the bytes alone, and behind each byte that may begin a longer character.
 bool isCutUndecoded(Encoding encoding, const RowForm& form) {
@@ -35,13 +22,21 @@ bool isCutUndecoded(Encoding encoding, const RowForm& form) {
     if (!isStateless(name)) {
         return false;
     }
+    kvt::ex::StreamTranscoder decoder(encoding, Encoding::Utf8);
+    std::string out;
+    const auto decoded = [&](std::string_view bytes) -> const std::string& {
+        out.clear();
+        decoder.convert(bytes, out, {});
+        decoder.finish(out, {});
+        return out;
+    };
     for (const char byte : {form.delimiter, form.quote, '\n', '\r'}) {
-        if (decoded(encoding, {&byte, 1}) != std::string(1, byte)) {
+        if (decoded({&byte, 1}) != std::string(1, byte)) {
             return false;
         }
         for (int lead = 0x80; lead <= 0xFF && !encoding.isSingleByte(); ++lead) {
             const std::array<char, 2> pair = {static_cast<char>(lead), byte};
-            if (!decoded(encoding, {pair.data(), pair.size()}).ends_with(byte)) {
+            if (!decoded({pair.data(), pair.size()}).ends_with(byte)) {
                 return false;
             }
         }
