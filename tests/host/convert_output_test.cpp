@@ -112,6 +112,42 @@ TEST_F(KvtConvertOutput, AReplacedFileKeepsItsMode) {
     EXPECT_EQ(read("out"), "new");
 }
 
+// In a folder such as /tmp, where anybody can put a link that waits for a name.
+TEST_F(KvtConvertOutput, ALinkOfSomebodyElseIsNotFollowedWhereAllMayWrite) {
+    if (::geteuid() != 0) {
+        GTEST_SKIP() << "it takes the superuser to make a link of somebody else";
+    }
+    constexpr uid_t somebody = 65534;
+    write("mine", "old");
+    std::filesystem::create_directory(path("all"));
+    ASSERT_EQ(::chmod(path("all").c_str(), 01777), 0);
+    std::filesystem::create_symlink(path("mine"), path("all/trap"));
+    ASSERT_EQ(::lchown(path("all/trap").c_str(), somebody, somebody), 0);
+    const ChildResult refused = convert("UTF-8", "UTF-8", "new", {"-o", "all/trap"});
+    EXPECT_EQ(refused.status, 2);
+    EXPECT_TRUE(contains(refused.err, "cannot write")) << refused.err;
+    EXPECT_EQ(read("mine"), "old");
+
+    // It is as good as any other where nobody else could have put it.
+    ASSERT_EQ(::chmod(path("all").c_str(), 0755), 0);
+    EXPECT_EQ(convert("UTF-8", "UTF-8", "new", {"-o", "all/trap"}).status, 0);
+    EXPECT_EQ(read("mine"), "new");
+}
+
+// Nobody may read it while it is written who may not read it afterwards.
+TEST_F(KvtConvertOutput, WhatReplacesAPrivateFileIsPrivateFromTheBeginning) {
+    write("out", "old");
+    ASSERT_EQ(::chmod(path("out").c_str(), 0600), 0);
+    RunningChild child(setup({"convert", "--from", "UTF-8", "--to", "UTF-8", "-o", "out"}));
+    child.write(std::string(300000, 'x'));
+    waitForTemporary(2);
+    for (const std::string& name : names()) {
+        EXPECT_EQ(modeOf(path(name)), 0600) << name;
+    }
+    child.signal(SIGTERM);
+    child.wait();
+}
+
 TEST_F(KvtConvertOutput, ASymbolicLinkStaysOne) {
     std::filesystem::create_directory(path("folder"));
     write("folder/target", "old");

@@ -193,6 +193,10 @@ TEST_F(KvtSortResources, AnInterruptedSortLeavesNothingBehind) {
                 child.write(randomLines(lineShapes().front(), 300000, 1));
                 waitForWorkspace();
                 EXPECT_EQ(std::filesystem::exists(scratch() / "work"), named);
+                for (const auto& file : std::filesystem::directory_iterator(scratch())) {
+                    using std::filesystem::perms;
+                    EXPECT_EQ(file.status().permissions(), perms::owner_read | perms::owner_write);
+                }
                 child.signal(number);
                 EXPECT_EQ(child.wait(), 128 + number) << command << " " << named;
                 EXPECT_TRUE(scratchIsEmpty()) << command << " " << named << " " << number;

@@ -51,6 +51,19 @@ TEST_F(OnDisk, ANewPersistentFileIsOneStretchOfZerosUntilItsHeaderIsReached) {
     }
 }
 
+// What is in memory is nobody else's business, and so it stays when it is in a file.
+TEST_F(OnDisk, OnlyItsOwnerMayReadOrWriteABackingFile) {
+    using std::filesystem::perms;
+    const auto modeOf = [&] { return std::filesystem::status(path).permissions(); };
+    {
+        const memory_manager manager = persistent();
+        EXPECT_EQ(modeOf(), perms::owner_read | perms::owner_write);
+    }
+    std::filesystem::remove(path);
+    const memory_manager temporary(path, manager_options{});
+    EXPECT_EQ(modeOf(), perms::owner_read | perms::owner_write);
+}
+
 TEST_F(OnDisk, TheHeaderSegmentIsAHeapWithOneNamedObject) {
     memory_manager manager = persistent();
     manager.restore();

@@ -142,16 +142,16 @@ struct Temporary {
     std::unique_ptr<RemovedOnInterrupt> guard;
 };
 
-// The name is short whatever the target is called, and O_EXCL makes it ours. The mode is the one that any new file
-// gets: what the umask leaves of 0666.
-Temporary createTemporary(const fs::path& target) {
+// The name is short whatever the target is called, and O_EXCL makes it ours: no link is followed that somebody put there.
+// The umask takes from the mode what it takes from that of any new file.
+Temporary createTemporary(const fs::path& target, mode_t mode) {
     const fs::path folder = target.has_parent_path() ? target.parent_path() : fs::path(".");
     SignalsHeldBack heldBack;
     for (unsigned attempt = 0;; ++attempt) {
         Temporary made;
         made.path = (folder / (".kvt-" + std::to_string(::getpid()) + "-" + std::to_string(attempt) + ".tmp"))
                         .string();
-        made.descriptor = ::open(made.path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+        made.descriptor = ::open(made.path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
         if (made.descriptor < 0 && (errno != EEXIST || attempt == 1000)) {
             throw systemFailure("cannot create " + printable(target.string()), errno);
         }
@@ -165,8 +165,9 @@ Temporary createTemporary(const fs::path& target) {
 class AtomicFile : public DescriptorOutput {
 public:
     AtomicFile(const fs::path& target, std::optional<mode_t> mode, const std::string& shownPath)
-        : AtomicFile(target, createTemporary(target), shownPath) {
-        // A file that is replaced keeps its permissions, as it would if it were written in place.
+        : AtomicFile(target, createTemporary(target, mode.value_or(0666)), shownPath) {
+        // A file that is replaced keeps its permissions, as it would if it were written in place. At no time before has
+        // anybody more of them.
         if (mode) {
             ::fchmod(descriptor(), *mode);
         }
@@ -221,10 +222,28 @@ std::optional<int> descriptorNamed(fs::path path) {
     return std::nullopt;
 }
 
+// In a folder that all may write to but nobody may clear, as /tmp, a link may be somebody's trap: it is followed only if it
+// belongs to us or to the owner of the folder, as the kernel has it where it is asked to protect links.
+void requireTrusted(const fs::path& link) {
+    const fs::path folder = link.has_parent_path() ? link.parent_path() : fs::path(".");
+    struct stat linkItself {};
+    struct stat around {};
+    if (::lstat(link.c_str(), &linkItself) != 0 || ::stat(folder.c_str(), &around) != 0) {
+        return;
+    }
+    const bool isOpenToAll = (around.st_mode & S_ISVTX) != 0 && (around.st_mode & S_IWOTH) != 0;
+    if (isOpenToAll && linkItself.st_uid != ::geteuid() && linkItself.st_uid != around.st_uid) {
+        throw systemFailure("cannot write " + printable(link.string()) +
+                                ": it is a link of somebody else, in a folder that all may write to",
+                            EACCES);
+    }
+}
+
 // Where a chain of symbolic links leads to, whether or not there is something at its end.
 fs::path followLinks(fs::path path) {
     std::error_code error;
     for (int links = 0; links < 40 && fs::is_symlink(fs::symlink_status(path, error)); ++links) {
+        requireTrusted(path);
         const fs::path next = fs::read_symlink(path, error);
         if (error) {
             break;
