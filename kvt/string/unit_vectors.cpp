@@ -32,6 +32,34 @@ HWY_INLINE NumberOf<sizeof(Unit)> number(Unit unit) {
     return static_cast<NumberOf<sizeof(Unit)>>(unit);
 }
 
+template <typename Number>
+HWY_INLINE bool areSame(const char* left, const char* right) {
+    Number l;
+    Number r;
+    std::memcpy(&l, left, sizeof l);
+    std::memcpy(&r, right, sizeof r);
+    return l == r;
+}
+
+/// Whether `count` units, of which the first and the last are the same, are all so. Without a call for the short needles
+/// of most searches, and for most places of the others.
+template <typename T>
+HWY_INLINE bool areSameBetween(const T* left, const T* right, std::size_t count) {
+    const auto* const l = reinterpret_cast<const char*>(left);
+    const auto* const r = reinterpret_cast<const char*>(right);
+    const std::size_t bytes = count * sizeof(T);
+    if (bytes > 16) {
+        return areSame<std::uint64_t>(l, r) && std::memcmp(l + 8, r + 8, bytes - 8) == 0;
+    }
+    if (bytes >= 8) {
+        return areSame<std::uint64_t>(l, r) && areSame<std::uint64_t>(l + (bytes - 8), r + (bytes - 8));
+    }
+    if (bytes >= 4) {
+        return areSame<std::uint32_t>(l, r) && areSame<std::uint32_t>(l + (bytes - 4), r + (bytes - 4));
+    }
+    return count <= 2 || left[1] == right[1];
+}
+
 /// The needle, and how often its ends stood at places that were no match.
 template <typename T>
 struct Sought {
@@ -41,7 +69,7 @@ struct Sought {
 
     /// Whether the needle stands at a place where its first and last unit do.
     HWY_INLINE bool standsAt(const T* place) {
-        if (length <= 2 || std::memcmp(place + 1, needle + 1, (length - 2) * sizeof(T)) == 0) {
+        if (areSameBetween(place, needle, length)) {
             return true;
         }
         ++inVain;

@@ -1,5 +1,5 @@
-// Split: one loop for all kinds of delimiters. Where they are single units their places are found for a block of units
-// at once and the pieces are counted first, so that the array is made once.
+// Split: one loop for all kinds of delimiters, and the same loop by blocks for a single unit, the places of which are
+// found for a block at once. There the pieces are counted first, so that the array is made once.
 #include <kvt/string/detail/instantiate.h>
 #include <kvt/string/detail/unit_search.h>
 #include <kvt/string/detail/unit_vectors.h>
@@ -47,83 +47,64 @@ UStringArray<N> splitAt(const UString<N>& text, bool keepEmptyParts, std::uint64
     return pieces;
 }
 
-/// The places of one unit in a text, found for a block of units at once.
-template <typename Unit>
-class Delimiters {
-public:
-    Delimiters(detail::Units<Unit> text, Unit unit) : text_(text), unit_(unit) {}
-
-    /// The next place; the text's size when there is none.
-    std::size_t next() {
-        while (next_ == end_) {
-            if (searched_ == text_.size()) {
-                return text_.size();
-            }
-            search();
-        }
-        return begin_ + *next_++;
-    }
-
-private:
-    void search() {
-        begin_ = searched_;
-        const std::size_t size = std::min(places_.size(), text_.size() - begin_);
-        next_ = places_.data();
-        end_ = next_ + detail::vectors::placesOf(text_.data() + begin_, static_cast<std::uint32_t>(size),
-                                                 unit_, places_.data());
-        searched_ += size;
-    }
-
-    const detail::Units<Unit> text_;
-    const Unit unit_;
-    std::size_t searched_ = 0;
-    std::size_t begin_ = 0; // of the block
-    const std::uint32_t* next_ = nullptr;
-    const std::uint32_t* end_ = nullptr;
-    std::array<std::uint32_t, 2048> places_;
+/// Where a piece begins and ends.
+struct Span {
+    std::size_t start;
+    std::size_t end;
 };
 
-/// Strings at the end of an array, made some at a time, for pieces whose number is known but for one.
-template <std::uint32_t N>
-class Pieces {
-public:
-    Pieces(UStringArray<N>& array, std::size_t most) : array_(array) { array_.reserve(most); }
-
-    /// The next string, which is empty.
-    UString<N>& next() {
-        if (next_ == end_) {
-            makeSome();
+/// cutAt() at each `delimiter`, the places of which are found for a block of units at once: `add` gets an array of spans
+/// and their number.
+template <typename Unit, typename Add>
+void cutAtUnit(detail::Units<Unit> text, Unit delimiter, bool keepEmptyParts, std::uint64_t maxCount,
+               Add add) {
+    std::array<std::uint32_t, 1024> places;
+    std::array<Span, 1024> spans;
+    std::size_t start = 0;
+    for (std::size_t begin = 0; begin < text.size() && maxCount != 0; begin += places.size()) {
+        const std::size_t size = std::min(places.size(), text.size() - begin);
+        const std::size_t found = detail::vectors::placesOf(
+            text.data() + begin, static_cast<std::uint32_t>(size), delimiter, places.data());
+        std::size_t count = 0;
+        for (std::size_t i = 0; i < found; ++i) {
+            const std::size_t end = begin + places[i];
+            spans[count] = {start, end};
+            count += keepEmptyParts || end > start ? 1 : 0;
+            start = end + 1;
         }
-        return *next_++;
+        if (count >= maxCount) {
+            count = static_cast<std::size_t>(maxCount);
+            start = spans[count - 1].end + 1;
+        }
+        add(spans.data(), count);
+        maxCount -= count;
     }
-    /// Drops the strings that were not asked for.
-    void finish() { array_.resize(array_.size() - static_cast<std::size_t>(end_ - next_)); }
-
-private:
-    void makeSome() {
-        const std::size_t made = array_.size();
-        array_.resize(made + std::min<std::size_t>(64, array_.capacity() - made));
-        next_ = array_.data() + made;
-        end_ = array_.end();
+    if (maxCount == 0 || keepEmptyParts || start < text.size()) {
+        spans[0] = {start, text.size()};
+        add(spans.data(), 1);
     }
+}
 
-    UStringArray<N>& array_;
-    UString<N>* next_ = nullptr;
-    UString<N>* end_ = nullptr;
-};
-
-// Sets `out`, which is empty, to the `size` units at `units`, of which `readable` can be read.
+// Sets `out`, which is empty, to the `size` units at `units`, of which `readable` can be read. Short pieces are copied
+// by as many bytes as a string holds in place, and by as many as the smallest piece of memory takes, whatever the size.
 template <typename Unit>
-void fill(std::basic_string<Unit>& out, const Unit* units, std::size_t size, std::size_t readable) {
-    constexpr std::size_t inPlace = 15 / sizeof(Unit); // units that a string holds without memory of its own
-    detail::appendInPlace(out, std::max(size, inPlace), [=](Unit* to) {
-        if (size <= inPlace && inPlace <= readable) {
-            std::memcpy(to, units, inPlace * sizeof(Unit)); // one step, whatever the size
-        } else {
-            std::memcpy(to, units, size * sizeof(Unit));
-        }
-        return size;
-    });
+[[gnu::always_inline]] inline void fill(std::basic_string<Unit>& out, const Unit* units, std::size_t size,
+                                        std::size_t readable) {
+    constexpr std::size_t inPlace = 15 / sizeof(Unit);
+    constexpr std::size_t smallest = 32 / sizeof(Unit);
+    const auto copy = [&](auto room) {
+        detail::appendInPlace(out, room, [=](Unit* to) {
+            std::memcpy(to, units, room * sizeof(Unit));
+            return size;
+        });
+    };
+    if (size <= inPlace && inPlace <= readable) {
+        copy(std::integral_constant<std::size_t, inPlace>());
+    } else if (size > inPlace && size <= smallest && smallest <= readable) {
+        copy(std::integral_constant<std::size_t, smallest>());
+    } else {
+        out.assign(units, size);
+    }
 }
 
 } // namespace
@@ -135,16 +116,18 @@ UStringArray<N> UString<N>::split(value_type delimiter, SplitBehaviour behaviour
     const bool keepEmptyParts = behaviour == KeepEmptyParts;
     const std::size_t parts =
         detail::vectors::countParts(text.data(), text.size(), delimiter, keepEmptyParts);
-    UStringArray<N> array;
-    Pieces<N> pieces(array, std::min<std::uint64_t>(parts, maxCount) + 1);
-    Delimiters<value_type> delimiters(text, delimiter);
-    cutAt<value_type>(
-        text, keepEmptyParts, maxCount, [&](std::size_t) { return delimiters.next(); },
-        [&pieces, text](std::size_t start, std::size_t end) {
-            fill(pieces.next().storage_, text.data() + start, end - start, text.size() - start);
-        });
-    pieces.finish();
-    return array;
+    UStringArray<N> pieces;
+    pieces.reserve(std::min<std::uint64_t>(parts, maxCount) + 1);
+    cutAtUnit<value_type>(text, delimiter, keepEmptyParts, maxCount,
+                          [&pieces, text](const Span* spans, std::size_t count) {
+                              UString<N>* piece = pieces.end();
+                              pieces.resize(pieces.size() + count);
+                              for (const Span* const end = spans + count; spans != end; ++spans, ++piece) {
+                                  fill(piece->storage_, text.data() + spans->start, spans->end - spans->start,
+                                       text.size() - spans->start);
+                              }
+                          });
+    return pieces;
 }
 
 template <std::uint32_t N>

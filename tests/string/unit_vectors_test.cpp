@@ -98,6 +98,23 @@ protected:
         }
     }
 
+    // Needles of which all units stand but for one, that one being any.
+    template <typename Unit>
+    void checkUnitsBetween() {
+        for (std::size_t length = 1; length <= 40; ++length) {
+            std::basic_string<Unit> needle;
+            while (needle.size() < length) {
+                needle += static_cast<Unit>('a' + needle.size());
+            }
+            for (std::size_t at = 0; at < length; ++at) {
+                std::basic_string<Unit> almost = needle;
+                almost[at] = highest<Unit>;
+                checkFind(almost + almost, needle);
+                checkFind(almost + needle, needle);
+            }
+        }
+    }
+
 private:
     GuardedMemory memory_{1 << 12};
 };
@@ -107,16 +124,19 @@ INSTANTIATE_TEST_SUITE_P(Each, UnitVectors, testing::ValuesIn(vectorTargets()), 
 TEST_P(UnitVectors, BytesAreFoundCountedAndListed) {
     checkAll<char>();
     checkPlaces<char>();
+    checkUnitsBetween<char>();
 }
 
 TEST_P(UnitVectors, UnitsOfSixteenBitsAreFoundCountedAndListed) {
     checkAll<char16_t>();
     checkPlaces<char16_t>();
+    checkUnitsBetween<char16_t>();
 }
 
 TEST_P(UnitVectors, UnitsOfThirtyTwoBitsAreFoundCountedAndListed) {
     checkAll<char32_t>();
     checkPlaces<char32_t>();
+    checkUnitsBetween<char32_t>();
 }
 
 TEST_P(UnitVectors, TheSearchForBytesGivesUpWhereItsEndsStandInVain) {

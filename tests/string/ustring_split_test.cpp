@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <new>
+#include <random>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -296,6 +297,30 @@ TYPED_TEST(UStringSplit, AgreesWithTheReferenceOnUnits) {
                 return text.split(static_cast<Unit<N>>(unit), behaviour, count);
             },
             [&](std::string_view word, std::size_t at) { return word[at] == unit; });
+    }
+}
+
+// Texts of several blocks, pieces of each length about that of what is copied in one step, and counts that end anywhere.
+TYPED_TEST(UStringSplit, AgreesWithTheReferenceOnUnitsOfLongTexts) {
+    constexpr auto N = TestFixture::number;
+    const auto delimiter = static_cast<Unit<N>>('b');
+    std::mt19937 random(17);
+    for (const unsigned longest : {1U, 3U, 20U, 40U, 3000U}) {
+        std::string text;
+        while (text.size() < 5000) {
+            text += std::string(random() % longest, 'a') + std::string(random() % 3, 'b');
+        }
+        const Units<N> units = asciiUnits<N>(text);
+        for (const bool keep : {true, false}) {
+            const auto behaviour = keep ? UString<N>::KeepEmptyParts : UString<N>::SkipEmptyParts;
+            for (const std::uint64_t count :
+                 {std::uint64_t{1}, std::uint64_t{50}, std::uint64_t{1000}, npos}) {
+                EXPECT_TRUE(sameUnits<N>(
+                    fromUnits<N>(units).split(delimiter, behaviour, count),
+                    referenceSplit(units, keep, count, [&](std::size_t at) { return text[at] == 'b'; })))
+                    << longest << (keep ? ", keeping, " : ", skipping, ") << count;
+            }
+        }
     }
 }
 
