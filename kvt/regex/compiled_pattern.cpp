@@ -87,7 +87,8 @@ std::optional<bool> CompiledPattern::searchByPrefix(const Range& range, boost::c
     double visited = 0; // states, by the tries
     std::size_t place = scan_.find(begin, size, 0);
     for (std::size_t tries = 1;; ++tries) {
-        visited += place != size ? prefix_.statesOfTry({begin, size}, place) : 0;
+        const std::size_t first = place != size ? prefix_.beginOfTry({begin, size}, place) : size;
+        visited += place != size ? prefix_.statesOfTry({begin, size}, first) : 0;
         if (!prefix_.isSureToEnd(engine_.size(), size, visited) || areClose(tries, place)) {
             return {};
         }
@@ -96,7 +97,7 @@ std::optional<bool> CompiledPattern::searchByPrefix(const Range& range, boost::c
         }
         try {
             // All that looks back sees what it would see in the plain search, and not the beginning of the try.
-            if (boost::regex_search(begin + place, range.end, result, engine(), boost::match_continuous,
+            if (boost::regex_search(begin + first, range.end, result, engine(), boost::match_continuous,
                                     range.base)) {
                 return true;
             }

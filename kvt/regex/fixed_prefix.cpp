@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <bit>
 #include <cstdint>
+#include <limits>
 
 namespace kvt::ex::detail {
 namespace {
@@ -83,8 +84,12 @@ bool readParts(const Engine& engine, FixedPrefix& prefix) {
         case states::syntax_element_char_rep:
         case states::syntax_element_short_set_rep: {
             const auto& repeat = as<states::re_repeat>(state);
-            prefix.parts.push_back(
-                {repeat.min != repeat.max ? bytesOf(state->next.p) : ByteSet(), repeat.min, repeat.max});
+            FixedPrefix::Part part{{}, repeat.min, repeat.max};
+            if (repeat.min != repeat.max) {
+                part.set = bytesOf(state->next.p);
+                part.takesAll = part.set.count() == 256;
+            }
+            prefix.parts.push_back(part);
             state = state->next.p; // what is repeated
             break;
         }
@@ -117,6 +122,13 @@ bool readParts(const Engine& engine, FixedPrefix& prefix) {
     return true;
 }
 
+/// Whether a repeat at the very beginning takes all bytes of a set that there are in a row. Where the engine fails behind
+/// such a run it goes on behind it, too.
+bool isRun(const states::re_repeat& repeat) {
+    return repeat.type != states::syntax_element_dot_rep && repeat.leading && repeat.greedy &&
+           repeat.min >= 1 && repeat.max == std::numeric_limits<std::size_t>::max();
+}
+
 /// Adds what comes first in the program, up to the first state that may take this or that number of bytes.
 void readPrefix(const Engine& engine, FixedPrefix& prefix) {
     auto& sets = prefix.sets;
@@ -141,9 +153,16 @@ void readPrefix(const Engine& engine, FixedPrefix& prefix) {
         case states::syntax_element_char_rep:
         case states::syntax_element_short_set_rep: {
             const auto& repeat = as<states::re_repeat>(state);
-            // The engine has shorter ways with a repeat at the very beginning.
             if (repeat.min != repeat.max && sets.empty()) {
-                return;
+                if (!isRun(repeat)) {
+                    return;
+                }
+                prefix.run = bytesOf(state->next.p);
+                ++prefix
+                      .statesOfPrefix; // one more for each byte of the run, which the engine gives back in vain
+                sets.push_back(*prefix.run);
+                state = repeat.alt.p;
+                continue;
             }
             sets.insert(sets.end(), std::min(repeat.min, longestPrefix - sets.size()),
                         bytesOf(state->next.p));
@@ -160,19 +179,20 @@ void readPrefix(const Engine& engine, FixedPrefix& prefix) {
     }
 }
 
-/// How frequent the bytes of a set are in texts, roughly: small letters and the blank have a weight.
-double frequencyOf(const ByteSet& set) {
-    constexpr double weight = 8; // where the others have 1
-    const int frequent = std::popcount(set.rows[6] & 0xFFFEU) + std::popcount(set.rows[7] & 0x07FFU) +
-                         std::popcount(set.rows[2] & 0x0001U);
-    return (static_cast<double>(set.count()) + (weight - 1) * frequent) / (256 + (weight - 1) * 27);
+bool haveCommonByte(const ByteSet& left, const ByteSet& right) {
+    for (std::size_t i = 0; i < left.rows.size(); ++i) {
+        if ((left.rows[i] & right.rows[i]) != 0) {
+            return true;
+        }
+    }
+    return false;
 }
 
 // Whether a place in so many is expected to have the prefix that looking for it pays.
 bool isRare(const std::vector<ByteSet>& sets) {
     double frequency = 1;
     for (const ByteSet& set : sets) {
-        frequency *= frequencyOf(set);
+        frequency *= set.frequency();
     }
     return frequency < 1.0 / 50;
 }
@@ -186,11 +206,21 @@ FixedPrefix fixedPrefix(const Engine& engine) {
         while (!prefix.sets.empty() && prefix.sets.back().count() == 256) {
             prefix.sets.pop_back();
         }
-        if (!isRare(prefix.sets)) {
+        // Behind a run stands something else, so that nothing but a whole run is one.
+        const bool isRunOpen =
+            prefix.run && (prefix.sets.size() < 2 || haveCommonByte(*prefix.run, prefix.sets[1]));
+        if (isRunOpen || !isRare(prefix.sets)) {
             prefix.sets.clear();
         }
     }
     return prefix;
+}
+
+std::size_t FixedPrefix::beginOfTry(std::string_view text, std::size_t place) const {
+    while (run && place > 0 && run->contains(static_cast<unsigned char>(text[place - 1]))) {
+        --place;
+    }
+    return place;
 }
 
 // Each part lies between two places, the nearest and the farthest that it may get to; a repeat gives as many ways more
@@ -207,7 +237,7 @@ double FixedPrefix::statesOfTry(std::string_view text, std::size_t place) const 
             // A run that goes past the farthest place so far is the one that goes on there.
             const std::size_t more = std::min(part.most - part.least, text.size() - farthest);
             const std::size_t end = farthest + more;
-            if (part.set.count() == 256) {
+            if (part.takesAll) {
                 farthest = end;
             } else {
                 while (farthest != end && part.set.contains(static_cast<unsigned char>(text[farthest]))) {

@@ -15,6 +15,7 @@
 #include <algorithm>
 #include <bit>
 #include <numeric>
+#include <string_view>
 #include <utility>
 
 HWY_BEFORE_NAMESPACE();
@@ -28,11 +29,13 @@ HWY_INLINE bool saysYes(const PrefixScan::Probe& probe, const std::uint8_t* plac
 
 #if HWY_TARGET != HWY_SCALAR
 /// Asks by registers of so many bytes, of which one at least fits the places.
-template <std::size_t bytes>
-HWY_INLINE std::size_t findByRegisters(const PrefixScan::Probe* probes, const std::uint8_t* text,
-                                       std::size_t places) {
+template <bool areBytes, std::size_t bytes>
+HWY_INLINE std::size_t findByRegisters(const std::array<PrefixScan::Probe, 3>& probes,
+                                       const std::uint8_t* text, std::size_t places) {
     const hn::CappedTag<std::uint8_t, bytes> d;
     const std::size_t N = hn::Lanes(d);
+    const auto byte0 = hn::Set(d, probes[0].byte);
+    const auto byte1 = hn::Set(d, probes[1].byte);
     const auto low0 = hn::LoadDup128(d, probes[0].low.data());
     const auto low1 = hn::LoadDup128(d, probes[1].low.data());
     const auto low2 = hn::LoadDup128(d, probes[2].low.data());
@@ -42,20 +45,24 @@ HWY_INLINE std::size_t findByRegisters(const PrefixScan::Probe* probes, const st
     const auto half = hn::Set(d, 0x0F);
     const auto ask = [&](auto low, auto high, const std::uint8_t* place) HWY_ATTR {
         const auto v = hn::LoadU(d, place);
-        return hn::And(hn::TableLookupBytes(low, hn::And(v, half)),
-                       hn::TableLookupBytes(high, hn::ShiftRight<4>(v)));
+        return hn::Ne(hn::And(hn::TableLookupBytes(low, hn::And(v, half)),
+                              hn::TableLookupBytes(high, hn::ShiftRight<4>(v))),
+                      hn::Zero(d));
     };
     for (std::size_t at = 0; at < places; at += N) {
         // The last register takes places that were asked before.
         at = at <= places - N ? at : places - N;
         const std::uint8_t* const begin = text + at;
-        const auto zero = hn::Zero(d);
-        auto yes = hn::Ne(ask(low0, high0, begin + probes[0].offset), zero);
+        auto yes = areBytes ? hn::And(hn::Eq(hn::LoadU(d, begin + probes[0].offset), byte0),
+                                      hn::Eq(hn::LoadU(d, begin + probes[1].offset), byte1))
+                            : ask(low0, high0, begin + probes[0].offset);
         if (hn::AllFalse(d, yes)) {
             continue;
         }
-        yes = hn::And(hn::And(yes, hn::Ne(ask(low1, high1, begin + probes[1].offset), zero)),
-                      hn::Ne(ask(low2, high2, begin + probes[2].offset), zero));
+        if (!areBytes) {
+            yes = hn::And(yes, ask(low1, high1, begin + probes[1].offset));
+        }
+        yes = hn::And(yes, ask(low2, high2, begin + probes[2].offset));
         if (HWY_UNLIKELY(!hn::AllFalse(d, yes))) {
             return at + static_cast<std::size_t>(hn::FindFirstTrue(d, yes));
         }
@@ -64,25 +71,32 @@ HWY_INLINE std::size_t findByRegisters(const PrefixScan::Probe* probes, const st
 }
 #endif
 
-std::size_t findProbesIn(const PrefixScan::Probe* probes, const char* text, std::size_t places) {
-    const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
+template <bool areBytes>
+HWY_INLINE std::size_t findThree(const std::array<PrefixScan::Probe, 3>& probes, const std::uint8_t* text,
+                                 std::size_t places) {
 #if HWY_TARGET != HWY_SCALAR
     if (places >= 64) {
-        return findByRegisters<64>(probes, begin, places);
+        return findByRegisters<areBytes, 64>(probes, text, places);
     }
     if (places >= 32) {
-        return findByRegisters<32>(probes, begin, places);
+        return findByRegisters<areBytes, 32>(probes, text, places);
     }
     if (places >= 16) {
-        return findByRegisters<16>(probes, begin, places);
+        return findByRegisters<areBytes, 16>(probes, text, places);
     }
 #endif
     std::size_t at = 0;
-    while (at < places && !(saysYes(probes[0], begin + at) && saysYes(probes[1], begin + at) &&
-                            saysYes(probes[2], begin + at))) {
+    while (at < places && !(saysYes(probes[0], text + at) && saysYes(probes[1], text + at) &&
+                            saysYes(probes[2], text + at))) {
         ++at;
     }
     return at;
+}
+
+std::size_t findProbesIn(const PrefixScan::Probes& probes, const char* text, std::size_t places) {
+    const auto* const begin = reinterpret_cast<const std::uint8_t*>(text);
+    return probes.areBytes ? findThree<true>(probes.probes, begin, places)
+                           : findThree<false>(probes.probes, begin, places);
 }
 
 } // namespace kvt::ex::detail::vectors::HWY_NAMESPACE
@@ -94,7 +108,7 @@ namespace vectors {
 
 KVT_VECTOR_TABLE(findProbesIn);
 
-std::size_t findProbes(const PrefixScan::Probe* probes, const char* text, std::size_t places) {
+std::size_t findProbes(const PrefixScan::Probes& probes, const char* text, std::size_t places) {
     return KVT_VECTOR_CALL(findProbesIn)(probes, text, places);
 }
 
@@ -108,9 +122,28 @@ std::size_t ByteSet::count() const {
 
 namespace {
 
+/// How often a byte stands in texts, as a multiple of how often the rare ones do.
+constexpr std::array<std::uint8_t, 256> weights = [] {
+    std::array<std::uint8_t, 256> weight{};
+    weight.fill(1);
+    const auto set = [&](std::string_view bytes, std::uint8_t value) {
+        for (const char byte : bytes) {
+            weight[static_cast<unsigned char>(byte)] = value;
+        }
+    };
+    set(".,-_/:\n", 2);
+    set("0123456789", 3);
+    set("abcdefghijklmnopqrstuvwxyz", 4);
+    set(" etaoinsrhld", 8);
+    return weight;
+}();
+
 PrefixScan::Probe probeOf(const ByteSet& set, std::size_t offset) {
     PrefixScan::Probe probe;
     probe.offset = offset;
+    while (probe.byte < 255 && !set.contains(probe.byte)) {
+        ++probe.byte;
+    }
     std::array<std::uint16_t, 8> rows{}; // the last one takes all that are left over
     std::size_t used = 0;
     for (std::size_t high = 0; high < 16; ++high) {
@@ -136,19 +169,34 @@ PrefixScan::Probe probeOf(const ByteSet& set, std::size_t offset) {
 
 } // namespace
 
+double ByteSet::frequency() const {
+    double sum = 0;
+    for (unsigned byte = 0; byte < 256; ++byte) {
+        sum += contains(static_cast<unsigned char>(byte)) ? weights[byte] : 0;
+    }
+    return sum / std::accumulate(weights.begin(), weights.end(), 0.0);
+}
+
 PrefixScan::PrefixScan(std::vector<ByteSet> sets) : sets_(std::move(sets)) {
     if (sets_.empty()) {
         return;
     }
-    // The smallest sets say most; among equal ones those that are far from each other.
+    // The rarest sets say most; among equal ones those that are far from each other. Those of one byte are asked first,
+    // since that is done in one step.
     std::vector<std::size_t> places(sets_.size());
     std::iota(places.begin(), places.end(), std::size_t{0});
     std::swap(places.back(), places[places.size() > 1 ? 1 : 0]);
-    std::stable_sort(places.begin(), places.end(),
-                     [&](std::size_t a, std::size_t b) { return sets_[a].count() < sets_[b].count(); });
-    for (std::size_t i = 0; i < probeCount; ++i) {
-        const std::size_t place = places[std::min(i, places.size() - 1)];
-        probes_[i] = probeOf(sets_[place], place);
+    std::stable_sort(places.begin(), places.end(), [&](std::size_t a, std::size_t b) {
+        return sets_[a].frequency() < sets_[b].frequency();
+    });
+    const auto others = std::stable_partition(places.begin(), places.end(),
+                                              [&](std::size_t place) { return sets_[place].count() == 1; });
+    const auto bytes = static_cast<std::size_t>(others - places.begin());
+    probes_.areBytes = bytes > 0;
+    const std::size_t chosen[] = {0, probes_.areBytes ? std::min<std::size_t>(1, bytes - 1) : 1, 2};
+    for (std::size_t i = 0; i < probes_.probes.size(); ++i) {
+        const std::size_t place = places[std::min(chosen[i], places.size() - 1)];
+        probes_.probes[i] = probeOf(sets_[place], place);
     }
 }
 
@@ -163,7 +211,7 @@ std::size_t PrefixScan::find(const char* text, std::size_t size, std::size_t fro
         return size;
     }
     for (const std::size_t end = size - sets_.size() + 1; from < end; ++from) {
-        from += vectors::findProbes(probes_.data(), text + from, end - from);
+        from += vectors::findProbes(probes_, text + from, end - from);
         if (from == end) {
             break;
         }

@@ -203,6 +203,15 @@ const std::vector<Prefixed> prefixes = {
     {"q[[:alpha:]]\\w{2,4}", {"qab1", "qabcdef", "q1", "qa"}},
     {"[[:xdigit:]]{8}", {"9f3c0a1b", "9f3c0a1", "g"}},
     {"\\Qa.b\\E", {"a.b", "axb", "."}},
+    // Beginnings that begin with a run.
+    {"\\d+-", {"12-", "1-", "-", "123", "1-2-", "0"}},
+    {"(\\d{2,})-(\\d+)", {"12-3", "1-2", "1-", "-", "123", "12--"}},
+    {"(?:(\\w+)@)x", {"ab@x", "a@", "@x", "ab", "a@x@x", "x"}},
+    {"z+y", {"zzy", "zy", "z", "y", "zzz"}},
+    {"[[:upper:]]+\\[", {"AB[", "A[", "[", "AB", "a["}},
+    {"\\d+?-", {"12-", "1-", "-"}},
+    {"\\d+\\w", {"12a", "1", "1-"}},
+    {"\\d++-", {"12-", "1-", "-", "12"}},
 };
 
 TEST(RegexDifferential, APatternWithAFixedBeginningIsFoundWhereTheEngineFindsIt) {
@@ -239,7 +248,8 @@ TEST(RegexDifferential, GivingUpIsNotPassedOver) {
     std::size_t givenUp = 0;
     std::size_t ended = 0;
     for (const char* pattern : {"ab.*x", "ab.*.*x", "ab.*.*.*x", "ab[ab]*[ab]*x", "(ab)\\w+\\s?\\w+(x|y)",
-                                "abab.{0,9}.{0,9}.{0,9}x", "ab(a|b|ab).*(a|b|ba)x", "ab.*$x"}) {
+                                "abab.{0,9}.{0,9}.{0,9}x", "ab(a|b|ab).*(a|b|ba)x", "ab.*$x", "a+b.*.*x",
+                                "a+b[ab]*[ab]*x", "(a+)b.*.*.*x"}) {
         const boost::regex engine(pattern);
         const URegex<0> regex(pattern);
         for (std::size_t count = 1; count < 700; count += 1 + count / 5) {

@@ -6,6 +6,7 @@
 #include <kvt/regex/detail/prefix_scan.h>
 
 #include <cstddef>
+#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -17,16 +18,23 @@ struct FixedPrefix {
         ByteSet set;
         std::size_t least = 0;
         std::size_t most = 0;
+        bool takesAll = false; ///< whether the set holds all bytes
     };
 
     /// Empty where the pattern has no such beginning, or what else is in it forbids to pass over places.
     std::vector<ByteSet> sets;
+    /// Where the pattern begins with a run of bytes of a set, that set. It is the first of `sets`, too: there it stands
+    /// for the last byte of the run, behind which no other of its bytes can stand.
+    std::optional<ByteSet> run;
     /// In the order of the pattern, the parts of all its alternatives.
     std::vector<Part> parts;
     bool hasAlternatives = false;
     double statesOfPrefix = 0; ///< visited at most by a try that fails within the prefix
     double statesOfWay =
         0; ///< visited at most in one way through the program, times the ways by alternatives
+
+    /// Where a match begins that has the sets at `place`: there, or where the run begins that ends there.
+    std::size_t beginOfTry(std::string_view text, std::size_t place) const;
 
     /// The states that a try at `place` visits at most.
     double statesOfTry(std::string_view text, std::size_t place) const;

@@ -17,6 +17,8 @@ struct ByteSet {
     }
     bool contains(unsigned char byte) const { return (rows[byte >> 4U] >> (byte & 0xFU) & 1U) != 0; }
     std::size_t count() const;
+    /// How frequent its bytes are in texts, roughly: from 0 for none to 1 for all of them.
+    double frequency() const;
 };
 
 class PrefixScan {
@@ -34,22 +36,27 @@ public:
     /// its set, and may be some more.
     struct Probe {
         std::size_t offset = 0;
+        std::uint8_t byte = 0; ///< the lowest one of the set
         alignas(16) std::array<std::uint8_t, 16> low{};
         alignas(16) std::array<std::uint8_t, 16> high{};
     };
-    static constexpr std::size_t probeCount = 3;
+    struct Probes {
+        std::array<Probe, 3> probes;
+        bool areBytes =
+            false; ///< the first two are of one byte each, which is all that has to be compared there
+    };
 
 private:
     bool standsAt(const char* place) const;
 
     std::vector<ByteSet> sets_;
-    std::array<Probe, probeCount> probes_;
+    Probes probes_;
 };
 
 namespace vectors {
 
 /// The first of the `places` from `text` on where all probes say yes; `places` where there is none.
-std::size_t findProbes(const PrefixScan::Probe* probes, const char* text, std::size_t places);
+std::size_t findProbes(const PrefixScan::Probes& probes, const char* text, std::size_t places);
 
 } // namespace vectors
 } // namespace kvt::ex::detail
