@@ -8,6 +8,7 @@
 #include <boost/regex.hpp>
 
 #include <cstdint>
+#include <locale>
 #include <ostream>
 #include <string>
 #include <string_view>
@@ -185,6 +186,28 @@ inline std::string perlByHand(std::string pattern) {
             pos = i + 2;
         }
     }
+}
+
+/// A pattern compiled while letters of the global locale include "!", which they do not in the classic one.
+inline ex::URegex<0> compiledWithExclamationLetters(const char* pattern) {
+    class Letters : public std::ctype<char> {
+    public:
+        Letters() : std::ctype<char>(table()) {}
+
+    private:
+        static const mask* table() {
+            static const std::vector<mask> masks = [] {
+                std::vector<mask> all(classic_table(), classic_table() + table_size);
+                all['!'] = alpha | lower | print | graph;
+                return all;
+            }();
+            return masks.data();
+        }
+    };
+    const std::locale before = std::locale::global(std::locale(std::locale::classic(), new Letters));
+    const ex::URegex<0> regex(pattern);
+    std::locale::global(before);
+    return regex;
 }
 
 /// Calls `use` for each text of at most `longest` characters of the alphabet, the empty one first.

@@ -5,7 +5,6 @@
 
 #include <atomic>
 #include <functional>
-#include <locale>
 #include <thread>
 
 namespace kvt::test {
@@ -38,28 +37,9 @@ TEST(RegexThreads, OneRegexServesThemAll) {
     EXPECT_EQ(wrong, 0);
 }
 
-// Takes "!" for a letter.
-class ExclamationLetters : public std::ctype<char> {
-public:
-    ExclamationLetters() : std::ctype<char>(table()) {}
-
-private:
-    static const mask* table() {
-        static const std::vector<mask> masks = [] {
-            std::vector<mask> all(classic_table(), classic_table() + table_size);
-            all['!'] = alpha | lower | print | graph;
-            return all;
-        }();
-        return masks.data();
-    }
-};
-
 // Other threads may have programs of their own, which are compiled later.
 TEST(RegexThreads, AllOfThemSeeTheLocaleInWhichThePatternWasCompiled) {
-    const std::locale classic =
-        std::locale::global(std::locale(std::locale::classic(), new ExclamationLetters));
-    const ex::URegex<0> regex("\\w+");
-    std::locale::global(classic);
+    const ex::URegex<0> regex = compiledWithExclamationLetters("\\w+");
     std::atomic<int> wrong{0};
     for (int round = 0; round < 3; ++round) {
         onThreads([&](int) { wrong += !regex.match("a!"); });
