@@ -1,8 +1,9 @@
 // Works held to limits beside other ways of doing them.
 //
 // All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
-// falls on all of them alike. A row is the median of the ratios of its two ways within a round. A row that misses its
-// limit is marked, and the exit status is then 1.
+// falls on all of them alike. What counts is the processor's time, in which waiting for a processor has no part, or the
+// clock's where ways take several threads. A row is the median of the ratios of its two ways within a round. A row that
+// misses its limit is marked, and the exit status is then 1.
 //
 //     --benchmark_filter=REGEX   only the rows whose work it finds
 //     --quick                    a fifth of the rounds
@@ -12,12 +13,12 @@
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
-#include <chrono>
 #include <cstdio>
 #include <functional>
 #include <map>
 #include <regex>
 #include <string>
+#include <time.h>
 #include <vector>
 
 namespace kvt::bench {
@@ -49,12 +50,19 @@ struct Row {
     double limit = 0;
 };
 
+/// Which time is measured: that of the processor for the calling thread, or that of the clock.
+enum class Clock { ofThread = CLOCK_THREAD_CPUTIME_ID, ofWall = CLOCK_MONOTONIC };
+
 class Limits {
 public:
     /// Each way is called `calls` times in each of the rounds.
-    Limits(int rounds, int calls) : rounds_(rounds), calls_(calls) {}
+    Limits(int rounds, int calls, Clock clock = Clock::ofThread)
+        : rounds_(rounds), calls_(calls), clock_(clock) {}
 
-    void add(const std::string& name, Way measured) { ways_[name] = std::move(measured); }
+    /// A way that does `parts` times as much as counts is taken to be so many times as fast.
+    void add(const std::string& name, Way measured, double parts = 1) {
+        ways_[name] = {std::move(measured), parts};
+    }
     void hold(Row row) { rows_.push_back(std::move(row)); }
 
     /// Measures the rows that the arguments ask for, prints them, and returns the exit status.
@@ -96,11 +104,21 @@ private:
                            [&](const Row& row) { return row.work == name || row.beside == name; });
     }
 
-    double nanosecondsOf(const Way& measured) const {
-        const auto begin = std::chrono::steady_clock::now();
-        measured(calls_);
-        const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - begin;
-        return taken.count() / calls_;
+    struct Measured {
+        Way way;
+        double parts = 1;
+    };
+
+    double now() const {
+        timespec time{};
+        clock_gettime(static_cast<clockid_t>(clock_), &time);
+        return static_cast<double>(time.tv_sec) * 1e9 + static_cast<double>(time.tv_nsec);
+    }
+
+    double nanosecondsOf(const Measured& measured) const {
+        const double begin = now();
+        measured.way(calls_);
+        return (now() - begin) / calls_ / measured.parts;
     }
 
     static double median(std::vector<double> numbers) {
@@ -148,7 +166,8 @@ private:
 
     int rounds_;
     int calls_;
-    std::map<std::string, Way> ways_;
+    Clock clock_;
+    std::map<std::string, Measured> ways_;
     std::vector<Row> rows_;
     std::map<std::string, std::vector<double>> times_;
     std::FILE* results_ = nullptr;

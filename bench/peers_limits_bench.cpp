@@ -8,10 +8,12 @@
 
 #include <absl/strings/str_split.h>
 #include <boost/algorithm/string/split.hpp>
+#include <boost/container/deque.hpp>
 #include <boost/locale.hpp>
 #include <date/date.h>
 #include <fmt/format.h>
 #include <glib.h>
+#include <lmdb.h>
 #include <QString>
 #include <re2/re2.h>
 #include <unicode/ustring.h>
@@ -19,11 +21,15 @@
 #define PCRE2_CODE_UNIT_WIDTH 8
 #include <pcre2.h>
 
+#include <cstdint>
 #include <cstring>
+#include <filesystem>
 #include <memory>
+#include <numeric>
 #include <sstream>
 #include <stdexcept>
 #include <string>
+#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -219,6 +225,94 @@ void holdDates(Limits& limits) {
              Bound::shown);
 }
 
+// ---- Data in a file
+
+constexpr std::uint64_t keptWords = 100'000;
+
+/// A file for the time of the program.
+std::string scratchFile(const std::string& name) {
+    return (std::filesystem::temp_directory_path() / ("kvt_bench_" + name + std::to_string(::getpid())))
+        .string();
+}
+
+/// Words in a deque in a segment.
+class Segment {
+public:
+    Segment() { segment_.load(false); }
+    std::uint64_t fillAndSum() {
+        boost::container::deque<std::uint64_t, mmap::segment_allocator<std::uint64_t>> words(
+            segment_.segment_manager());
+        for (std::uint64_t i = 0; i < keptWords; ++i) {
+            words.push_back(i);
+        }
+        return std::accumulate(words.begin(), words.end(), std::uint64_t{0});
+    }
+
+private:
+    mmap::memory_manager manager_{scratchFile("segment"), {}};
+    mmap::mapped_region_segment segment_ = manager_.create_segment();
+};
+
+/// Words under ascending numbers in LMDB, as fast as it goes: in one transaction that does not wait for the disk.
+class Lmdb {
+public:
+    Lmdb() {
+        check(mdb_env_create(&environment_));
+        check(mdb_env_set_mapsize(environment_, 64 << 20));
+        check(mdb_env_open(environment_, path_.c_str(), MDB_NOSUBDIR | MDB_WRITEMAP | MDB_NOSYNC | MDB_NOLOCK,
+                           0600));
+    }
+    Lmdb(const Lmdb&) = delete;
+    Lmdb& operator=(const Lmdb&) = delete;
+    ~Lmdb() {
+        mdb_env_close(environment_);
+        std::filesystem::remove(path_);
+    }
+    std::uint64_t fillAndSum() {
+        MDB_txn* transaction = nullptr;
+        MDB_dbi table = 0;
+        check(mdb_txn_begin(environment_, nullptr, 0, &transaction));
+        check(mdb_dbi_open(transaction, nullptr, MDB_INTEGERKEY, &table));
+        check(mdb_drop(transaction, table, 0));
+        for (std::uint64_t i = 0; i < keptWords; ++i) {
+            MDB_val key{sizeof i, &i};
+            MDB_val value{sizeof i, &i};
+            check(mdb_put(transaction, table, &key, &value, MDB_APPEND));
+        }
+        check(mdb_txn_commit(transaction));
+        check(mdb_txn_begin(environment_, nullptr, MDB_RDONLY, &transaction));
+        MDB_cursor* cursor = nullptr;
+        check(mdb_cursor_open(transaction, table, &cursor));
+        std::uint64_t sum = 0;
+        MDB_val key{};
+        MDB_val value{};
+        while (mdb_cursor_get(cursor, &key, &value, MDB_NEXT) == 0) {
+            std::uint64_t word = 0;
+            std::memcpy(&word, value.mv_data, sizeof word);
+            sum += word;
+        }
+        mdb_cursor_close(cursor);
+        mdb_txn_abort(transaction);
+        return sum;
+    }
+
+private:
+    static void check(int error) {
+        if (error != 0) {
+            throw std::runtime_error(mdb_strerror(error));
+        }
+    }
+
+    std::string path_ = scratchFile("lmdb");
+    MDB_env* environment_ = nullptr;
+};
+
+void holdFiles(Limits& limits) {
+    Peers(limits, "100,000 words into a file, and read",
+          way([segment = std::make_shared<Segment>()] { return segment->fillAndSum(); }))
+        .add("LMDB", way([lmdb = std::make_shared<Lmdb>()] { return lmdb->fillAndSum(); }));
+}
+
 } // namespace
 
 int main(int argc, char** argv) {
@@ -234,6 +328,7 @@ int main(int argc, char** argv) {
                kvt::bench::logText(mebibyte));
     holdSearch(large, "a literal in 1 MiB of a log", "ERROR \\[(\\w+)\\] (.*)",
                kvt::bench::logText(mebibyte));
+    holdFiles(large);
     Limits small(101, 2'000);
     holdSearch(small, "no match in 90 bytes", "(\\d{4})-(\\d\\d)-(\\d\\d)", kvt::bench::prose(90));
     holdDates(small);
