@@ -243,6 +243,10 @@ Progress convertByPivot(Form from, Side to, std::string_view in, char* out, std:
 
 /// Converts text that is well-formed in the source, which has no tables, as far as the target has its characters.
 Progress convertWellFormed(Form from, Side to, std::string_view in, char* out, std::size_t room) {
+    if (from == to.form) {
+        std::memcpy(out, in.data(), in.size());
+        return {in.size(), in.size()};
+    }
     using Convert = std::size_t (*)(const char*, std::size_t, char*, std::size_t);
     Convert convert = nullptr;
     if (from == Form::utf8) {

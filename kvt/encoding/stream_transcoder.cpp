@@ -71,7 +71,8 @@ class StreamTranscoder::Impl final : private detail::icu::LossListener {
 public:
     Impl(Encoding from, Encoding to)
         : from_(open(from)), to_(open(to)), fromSide_(detail::sideOf(from)), toSide_(detail::sideOf(to)),
-          hasShortcut_(fromSide_.form != Form::other && toSide_.form != Form::other && from != to),
+          hasShortcut_(fromSide_.form != Form::other && toSide_.form != Form::other &&
+                       (from != to || detail::unicodeForm(from) != Form::other)),
           fromNature_(from_.nature()), isStateless_(fromNature_.isStateless && to_.nature().isStateless),
           countsHeldBytes_(from_.countsHeldBytes() && !fromNature_.isBehind),
           canTakeCharacters_(hasShortcut_ && isStateless_ && countsHeldBytes_),

@@ -31,7 +31,7 @@ struct Side {
 Side sideOf(Encoding encoding);
 
 /// Converts the longest prefix of the bytes `in` that needs no ICU, appends it to `out`, and returns the bytes taken
-/// from `in`; 0 when there is no shorter way between the two sides. The two sides belong to different encodings.
+/// from `in`; 0 when there is no shorter way between the two sides. Two sides of one encoding have to be Unicode forms.
 /// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted. Where a table is not
 /// built, only ASCII is.
 template <typename CharOut>
