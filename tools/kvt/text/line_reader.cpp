@@ -51,6 +51,8 @@ bool LineReader::readBlock() {
     decodedBegin_ += taken_;
     searched_ -= taken_;
     taken_ = 0;
+    feed_.reset();
+    return_.reset();
     const std::string_view block = std::exchange(started_, true) ? input_.read() : first_;
     lastBlock_ = block.size();
     ended_ = block.empty();
@@ -118,10 +120,16 @@ Place TextLine::placeOf(std::size_t position) const {
     return reader->placeOf(*this, position);
 }
 
+// Each of the two is looked for behind the one before only, also where the text has none.
+std::size_t LineReader::nextOf(char byte, std::optional<std::size_t>& known) const {
+    if (!known || *known < searched_) {
+        known = std::min(decoded_.find(byte, searched_), decoded_.size());
+    }
+    return *known;
+}
+
 bool LineReader::next(TextLine& line) {
-    const auto isEnd = [](char byte) { return byte == '\n' || byte == '\r'; };
-    const auto from = decoded_.begin() + static_cast<std::ptrdiff_t>(searched_);
-    const auto end = static_cast<std::size_t>(std::find_if(from, decoded_.end(), isEnd) - decoded_.begin());
+    const std::size_t end = std::min(nextOf('\n', feed_), nextOf('\r', return_));
     const std::string_view all = decoded_;
     const bool openEnd = end == all.size() || (all[end] == '\r' && end + 1 == all.size());
     if (openEnd && !ended_) {

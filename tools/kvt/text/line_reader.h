@@ -76,6 +76,7 @@ public:
 private:
     [[noreturn]] void refuse(const kvt::ex::Loss& loss);
     void decode(std::string_view block);
+    std::size_t nextOf(char byte, std::optional<std::size_t>& known) const;
     void findMark();
     Place placeOf(const TextLine& line, std::size_t position);
     friend TextLine;
@@ -94,6 +95,9 @@ private:
     std::uint64_t decodedBegin_ = 0; ///< what came before decoded_
     std::size_t taken_ = 0;          ///< up to here, decoded_ was given out
     std::size_t searched_ = 0;       ///< up to here, decoded_ holds no end of the line that begins at taken_
+    std::optional<std::size_t>
+        feed_; ///< in decoded_, the first LF behind what was searched, if that is known
+    std::optional<std::size_t> return_; ///< the same for CR
     std::uint64_t number_ = 0;
     std::size_t lastBlock_ = 0;
     bool markSought_ = false;
