@@ -55,12 +55,13 @@ miller() {
             $amount = sub(gsub($amount, "[.]", ""), ",", ".")'
 }
 
-# One round: seconds of the clock, and of processors, go to a file called by the name.
+# One round: seconds of the clock, and of processors, go to a file called by the name. What is written is thrown away, so
+# that the file system has no say.
 TIMEFORMAT='%R %U %S'
 take() {
     local name=$1
     shift
-    { time "$@" >out 2>/dev/null; } 2>>"times of $name"
+    { time "$@" >/dev/null 2>&1; } 2>>"times of $name"
 }
 
 row() {
