@@ -88,11 +88,12 @@ private:
     std::shared_ptr<void> descriptor_;
 };
 
-struct Held {
+struct Pair {
     const char* from;
     const char* to;
     Text text;
     double limit;
+    double limitBack; ///< 0 where the way back is not held
 };
 
 constexpr Text simplified{"Chinese",
@@ -102,27 +103,19 @@ constexpr Text traditional{"Chinese",
 constexpr Text korean{"Korean", "동해물과 백두산이 마르고 닳도록 하느님이 보우하사 우리나라 만세. "
                                 "무궁화 삼천리 화려 강산 대한 사람 대한으로 길이 보전하세."};
 
-// In the order of what is promised: the pair, and what it has to reach for each text.
-constexpr Held held[] = {
-    {"UTF-8", "UTF-16LE", ascii, 16},      {"UTF-8", "UTF-16LE", latin, 7.5},
-    {"UTF-8", "UTF-16LE", japanese, 5.5},  {"UTF-16LE", "UTF-8", ascii, 10},
-    {"UTF-16LE", "UTF-8", latin, 3},       {"UTF-16LE", "UTF-8", japanese, 3},
-    {"UTF-8", "UTF-32LE", ascii, 12},      {"UTF-8", "UTF-32LE", latin, 6.3},
-    {"UTF-8", "UTF-32LE", japanese, 8.4},  {"windows-1252", "UTF-8", ascii, 11},
-    {"windows-1252", "UTF-8", latin, 3.4}, {"UTF-8", "windows-1252", ascii, 14},
-    {"UTF-8", "windows-1252", latin, 2.2}, {"Shift_JIS", "UTF-8", japanese, 3.2},
-    {"UTF-8", "Shift_JIS", japanese, 1.7}, {"EUC-JP", "UTF-8", japanese, 3.2},
-    {"UTF-8", "EUC-JP", japanese, 1.7},    {"GBK", "UTF-8", simplified, 3.2},
-    {"UTF-8", "GBK", simplified, 1.7},     {"GB18030", "UTF-8", simplified, 3.2},
-    {"UTF-8", "GB18030", simplified, 1.7}, {"Big5", "UTF-8", traditional, 3.2},
-    {"UTF-8", "Big5", traditional, 1.7},   {"EUC-KR", "UTF-8", korean, 3.2},
-    {"UTF-8", "EUC-KR", korean, 1.7},
+// The pair, and what it has to reach for a text, there and back.
+constexpr Pair pairs[] = {
+    {"UTF-8", "UTF-16LE", ascii, 16, 10},       {"UTF-8", "UTF-16LE", latin, 7.5, 3},
+    {"UTF-8", "UTF-16LE", japanese, 5.5, 3},    {"UTF-8", "UTF-32LE", ascii, 12, 0},
+    {"UTF-8", "UTF-32LE", latin, 6.3, 0},       {"UTF-8", "UTF-32LE", japanese, 8.4, 0},
+    {"windows-1252", "UTF-8", ascii, 11, 14},   {"windows-1252", "UTF-8", latin, 3.4, 2.2},
+    {"Shift_JIS", "UTF-8", japanese, 3.2, 1.7}, {"EUC-JP", "UTF-8", japanese, 3.2, 1.7},
+    {"GBK", "UTF-8", simplified, 3.2, 1.7},     {"GB18030", "UTF-8", simplified, 3.2, 1.7},
+    {"Big5", "UTF-8", traditional, 3.2, 1.7},   {"EUC-KR", "UTF-8", korean, 3.2, 1.7},
 };
 
 /// The library's own call for a pair of Unicode forms, with the string types, and for the others by an encoding.
-kvt::bench::Way libraryWay(const Held& row, const std::string& text) {
-    const std::string from = row.from;
-    const std::string to = row.to;
+kvt::bench::Way libraryWay(const std::string& from, const std::string& to, const std::string& text) {
     if (from == "UTF-8" && to == "UTF-16LE") {
         return way([source = UString<0>(text.data(), text.size())] { return UString<2>(source); });
     }
@@ -143,24 +136,67 @@ kvt::bench::Way libraryWay(const Held& row, const std::string& text) {
     });
 }
 
+void holdConversion(Limits& limits, const char* fromName, const char* toName, const Text& sample,
+                    std::size_t bytes, const std::string& size, kvt::bench::Bound besideIconv, double limit) {
+    const Converter utf8("UTF-8");
+    const Converter from(fromName);
+    const Converter to(toName);
+    // A long text first, which has the library build what tables there are for the pair.
+    libraryWay(fromName, toName, convertPlainly(from, utf8, shuffled(sample.sentence, textBytes)))(1);
+    const std::string text = convertPlainly(from, utf8, shuffled(sample.sentence, bytes));
+    const std::string name = std::string(fromName) + " to " + toName + ", " + sample.name + ", " + size;
+    limits.add(name, libraryWay(fromName, toName, text));
+    limits.add(name + ": plain", way([to, from, text] { return convertPlainly(to, from, text); }));
+    limits.add(name + ": iconv",
+               way([iconv = Iconv(toName, fromName), text] { return iconv.convert(text); }));
+    limits.add(name + ": copy", way([text] { return std::string(text); }));
+    limits.hold({name, name + ": plain", Bound::atLeast, limit});
+    limits.hold({name, name + ": iconv", besideIconv, 1});
+    limits.hold({name, name + ": copy"});
+}
+
 /// What a text of `bytes` has to reach: the limit of its row, or one for all rows.
 void holdConversions(Limits& limits, std::size_t bytes, const std::string& size, double limitForAll) {
-    for (const Held& row : held) {
-        const Converter utf8("UTF-8");
-        const Converter from(row.from);
-        const Converter to(row.to);
-        // A long text first, which has the library build what tables there are for the pair.
-        libraryWay(row, convertPlainly(from, utf8, shuffled(row.text.sentence, textBytes)))(1);
-        const std::string text = convertPlainly(from, utf8, shuffled(row.text.sentence, bytes));
-        const std::string name = std::string(row.from) + " to " + row.to + ", " + row.text.name + ", " + size;
-        limits.add(name, libraryWay(row, text));
-        limits.add(name + ": plain", way([to, from, text] { return convertPlainly(to, from, text); }));
-        limits.add(name + ": iconv",
-                   way([iconv = Iconv(row.to, row.from), text] { return iconv.convert(text); }));
-        limits.add(name + ": copy", way([text] { return std::string(text); }));
-        limits.hold({name, name + ": plain", Bound::atLeast, limitForAll != 0 ? limitForAll : row.limit});
-        limits.hold({name, name + ": iconv", limitForAll != 0 ? Bound::shown : Bound::atLeast, 1});
-        limits.hold({name, name + ": copy"});
+    const Bound besideIconv = limitForAll != 0 ? Bound::shown : Bound::atLeast;
+    for (const Pair& pair : pairs) {
+        const double limit = limitForAll != 0 ? limitForAll : pair.limit;
+        const double limitBack = limitForAll != 0 ? limitForAll : pair.limitBack;
+        holdConversion(limits, pair.from, pair.to, pair.text, bytes, size, besideIconv, limit);
+        if (pair.limitBack != 0) {
+            holdConversion(limits, pair.to, pair.from, pair.text, bytes, size, besideIconv, limitBack);
+        }
+    }
+}
+
+std::size_t lossesOfStream(Encoding to, const std::string& text) {
+    std::string out;
+    std::size_t losses = 0;
+    const auto onLoss = [&](const Loss&) { ++losses; };
+    StreamTranscoder stream(Encoding::Utf8, to);
+    stream.convert(text, out, onLoss);
+    stream.finish(out, onLoss);
+    return losses;
+}
+
+/// Bad input, told by the stream with its place.
+void holdBadInput(Limits& limits) {
+    const std::pair<const char*, const char*> rows[] = {
+        {"one byte in twenty", "abcdefghijklmnopqrs\xFF"},
+        {"letters of windows-1252", "Gr\xF6\xDF"
+                                    "e f\xFChren \xFC"
+                                    "ber l\xE9"},
+    };
+    for (const auto& [what, piece] : rows) {
+        std::string text;
+        while (text.size() < textBytes / 4) {
+            text += piece;
+        }
+        const std::string name = std::string("UTF-8 to UTF-16LE, bad input, ") + what;
+        limits.add(name, way([text] { return lossesOfStream(Encoding::Utf16LE, text); }));
+        limits.add(name + ": plain", way([to = Converter("UTF-16LE"), from = Converter("UTF-8"), text] {
+                       return convertPlainly(to, from, text);
+                   }));
+        limits.hold({name, name + ": plain", Bound::atMost, 2});
     }
 }
 
@@ -192,15 +228,7 @@ void holdLosses(Limits& limits) {
                        }
                        return out.size();
                    }));
-        limits.add(name + "stream", way([to, text] {
-                       std::string out;
-                       std::size_t losses = 0;
-                       const auto onLoss = [&](const Loss&) { ++losses; };
-                       StreamTranscoder stream(Encoding::Utf8, to);
-                       stream.convert(text, out, onLoss);
-                       stream.finish(out, onLoss);
-                       return losses;
-                   }));
+        limits.add(name + "stream", way([to, text] { return lossesOfStream(to, text); }));
         limits.add(name + "plain", way([to = Converter(row.to), from = Converter("UTF-8"), text] {
                        return convertPlainly(to, from, text);
                    }));
@@ -265,6 +293,7 @@ int main(int argc, char** argv) {
     Limits large(31, 1);
     holdConversions(large, textBytes, "1 MiB", 0);
     holdLosses(large);
+    holdBadInput(large);
     holdWwjd(large);
     Limits small(101, 2000);
     holdConversions(small, 64, "64 bytes", 4);

@@ -240,9 +240,10 @@ void EncodingTable::add(char16_t unit, std::string_view bytes) {
         return;
     }
     const std::size_t first = static_cast<unsigned char>(bytes[0]);
-    const std::size_t code = bytes.size() == 1 ? first : first << 8 | static_cast<unsigned char>(bytes[1]);
+    const std::size_t second = bytes.size() == 1 ? 0 : static_cast<unsigned char>(bytes[1]);
+    const std::size_t code = first | second << 8;
     // The number would say something else.
-    if (bytes.size() == 2 && (first == 0 || code == noCode)) {
+    if (bytes.size() == 2 && (second == 0 || code == noCode)) {
         return;
     }
     std::uint16_t& page = pageOf_[unit / pageSize];
@@ -279,12 +280,21 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
     };
     const bool isWorthACall = keepsAscii_ && count > vectors::shortText;
     std::size_t i = isWorthACall ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
-    for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
-        for (std::size_t place = i; place < i + block; ++place) {
+    const auto putAll = [=](std::size_t begin, std::size_t length) {
+        bool areKnown = true;
+        for (std::size_t place = begin; place < begin + length; ++place) {
             areKnown = put(place) != noCode && areKnown;
         }
+        return areKnown;
+    };
+    // Whether all are known is asked once for each block, and for the rest.
+    while (i + block <= count && putAll(i, block)) {
+        i += block;
     }
-    while (i < count && put(i) != noCode) {
+    if (count - i < block && putAll(i, count - i)) {
+        return {count, count};
+    }
+    while (put(i) != noCode) {
         ++i;
     }
     return {i, i};
@@ -312,20 +322,19 @@ EncodingTable::Written EncodingTable::writePairs(const char16_t* units, std::siz
             if (code == noCode) {
                 return {i, static_cast<std::size_t>(q - out)};
             }
-            const unsigned isPair = code > 0xFF ? 1 : 0;
-            q[0] = static_cast<char>(code >> 8 * isPair);
-            q[1] = static_cast<char>(code);
-            q += 1 + isPair;
+            q[0] = static_cast<char>(code);
+            q[1] = static_cast<char>(code >> 8);
+            q += code > 0xFF ? 2 : 1;
         }
         if (i + 1 == count) {
             const unsigned code = codeOf(units[i]);
             if (code == noCode) {
                 break;
             }
+            *q++ = static_cast<char>(code);
             if (code > 0xFF) {
                 *q++ = static_cast<char>(code >> 8);
             }
-            *q++ = static_cast<char>(code);
             ++i;
         }
     }

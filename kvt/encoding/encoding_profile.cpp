@@ -10,6 +10,8 @@ namespace {
 // table. So much has to come together first, in one text or in many: then a table never costs more than double. A table
 // of single bytes costs no more than some short texts.
 constexpr std::size_t repaidBy = std::size_t{512} << 10;
+// What a text costs ICU before its first byte, in bytes of text, so that short texts come to have tables, too.
+constexpr std::size_t perText = 64;
 
 bool hasSingleBytes(Form form) {
     return form == Form::singleByte || form == Form::asciiSingleByte;
@@ -40,7 +42,8 @@ bool EncodingProfile::build(Lazy<Table>& lazy, std::size_t bytes) {
     if (lazy.table.load(std::memory_order_acquire) != nullptr) {
         return true;
     }
-    const std::size_t missed = lazy.missed.fetch_add(bytes, std::memory_order_relaxed) + bytes;
+    const std::size_t cost = bytes + perText;
+    const std::size_t missed = lazy.missed.fetch_add(cost, std::memory_order_relaxed) + cost;
     if (missed < repaidBy && !hasSingleBytes(form())) {
         return false;
     }

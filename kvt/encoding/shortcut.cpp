@@ -163,8 +163,8 @@ std::size_t decode(Form from, std::string_view& in, Pivot& pivot) {
 using Written = EncodingTable::Written;
 
 /// Writes well-formed UTF-16, as far as the target has its characters. `out` has room for all of it.
-Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::size_t room) {
-    const auto* const in = reinterpret_cast<const char*>(pivot.data());
+Written encode(Side to, const char16_t* text, std::size_t units, char* out, std::size_t room) {
+    const auto* const in = reinterpret_cast<const char*>(text);
     switch (to.form) {
     case Form::asciiCompatible: {
         const std::size_t ascii = vectors::narrowAscii(in, units, out);
@@ -174,7 +174,7 @@ Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::s
     case Form::asciiSeveralBytes:
     case Form::singleByte:
     case Form::severalBytes:
-        return to.profile->encoding()->write(pivot.data(), units, out, room);
+        return to.profile->encoding()->write(text, units, out, room);
     case Form::utf8:
         return {units, vectors::utf16ToUtf8(in, units, out, room)};
     case nativeUtf16:
@@ -195,27 +195,37 @@ Written encode(Side to, const Pivot& pivot, std::size_t units, char* out, std::s
     }
 }
 
-/// The bytes of `in`, of a form without tables, that the first `units` units of UTF-16 come from.
-std::size_t sourceOf(Form form, std::string_view in, std::size_t units) {
-    if (form != Form::utf8 && !isUtf32(form)) {
-        return units * unitBytes(form);
+/// The bytes of `in` that well-formed units of UTF-16 were read from.
+std::size_t sourceOf(Side from, std::string_view in, const char16_t* units, std::size_t count) {
+    if (hasTables(from.form)) {
+        return from.profile->decoding()->bytesOf(in, count);
     }
-    std::size_t bytes = 0;
-    while (units > 0) {
-        std::size_t length = 4;
-        bool isPair = false;
-        if (form == Form::utf8) {
-            const auto lead = static_cast<unsigned char>(in[bytes]);
-            length = lead < 0x80 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : 4;
-            isPair = length == 4;
-        } else {
-            // The third lowest byte of the number says whether it is beyond U+FFFF.
-            isPair = in[bytes + (form == Form::utf32le ? 2 : 1)] != 0;
-        }
-        bytes += length;
-        units -= isPair ? 2 : 1;
+    if (from.form != Form::utf8 && !isUtf32(from.form)) {
+        return count * unitBytes(from.form);
     }
-    return bytes;
+    std::size_t beyondAscii = 0; // units from U+0080 and from U+0800
+    std::size_t surrogates = 0;
+    for (std::size_t i = 0; i < count; ++i) {
+        beyondAscii += (units[i] >= 0x80 ? 1U : 0U) + (units[i] >= 0x800 ? 1U : 0U);
+        surrogates += isSurrogate(units[i]) ? 1 : 0;
+    }
+    return from.form == Form::utf8 ? count + beyondAscii - surrogates : 4 * (count - surrogates / 2);
+}
+
+/// Reads what is well-formed at the beginning of a text, as much as the pivot may hold, and says whether the next piece
+/// would be nothing.
+std::size_t decodePiece(Side from, std::string_view in, Pivot& pivot, bool& ended) {
+    if (hasTables(from.form)) {
+        const std::size_t units = from.profile->decoding()->read(in, pivot.data(), pivotUnits);
+        ended = units < pivotUnits;
+        return units;
+    }
+    const std::string_view piece = in.substr(0, pivotUnits);
+    const std::size_t wellFormed = measure(from.form, piece).taken * unitBytes(from.form);
+    // A piece may have been cut in the middle of a character.
+    ended = wellFormed + longestUtf8 <= piece.size() || wellFormed == 0;
+    std::string_view text = piece.substr(0, wellFormed);
+    return text.empty() ? 0 : decode(from.form, text, pivot);
 }
 
 /// How far a conversion came, in bytes.
@@ -230,10 +240,11 @@ Progress convertByPivot(Form from, Side to, std::string_view in, char* out, std:
     for (std::string_view rest = in; !rest.empty();) {
         const std::string_view before = rest;
         const std::size_t units = decode(from, rest, pivot);
-        const Written written = encode(to, pivot, units, out + progress.written, room - progress.written);
+        const Written written =
+            encode(to, pivot.data(), units, out + progress.written, room - progress.written);
         progress.written += written.bytes;
         if (written.units < units) {
-            progress.taken += sourceOf(from, before, written.units);
+            progress.taken += sourceOf({from}, before, pivot.data(), written.units);
             break;
         }
         progress.taken += before.size() - rest.size();
@@ -326,7 +337,7 @@ std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view
         const std::size_t room = roomFor(extent, to);
         Written written{0, 0};
         appendInPlace(out, room / sizeof(CharOut), [&](CharOut* place) {
-            written = encode(to, pivot, units, reinterpret_cast<char*>(place), room);
+            written = encode(to, pivot.data(), units, reinterpret_cast<char*>(place), room);
             return written.bytes / sizeof(CharOut);
         });
         if (written.units < units) {
@@ -399,6 +410,70 @@ Side sideOf(Encoding encoding) {
     }
     EncodingProfile& profile = profileOf(encoding);
     return {profile.form(), &profile};
+}
+
+std::size_t convertLossy(Side from, Side to, std::string_view in, std::string& out,
+                         const LoseCharacter& lose) {
+    const EncodingTable* const table = hasTables(to.form) ? to.profile->encoding() : nullptr;
+    const auto isLost = [table](char16_t unit) {
+        return table != nullptr ? !table->has(unit) : unit >= 0x80;
+    };
+    std::size_t taken = 0;
+    Pivot pivot;
+    for (bool ended = false; !ended && taken < in.size();) {
+        const std::size_t units = decodePiece(from, in.substr(taken), pivot, ended);
+        for (std::size_t done = 0; done < units;) {
+            const char16_t* const next = pivot.data() + done;
+            if (isLost(*next)) {
+                const std::size_t lost = isHighSurrogate(*next) ? 2 : 1;
+                const std::size_t length = sourceOf(from, in.substr(taken), next, lost);
+                const std::string* const instead = lose(in.substr(taken, length), taken);
+                if (instead == nullptr) {
+                    return taken;
+                }
+                out += *instead;
+                done += lost;
+                taken += length;
+                continue;
+            }
+            const std::size_t left = units - done;
+            const std::size_t room = roomFor({left, 3 * left, left, left}, to);
+            Written written{0, 0};
+            appendInPlace(out, room, [&](char* place) {
+                written = encode(to, next, left, place, room);
+                return written.bytes;
+            });
+            taken += sourceOf(from, in.substr(taken), next, written.units);
+            done += written.units;
+        }
+    }
+    return taken;
+}
+
+// A lead byte and those behind it that could go on with the same character, as far as they do: the "maximal subpart" of
+// the Unicode Standard.
+std::size_t malformedLength(Side from, std::string_view in) {
+    if (from.form != Form::utf8 || in.empty()) {
+        return 0;
+    }
+    const auto lead = static_cast<unsigned char>(in[0]);
+    if (lead < 0x80 || lead > 0xF4 || lead < 0xC2) {
+        return lead < 0x80 ? 0 : 1;
+    }
+    const std::size_t whole = utf8Length(in[0]);
+    for (std::size_t length = 1; length < whole; ++length) {
+        if (length == in.size()) {
+            return 0;
+        }
+        const auto byte = static_cast<unsigned char>(in[length]);
+        const bool isSecond = length == 1;
+        const unsigned least = isSecond && lead == 0xE0 ? 0xA0 : isSecond && lead == 0xF0 ? 0x90 : 0x80;
+        const unsigned most = isSecond && lead == 0xED ? 0x9F : isSecond && lead == 0xF4 ? 0x8F : 0xBF;
+        if (byte < least || byte > most) {
+            return length;
+        }
+    }
+    return 0;
 }
 
 std::size_t characterLength(Side from, std::string_view in) {

@@ -18,6 +18,8 @@
 
 #include <hwy/highway.h>
 
+#include <algorithm>
+
 HWY_BEFORE_NAMESPACE();
 namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
 
@@ -36,8 +38,8 @@ public:
 
 private:
     static constexpr std::size_t before = 16;
-    // As much again behind the text as a register may read.
-    alignas(64) std::uint8_t bytes_[before + 2 * shortText + 16];
+    // Behind the text, what a register may read.
+    alignas(64) std::uint8_t bytes_[before + shortText + 64 + 16];
 };
 
 /// The next eight units, or as many as there are and zeros behind them.
@@ -58,7 +60,9 @@ HWY_INLINE hn::Vec<Eight16> loadUpToEight(const std::uint16_t* p, const std::uin
 #endif
 
 #if KVT_HAS_VECTORS && HWY_TARGET <= HWY_AVX3
-/// A short text in one register, of which only the bytes are read that there are: to read what was just written in
+constexpr std::size_t registerBytes = 64;
+
+/// A text in one register, of which only the bytes are read that there are: to read what was just written in
 /// other portions would wait for it.
 class InRegister {
 public:
@@ -98,10 +102,9 @@ HWY_INLINE void putWhole(const InRegister& text, std::uint64_t mask, Unit*& q) {
     }
 }
 
-/// Returns `notWhole` too where the result would be UTF-32 beyond U+FFFF.
+/// A text of up to a register. Returns `notWhole` too where the result would be UTF-32 beyond U+FFFF.
 template <typename Unit>
 HWY_INLINE std::size_t fromOneRegister(const char* text, std::size_t bytes, Unit* begin) {
-    static_assert(HWY_MAX_BYTES >= shortText);
     const Bytes d;
     const hn::RebindToSigned<Bytes> isSigned;
     const InRegister whole(text, bytes);
@@ -109,7 +112,7 @@ HWY_INLINE std::size_t fromOneRegister(const char* text, std::size_t bytes, Unit
     const auto errors = Utf8Check::errors(d, v, whole.before(1), whole.before(2), whole.before(3));
     // Where zeros follow, an open character is one of the errors.
     const auto last = [=](std::size_t i) { return static_cast<std::uint8_t>(text[bytes - i]); };
-    const bool isOpen = bytes == shortText && (last(1) >= 0xC0 || last(2) >= 0xE0 || last(3) >= 0xF0);
+    const bool isOpen = bytes == registerBytes && (last(1) >= 0xC0 || last(2) >= 0xE0 || last(3) >= 0xF0);
     if (isOpen || !hn::AllTrue(d, hn::Eq(errors, hn::Zero(d)))) {
         return notWhole;
     }
@@ -130,16 +133,37 @@ HWY_INLINE std::size_t fromOneRegister(const char* text, std::size_t bytes, Unit
 }
 #endif
 
+#if KVT_HAS_VECTORS && HWY_TARGET <= HWY_AVX3
+template <typename Unit>
+HWY_INLINE std::size_t fromRegisters(const char* text, std::size_t bytes, Unit* begin) {
+    static_assert(HWY_MAX_BYTES == registerBytes);
+    Unit* q = begin;
+    while (bytes != 0) {
+        std::size_t length = std::min(bytes, registerBytes);
+        // Up to a character, if this is text.
+        for (int i = 0; i < 3 && length < bytes && isTrail(static_cast<std::uint8_t>(text[length])); ++i) {
+            --length;
+        }
+        const std::size_t written = fromOneRegister(text, length, q);
+        if (written == notWhole) {
+            return notWhole;
+        }
+        q += written;
+        text += length;
+        bytes -= length;
+    }
+    return static_cast<std::size_t>(q - begin);
+}
+#endif
+
 template <typename Unit>
 HWY_INLINE std::size_t fromShortUtf8(const char* text, std::size_t bytes, char* out) {
     auto* const begin = reinterpret_cast<Unit*>(out);
     Unit* q = begin;
 #if KVT_HAS_VECTORS && HWY_TARGET <= HWY_AVX3
-    if (bytes != 0) {
-        const std::size_t written = fromOneRegister(text, bytes, begin);
-        if (written != notWhole || sizeof(Unit) == 2) {
-            return written;
-        }
+    const std::size_t written = fromRegisters(text, bytes, begin);
+    if (written != notWhole || sizeof(Unit) == 2) {
+        return written;
     }
 #endif
 #if KVT_HAS_VECTORS

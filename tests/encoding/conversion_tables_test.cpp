@@ -409,6 +409,18 @@ TEST(ConversionTable, OfSeveralBytesIsBuiltWhenEnoughTextWouldHaveUsedIt) {
     EXPECT_EQ(wayOf(utf8, side, "a\xE3\x81\x82"), text);
 }
 
+// Again one that nothing else in this program converts.
+TEST(ConversionTable, OfSeveralBytesIsBuiltForManyShortTextsToo) {
+    const Side side = sideOf(Encoding("ibm-33722_P120-1999"));
+    ASSERT_EQ(side.form, Form::asciiSeveralBytes);
+    std::size_t texts = 1;
+    while (!canGoOn(side, utf8, 2)) {
+        ++texts;
+        ASSERT_LT(texts, 20000U);
+    }
+    EXPECT_GT(texts, 1000U);
+}
+
 TEST(ConversionTable, OfAnEncodingThatNobodyHasIsNone) {
     for (const auto id : {static_cast<Encoding::Type>(0x7FFFFFFF), Encoding::Unknown, Encoding::Binary}) {
         EXPECT_EQ(sideOf(id).form, Form::other);

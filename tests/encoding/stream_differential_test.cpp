@@ -140,6 +140,28 @@ TEST(StreamDifferential, CodePagesOfTwoBytesByTheirTables) {
     }
 }
 
+// Bad input of UTF-8 is told from text, and measured, without ICU.
+TEST(StreamDifferential, EachBadSequenceOfUtf8) {
+    // The border of each kind of byte, so of each range that a byte behind another one may be in.
+    const std::string_view bytes(
+        "\x41\x80\x8F\x90\x9F\xA0\xBF\xC1\xC2\xDF\xE0\xE1\xED\xEF\xF0\xF1\xF4\xF5\xFF");
+    for (const std::string to : {"UTF-16LE", "windows-1252", "US-ASCII"}) {
+        std::string text;
+        for (const char first : bytes) {
+            for (const char second : bytes) {
+                for (const char third : bytes) {
+                    text += {first, second, third, '\x80', 'a', first, second, third};
+                    text += "z";
+                }
+            }
+        }
+        EXPECT_EQ(differenceInStream("UTF-8", to, text, {7, 64, 1000}), "") << to;
+        for (std::size_t length = 1; length <= 4; ++length) {
+            EXPECT_EQ(differenceInStream("UTF-8", to, "a" + text.substr(0, length), {1, 2}), "") << to;
+        }
+    }
+}
+
 // Found by a fuzzer, each with a fault of its own.
 TEST(StreamDifferential, TextsThatWentWrong) {
     struct Row {

@@ -57,6 +57,9 @@ public:
     /// The bytes that suffice for a text.
     std::size_t roomFor(const vectors::Extent& text) const;
 
+    /// Whether a unit alone is a character that the table knows.
+    bool has(char16_t unit) const { return codeOf(unit) != noCode; }
+
     struct Written {
         std::size_t units; ///< taken
         std::size_t bytes;
@@ -75,7 +78,7 @@ private:
 
     // For a unit without its last six bits the place where its page begins. The first page is empty.
     std::array<std::uint16_t, 0x10000 / pageSize> pageOf_{};
-    std::vector<std::uint16_t> pages_; // one byte as its number, two with the first one above
+    std::vector<std::uint16_t> pages_; // one byte as its number, two with the second one above
     std::size_t longest_ = 1;          // bytes of a character
     bool isWithinUtf8_ = true;         // no character is longer than in UTF-8
     bool keepsAscii_ = true;

@@ -14,6 +14,7 @@
 #include <kvt/encoding/encoding.h>
 
 #include <cstddef>
+#include <functional>
 #include <string>
 #include <string_view>
 
@@ -36,6 +37,19 @@ Side sideOf(Encoding encoding);
 /// built, only ASCII is.
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
+
+/// Is given a character that the target may lack and the bytes of the text before it, and returns what stands in its
+/// place; null where only ICU knows.
+using LoseCharacter = std::function<const std::string*(std::string_view character, std::size_t offset)>;
+
+/// As convertPrefix(), to a target that is none of the Unicode forms, and going on behind characters that `lose` knows.
+/// All tables of the two sides are there.
+std::size_t convertLossy(Side from, Side to, std::string_view in, std::string& out,
+                         const LoseCharacter& lose);
+
+/// The bytes in front of `in` that ICU takes for one piece of bad input, where that is known without it: at the beginning
+/// of what is no character, whatever follows. 0 where it is not.
+std::size_t malformedLength(Side from, std::string_view in);
 
 /// The bytes of the first character of `in`, if it is known without ICU to be well-formed and complete; else 0.
 std::size_t characterLength(Side from, std::string_view in);

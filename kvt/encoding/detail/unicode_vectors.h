@@ -35,7 +35,7 @@ std::size_t utf32ToUtf8(const char* text, std::size_t units, char* out, std::siz
 std::size_t utf32ToUtf16(const char* text, std::size_t units, char* out, std::size_t room);
 
 /// The longest text for the functions below, in units, and the units of room that each of them needs for its result.
-constexpr std::size_t shortText = 64;
+constexpr std::size_t shortText = 128;
 constexpr std::size_t shortRoom = 4 * shortText;
 /// What they return where nothing was converted.
 constexpr std::size_t notWhole = static_cast<std::size_t>(-1);

@@ -64,6 +64,9 @@ Conversion::Conversion(const ConvertOptions& options, const TextEncoding& from, 
     : options_(options), named_(from), from_(from.encoding), to_(to), fromName_(from_.getName()),
       toName_(to.getName()), diagnostics_(diagnostics), transcoder_(from_, to),
       onLoss_([this](const Loss& reported) {
+          if (!needsPlaces() && ledger_.addAgain(reported)) {
+              return;
+          }
           Loss loss = reported;
           loss.offset += source_->skipped();
           takeLoss(
@@ -224,13 +227,12 @@ void Conversion::takeLoss(const Loss& loss, const std::function<Place()>& placeO
         throw Stopped{loss, placeOfIt(), std::nullopt};
     }
     std::optional<Place> place;
-    const bool isReported = options_.onError == OnError::Report;
-    if (isReported || report_) {
+    if (needsPlaces()) {
         place = placeOfIt();
     }
     if (report_) {
         reportLines_ += lossAsJson(loss, *place, fromName_, toName_, written);
-    } else if (isReported) {
+    } else if (needsPlaces()) {
         diagnostics_.say(describeLoss(loss, *place, fromName_, toName_));
     }
     ledger_.add(

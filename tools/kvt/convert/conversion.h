@@ -49,6 +49,8 @@ private:
     void takeLoss(const kvt::ex::Loss& loss, const std::function<Place()>& place,
                   const std::optional<std::u32string>& written);
     Place placeOf(const kvt::ex::Loss& loss);
+    /// Whether each loss is reported, and not only the first of its kind listed.
+    bool needsPlaces() const { return options_.onError == OnError::Report || report_ != nullptr; }
     void explainStop(const Stopped& stopped);
     void printFallbackLines() const;
     std::u32string withChanges(const std::u32string& line) const;

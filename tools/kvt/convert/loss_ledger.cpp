@@ -8,18 +8,51 @@
 
 namespace host {
 
+// 0 for bad bytes that are too many.
+std::uint64_t LossLedger::numberOf(const kvt::ex::Loss& loss) {
+    constexpr std::size_t mostBytes = 6;
+    if (loss.kind == kvt::ex::Loss::NotRepresentable) {
+        return std::uint64_t{1} << 56 | loss.codePoint;
+    }
+    if (loss.bytes.size() > mostBytes) {
+        return 0;
+    }
+    std::uint64_t number = 2 + loss.bytes.size();
+    for (const char byte : loss.bytes) {
+        number = number << 8 | static_cast<unsigned char>(byte);
+    }
+    return number << 8;
+}
+
+bool LossLedger::addAgain(const kvt::ex::Loss& loss) {
+    const std::uint64_t number = numberOf(loss);
+    const Known& known = knownOf(number);
+    if (number == 0 || known.number != number) {
+        return false;
+    }
+    ++total_;
+    ++known.entry->count;
+    return true;
+}
+
 void LossLedger::add(const kvt::ex::Loss& loss, const std::function<Place()>& place,
                      const std::optional<std::u32string>& written) {
+    if (addAgain(loss)) {
+        return;
+    }
     ++total_;
     Key key(loss.codePoint, loss.kind == kvt::ex::Loss::BadInput ? loss.bytes : std::string());
-    const auto found = entries_.find(key);
-    if (found != entries_.end()) {
-        ++found->second.count;
-    } else if (entries_.size() < mostEntries) {
-        entries_.emplace(std::move(key), Entry{loss, place(), 1, entries_.size(), written});
-    } else {
-        ++unlisted_;
+    auto found = entries_.find(key);
+    if (found == entries_.end()) {
+        if (entries_.size() == mostEntries) {
+            ++unlisted_;
+            return;
+        }
+        found = entries_.emplace(std::move(key), Entry{loss, place(), 0, entries_.size(), written}).first;
     }
+    ++found->second.count;
+    const std::uint64_t number = numberOf(loss);
+    knownOf(number) = {number, &found->second};
 }
 
 void LossLedger::addFallbackLines(std::uint64_t count, const Place& first) {
