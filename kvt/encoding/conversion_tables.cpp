@@ -280,21 +280,12 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
     };
     const bool isWorthACall = keepsAscii_ && count > vectors::shortText;
     std::size_t i = isWorthACall ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
-    const auto putAll = [=](std::size_t begin, std::size_t length) {
-        bool areKnown = true;
-        for (std::size_t place = begin; place < begin + length; ++place) {
+    for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
+        for (std::size_t place = i; place < i + block; ++place) {
             areKnown = put(place) != noCode && areKnown;
         }
-        return areKnown;
-    };
-    // Whether all are known is asked once for each block, and for the rest.
-    while (i + block <= count && putAll(i, block)) {
-        i += block;
     }
-    if (count - i < block && putAll(i, count - i)) {
-        return {count, count};
-    }
-    while (put(i) != noCode) {
+    while (i < count && put(i) != noCode) {
         ++i;
     }
     return {i, i};
@@ -322,9 +313,10 @@ EncodingTable::Written EncodingTable::writePairs(const char16_t* units, std::siz
             if (code == noCode) {
                 return {i, static_cast<std::size_t>(q - out)};
             }
+            const unsigned isPair = (0xFF - code) >> 31;
             q[0] = static_cast<char>(code);
             q[1] = static_cast<char>(code >> 8);
-            q += code > 0xFF ? 2 : 1;
+            q += 1 + isPair;
         }
         if (i + 1 == count) {
             const unsigned code = codeOf(units[i]);

@@ -140,6 +140,7 @@ bool convertBuffered(Side from, Side to, std::string_view in, std::basic_string<
 template <typename CharOut>
 bool convertShort(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
     return in.size() <= vectors::shortText * unitBytes(from.form) &&
+           (sizeof(CharOut) == 1 || sizeof(CharOut) == unitBytes(to.form)) &&
            (convertAscii(from.form, to.form, in, out) || convertBuffered(from, to, in, out));
 }
 
