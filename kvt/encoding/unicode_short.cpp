@@ -39,7 +39,7 @@ public:
 private:
     static constexpr std::size_t before = 16;
     // Behind the text, what a register may read.
-    alignas(64) std::uint8_t bytes_[before + shortText + 64 + 16];
+    alignas(64) std::uint8_t bytes_[before + shortText + HWY_MAX_BYTES + 16];
 };
 
 /// The next eight units, or as many as there are and zeros behind them.
@@ -131,9 +131,7 @@ HWY_INLINE std::size_t fromOneRegister(const char* text, std::size_t bytes, Unit
     }
     return static_cast<std::size_t>(q - begin);
 }
-#endif
 
-#if KVT_HAS_VECTORS && HWY_TARGET <= HWY_AVX3
 template <typename Unit>
 HWY_INLINE std::size_t fromRegisters(const char* text, std::size_t bytes, Unit* begin) {
     static_assert(HWY_MAX_BYTES == registerBytes);
