@@ -155,26 +155,13 @@ ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant, ReturnSt
             instant.offsetMinutes ? offsetOfMinutes(*instant.offsetMinutes) : std::nullopt};
 }
 
-namespace {
-
-// A year of four digits, or whatever ran over at either end.
-void writeYear(TextBuffer& text, std::int64_t year) {
-    if (year < lowestYear || year > highestYear) {
-        return text.putSigned(year, 4);
-    }
-    const auto number = static_cast<unsigned>(year);
-    writePair(writePair(text.room(4), number / 100), number % 100);
-}
-
-} // namespace
-
 void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,
                     std::string_view offset) {
     if (kind == TemporalType::Unsupported) {
         return;
     }
     if (!isTimeKind(kind)) {
-        writeYear(text, fields.year);
+        text.putSigned(fields.year, 4);
         writePair(writePair(text.room(4), static_cast<unsigned>(fields.month)),
                   static_cast<unsigned>(fields.day));
     }

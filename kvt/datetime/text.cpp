@@ -157,15 +157,6 @@ void TextBuffer::putDigits(std::uint64_t number, unsigned width) {
     }
 }
 
-void TextBuffer::putSigned(std::int64_t number, unsigned width) {
-    if (number < 0) {
-        put('-');
-        putNumber(0 - static_cast<std::uint64_t>(number), width - (width > 0 ? 1 : 0));
-    } else {
-        putNumber(static_cast<std::uint64_t>(number), width);
-    }
-}
-
 void TextBuffer::putFraction(std::uint64_t nanoseconds) {
     if (nanoseconds == 0) {
         return;

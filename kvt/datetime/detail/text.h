@@ -137,8 +137,8 @@ public:
         } else if (width <= 2 && number < 100) {
             putPair(static_cast<unsigned>(number));
         } else if (width == 4 && number < 10'000) { // a year
-            putPair(static_cast<unsigned>(number / 100));
-            putPair(static_cast<unsigned>(number % 100));
+            const auto year = static_cast<unsigned>(number);
+            writePair(writePair(room(4), year / 100), year % 100);
         } else {
             putDigits(number, width);
         }
@@ -146,7 +146,14 @@ public:
     /// Two digits; the number is below 100.
     void putPair(unsigned number) { writePair(room(2), number); }
     /// The same with "-" in front of a negative number, which counts as one of the `width`.
-    void putSigned(std::int64_t number, unsigned width = 1);
+    void putSigned(std::int64_t number, unsigned width = 1) {
+        if (number < 0) {
+            put('-');
+            putNumber(0 - static_cast<std::uint64_t>(number), width - (width > 0 ? 1 : 0));
+        } else {
+            putNumber(static_cast<std::uint64_t>(number), width);
+        }
+    }
     /// Place for so many chars, which are part of the text then and the caller's to write.
     char* room(std::size_t count) {
         if (count > capacity_ - size_) {
