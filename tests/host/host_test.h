@@ -68,6 +68,35 @@ protected:
         return runChild(made);
     }
 
+    /// What a command has written to the file "out" while its input, `piece` so far, has not ended.
+    std::string answerTo(std::vector<std::string> arguments, std::string_view piece) const {
+        ChildSetup made = setup(std::move(arguments));
+        made.outputFile = path("out");
+        bool isSent = false;
+        std::string answer;
+        made.makeInput = [&]() -> std::string_view {
+            if (!std::exchange(isSent, true)) {
+                return piece;
+            }
+            for (int tries = 0; tries < 500 && answer.empty(); ++tries) {
+                ::usleep(10000);
+                answer = read("out");
+            }
+            return {};
+        };
+        EXPECT_EQ(runChild(made).status, 0);
+        return answer;
+    }
+
+    /// The same setup for a test of how much memory is used: the address sanitizer would keep what was released.
+    static ChildSetup withoutQuarantine(ChildSetup made) {
+        const char* const options = std::getenv("ASAN_OPTIONS");
+        made.environment.emplace_back("ASAN_OPTIONS",
+                                      (options == nullptr ? "" : options + std::string(":")) +
+                                          "quarantine_size_mb=0:thread_local_quarantine_size_kb=0");
+        return made;
+    }
+
     /// `kvt convert --from FROM --to TO`, and more.
     ChildResult convert(const std::string& from, const std::string& to, const std::string& input,
                         std::vector<std::string> more = {}) const {

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <algorithm>
+#include <cctype>
 #include <cstddef>
 #include <map>
 #include <random>
@@ -96,6 +97,14 @@ inline std::string randomLines(const LineShape& shape, std::size_t size, unsigne
     }
     text.pop_back();
     return text;
+}
+
+/// With small letters for all of ASCII.
+inline std::string foldedAscii(std::string line) {
+    for (char& c : line) {
+        c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    }
+    return line;
 }
 
 } // namespace kvt::test

@@ -335,22 +335,7 @@ TEST_F(KvtText, TextMayComeByteByByte) {
 }
 
 TEST_F(KvtText, CompleteLinesAreWrittenWithoutWaitingForMore) {
-    ChildSetup made = setup({"text", "upper"});
-    made.outputFile = path("out");
-    int sent = 0;
-    std::string answer;
-    made.makeInput = [&]() -> std::string_view {
-        if (sent++ == 0) {
-            return "a\nb";
-        }
-        for (int tries = 0; tries < 500 && answer.empty(); ++tries) {
-            ::usleep(10000);
-            answer = read("out");
-        }
-        return {};
-    };
-    EXPECT_EQ(runChild(made).status, 0);
-    EXPECT_EQ(answer, "A\n");
+    EXPECT_EQ(answerTo({"text", "upper"}, "a\nb"), "A\n");
     EXPECT_EQ(read("out"), "A\nB");
 }
 
