@@ -70,6 +70,19 @@ TEST_F(InferCommand, SaysWhatIsWrongWithRows) {
     EXPECT_NE(result.out.find("the first is row 5.\n"), std::string::npos) << result.out;
 }
 
+// Only a row with an open quote can be blamed on one.
+TEST_F(InferCommand, NamesTheQuoteOfARowThatIsTooLong) {
+    const std::string cell(70 << 20, 'x');
+    write("plain.csv", "a,b\n1," + cell);
+    EXPECT_EQ(kvt({"infer", path("plain.csv")}).err,
+              "kvt: " + path("plain.csv") + ": a row is longer than 64 MiB\n");
+    write("quoted.csv", "a,b\n1,\"" + cell);
+    EXPECT_EQ(kvt({"infer", path("quoted.csv")}).err,
+              "kvt: " + path("quoted.csv") +
+                  ": a row is longer than 64 MiB; the quote that opens at byte 6 of its text may never be "
+                  "closed\n");
+}
+
 TEST_F(InferCommand, NamesTextThatWentThroughTheWrongEncoding) {
     write("a.csv", "a,b\nM\xC3\x83\xC2\xBCller,1\n");
     EXPECT_NE(kvt({"infer", path("a.csv")}).out.find("\"M\xC3\x83\xC2\xBCller\" was \"M\xC3\xBCller\""),

@@ -20,7 +20,7 @@ using OnBytes = std::function<void(std::uint64_t)>;
 
 // So much of the beginning says what delimiter there is, and what ICU's detector thinks.
 constexpr std::size_t beginningSize = 1024 * 1024;
-// A row that is longer than that has a quote that was never closed.
+// A row that is longer than that is not one of a table; mostly a quote was never closed.
 constexpr std::size_t longestRow = 64 * 1024 * 1024;
 
 void guessEncoding(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
@@ -70,9 +70,12 @@ public:
                 return;
             }
             if (text_.size() > longestRow) {
-                throw Failure(survey_.file + ": a row is longer than " + std::to_string(longestRow >> 20) +
-                              " MiB; the quote that opens at byte " + std::to_string(borders.openQuote()) +
-                              " of its text may never be closed");
+                const std::string problem =
+                    survey_.file + ": a row is longer than " + std::to_string(longestRow >> 20) + " MiB";
+                throw Failure(borders.isWithinQuotes() ? problem + "; the quote that opens at byte " +
+                                                             std::to_string(borders.openQuote()) +
+                                                             " of its text may never be closed"
+                                                       : problem);
             }
             const std::size_t old = text_.size();
             decode();
