@@ -190,24 +190,34 @@ bool substitutes(const std::string& callback) {
     return callback.empty() || callback == "?";
 }
 
+// Calls `use` with the cells of each case of a section that can be tried at all, and its encoding. The text stands in the
+// cell `textAt`.
+template <typename Use>
+void forEachCase(Suite& suite, const std::string& section, std::size_t textAt, Use use) {
+    Reader reader(contentsOf(sourceFolder("icu") + "/source/test/testdata/conversion.txt"));
+    reader.seek(section + " {");
+    reader.seek("Cases {");
+    while (const auto cells = reader.next()) {
+        if (const std::string reason = reasonNot(*cells, (*cells)[textAt].value); !reason.empty()) {
+            suite.leaveOut(reason);
+            continue;
+        }
+        const std::string& charset = (*cells)[0].value;
+        use(*cells, Encoding(charset.substr(charset[0] == '+' ? 1 : 0)));
+    }
+}
+
 TEST(ConformanceIcu, TextsAreRead) {
     if (sourceFolder("icu").empty()) {
         GTEST_SKIP() << noSources("icu");
     }
     Suite suite("ICU's cases of reading", "ICU " + sourceVersion("icu"));
-    Reader reader(contentsOf(sourceFolder("icu") + "/source/test/testdata/conversion.txt"));
-    reader.seek("toUnicode {");
-    reader.seek("Cases {");
-    while (const auto cells = reader.next()) {
-        const auto& [charset, bytes, text] =
-            std::tie((*cells)[0].value, (*cells)[1].value, (*cells)[2].value);
-        const std::string& error = (*cells)[6].value;
-        const std::string& callback = (*cells)[7].value;
-        if (const std::string reason = reasonNot(*cells, text); !reason.empty()) {
-            suite.leaveOut(reason);
-            continue;
-        }
-        const Encoding encoding(charset.substr(charset[0] == '+' ? 1 : 0));
+    forEachCase(suite, "toUnicode", 2, [&](const auto& cells, const Encoding& encoding) {
+        const std::string& charset = cells[0].value;
+        const std::string& bytes = cells[1].value;
+        const std::string& text = cells[2].value;
+        const std::string& error = cells[6].value;
+        const std::string& callback = cells[7].value;
         const Converted found = decoded(encoding, bytesOf(bytes));
         const std::string what = charset + " " + bytes + " is read as " + hex(found.text) +
                                  (found.failed ? " with a failure" : "") + ", not " + hex(text) + " " +
@@ -223,7 +233,7 @@ TEST(ConformanceIcu, TextsAreRead) {
         } else {
             suite.leaveOut("bad text, and what another callback than the substituting one makes of it");
         }
-    }
+    });
     suite.finish();
 }
 
@@ -232,23 +242,16 @@ TEST(ConformanceIcu, TextsAreWritten) {
         GTEST_SKIP() << noSources("icu");
     }
     Suite suite("ICU's cases of writing", "ICU " + sourceVersion("icu"));
-    Reader reader(contentsOf(sourceFolder("icu") + "/source/test/testdata/conversion.txt"));
-    reader.seek("fromUnicode {");
-    reader.seek("Cases {");
-    while (const auto cells = reader.next()) {
-        const auto& [charset, text, bytes] =
-            std::tie((*cells)[0].value, (*cells)[1].value, (*cells)[2].value);
-        const std::string& error = (*cells)[6].value;
-        const std::string& callback = (*cells)[7].value;
-        if (const std::string reason = reasonNot(*cells, text); !reason.empty()) {
-            suite.leaveOut(reason);
-            continue;
-        }
-        const Encoding encoding(charset.substr(charset[0] == '+' ? 1 : 0));
+    forEachCase(suite, "fromUnicode", 1, [&](const auto& cells, const Encoding& encoding) {
+        const std::string& charset = cells[0].value;
+        const std::string& text = cells[1].value;
+        const std::string& bytes = cells[2].value;
+        const std::string& error = cells[6].value;
+        const std::string& callback = cells[7].value;
         const Converted found = encoded(encoding, text);
         const std::string what = charset + " " + hex(text) + " is written as " + hex(found.text) +
                                  (found.failed ? " with a failure" : "") + ", not " + bytes + " " + callback;
-        if ((*cells)[5].value != "0") {
+        if (cells[5].value != "0") {
             suite.leaveOut("bytes that ICU gives for want of better when it is asked to");
         } else if (!error.empty()) {
             suite.check(found.failed, what);
@@ -257,7 +260,7 @@ TEST(ConformanceIcu, TextsAreWritten) {
         } else {
             suite.leaveOut("characters that are not there, for which kvt has a sign of its own");
         }
-    }
+    });
     suite.finish();
 }
 
