@@ -30,6 +30,10 @@ inline std::string_view trimmed(std::string_view text) {
     return text.substr(0, text.find_last_not_of(blanks) + 1);
 }
 
+inline bool isAscii(std::string_view text) {
+    return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+}
+
 template <typename Result>
 bool isGood(const Result& result) {
     return std::get<0>(result) == kvt::ex::datetime::ReturnState::Success ||

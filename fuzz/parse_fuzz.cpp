@@ -10,10 +10,6 @@ using namespace kvt::fuzz;
 
 namespace {
 
-bool isAscii(std::string_view text) {
-    return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-}
-
 std::string parametersOf(const TextResult& result) {
     std::string text;
     if (std::get<2>(result)) {
