@@ -63,6 +63,13 @@ bool CompiledPattern::search(std::string_view text, std::size_t start, boost::cm
     return searchIn({begin, begin, text.data() + text.size()}, boost::regex_constants::match_default, result);
 }
 
+std::size_t CompiledPattern::passOver(std::string_view text, std::size_t start) const {
+    // What is sure to end without a try is so in each part of the text.
+    return scan_ && prefix_.isSureToEnd(engine_.size(), text.size() - start, 0)
+               ? scan_.find(text.data(), text.size(), start)
+               : start;
+}
+
 bool CompiledPattern::searchOn(std::string_view text, std::size_t start, bool mayBeEmpty,
                                boost::cmatch& result) const {
     return searchIn({text.data(), text.data() + start, text.data() + text.size()},

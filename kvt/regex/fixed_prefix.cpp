@@ -122,62 +122,100 @@ bool readParts(const Engine& engine, FixedPrefix& prefix) {
     return true;
 }
 
-/// Whether a repeat at the very beginning takes all bytes of a set that there are in a row. Where the engine fails behind
-/// such a run it goes on behind it, too.
-bool isRun(const states::re_repeat& repeat) {
-    return repeat.type != states::syntax_element_dot_rep && repeat.leading && repeat.greedy &&
-           repeat.min >= 1 && repeat.max == std::numeric_limits<std::size_t>::max();
-}
+/// Reads what comes first in a program, and counts the states in it.
+class PrefixReader {
+public:
+    explicit PrefixReader(FixedPrefix& prefix) : prefix_(prefix) {}
 
-/// Adds what comes first in the program, up to the first state that may take this or that number of bytes.
-void readPrefix(const Engine& engine, FixedPrefix& prefix) {
-    auto& sets = prefix.sets;
-    sets.reserve(longestPrefix);
-    for (const auto* state = engine.get_first_state(); sets.size() < longestPrefix;) {
-        ++prefix.statesOfPrefix;
-        switch (state->type) {
-        case states::syntax_element_startmark:
-        case states::syntax_element_endmark:
-            break;
-        case states::syntax_element_literal:
-            for (std::size_t i = 0; i < as<states::re_literal>(state).length && sets.size() < longestPrefix;
-                 ++i) {
-                sets.push_back(only(textOf(state)[i]));
-            }
-            break;
-        case states::syntax_element_set:
-        case states::syntax_element_wild:
-            sets.push_back(bytesOf(state));
-            break;
-        case states::syntax_element_dot_rep:
-        case states::syntax_element_char_rep:
-        case states::syntax_element_short_set_rep: {
-            const auto& repeat = as<states::re_repeat>(state);
-            if (repeat.min != repeat.max && sets.empty()) {
-                if (!isRun(repeat)) {
-                    return;
+    void read(const Engine& engine) {
+        prefix_.sets = setsFrom(engine.get_first_state(), longestPrefix, true);
+    }
+
+private:
+    static constexpr double mostStates = 256; // of alternatives that begin with more, nothing is said
+
+    /// Whether a repeat at the very beginning takes all bytes of a set that there are in a row. Where the engine fails
+    /// behind such a run it goes on behind it, too.
+    static bool isRun(const states::re_repeat& repeat) {
+        return repeat.type != states::syntax_element_dot_rep && repeat.leading && repeat.greedy &&
+               repeat.min >= 1 && repeat.max == std::numeric_limits<std::size_t>::max();
+    }
+
+    /// The sets of at most `longest` bytes from a state on, up to the first state that may take this or that number of
+    /// bytes.
+    std::vector<ByteSet> setsFrom(const states::re_syntax_base* state, std::size_t longest, bool mayBeRun) {
+        std::vector<ByteSet> sets;
+        sets.reserve(longest);
+        while (sets.size() < longest && ++prefix_.statesOfPrefix < mostStates) {
+            switch (state->type) {
+            case states::syntax_element_startmark:
+            case states::syntax_element_endmark:
+                break;
+            case states::syntax_element_start_line:
+            case states::syntax_element_word_boundary:
+            case states::syntax_element_within_word:
+            case states::syntax_element_word_start:
+            case states::syntax_element_word_end:
+                mayBeRun = false; // what may not stand where the run begins may stand within it
+                break;
+            case states::syntax_element_literal:
+                for (std::size_t i = 0; i < as<states::re_literal>(state).length && sets.size() < longest;
+                     ++i) {
+                    sets.push_back(only(textOf(state)[i]));
                 }
-                prefix.run = bytesOf(state->next.p);
-                ++prefix
-                      .statesOfPrefix; // one more for each byte of the run, which the engine gives back in vain
-                sets.push_back(*prefix.run);
+                break;
+            case states::syntax_element_set:
+            case states::syntax_element_wild:
+                sets.push_back(bytesOf(state));
+                break;
+            case states::syntax_element_dot_rep:
+            case states::syntax_element_char_rep:
+            case states::syntax_element_short_set_rep: {
+                const auto& repeat = as<states::re_repeat>(state);
+                const ByteSet repeated = bytesOf(state->next.p);
+                if (mayBeRun && sets.empty() && isRun(repeat)) {
+                    prefix_.run = repeated;
+                    sets.push_back(repeated);
+                    // One more for each byte of the run, which the engine gives back in vain.
+                    ++prefix_.statesOfPrefix;
+                } else {
+                    sets.insert(sets.end(), std::min(repeat.min, longest - sets.size()), repeated);
+                    if (repeat.min != repeat.max) {
+                        return sets;
+                    }
+                }
                 state = repeat.alt.p;
                 continue;
             }
-            sets.insert(sets.end(), std::min(repeat.min, longestPrefix - sets.size()),
-                        bytesOf(state->next.p));
-            if (repeat.min != repeat.max) {
-                return;
+            case states::syntax_element_jump: // behind an alternative
+                state = as<states::re_jump>(state).alt.p;
+                continue;
+            case states::syntax_element_alt: {
+                const std::size_t left = longest - sets.size();
+                const auto either = unionOf(setsFrom(state->next.p, left, false),
+                                            setsFrom(as<states::re_alt>(state).alt.p, left, false));
+                sets.insert(sets.end(), either.begin(), either.end());
+                return sets;
             }
-            state = repeat.alt.p;
-            continue;
+            default:
+                return sets;
+            }
+            state = state->next.p;
         }
-        default:
-            return;
-        }
-        state = state->next.p;
+        return sets;
     }
-}
+
+    /// Where both have a set.
+    static std::vector<ByteSet> unionOf(std::vector<ByteSet> left, const std::vector<ByteSet>& right) {
+        left.resize(std::min(left.size(), right.size()));
+        for (std::size_t i = 0; i < left.size(); ++i) {
+            left[i].add(right[i]);
+        }
+        return left;
+    }
+
+    FixedPrefix& prefix_;
+};
 
 bool haveCommonByte(const ByteSet& left, const ByteSet& right) {
     for (std::size_t i = 0; i < left.rows.size(); ++i) {
@@ -202,7 +240,7 @@ bool isRare(const std::vector<ByteSet>& sets) {
 FixedPrefix fixedPrefix(const Engine& engine) {
     FixedPrefix prefix;
     if (readParts(engine, prefix)) {
-        readPrefix(engine, prefix);
+        PrefixReader(prefix).read(engine);
         while (!prefix.sets.empty() && prefix.sets.back().count() == 256) {
             prefix.sets.pop_back();
         }

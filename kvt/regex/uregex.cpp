@@ -126,6 +126,18 @@ void URegex<N>::searchAll(const UString<N>& subject,
     searchAllOf(d().pattern.get(), match.subject_, match.groups_, [&] { return use(match); });
 }
 
+template <std::uint32_t N>
+bool URegex<N>::matchesIn(UStringView<N> text) const {
+    boost::cmatch result;
+    return d().pattern != nullptr && d().pattern->search({text.data(), text.size()}, 0, result);
+}
+
+template <std::uint32_t N>
+std::uint64_t URegex<N>::passOver(UStringView<N> text, std::uint64_t start) const noexcept {
+    const detail::CompiledPattern* const pattern = d().pattern.get();
+    return pattern == nullptr ? text.size() : pattern->passOver({text.data(), text.size()}, start);
+}
+
 template class URegex<0>;
 template class URegex<1>;
 template class URegex<28>;

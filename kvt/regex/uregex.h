@@ -121,6 +121,16 @@ public:
     /// match(), and with what `use` throws.
     void searchAll(const UString<N>& subject, const std::function<bool(const URegexMatch<N>&)>& use) const;
 
+    /// Whether search() finds a match in `text`, of which nothing is copied. Fails as match().
+    bool matchesIn(UStringView<N> text) const;
+
+    /// The place behind which every match ends that begins at `start` or behind it: in `text`, and in each part of it
+    /// that is searched by itself. The size where there is none, `start` where nothing is known, as with patterns that
+    /// begin with this or that number of bytes. It is found by the fixed beginning of the pattern, many bytes at once,
+    /// and for many short texts in a row, such as lines, spares a search of each.
+    /// Not checked: `start` must be at most the size of the text. Throws nothing.
+    std::uint64_t passOver(UStringView<N> text, std::uint64_t start = 0) const noexcept;
+
 private:
     const detail::URegexImpl<N>& d() const noexcept { return *impl_; }
     detail::URegexImpl<N>& d() noexcept { return *impl_; }

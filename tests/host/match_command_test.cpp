@@ -3,7 +3,10 @@
 #include "encode.h"
 #include "host_test.h"
 
+#include <algorithm>
 #include <csignal>
+#include <random>
+#include <regex>
 
 namespace kvt::test {
 
@@ -192,6 +195,43 @@ TEST_F(KvtMatch, LinesMayBeSplitAtEveryBlockBorder) {
         ASSERT_EQ(match({"--groups", "^b", "in"}, "").out,
                   "2:1:" + std::to_string(lead.size() + 4) + ":0:1:b\n")
             << before;
+    }
+}
+
+// Lines in which the pattern cannot match are not looked at one by one, but counted they are.
+TEST_F(KvtMatch, LinesThatArePassedOverAreCounted) {
+    std::mt19937 random(51);
+    const std::regex date("\\d{4}-\\d\\d");
+    const Strings pieces = {"\n", "\r",      "\r\n",       "\n",    "\r\r\n", "a",
+                            "12", "\u00e9 ", "2020-01-31", "2020-", " - "};
+    for (int round = 0; round < 6; ++round) {
+        std::string text;
+        // The last rounds have no CR, and few lines that match.
+        while (text.size() < 300000) {
+            const std::string& piece = pieces[random() % pieces.size()];
+            text += round > 3 && (piece.find('\r') != std::string::npos || random() % 50 > 0) ? "x\n" : piece;
+        }
+        std::string expected;
+        std::size_t number = 0;
+        std::size_t found = 0;
+        for (std::size_t at = 0; at < text.size();) {
+            const std::size_t end = std::min(text.find_first_of("\r\n", at), text.size());
+            const std::size_t endLength = text.compare(end, 2, "\r\n") == 0 ? 2 : end < text.size() ? 1 : 0;
+            const std::string line = text.substr(at, end - at);
+            ++number;
+            if (std::regex_search(line, date)) {
+                ++found;
+                expected += std::to_string(number) + ":" + line +
+                            (endLength == 0 ? "\n" : text.substr(end, endLength));
+            }
+            at = end + endLength;
+        }
+        ASSERT_GT(found, 100U);
+        // Of the second one no beginning is known.
+        for (const char* pattern : {"\\d{4}-\\d\\d", "(?=\\d{4}-\\d\\d)."}) {
+            ASSERT_EQ(match({"-n", pattern}, text).out, expected) << round << pattern;
+            ASSERT_EQ(match({"-c", pattern}, text).out, std::to_string(found) + "\n") << round << pattern;
+        }
     }
 }
 

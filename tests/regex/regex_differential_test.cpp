@@ -119,6 +119,30 @@ struct Tally {
     }
 };
 
+// Nothing matches in what is passed over, nor in a part of it.
+template <std::uint32_t N>
+void comparePlaces(const ex::URegex<N>& regex, const boost::regex& engine, const std::string& subject) {
+    bool matches = false;
+    const EngineError error =
+        errorOf([&] { matches = regex.matchesIn(ex::UStringView<N>(subject.data(), subject.size())); });
+    const Found found = searchedByEngine(engine, subject, 0);
+    ASSERT_EQ(error, found.error);
+    ASSERT_EQ(matches, !found.groups.empty());
+    std::uint64_t last = 0;
+    for (std::size_t start = 0; start <= subject.size(); ++start) {
+        const std::uint64_t place = regex.passOver(ex::UStringView<N>(subject.data(), subject.size()), start);
+        ASSERT_GE(place, start);
+        ASSERT_GE(place, last);
+        ASSERT_LE(place, subject.size());
+        const std::size_t end = start % 2 == 0 ? place : start + (place - start) / 2;
+        if (place > start) {
+            ASSERT_EQ(searchedByEngine(engine, subject.substr(0, end), start), Found())
+                << "from " << start << " to " << end << " of " << place;
+        }
+        last = place;
+    }
+}
+
 template <std::uint32_t N>
 void compare(const std::string& pattern, const std::vector<std::string>& subjects, Tally& tally) {
     ex::URegex<N> regex;
@@ -141,6 +165,7 @@ void compare(const std::string& pattern, const std::vector<std::string>& subject
             ASSERT_EQ(searchedBy(regex, subject, start), found) << "from " << start;
             tally.add(found);
         }
+        comparePlaces(regex, engine, subject);
         // The engine's own iterator stays for ever where a match ends before it begins.
         if (pattern.find("\\K") == std::string::npos) {
             ASSERT_EQ(allFoundBy(regex, subject), allFoundByEngine(engine, subject));
@@ -212,6 +237,22 @@ const std::vector<Prefixed> prefixes = {
     {"\\d+?-", {"12-", "1-", "-"}},
     {"\\d+\\w", {"12a", "1", "1-"}},
     {"\\d++-", {"12-", "1-", "-", "12"}},
+    // Alternatives, of which each place has the bytes of all.
+    {"(?:open|activ)ed?", {"open", "opened", "active", "oped", "activ", "acten", "o"}},
+    {"(ERROR|WARN|FATAL): ", {"ERROR: ", "WARN: ", "FATAL: ", "WARNR: ", "ERR", "WARN", ":"}},
+    {"[0-3]?\\d(\\.|/)Z", {"31.Z", "3/Z", "31", ".Z", "/", "Z"}},
+    {"(?:x(?:y|[0-4])|z\\d)q", {"xyq", "x0q", "z9q", "xq", "zyq", "x9q", "q"}},
+    {"(?:Zab|)Q", {"ZabQ", "Q", "Zab", "abQ"}},
+    {"\\d+(?:-|:)\\d", {"12-3", "1:2", "12", "-3", "1-:2", ":"}},
+    {"(?:\\d+-|Q)x", {"12-x", "Qx", "1-", "-x", "12", "Q"}},
+    // What takes no byte, before and within it.
+    {"^\\d{4}-\\d", {"2020-0", "\n2020-0", "020-0", "\r\n2020-1", "2020", "\f"}},
+    {"\\b[A-Z]{3}\\b", {"ABC", "ABCD", "AB", " ABC ", "A", "_ABC"}},
+    {"\\b\\d+-", {"12-", "a12-", " 12-", "1-2-", "12"}},
+    {"\\b[0-9 ]+-Q", {"12-Q", "a 12-Q", "1 2-Q", "a12-Q", " -Q", "a-Q"}},
+    {"\\B[0-9 ]+-Q", {"12-Q", "a 12-Q", "1 2-Q", "a12-Q", " -Q", "a-Q"}},
+    {"\\<\\w+\\>@", {"ab@", "@", "a@@", "a b@", "-"}},
+    {"(?:^|, )Z\\d", {"Z1", ", Z1", "\nZ2", ",Z1", "Z", ", "}},
 };
 
 TEST(RegexDifferential, APatternWithAFixedBeginningIsFoundWhereTheEngineFindsIt) {
@@ -247,9 +288,10 @@ TEST(RegexDifferential, APatternWithAFixedBeginningIsFoundWhereTheEngineFindsIt)
 TEST(RegexDifferential, GivingUpIsNotPassedOver) {
     std::size_t givenUp = 0;
     std::size_t ended = 0;
-    for (const char* pattern : {"ab.*x", "ab.*.*x", "ab.*.*.*x", "ab[ab]*[ab]*x", "(ab)\\w+\\s?\\w+(x|y)",
-                                "abab.{0,9}.{0,9}.{0,9}x", "ab(a|b|ab).*(a|b|ba)x", "ab.*$x", "a+b.*.*x",
-                                "a+b[ab]*[ab]*x", "(a+)b.*.*.*x"}) {
+    for (const char* pattern :
+         {"ab.*x", "ab.*.*x", "ab.*.*.*x", "ab[ab]*[ab]*x", "(ab)\\w+\\s?\\w+(x|y)",
+          "abab.{0,9}.{0,9}.{0,9}x", "ab(a|b|ab).*(a|b|ba)x", "ab.*$x", "a+b.*.*x", "a+b[ab]*[ab]*x",
+          "(a+)b.*.*.*x", "(?:ab|ba).*.*x", "^ab.*.*x", "\\bab.*.*.*x", "(?:a(?:b|c)|ba)[ab]*[ab]*x"}) {
         const boost::regex engine(pattern);
         const URegex<0> regex(pattern);
         for (std::size_t count = 1; count < 700; count += 1 + count / 5) {

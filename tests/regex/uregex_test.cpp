@@ -13,6 +13,7 @@ namespace {
 using ex::URegex;
 using ex::URegexMatch;
 using ex::UString;
+using ex::UStringView;
 
 // What programs rely on at compile time.
 static_assert(std::is_nothrow_move_constructible_v<URegex<0>> &&
@@ -344,6 +345,32 @@ TEST(URegex, ClassesFollowTheGlobalLocaleInWhichThePatternWasCompiled) {
     EXPECT_FALSE(before.match("a!"));
     EXPECT_TRUE(during.match("a!"));
     EXPECT_FALSE(URegex<0>("\\w+").match("a!"));
+}
+
+// What a search of many lines builds on.
+TEST(URegex, PlacesWithoutAMatchArePassedOver) {
+    const std::string text = "no date\n12 \n2020-01-31 and 2020-02-01\nend";
+    const URegex<0> date("\\d{4}-\\d\\d-\\d\\d");
+    EXPECT_EQ(date.passOver(text), text.find("2020"));
+    EXPECT_EQ(date.passOver(text, text.find("2020") + 1), text.find("2020-02"));
+    EXPECT_EQ(date.passOver(text, text.find("020-02")), text.size());
+    EXPECT_EQ(date.passOver(text, text.size()), text.size());
+    EXPECT_EQ(date.passOver("", 0), 0U);
+    // Of a run, up to its last byte.
+    EXPECT_EQ(URegex<0>("\\d+-").passOver(text), text.find("0-"));
+    EXPECT_EQ(URegex<1>("(?:ERROR|WARN): ").passOver("no ERROR, a WARN: x"), 12U);
+    EXPECT_EQ(URegex<28>("^Z\\d").passOver("aZ Z1"), 3U) << "where a line begins is not known";
+    // Nothing is known of these, or too little to be worth looking for.
+    for (const char* pattern : {"", "x*", "[a-z]", "(?<=a)Z1", "(Z1)*", ".*Z1", "\\AZ1", "(Z)\\1"}) {
+        EXPECT_EQ(URegex<0>(pattern).passOver(text, 3), 3U) << pattern;
+    }
+    EXPECT_EQ(URegex<0>().passOver(text, 3), text.size());
+
+    EXPECT_TRUE(date.matchesIn(text));
+    EXPECT_FALSE(date.matchesIn("no date"));
+    EXPECT_TRUE(URegex<0>("^$").matchesIn(""));
+    EXPECT_TRUE(URegex<0>("").matchesIn(UStringView<0>()));
+    EXPECT_FALSE(URegex<0>().matchesIn(""));
 }
 
 } // namespace

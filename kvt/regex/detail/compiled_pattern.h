@@ -27,7 +27,10 @@ public:
     bool match(std::string_view text, boost::cmatch& result) const;
     /// Whether it matches somewhere from `start` on, which is at most the size; nothing before `start` is seen.
     bool search(std::string_view text, std::size_t start, boost::cmatch& result) const;
-    /// The same with a view of the text before `start`; a match that is empty there counts only where it may be.
+    /// Behind which place a match ends that begins at `start` or behind it, in the text or in a part of it that is
+    /// searched by itself.
+    std::size_t passOver(std::string_view text, std::size_t start) const;
+    /// As search(), with a view of the text before `start`; a match that is empty there counts only where it may be.
     bool searchOn(std::string_view text, std::size_t start, bool mayBeEmpty, boost::cmatch& result) const;
 
 private:

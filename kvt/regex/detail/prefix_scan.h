@@ -15,6 +15,11 @@ struct ByteSet {
     void add(unsigned char byte) {
         rows[byte >> 4U] = static_cast<std::uint16_t>(rows[byte >> 4U] | 1U << (byte & 0xFU));
     }
+    void add(const ByteSet& other) {
+        for (std::size_t i = 0; i < rows.size(); ++i) {
+            rows[i] = static_cast<std::uint16_t>(rows[i] | other.rows[i]);
+        }
+    }
     bool contains(unsigned char byte) const { return (rows[byte >> 4U] >> (byte & 0xFU) & 1U) != 0; }
     std::size_t count() const;
     /// How frequent its bytes are in texts, roughly: from 0 for none to 1 for all of them.

@@ -1,5 +1,7 @@
 #include "text/line_counter.h"
 
+#include "text/byte_count.h"
+
 #include <algorithm>
 #include <cstring>
 #include <utility>
@@ -55,7 +57,7 @@ LineEnds findByteLineEnds(std::string_view bytes, bool afterReturn) {
         return findUnitLineEnds<1, false>(bytes, afterReturn);
     }
     LineEnds ends;
-    ends.count = static_cast<std::uint64_t>(std::count(bytes.begin(), bytes.end(), '\n'));
+    ends.count = countOf(bytes, '\n');
     ends.lastEnd = ends.count == 0 ? 0 : bytes.rfind('\n') + 1;
     return ends;
 }

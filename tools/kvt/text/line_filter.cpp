@@ -22,7 +22,7 @@ void filterFile(LineReader& reader, LineFilter& filter, TextWriter& writer, Prog
             filter.takeMark(mark, writer.buffer());
             writer.endLine(line);
         }
-        while (reader.next(line)) {
+        while (reader.passOver(filter.passOver(reader.wholeLines())), reader.next(line)) {
             filter.takeLine(line, writer.buffer());
             writer.endLine(line);
         }

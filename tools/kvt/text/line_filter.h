@@ -26,6 +26,9 @@ public:
     /// It begins with a byte order mark, which is part of no line.
     virtual void takeMark(std::string_view mark, std::string& out) = 0;
     virtual void takeLine(const TextLine& line, std::string& out) = 0;
+    /// Of lines in a row with their ends, the place up to which lines end that need not be taken: nothing would come of
+    /// them.
+    virtual std::size_t passOver(std::string_view) { return 0; }
     virtual void endFile(std::string&) {}
 };
 

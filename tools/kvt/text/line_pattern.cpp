@@ -29,7 +29,8 @@ public:
     explicit PerlPattern(const std::string& pattern)
         : regex_(Utf8String(View(pattern))), groupCount_(countGroups(pattern)) {}
 
-    bool find(std::string_view line) override { return regex_.search(subject(line)).matched(); }
+    bool find(std::string_view line) override { return regex_.matchesIn(View(line)); }
+    std::size_t passOver(std::string_view lines) const override { return regex_.passOver(View(lines)); }
 
     void findAll(std::string_view line, const TakeMatch& take) override {
         regex_.searchAll(subject(line), [&](const URegexMatch<0>& match) {

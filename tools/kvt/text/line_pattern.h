@@ -37,6 +37,9 @@ public:
     /// but one. Behind an empty match, the next one is longer or stands farther on.
     virtual void findAll(std::string_view line, const TakeMatch& take) = 0;
 
+    /// The place up to which no line ends that has a match, of lines in a row with their ends. Never throws.
+    virtual std::size_t passOver(std::string_view) const { return 0; }
+
     /// Of the pattern, without the whole match.
     virtual std::size_t groupCount() const { return 0; }
 };

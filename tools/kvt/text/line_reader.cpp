@@ -2,6 +2,7 @@
 
 #include "base/messages.h"
 #include "base/text_units.h"
+#include "text/byte_count.h"
 #include "text/byte_order_mark.h"
 
 #include <kvt/string/ustring.h>
@@ -21,6 +22,10 @@ std::string shownBytes(const std::string& bytes) {
     std::ostringstream out;
     out << kvt::ex::BinaryString(bytes.data(), bytes.size());
     return out.str();
+}
+
+bool isLineEnd(char byte) {
+    return byte == '\n' || byte == '\r';
 }
 
 } // namespace
@@ -50,7 +55,7 @@ bool LineReader::readBlock() {
     decoded_.erase(0, taken_);
     decodedBegin_ += taken_;
     searched_ -= taken_;
-    taken_ = 0;
+    taken_ = whole_ = 0;
     feed_.reset();
     return_.reset();
     const std::string_view block = std::exchange(started_, true) ? input_.read() : first_;
@@ -60,12 +65,14 @@ bool LineReader::readBlock() {
         offsets_->passTo(decodedBegin_);
         offsets_->add(block);
     }
+    const std::size_t before = decoded_.size();
     if (isDecoded_) {
         decode(block);
     } else {
         decoded_ += block;
     }
     findMark();
+    findLastEnd(before);
     return true;
 }
 
@@ -91,6 +98,16 @@ void LineReader::findMark() {
         marked_ = true;
         taken_ = searched_ = mark.size();
     }
+}
+
+// A CR at the very end may yet turn out to be the first half of a CRLF, as one before what is `fresh` has by now.
+void LineReader::findLastEnd(std::size_t fresh) {
+    const std::size_t first = fresh == 0 ? 0 : fresh - 1;
+    std::size_t end = decoded_.ends_with('\r') ? decoded_.size() - 1 : decoded_.size();
+    while (end > first && !isLineEnd(decoded_[end - 1])) {
+        --end;
+    }
+    whole_ = end > first ? end : taken_;
 }
 
 std::string_view LineReader::takeMark() {
@@ -126,6 +143,33 @@ std::size_t LineReader::nextOf(char byte, std::optional<std::size_t>& known) con
         known = std::min(decoded_.find(byte, searched_), decoded_.size());
     }
     return *known;
+}
+
+void LineReader::passOver(std::size_t length) {
+    if (length == 0) {
+        return;
+    }
+    const std::string_view all = decoded_;
+    std::size_t end = std::min(taken_ + length, whole_ - 1) + 1; // behind where a line ends, or its CR
+    while (end > taken_ && !isLineEnd(all[end - 1])) {
+        --end;
+    }
+    if (end == taken_) {
+        return;
+    }
+    if (all[end - 1] == '\r' && all.substr(end).starts_with('\n')) {
+        ++end;
+    }
+    const std::string_view passed = all.substr(taken_, end - taken_);
+    number_ += countOf(passed, '\n');
+    if (nextOf('\r', return_) < end) {
+        number_ += countWhere(passed.size(), [bytes = passed.data()](std::size_t index) {
+            const char byte = bytes[index];
+            const char next = bytes[index + 1]; // behind the last one stands a zero
+            return byte == '\r' && next != '\n';
+        });
+    }
+    taken_ = searched_ = end;
 }
 
 bool LineReader::next(TextLine& line) {

@@ -57,6 +57,11 @@ public:
     /// line is longer than longestLine.
     bool next(TextLine& line);
 
+    /// What next() gives before the next block, lines with their ends.
+    std::string_view wholeLines() const { return std::string_view(decoded_).substr(taken_, whole_ - taken_); }
+    /// Passes over the lines that end, without their ends, in the first `length` bytes of wholeLines().
+    void passOver(std::size_t length);
+
     /// The byte order mark at the start of the file, as UTF-8, for the first call. It does not belong to the
     /// first line.
     std::string_view takeMark();
@@ -78,6 +83,7 @@ private:
     void decode(std::string_view block);
     std::size_t nextOf(char byte, std::optional<std::size_t>& known) const;
     void findMark();
+    void findLastEnd(std::size_t fresh);
     Place placeOf(const TextLine& line, std::size_t position);
     friend TextLine;
 
@@ -94,6 +100,7 @@ private:
     std::string decoded_;
     std::uint64_t decodedBegin_ = 0; ///< what came before decoded_
     std::size_t taken_ = 0;          ///< up to here, decoded_ was given out
+    std::size_t whole_ = 0;          ///< behind the last end of a line
     std::size_t searched_ = 0;       ///< up to here, decoded_ holds no end of the line that begins at taken_
     std::optional<std::size_t>
         feed_; ///< in decoded_, the first LF behind what was searched, if that is known

@@ -111,6 +111,9 @@ public:
             throw Failure(placeOf(line) + "REGEX gives up: " + printable(failure.what()));
         }
     }
+    std::size_t passOver(std::string_view lines) override {
+        return rule_.invert || rule_.allLines ? 0 : pattern_.passOver(lines);
+    }
     void endFile(std::string& out) override {
         if (rule_.count) {
             out.append(rule_.showFile ? file_ + ":" : "").append(std::to_string(found_)) += '\n';
