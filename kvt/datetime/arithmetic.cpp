@@ -31,10 +31,14 @@ bool isInRange(const CivilDate& date) noexcept {
 
 // The date so many years and then months later; its day is cut to the length of the month reached.
 CivilDate dateAfter(const CivilDate& date, std::int64_t years, std::int64_t months) noexcept {
-    const std::int64_t sum = wrappingSum(months, date.month - 1);
-    const std::int64_t carry = sum / 12 - (sum % 12 < 0 ? 1 : 0);
-    const std::int64_t year = static_cast<std::int16_t>(wrappingSum(date.year, years)) + carry;
-    const auto month = static_cast<unsigned>(sum - carry * 12) + 1;
+    std::int64_t year = static_cast<std::int16_t>(wrappingSum(date.year, years));
+    unsigned month = date.month;
+    if (months != 0) {
+        const std::int64_t sum = wrappingSum(months, month - 1);
+        const std::int64_t carry = sum / 12 - (sum % 12 < 0 ? 1 : 0);
+        year += carry;
+        month = static_cast<unsigned>(sum - carry * 12) + 1;
+    }
     const bool isInEveryMonth = date.day <= 28;
     return {year, month, isInEveryMonth ? date.day : std::min(date.day, lastDayOfMonth(year, month))};
 }
@@ -113,7 +117,7 @@ std::optional<std::int64_t> go(Walk& walk, std::int64_t steps) noexcept {
     walk.at.date = stepped(start, steps);
     if (walk.backwards ? walk.at < walk.target : walk.target < walk.at) {
         steps += walk.backwards ? 1 : -1;
-        walk.at.date = stepped(start, steps);
+        walk.at.date = steps == 0 ? start : stepped(start, steps);
     }
     return std::abs(steps);
 }
@@ -158,35 +162,42 @@ double Difference::inMonths() const {
     return backwards ? -magnitude : magnitude;
 }
 
-WallClock utcClock(const CanonicalRecord& record) noexcept {
+void setUtcClock(WallClock& clock, const CanonicalRecord& record) noexcept {
     const DateTimeFields& fields = record.fields;
     const std::int32_t offset = hasOffset(record.type) ? record.offset.minutes : 0;
     const std::int64_t nanoseconds = nanosecondsOfDay(fields) - offset * nanosPerMinute;
     if (nanoseconds >= 0 && nanoseconds < nanosPerDay) {
-        return {{fields.year, static_cast<unsigned>(fields.month), static_cast<unsigned>(fields.day)},
-                nanoseconds};
+        clock.date = {fields.year, static_cast<unsigned>(fields.month), static_cast<unsigned>(fields.day)};
+        clock.nanoseconds = nanoseconds;
+    } else {
+        const TimeCount count = plusMinutes(countOf(fields), -offset);
+        clock.date = civilFromDays(count.days);
+        clock.nanoseconds = count.nanoseconds;
     }
-    const TimeCount count = plusMinutes(countOf(fields), -offset);
-    return {civilFromDays(count.days), count.nanoseconds};
 }
 
 Outcome<Difference> diffParts(const WallClock& first, const WallClock& second, bool byCalendar) {
+    Outcome<Difference> outcome;
     if (first == second) {
-        return Difference();
+        return outcome;
     }
-    const bool backwards = first < second;
-    if (!byCalendar) {
-        return Difference{backwards, 0, 0, backwards ? second - first : first - second,
-                          backwards ? first.date : second.date};
+    Difference& difference =
+        *outcome; // made in its place: a copy of what was just written has to wait for it
+    difference.backwards = first < second;
+    Walk walk = {second, first, difference.backwards};
+    if (byCalendar) {
+        const std::optional<std::int64_t> years = goYears(walk);
+        const std::optional<std::int64_t> months = years ? goMonths(walk) : std::nullopt;
+        if (!months) {
+            outcome = yearOutOfRange(walk.at.date.year);
+            return outcome;
+        }
+        difference.years = *years;
+        difference.months = *months;
     }
-    Walk walk = {second, first, backwards};
-    const std::optional<std::int64_t> years = goYears(walk);
-    const std::optional<std::int64_t> months = years ? goMonths(walk) : std::nullopt;
-    if (!months) {
-        return yearOutOfRange(walk.at.date.year);
-    }
-    return Difference{backwards, *years, *months, backwards ? walk.at - first : first - walk.at,
-                      backwards ? first.date : walk.at.date};
+    difference.rest = difference.backwards ? walk.at - first : first - walk.at;
+    difference.earlier = difference.backwards ? first.date : walk.at.date;
+    return outcome;
 }
 
 } // namespace kvt::ex::datetime::detail

@@ -3,8 +3,6 @@
 
 #include <date/date.h>
 
-#include <iterator>
-
 namespace kvt::ex::datetime::detail {
 
 namespace {
@@ -56,16 +54,8 @@ CivilDate civilFromDays(std::int64_t days) noexcept {
     return date;
 }
 
-unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept {
-    static constexpr unsigned lengths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    if (month - 1 >= std::size(lengths)) {
-        return 29;
-    }
-    if (month != 2) {
-        return lengths[month - 1];
-    }
-    const auto inCycle = static_cast<int>(year - floorOf(year, yearsPerCycle) * yearsPerCycle);
-    return date::year(inCycle).is_leap() ? 29 : 28;
+bool isLeapYear(std::int64_t year) noexcept {
+    return date::year(static_cast<int>(year - floorOf(year, yearsPerCycle) * yearsPerCycle)).is_leap();
 }
 
 std::string_view lastDayText(unsigned lastDay) noexcept {

@@ -16,9 +16,27 @@ using detail::CanonicalRecord;
 using detail::Outcome;
 using detail::ValueAnswer;
 
+// Whether a value has the parts of a kind without an offset, and no others.
+bool hasPartsOf(TemporalType kind, TemporalType type) noexcept {
+    switch (kind) {
+    case TemporalType::Time:
+        return detail::isTimeKind(type);
+    case TemporalType::Date:
+        return type == TemporalType::Date;
+    default:
+        return type == TemporalType::Datetime || type == TemporalType::DatetimeWithOffset;
+    }
+}
+
 // The state says whether the offset was repaired, if the text has it.
 Outcome<ValueAnswer> castTo(TemporalType kind, const CanonicalRecord& record) {
     Outcome<ValueAnswer> answer;
+    if (hasPartsOf(kind, record.type)) { // as it mostly has: nothing is left out or added then
+        answer->text = record.canonicalText();
+        if (!answer->text.empty()) {
+            return answer;
+        }
+    }
     detail::setAnswer(*answer, record);
     answer->kind = kind;
     if (kind == TemporalType::Date) {

@@ -29,9 +29,11 @@ using detail::WallClock;
 
 /// Two values that can be compared, in UTC where they have an offset.
 struct Pair {
+    Pair() noexcept {} // NOLINT(modernize-use-equals-default): both clocks are written at once
+
     WallClock first;
     WallClock second;
-    bool haveDates;
+    bool haveDates = false;
 };
 
 bool areComparable(TemporalType first, TemporalType second) noexcept {
@@ -43,16 +45,19 @@ bool areComparable(TemporalType first, TemporalType second) noexcept {
 // that is named if neither is a value.
 Outcome<Pair> readPair(const UString<0>& first, const UString<0>& second) {
     return detail::parseCanonical(detail::viewOf(second), false).andThen([&](const CanonicalRecord& right) {
-        return detail::readValue(detail::viewOf(first))
-            .andThen([&](const CanonicalRecord& left) -> Outcome<Pair> {
-                if (right.type == TemporalType::Unsupported) {
-                    return detail::ValueUnsupported{detail::viewOf(second)};
-                }
-                if (!areComparable(left.type, right.type)) {
-                    return detail::KindsNotComparable{detail::viewOf(first), detail::viewOf(second)};
-                }
-                return Pair{detail::utcClock(left), detail::utcClock(right), !detail::isTimeKind(right.type)};
-            });
+        return detail::readValue(detail::viewOf(first)).andThen([&](const CanonicalRecord& left) {
+            Outcome<Pair> pair; // in its place, with one return: a copy would have to wait for the clocks
+            if (right.type == TemporalType::Unsupported) {
+                pair = detail::ValueUnsupported{detail::viewOf(second)};
+            } else if (!areComparable(left.type, right.type)) {
+                pair = detail::KindsNotComparable{detail::viewOf(first), detail::viewOf(second)};
+            } else {
+                detail::setUtcClock(pair->first, left);
+                detail::setUtcClock(pair->second, right);
+                pair->haveDates = !detail::isTimeKind(right.type);
+            }
+            return pair;
+        });
     });
 }
 

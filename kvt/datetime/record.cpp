@@ -5,7 +5,6 @@
 #include <kvt/datetime/detail/text.h>
 
 #include <algorithm>
-#include <array>
 #include <optional>
 
 namespace kvt::ex::datetime::detail {
@@ -46,6 +45,7 @@ TemporalType typeOf(std::size_t digits, bool hasPoint, bool hasOffset) noexcept 
 // in the order in which it stands.
 bool split(std::string_view text, CanonicalRecord& record) noexcept {
     text = trimmed(text);
+    record.text = text;
     const std::string_view digits = takeDigits(text);
     const bool hasPoint = !text.empty() && text.front() == '.';
     if (hasPoint) {
@@ -73,21 +73,19 @@ std::int64_t pairAt(std::uint64_t pairs, unsigned index) noexcept {
 
 void readNumbers(CanonicalRecord& record) noexcept {
     DateTimeFields& fields = record.fields;
-    std::string_view digits = record.digits;
-    if (!isTimeKind(record.type)) {
+    const std::string_view digits = record.digits;
+    if (digits.size() >= dateDigits) {
         const std::uint64_t date = pairsOf(digits.data());
         fields.year = pairAt(date, 0) * 100 + pairAt(date, 1);
         fields.month = static_cast<std::uint64_t>(pairAt(date, 2));
         fields.day = static_cast<std::uint64_t>(pairAt(date, 3));
     }
-    if (record.type != TemporalType::Date) {
-        // The last eight digits end with those of the time; a time without a date has but six.
-        std::array<char, dateDigits> alone = {'0', '0'};
-        const bool isAlone = digits.size() == timeDigits;
-        if (isAlone) {
-            std::copy(digits.begin(), digits.end(), alone.begin() + 2);
-        }
-        const std::uint64_t time = pairsOf(isAlone ? alone.data() : digits.data() + timeDigits);
+    if (digits.size() == timeDigits) {
+        fields.hours = digitPair(digits.data());
+        fields.minutes = digitPair(digits.data() + 2);
+        fields.seconds = digitPair(digits.data() + 4);
+    } else if (digits.size() > dateDigits) {
+        const std::uint64_t time = pairsOf(digits.data() + timeDigits); // the last eight end with the time
         fields.hours = pairAt(time, 1);
         fields.minutes = pairAt(time, 2);
         fields.seconds = pairAt(time, 3);
@@ -107,6 +105,22 @@ std::string_view CanonicalRecord::timeText() const noexcept {
     return isTimeKind(type) ? digits : digits.substr(std::min(dateDigits, digits.size()));
 }
 
+std::string_view CanonicalRecord::canonicalText() const noexcept {
+    // Zeros at the end of a fraction are in no part, nor is a "." with nothing behind it. More than nine digits are
+    // rounded.
+    const std::size_t fractionSize = fractionText.empty() ? 0 : 1 + fractionText.size();
+    const bool isCanonical = !offsetRepaired && fractionText.size() <= nanosecondDigits &&
+                             text.size() == digits.size() + fractionSize + offsetText().size();
+    return isCanonical ? text : std::string_view();
+}
+
+// Apart, since few values come here: room for a failure would cost each of them.
+[[gnu::noinline]] static void failWhereOutOfRange(Outcome<CanonicalRecord>& outcome) {
+    if (const std::optional<DatePartRange> wrong = partOutOfRange(outcome->fields, outcome->lenient)) {
+        outcome = *wrong;
+    }
+}
+
 Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
     Outcome<CanonicalRecord> outcome;
     CanonicalRecord& record = *outcome;
@@ -116,8 +130,8 @@ Outcome<CanonicalRecord> parseCanonical(std::string_view text, bool lenient) {
         return outcome;
     }
     readNumbers(record);
-    if (const std::optional<DatePartRange> wrong = partOutOfRange(record.fields, lenient)) {
-        outcome = *wrong;
+    if (!areOfEveryYear(record.fields)) {
+        failWhereOutOfRange(outcome);
     }
     return outcome;
 }
@@ -151,8 +165,14 @@ void setAnswer(ValueAnswer& answer, const CanonicalRecord& record) noexcept {
 }
 
 ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant, ReturnState state) noexcept {
-    return {state, kind, fieldsFromCount(instant.count),
-            instant.offsetMinutes ? offsetOfMinutes(*instant.offsetMinutes) : std::nullopt};
+    ValueAnswer answer;
+    answer.state = state;
+    answer.kind = kind;
+    answer.fields = fieldsFromCount(instant.count);
+    if (instant.offsetMinutes) {
+        answer.offset = offsetOfMinutes(*instant.offsetMinutes);
+    }
+    return answer;
 }
 
 void writeCanonical(TextBuffer& text, TemporalType kind, const DateTimeFields& fields,

@@ -20,7 +20,6 @@ constexpr double powersOfTen[] = {1e0, 1e1, 1e2,  1e3,  1e4,  1e5,  1e6,  1e7,
                                   1e8, 1e9, 1e10, 1e11, 1e12, 1e13, 1e14, 1e15};
 constexpr std::size_t exactDigits = 15; // 10^15 is below 2^53
 
-constexpr std::size_t nanosecondDigits = 9;
 // What makes nanoseconds of a fraction with so many digits.
 constexpr std::uint64_t scaleOfDigits[] = {1'000'000'000, 100'000'000, 10'000'000, 1'000'000, 100'000,
                                            10'000,        1'000,       100,        10,        1};

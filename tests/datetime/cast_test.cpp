@@ -92,6 +92,37 @@ TEST(Cast, AFractionThatRoundsUpCarries) {
     });
 }
 
+// A text that is canonical already is taken over as it stands; all others are made of their numbers, as by parse().
+TEST(Cast, OfAValueToItsOwnKindIsItsCanonicalText) {
+    struct Body {
+        const char* text;
+        CastToTemporalType kind;
+    };
+    const Body bodies[] = {{"20200229", toDate}, {"235959", toTime}, {"99990102030405", toDatetime}};
+    const char* const fractions[] = {
+        "",           ".",           ".5",          ".500",           ".0",
+        ".000000001", ".0000000001", ".9999999995", ".123456789",     ".1234567890",
+        ".999999999", ".00000000",   ".1234567891", ".12345678949999"};
+    const char* const offsets[] = {"", "+01:00", "+0100", "+01", "-00:00", "+10:75", "-1075", "+99:59"};
+    int values = 0;
+    for (const Body& body : bodies) {
+        for (const std::string fraction : fractions) {
+            for (const std::string offset : offsets) {
+                for (const std::string space : {"", " ", "\t\n"}) {
+                    const std::string value = space + body.text + fraction + offset + space;
+                    const kvt::ex::UString<0> text(value.c_str());
+                    const auto expected = parse(text, "ZQT", false);
+                    if (std::get<0>(expected) == ReturnState::Success) {
+                        ++values;
+                        EXPECT_EQ(std::get<1>(cast(text, body.kind)), std::get<1>(expected)) << value;
+                    }
+                }
+            }
+        }
+    }
+    EXPECT_GT(values, 300);
+}
+
 TEST(Cast, RefusesWhatIsNoValueBeforeItLooksAtTheTarget) {
     for (const CastToTemporalType target : {toDate, toTime, toDatetime, toUnknown, toNothing}) {
         EXPECT_EQ(answerOf(cast("abc", target)), failure(933063, {"abc"}));

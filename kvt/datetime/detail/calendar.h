@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <iterator>
 #include <string_view>
 
 namespace kvt::ex::datetime::detail {
@@ -24,8 +25,18 @@ std::int64_t daysFromCivil(std::int64_t year, unsigned month, unsigned day) noex
 /// The date so many days after 1970-01-01.
 CivilDate civilFromDays(std::int64_t days) noexcept;
 
+/// How long the months are in a year that is not a leap year.
+inline constexpr std::uint8_t shortestMonths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+
+bool isLeapYear(std::int64_t year) noexcept;
+
 /// 28 to 31; 29 for a month beyond the twelve.
-unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept;
+inline unsigned lastDayOfMonth(std::int64_t year, unsigned month) noexcept {
+    if (month - 1 >= std::size(shortestMonths)) {
+        return 29;
+    }
+    return month == 2 && isLeapYear(year) ? 29 : shortestMonths[month - 1];
+}
 
 /// "28" to "31", for messages.
 std::string_view lastDayText(unsigned lastDay) noexcept;

@@ -54,12 +54,11 @@ std::optional<DatePartRange> dateOutOfRange(const DateTimeFields& fields, bool l
 
 /// Whether all numbers are in their ranges in every year, as all are but a 29th of February.
 constexpr bool areOfEveryYear(const DateTimeFields& fields) noexcept {
-    constexpr std::uint8_t shortest[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
     const auto isBelow = [](std::int64_t number, std::uint64_t end) {
         return static_cast<std::uint64_t>(number) < end;
     };
     return isBelow(fields.year - lowestYear, highestYear - lowestYear + 1) && fields.month - 1 < 12 &&
-           fields.day - 1 < shortest[fields.month - 1] && isBelow(fields.hours, 24) &&
+           fields.day - 1 < shortestMonths[fields.month - 1] && isBelow(fields.hours, 24) &&
            isBelow(fields.minutes, 60) && isBelow(fields.seconds, 60);
 }
 

@@ -3,6 +3,7 @@
 
 #include <kvt/datetime/detail/text.h>
 
+#include <algorithm>
 #include <array>
 #include <cstdint>
 #include <optional>
@@ -40,7 +41,11 @@ inline bool readOffset(std::string_view text, OffsetForm& form) noexcept {
     }
     const int magnitude = hours * minutesPerHour + minutes;
     form.minutes = text.front() == '-' ? -magnitude : magnitude;
-    form.text = {text.front(), body[0], body[1], ':', minuteDigits[0], minuteDigits[1]};
+    if (hasColon) {
+        std::copy_n(text.data(), form.text.size(), form.text.data());
+    } else {
+        form.text = {text.front(), body[0], body[1], ':', minuteDigits[0], minuteDigits[1]};
+    }
     return true;
 }
 

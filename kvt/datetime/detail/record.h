@@ -32,6 +32,7 @@ struct CanonicalRecord {
     bool offsetRepaired = false; ///< the offset was not canonical in the text
     bool lenient = false;
     OffsetForm offset;             ///< of the kinds with an offset only
+    std::string_view text;         ///< all of it, without white space at its ends
     std::string_view digits;       ///< of the date, the time or both
     std::string_view fractionText; ///< digits behind the ".", without zeros at the end
     DateTimeFields fields;         ///< as they are written; 1970-01-01 stands for a date that is not there
@@ -44,6 +45,9 @@ struct CanonicalRecord {
     std::string_view offsetText() const noexcept {
         return hasOffset(type) ? offset.view() : std::string_view();
     }
+    /// The text that was read, if it is what would be written of these numbers; else empty. Only of values that were
+    /// read without `lenient`, whose numbers need no carrying.
+    std::string_view canonicalText() const noexcept;
 };
 
 /// Reads a text. A wrong shape gives a record of type `Unsupported`, in which all else is open; the right shape with
@@ -63,10 +67,13 @@ DateTimeFields carriedFields(const CanonicalRecord& record) noexcept;
 
 /// A value as the answer of a function, before there is a text of it.
 struct ValueAnswer {
+    ValueAnswer() noexcept {} // NOLINT(modernize-use-equals-default): as for a record
+
     ReturnState state = ReturnState::Success;
     TemporalType kind = TemporalType::Unsupported; ///< of the text; it is empty for this one
     DateTimeFields fields;                         ///< within their bounds, but for the year
     std::optional<OffsetForm> offset;              ///< to be written behind the value
+    std::string_view text; ///< if not empty, the text itself, and the numbers play no part
 };
 
 /// Makes the answer the record as it is, of its own kind. The offset is as it was written: "+10:75" stays. In its
@@ -84,12 +91,13 @@ inline ValueAnswer answerOf(const CanonicalRecord& record) noexcept {
 ValueAnswer answerOf(TemporalType kind, const TemporalInstant& instant,
                      ReturnState state = ReturnState::Success) noexcept;
 
-/// A result with the text of these numbers, which is made in its place.
+/// A result with the text of these numbers. Like the one below, it is made in its place.
 TextResult resultOf(ReturnState state, TemporalType kind, const DateTimeFields& fields,
                     const std::optional<OffsetForm>& offset);
 
 inline TextResult resultOf(const ValueAnswer& answer) {
-    return resultOf(answer.state, answer.kind, answer.fields, answer.offset);
+    return answer.text.empty() ? resultOf(answer.state, answer.kind, answer.fields, answer.offset)
+                               : TextResult(answer.state, UStringView<0>(answer.text), std::nullopt);
 }
 
 /// The text alone.

@@ -67,6 +67,9 @@ std::uint64_t digitsValue(std::string_view digits) noexcept;
 /// The nearest double of digits with at most one "." among, before or behind them.
 double decimalValue(std::string_view digits) noexcept;
 
+/// The digits of a fraction of a second that is written.
+inline constexpr std::size_t nanosecondDigits = 9;
+
 /// "." and the digits read as a double, in nanoseconds, rounded half up: 1,000,000,000 for "9999999999".
 std::uint64_t fractionNanoseconds(std::string_view digits) noexcept;
 

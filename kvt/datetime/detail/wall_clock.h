@@ -40,7 +40,8 @@ private:
     }
 };
 
-/// The clock of a record that was read without `lenient`: in UTC where it has an offset, else as it is written.
-WallClock utcClock(const CanonicalRecord& record) noexcept;
+/// Makes the clock that of a record that was read without `lenient`: in UTC where it has an offset, else as it is
+/// written. In its place, since a copy of what was just written has to wait for it.
+void setUtcClock(WallClock& clock, const CanonicalRecord& record) noexcept;
 
 } // namespace kvt::ex::datetime::detail
