@@ -27,6 +27,18 @@ TEST(Trimmed, TakesSixCharactersFromBothEnds) {
     EXPECT_EQ(trimmed(std::string_view("\0x", 2)), std::string_view("\0x", 2));
 }
 
+TEST(CountDigits, StopsAtTheFirstByteThatIsNone) {
+    EXPECT_EQ(countDigits(""), 0u);
+    for (std::size_t digits = 0; digits < 20; ++digits) {
+        for (int byte = 0; byte < 256; ++byte) {
+            const bool isDigit = byte >= '0' && byte <= '9';
+            const std::string text =
+                std::string(digits, '9') + static_cast<char>(byte) + std::string("0123456789abcdef");
+            EXPECT_EQ(countDigits(text), isDigit ? digits + 11 : digits) << digits << " and " << byte;
+        }
+    }
+}
+
 TEST(FractionNanoseconds, IsThatOfTheNearestDouble) {
     std::mt19937_64 random(15);
     for (int i = 0; i < 200'000; ++i) {

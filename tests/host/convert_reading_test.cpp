@@ -227,7 +227,10 @@ TEST_F(KvtConvertReading, TransliterationWritesWhatTheTargetHas) {
     EXPECT_EQ(convert("UTF-8", "IBM037", "\u0436", transliterate).out, "\xa9");
     EXPECT_EQ(convert("UTF-8", "ISO-2022-JP", "\u3042\u0142\u3042", transliterate).out,
               "\x1b$B$\"\x1b(Bl\x1b$B$\"\x1b(B");
-    EXPECT_EQ(convert("UTF-8", "US-ASCII", "a\xff\u0142", transliterate).out, "a?l");
+    const ChildResult withBadInput = convert("UTF-8", "US-ASCII", "a\xff\u0142", transliterate);
+    EXPECT_EQ(withBadInput.out, "a?l");
+    EXPECT_EQ(withBadInput.err.rfind("kvt: 2 losses from UTF-8 to US-ASCII, 2 different:\n", 0), 0u)
+        << withBadInput.err;
     EXPECT_EQ(convert("UTF-8", "UTF-16LE", "\u0142", transliterate).status, 0);
     expectTheSameInPieces("UTF-8", "US-ASCII", "\u0141\u00f3d\u017a \xff\u2026\n\U0001F600", transliterate);
 }
