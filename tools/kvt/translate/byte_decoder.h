@@ -1,5 +1,5 @@
 // From an encoding of one byte a character straight to UTF-8, by a table that StreamTranscoder was asked for: ASCII in
-// pieces of 16 bytes, and each other byte by its row.
+// pieces of 64 bytes, and each other byte by its row.
 #pragma once
 
 #include <kvt/encoding/encoding.h>

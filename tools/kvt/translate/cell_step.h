@@ -19,25 +19,32 @@ public:
     }
     // Cells without a text have nothing that could be translated, and those that have failed are left alone.
     bool apply(RowCells& row) final {
-        if (!row.hasFailed(slot_)) {
-            const std::string_view text = row.text(slot_);
-            if (!text.empty()) {
-                applyTo(text, row);
-            }
+        const std::string_view text = row.textToTranslate(slot_);
+        if (!text.empty()) {
+            applyTo(text, row);
         }
         return true;
     }
+    std::size_t slot() const { return slot_; }
 
 protected:
-    /// `text` is that of the cell. Calls set() or fail(), or neither.
+    /// `text` is that of the cell. Calls one of those below, or none.
     virtual void applyTo(std::string_view text, RowCells& row) = 0;
 
+    // The text stays until the next row, or:
     void set(RowCells& row, std::string_view text) const { row.set(slot_, text); }
+    void change(RowCells& row, std::string_view text) const { row.change(slot_, text); }
+    /// For a text that does not.
+    void keep(RowCells& row, std::string_view text) {
+        kept_ = text;
+        row.set(slot_, kept_);
+    }
     void fail(RowCells& row, Problem problem) const { row.fail(slot_, column_, std::move(problem)); }
 
 private:
     std::string column_;
     std::size_t slot_ = 0;
+    std::string kept_;
 };
 
 } // namespace host

@@ -189,22 +189,24 @@ DateReader::Form DateReader::makeForm(const std::string& typed) const {
         form.fixed = FixedDateForm::toRead(hasEnd ? std::string_view(pattern).substr(0, pattern.size() - 1)
                                                   : std::string_view(pattern));
     }
+    if (form.fixed) {
+        form.canonical.emplace(form.fixed->canonical());
+    }
     return form;
 }
 
-bool DateReader::read(std::string_view text, std::string& out, Problem& problem) {
+bool DateReader::read(std::string_view text, std::string_view& out, Problem& problem) {
     const bool isOnly = forms_.size() == 1;
     Misfit best;
-    for (const Form& form : forms_) {
-        if ((form.fixed && form.fixed->read(text, out)) ||
-            readBy(form, text, out, isOnly ? &best : nullptr)) {
+    for (Form& form : forms_) {
+        if (readBy(form, text, out, isOnly ? &best : nullptr)) {
             return true;
         }
     }
     // Why is asked when nothing fits.
     for (auto form = forms_.begin(); !isOnly && form != forms_.end(); ++form) {
         Misfit misfit;
-        readBy(*form, text, out, &misfit);
+        readByLibrary(*form, text, out, &misfit);
         if (misfit.fit > best.fit || form == forms_.begin()) {
             best = std::move(misfit);
         }
@@ -213,7 +215,16 @@ bool DateReader::read(std::string_view text, std::string& out, Problem& problem)
     return false;
 }
 
-bool DateReader::readBy(const Form& form, std::string_view text, std::string& out, Misfit* misfit) {
+bool DateReader::readBy(Form& form, std::string_view text, std::string_view& out, Misfit* misfit) {
+    if (form.fixed && form.canonical->take(text, *form.fixed)) {
+        out = form.canonical->view();
+        return true;
+    }
+    return readByLibrary(form, text, out, misfit);
+}
+
+bool DateReader::readByLibrary(const Form& form, std::string_view text, std::string_view& out,
+                               Misfit* misfit) {
     if (form.isRewritten) {
         const std::string trimmed = withoutBlanks(text);
         if (const auto place = rewrite(form.typed, trimmed)) {
@@ -235,7 +246,7 @@ bool DateReader::readBy(const Form& form, std::string_view text, std::string& ou
         }
         return false;
     }
-    out.assign(canonical.rawData(), canonical.size());
+    out = canonical_.assign(canonical.rawData(), canonical.size());
     return true;
 }
 

@@ -43,15 +43,19 @@ public:
     /// language, months have English names. Throws Failure.
     DateReader(const std::string& formats, const std::string& pivot, const std::string& language);
 
-    /// The canonical text in `out`. False, with the problem by the form that fits best, where none fits.
-    bool read(std::string_view text, std::string& out, Problem& problem);
+    /// The canonical text in `out`, valid until the next one is read. False, with the problem by the form that fits best,
+    /// where none fits.
+    bool read(std::string_view text, std::string_view& out, Problem& problem);
+    /// The first form, by which a text is read that fits it, if it has a fixed length.
+    const std::optional<FixedDateForm>& fixedForm() const { return forms_.front().fixed; }
 
 private:
     struct Form {
         std::string typed;
         kvt::ex::UString<0> format; ///< as the library gets it
         std::optional<FixedDateForm> fixed;
-        bool isRewritten = false; ///< texts become such as the library reads
+        std::optional<FixedDateText> canonical; ///< of texts in the fixed form
+        bool isRewritten = false;               ///< texts become such as the library reads
     };
 
     /// Why a form does not fit, and how much of it does.
@@ -61,7 +65,8 @@ private:
     };
 
     Form makeForm(const std::string& typed) const;
-    bool readBy(const Form& form, std::string_view text, std::string& out, Misfit* misfit);
+    bool readBy(Form& form, std::string_view text, std::string_view& out, Misfit* misfit);
+    bool readByLibrary(const Form& form, std::string_view text, std::string_view& out, Misfit* misfit);
     std::optional<std::size_t> rewrite(std::string_view pattern, std::string_view text);
 
     std::vector<Form> forms_;
@@ -69,6 +74,7 @@ private:
     std::optional<MonthNames> months_;
     kvt::ex::UString<0> value_;
     std::string rewritten_;
+    std::string canonical_;
 };
 
 } // namespace host

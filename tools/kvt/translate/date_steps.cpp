@@ -17,26 +17,6 @@ namespace {
 namespace datetime = kvt::ex::datetime;
 using kvt::ex::UString;
 
-class DateStep : public CellStep {
-public:
-    DateStep(std::string column, DateReader reader)
-        : CellStep(std::move(column)), reader_(std::move(reader)) {}
-
-protected:
-    void applyTo(std::string_view text, RowCells& row) override {
-        Problem problem;
-        if (reader_.read(text, canonical_, problem)) {
-            set(row, canonical_);
-        } else {
-            fail(row, std::move(problem));
-        }
-    }
-
-private:
-    DateReader reader_;
-    std::string canonical_;
-};
-
 // What the functions on canonical values share.
 class CanonicalStep : public CellStep {
 public:
@@ -53,7 +33,7 @@ protected:
     void take(const datetime::TextResult& result, RowCells& row) {
         const UString<0>& text = std::get<1>(result);
         if (std::get<0>(result) == datetime::ReturnState::Success && !text.isEmpty()) {
-            set(row, {text.rawData(), text.size()});
+            keep(row, {text.rawData(), text.size()});
         } else {
             take(outcomeOf(result), row);
         }
@@ -61,7 +41,7 @@ protected:
 
     void take(const DateOutcome& outcome, RowCells& row) {
         if (outcome.isGood()) {
-            set(row, resultText(outcome));
+            keep(row, resultText(outcome));
         } else {
             fail(row, {outcome.message ? outcome.message->number : 0, failureSentence(outcome)});
         }
@@ -75,12 +55,21 @@ class WriteDateStep : public CanonicalStep {
 public:
     WriteDateStep(std::string column, const std::string& format)
         : CanonicalStep(std::move(column)), format_(toUString(format)),
-          fixed_(FixedDateForm::toWrite(format)) {}
+          fixed_(FixedDateForm::toWrite(format)) {
+        if (fixed_) {
+            written_.emplace(*fixed_);
+        }
+    }
+
+    const std::optional<FixedDateForm>& fixedForm() const { return fixed_; }
 
 protected:
     void applyTo(std::string_view text, RowCells& row) override {
-        if (fixed_ && fixed_->write(text, written_)) {
-            set(row, written_);
+        const FixedDateForm& form = text.size() == FixedDateForm::canonicalDate().length()
+                                        ? FixedDateForm::canonicalDate()
+                                        : FixedDateForm::canonicalDateTime();
+        if (written_ && written_->take(text, form)) {
+            set(row, written_->view());
         } else {
             take(datetime::format(valueOf(text), format_), row);
         }
@@ -89,7 +78,63 @@ protected:
 private:
     UString<0> format_;
     std::optional<FixedDateForm> fixed_;
-    std::string written_;
+    std::optional<FixedDateText> written_;
+};
+
+// Nearly all texts are in one form of a fixed length, and become at once what they are to be: canonical, or, where the
+// next step writes the date, what that makes of it.
+class DateStep : public CellStep {
+public:
+    DateStep(std::string column, DateReader reader)
+        : CellStep(std::move(column)), reader_(std::move(reader)), fixed_(reader_.fixedForm()) {
+        if (fixed_) {
+            atOnce_.emplace(fixed_->canonical());
+            isChanging_ = !fixed_->isCanonical();
+        }
+    }
+
+    bool takeOver(std::unique_ptr<Step>& next) override {
+        auto* const writer = dynamic_cast<WriteDateStep*>(next.get());
+        if (writer_ || writer == nullptr || writer->slot() != slot()) {
+            return false;
+        }
+        next.release();
+        writer_.reset(writer);
+        atOnce_.reset();
+        if (fixed_ && writer->fixedForm()) {
+            atOnce_.emplace(*writer->fixedForm());
+        }
+        return true;
+    }
+
+protected:
+    void applyTo(std::string_view text, RowCells& row) override {
+        if (atOnce_ && atOnce_->take(text, *fixed_)) {
+            if (isChanging_) {
+                change(row, atOnce_->view());
+            } else {
+                set(row, atOnce_->view());
+            }
+            return;
+        }
+        Problem problem;
+        std::string_view canonical;
+        if (reader_.read(text, canonical, problem)) {
+            set(row, canonical);
+        } else {
+            fail(row, std::move(problem));
+        }
+        if (writer_) {
+            writer_->apply(row);
+        }
+    }
+
+private:
+    DateReader reader_;
+    std::optional<FixedDateForm> fixed_;
+    std::optional<FixedDateText> atOnce_;
+    bool isChanging_ = false; ///< a text in the fixed form is another one than the canonical text
+    std::unique_ptr<WriteDateStep> writer_;
 };
 
 class AddStep : public CanonicalStep {

@@ -25,7 +25,7 @@ std::optional<FixedDateForm> FixedDateForm::of(std::string_view pattern) {
         // "." behind seconds is the beginning of a fraction.
         const bool isPlain = element.size() == 1 && element[0] >= ' ' && element[0] < 127 &&
                              element.find_first_of("$*?%") != 0 && !(element == "." && isBehindSeconds);
-        const std::size_t width = !isFlag ? 1 : widthOf(part);
+        const std::size_t width = !isFlag ? 1 : part == Year ? 4 : 2;
         if ((isFlag ? form.given_[part] : !isPlain) || form.length_ + width > longest) {
             return std::nullopt;
         }
@@ -39,6 +39,16 @@ std::optional<FixedDateForm> FixedDateForm::of(std::string_view pattern) {
             form.room_[form.length_] = isFlag ? anyDigit : itself;
         }
     }
+    return form;
+}
+
+const FixedDateForm& FixedDateForm::canonicalDate() {
+    static const FixedDateForm form = *of("%Y%m%d");
+    return form;
+}
+
+const FixedDateForm& FixedDateForm::canonicalDateTime() {
+    static const FixedDateForm form = *of("%Y%m%d%H%M%S");
     return form;
 }
 
@@ -83,6 +93,12 @@ inline bool FixedDateForm::fitsShape(const char* text) const {
     return wrong == 0;
 }
 
+static unsigned daysOf(unsigned year, unsigned month) {
+    static constexpr std::array<unsigned char, 12> days = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    const bool isLeap = year % 4 == 0 && (year % 100 != 0 || year % 400 == 0);
+    return days[month - 1] + (isLeap && month == 2 ? 1U : 0U);
+}
+
 // Whether it is a date in this form, and perhaps a time, that there is.
 inline bool FixedDateForm::isValid(std::string_view text) const {
     if (text.size() != length_ || !fitsShape(text.data())) {
@@ -92,43 +108,32 @@ inline bool FixedDateForm::isValid(std::string_view text) const {
         return static_cast<unsigned>(text[at] - '0') * 10 + static_cast<unsigned>(text[at + 1] - '0');
     };
     const auto number = [&](Part part) { return given_[part] ? pairAt(places_[part]) : 0; };
-    static constexpr std::array<unsigned char, 12> days = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    const unsigned year = pairAt(places_[Year]) * 100 + pairAt(places_[Year] + std::size_t{2});
+    if (given_[Hour] && (number(Hour) > 23 || number(Minute) > 59 || number(Second) > 59)) {
+        return false;
+    }
+    const std::size_t year = places_[Year]; // from 1000
     const unsigned month = pairAt(places_[Month]);
-    if (year < 1000 || month - 1 > 11 || number(Hour) > 23 || number(Minute) > 59 || number(Second) > 59) {
+    const unsigned day = pairAt(places_[Day]);
+    if (text[year] == '0' || month - 1 > 11 || day - 1 > 30) {
         return false;
     }
-    const bool isLeap = year % 4 == 0 && (year % 100 != 0 || year % 400 == 0);
-    const unsigned most = days[month - 1] + (isLeap && month == 2 ? 1U : 0U);
-    return pairAt(places_[Day]) - 1 < most;
+    return day <= 28 || day <= daysOf(pairAt(year) * 100 + pairAt(year + 2), month);
 }
 
-bool FixedDateForm::read(std::string_view text, std::string& out) const {
-    if (!isValid(text)) {
+bool FixedDateText::take(std::string_view text, const FixedDateForm& from) {
+    using Form = FixedDateForm;
+    if ((form_.hasTime() && !from.given_[Form::Hour]) || !from.isValid(text)) {
         return false;
     }
-    out.resize(given_[Hour] ? 14 : 8);
-    std::memcpy(out.data(), text.data() + places_[Year], 4);
-    std::memcpy(out.data() + 4, text.data() + places_[Month], 2);
-    std::memcpy(out.data() + 6, text.data() + places_[Day], 2);
-    for (std::size_t part = Hour; given_[Hour] && part <= Second; ++part) {
-        std::memcpy(out.data() + 8 + 2 * (part - Hour), given_[part] ? text.data() + places_[part] : "00", 2);
+    if (form_.given_[Form::Year]) {
+        std::memcpy(text_.data() + form_.places_[Form::Year], text.data() + from.places_[Form::Year], 4);
     }
-    return true;
-}
-
-bool FixedDateForm::write(std::string_view canonical, std::string& out) const {
-    static const FixedDateForm date = *toRead("%Y%m%d");
-    static const FixedDateForm dateTime = *toRead("%Y%m%d%H%M%S");
-    const FixedDateForm& form = canonical.size() == date.length_ ? date : dateTime;
-    const bool needsTime = given_[Hour] || given_[Minute] || given_[Second];
-    if ((needsTime && &form == &date) || !form.isValid(canonical)) {
-        return false;
-    }
-    out.assign(expected_.data(), length_);
-    for (std::size_t part = Year; part < (needsTime ? partCount : std::size_t{Hour}); ++part) {
-        if (given_[part]) {
-            std::memcpy(out.data() + places_[part], canonical.data() + form.places_[part], widthOf(part));
+    const std::size_t end = form_.hasTime() ? Form::partCount : std::size_t{Form::Hour};
+    for (std::size_t part = Form::Month; part < end; ++part) {
+        if (form_.given_[part]) {
+            // What is not said of a time is zero.
+            std::memcpy(text_.data() + form_.places_[part],
+                        from.given_[part] ? text.data() + from.places_[part] : "00", 2);
         }
     }
     return true;

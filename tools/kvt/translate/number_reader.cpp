@@ -6,7 +6,6 @@
 #include "translate/icu_data.h"
 
 #include <algorithm>
-#include <array>
 
 namespace host {
 
@@ -115,17 +114,16 @@ NumberReader::NumberReader(const std::string& language) {
 }
 
 // Nearly all numbers: perhaps a minus, one to three digits, groups of three, a fraction. False is no answer.
-bool NumberReader::readPlain(std::string_view text, std::string& out) const {
+bool NumberReader::readPlain(std::string_view text, std::string_view& number) {
     const char* at = text.data();
     const char* const end = at + text.size();
     const bool isNegative = at != end && *at == '-';
     at += isNegative ? 1 : 0;
     const bool isBelowOne = end - at >= 2 && *at == '0' && at[1] == plainDecimal_ && !isNegative;
-    std::array<char, 64> digits;
-    if (at == end || text.size() > digits.size() || ((*at < '1' || *at > '9') && !isBelowOne)) {
+    if (at == end || text.size() > plain_.size() || ((*at < '1' || *at > '9') && !isBelowOne)) {
         return false;
     }
-    char* to = digits.data();
+    char* to = plain_.data();
     *to = '-';
     to += isNegative ? 1 : 0;
     const char* const first = at;
@@ -145,14 +143,20 @@ bool NumberReader::readPlain(std::string_view text, std::string& out) const {
             *to++ = *at;
         }
     }
-    out.assign(digits.data(), to);
+    number = {plain_.data(), static_cast<std::size_t>(to - plain_.data())};
     return at == end;
 }
 
-bool NumberReader::read(std::string_view text, std::string& out) const {
-    if (readPlain(text, out)) {
+bool NumberReader::read(std::string_view text, std::string_view& number) {
+    if (readPlain(text, number)) {
         return true;
     }
+    const bool isNumber = readAny(text, number_);
+    number = number_;
+    return isNumber;
+}
+
+bool NumberReader::readAny(std::string_view text, std::string& out) const {
     bool isNegative = false;
     if (text.empty() || !isDigit(text.front()) || !isDigit(text.back())) {
         int signs = 0;

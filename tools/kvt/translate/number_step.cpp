@@ -12,8 +12,9 @@ public:
 
 protected:
     void applyTo(std::string_view text, RowCells& row) override {
-        if (reader_.read(text, number_)) {
-            set(row, number_);
+        std::string_view number;
+        if (reader_.read(text, number)) {
+            set(row, number);
         } else {
             fail(row, makeProblem(problem_number::notANumber, {std::string(text), language_}));
         }
@@ -22,7 +23,6 @@ protected:
 private:
     std::string language_;
     NumberReader reader_;
-    std::string number_;
 };
 
 } // namespace

@@ -67,8 +67,11 @@ Plan::Plan(const Job& wanted)
 std::vector<std::unique_ptr<Step>> Plan::start(Layout& layout) const {
     std::vector<std::unique_ptr<Step>> steps;
     for (const JobStep& step : job.steps) {
-        steps.push_back(startStep(step, job.zoneDatabase));
-        steps.back()->bind(layout);
+        std::unique_ptr<Step> started = startStep(step, job.zoneDatabase);
+        started->bind(layout);
+        if (steps.empty() || !steps.back()->takeOver(started)) {
+            steps.push_back(std::move(started));
+        }
     }
     return steps;
 }

@@ -1,9 +1,8 @@
-// The cells of one row on their way through the steps. A cell stays a view of the text that was read until a step
-// gives it another text. Steps that cannot do their work say so by fail(); the cell is then out of their reach.
+// The cells of one row on their way through the steps. A cell is a view: of the text that was read, until a step gives it
+// another text, which the step keeps for as long as the row is there. Steps that cannot do their work say so by fail(); the cell is then out of their reach.
 #pragma once
 
 #include "translate/cell_text.h"
-#include "translate/cell_value.h"
 #include "translate/problem.h"
 #include "translate/row_reader.h"
 
@@ -36,22 +35,20 @@ struct CellFailure {
 class RowCells {
 public:
     RowCells(const RowForm& form, OnCellError onError, std::size_t slotCount)
-        : form_(form), onError_(onError), states_(slotCount), values_(slotCount), unquoted_(slotCount) {}
+        : form_(form), onError_(onError), cells_(slotCount), unquoted_(slotCount) {}
 
     /// A row begins. `row` outlives the use of its cells.
     void begin(const RowReader& row) {
         row_ = &row;
-        for (const std::size_t slot : touched_) {
-            states_[slot] = State::AsItStood;
-        }
-        touched_.clear();
+        ++number_;
+        changedCount_ = 0;
         failures_.clear();
     }
 
     /// Whether the cell is the one that was read.
     bool isAsItStood(std::size_t slot) const {
-        return states_[slot] == State::AsItStood ||
-               (states_[slot] == State::FailedAndKept && slot < row_->cellCount());
+        const State state = stateOf(slot);
+        return state == State::AsItStood || (state == State::FailedAndKept && isOfInput(slot));
     }
     /// Whether it is a cell of the input, and not one that was made.
     bool isOfInput(std::size_t slot) const { return slot < row_->cellCount(); }
@@ -60,35 +57,55 @@ public:
 
     /// Valid until the cell gets another one.
     std::string_view text(std::size_t slot) {
-        return states_[slot] == State::AsItStood ? textOfInput(slot) : values_[slot].text();
+        return stateOf(slot) == State::AsItStood ? textOfInput(slot) : cells_[slot].text;
     }
-    /// The text may be a view of this cell.
+    /// What a step has to translate: nothing of a cell that has failed.
+    std::string_view textToTranslate(std::size_t slot) {
+        const State state = stateOf(slot);
+        return state == State::AsItStood ? textOfInput(slot)
+               : state == State::Changed ? cells_[slot].text
+                                         : std::string_view();
+    }
+    /// The text has to stay until the next row; it may be a view of this cell.
     void set(std::size_t slot, std::string_view text) {
-        const bool isSame = states_[slot] == State::AsItStood && isOfInput(slot) && text == textOfInput(slot);
-        if (!isSame) {
-            values_[slot].assign(text);
-            touch(slot, State::Changed);
+        if (stateOf(slot) != State::AsItStood || !isOfInput(slot) || text != textOfInput(slot)) {
+            change(slot, text);
         }
     }
+    /// The same for a text that is another one, or was in between.
+    void change(std::size_t slot, std::string_view text) { become(slot, State::Changed, text); }
     void fail(std::size_t slot, const std::string& column, Problem problem);
     /// Steps pass over a cell that has failed.
     bool hasFailed(std::size_t slot) const {
-        return states_[slot] == State::FailedAndKept || states_[slot] == State::FailedAndEmpty;
+        const State state = stateOf(slot);
+        return state == State::FailedAndKept || state == State::FailedAndEmpty;
     }
 
     /// Of this row.
     const std::vector<CellFailure>& failures() const { return failures_; }
     /// How many cells have another text than they had.
-    std::size_t changedCount() const {
-        std::size_t count = 0;
-        for (const std::size_t slot : touched_) {
-            count += states_[slot] == State::Changed || states_[slot] == State::FailedAndEmpty ? 1 : 0;
-        }
-        return count;
-    }
+    std::size_t changedCount() const { return changedCount_; }
 
 private:
     enum class State : std::uint8_t { AsItStood, Changed, FailedAndKept, FailedAndEmpty };
+
+    /// What became of a cell in one row. In any other row, it is as it stood.
+    struct Cell {
+        std::uint64_t row = 0;
+        State state = State::AsItStood;
+        std::string_view text;
+    };
+
+    State stateOf(std::size_t slot) const {
+        return cells_[slot].row == number_ ? cells_[slot].state : State::AsItStood;
+    }
+    static std::size_t countOf(State state) {
+        return state == State::Changed || state == State::FailedAndEmpty ? 1 : 0;
+    }
+    void become(std::size_t slot, State state, std::string_view text) {
+        changedCount_ += countOf(state) - countOf(stateOf(slot));
+        cells_[slot] = {number_, state, text};
+    }
 
     std::string_view textOfInput(std::size_t slot) {
         if (slot >= row_->cellCount()) {
@@ -97,20 +114,14 @@ private:
         const std::string_view cell = row_->cell(slot);
         return cell.empty() || cell.front() != form_.quote ? cell : textOfCell(cell, form_, unquoted_[slot]);
     }
-    void touch(std::size_t slot, State state) {
-        if (states_[slot] == State::AsItStood) {
-            touched_.push_back(slot);
-        }
-        states_[slot] = state;
-    }
 
     RowForm form_;
     OnCellError onError_;
     const RowReader* row_ = nullptr;
-    std::vector<State> states_;
-    std::vector<CellValue> values_;
+    std::uint64_t number_ = 0; ///< of the row, from 1
+    std::vector<Cell> cells_;
     std::vector<std::string> unquoted_;
-    std::vector<std::size_t> touched_;
+    std::size_t changedCount_ = 0;
     std::vector<CellFailure> failures_;
 };
 

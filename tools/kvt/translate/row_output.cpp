@@ -9,6 +9,21 @@ namespace {
 // So many bytes are copied at once, however few there are: what stands between two cells that change is mostly shorter.
 constexpr std::size_t slack = 64;
 
+// The same as memcpy. Most texts of cells are short, as dates and numbers are, and are copied without a call; then, the
+// same bytes may be written twice.
+inline void copyText(char* to, std::string_view from) {
+    const std::size_t size = from.size();
+    if (size >= 8 && size <= 16) {
+        std::memcpy(to, from.data(), 8);
+        std::memcpy(to + size - 8, from.data() + size - 8, 8);
+    } else if (size >= 4 && size < 8) {
+        std::memcpy(to, from.data(), 4);
+        std::memcpy(to + size - 4, from.data() + size - 4, 4);
+    } else if (size != 0) {
+        std::memcpy(to, from.data(), size);
+    }
+}
+
 } // namespace
 
 RowOutput::RowOutput(const Plan& plan, const Layout& layout)
@@ -25,9 +40,13 @@ RowOutput::RowOutput(const Plan& plan, const Layout& layout)
             stretches_.push_back({column.slot, column.slot, isCopied});
         }
     }
-    const Stretch& first = stretches_.front();
-    keepsRows_ = stretches_.size() == 1 && first.isCopied && first.first == 0 &&
-                 first.last + 1 == layout.inputCount() && lineEnds_ == RowEnds::Keep;
+    keepsRows_ = keepsForm_ && lineEnds_ == RowEnds::Keep && layout.columns().size() == layout.inputCount();
+    for (std::size_t slot = 0; keepsRows_ && slot < layout.inputCount(); ++slot) {
+        keepsRows_ = layout.columns()[slot].slot == slot;
+        if (layout.isChanging(slot)) {
+            changing_.push_back(slot);
+        }
+    }
 }
 
 void RowOutput::begin(std::string& room, std::string_view text) {
@@ -112,15 +131,7 @@ inline void RowOutput::putCell(RowCells& cells, std::size_t slot) {
             return;
         }
     }
-    flush();
-    const std::string_view text = cells.text(slot);
-    if (quoteAll_ || needsQuotes_(text)) {
-        quoted_.clear();
-        appendQuoted(quoted_, text, out_);
-        append(quoted_);
-    } else {
-        append(text);
-    }
+    putText(cells.text(slot));
     if (!isAsItStood && cells.isOfInput(slot)) {
         // What stands behind the cell may be what is written next.
         const std::string_view cell = cells.asItStood(slot);
@@ -128,12 +139,33 @@ inline void RowOutput::putCell(RowCells& cells, std::size_t slot) {
     }
 }
 
+inline void RowOutput::putText(std::string_view text) {
+    flush();
+    if (quoteAll_ || needsQuotes_(text)) {
+        quoted_.clear();
+        appendQuoted(quoted_, text, out_);
+        append(quoted_);
+    } else {
+        append(text);
+    }
+}
+
 void RowOutput::write(RowCells& cells, const RowReader& row, bool needsLineEnd) {
-    if (keepsRows_ && !row.lineEnd().empty()) {
-        copy(row.row().data(), row.lineEnd().data() + row.lineEnd().size());
+    if (!keepsRows_) {
+        writeAs(stretches_, cells, row, needsLineEnd);
         return;
     }
-    writeAs(stretches_, cells, row, needsLineEnd);
+    const char* place = row.row().data();
+    for (const std::size_t slot : changing_) {
+        if (!cells.isAsItStood(slot)) {
+            const std::string_view cell = cells.asItStood(slot);
+            copy(place, cell.data());
+            putText(cells.text(slot));
+            place = runBegin_ = runEnd_ = cell.data() + cell.size();
+        }
+    }
+    copy(place, row.row().data() + row.row().size());
+    putLineEnd(row, needsLineEnd);
 }
 
 void RowOutput::writeEachCell(RowCells& cells, const RowReader& row, bool needsLineEnd) {

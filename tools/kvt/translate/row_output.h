@@ -43,6 +43,7 @@ private:
     void put(char byte);
     void flush();
     void putCell(RowCells& cells, std::size_t slot);
+    void putText(std::string_view text);
     void writeAs(const std::vector<Stretch>& stretches, RowCells& cells, const RowReader& row,
                  bool needsLineEnd);
     void putLineEnd(const RowReader& row, bool needsLineEnd);
@@ -53,7 +54,8 @@ private:
     bool keepsForm_; ///< cells are written with the quotes that they had
     RowEnds lineEnds_;
     bool quoteAll_;
-    bool keepsRows_ = false; ///< rows are written as they were read
+    bool keepsRows_;                    ///< rows are written as they were read, but for the cells that change
+    std::vector<std::size_t> changing_; ///< their slots
     std::vector<Stretch> stretches_;
     std::vector<Stretch> eachCell_;
     std::string* room_ = nullptr; ///< longer than what is written

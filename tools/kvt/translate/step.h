@@ -21,6 +21,12 @@ public:
     virtual void bind(Layout& layout) = 0;
     /// Does its work on a row; false where the row is not wanted.
     virtual bool apply(RowCells& row) = 0;
+    /// Does the work of the step behind it from now on, too, if that saves something; both are bound. False where `next`
+    /// stays a step of its own.
+    virtual bool takeOver(std::unique_ptr<Step>& next) {
+        static_cast<void>(next);
+        return false;
+    }
 };
 
 /// The arguments of a step, looked up by name.

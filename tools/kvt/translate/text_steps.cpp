@@ -68,7 +68,7 @@ protected:
                                                               : Utf8String::getAsFoldedCase(view);
         // Where the mapping shrinks, zeros fill it up; the cell itself has none.
         const std::string_view all(changed.rawData(), changed.size());
-        set(row, all.substr(0, all.find('\0')));
+        keep(row, all.substr(0, all.find('\0')));
     }
 
 private:
@@ -97,7 +97,7 @@ protected:
             found = isOneOf([&](const std::string& one) { return text.ends_with(one); });
             text.remove_suffix(found == characters_.end() ? 0 : found->size());
         }
-        set(row, std::string(text));
+        set(row, text);
     }
 
 private:
@@ -112,7 +112,7 @@ public:
 protected:
     void applyTo(std::string_view text, RowCells& row) override {
         if (!std::all_of(text.begin(), text.end(), isAscii)) {
-            set(row, normalizer_->normalized(text));
+            keep(row, normalizer_->normalized(text));
         }
     }
 
