@@ -120,13 +120,24 @@ void StreamTranscoder::Impl::goShortWay(std::string_view& block, std::string& ou
 // As far as ICU need not be asked, for losses either.
 void StreamTranscoder::Impl::goOn(std::string_view& block, std::string& out, const LossHandler& onLoss) {
     const std::string_view before = block;
-    do {
-        const std::size_t taken = detail::isUnicode(toSide_.form)
-                                      ? detail::convertPrefix(fromSide_, toSide_, block, out)
-                                      : convertLossy(block, out, onLoss);
-        position_ += taken;
-        block.remove_prefix(taken);
-    } while (!block.empty() && loseMalformed(block, out, onLoss));
+    const auto take = [&](std::size_t bytes) {
+        position_ += bytes;
+        block.remove_prefix(bytes);
+    };
+    for (bool isBehindLoss = false;; isBehindLoss = true) {
+        // Losses come in clusters.
+        if (isBehindLoss) {
+            take(detail::convertFew(fromSide_, toSide_, block, out));
+        }
+        if (loseMalformed(block, out, onLoss)) {
+            continue;
+        }
+        take(detail::isUnicode(toSide_.form) ? detail::convertPrefix(fromSide_, toSide_, block, out)
+                                             : convertLossy(block, out, onLoss));
+        if (!loseMalformed(block, out, onLoss)) {
+            break;
+        }
+    }
     keepRecent(before.substr(0, before.size() - block.size()));
     characterBegin_ = position_;
 }

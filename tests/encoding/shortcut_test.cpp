@@ -21,6 +21,7 @@
 namespace kvt::test {
 namespace {
 
+using kvt::ex::detail::convertFew;
 using kvt::ex::detail::convertPrefix;
 using kvt::ex::detail::Form;
 using kvt::ex::detail::Side;
@@ -287,6 +288,35 @@ TEST(Shortcut, AllUtf8LeadsAndTrailsAreReadAsIcuReadsThem) {
             }
         }
     }
+}
+
+// Between losses: as much as convertPrefix() takes, but no more than begins in sixteen bytes.
+TEST(Shortcut, AFewCharactersAreThoseOfAPrefix) {
+    std::mt19937_64 random(13);
+    const std::vector<std::string> pieces = {"a",      "bcd",      "0123456789", "\u00e9",     "\u07ff",
+                                             "\u4e2d", "\uffff",   "\U00010000", "\U0010ffff", "\xff",
+                                             "\xc3",   "\xe4\xb8", "\xed\xa0",   "\x80",       "\xf4\x90"};
+    for (const Form to : {Form::utf8, kvt::ex::detail::nativeUtf16, kvt::ex::detail::nativeUtf32}) {
+        for (int round = 0; round < 20000; ++round) {
+            std::string text;
+            for (std::size_t count = random() % 12; count > 0; --count) {
+                text += pieces[random() % (random() % 3 == 0 ? pieces.size() : 9)];
+            }
+            std::string whole;
+            const std::size_t prefix = convertPrefix(Side{Form::utf8}, Side{to}, text, whole);
+            std::string out = "x";
+            const std::size_t taken = convertFew(Side{Form::utf8}, Side{to}, text, out);
+            ASSERT_GE(taken, std::min<std::size_t>(prefix, 16)) << hex(text);
+            ASSERT_LE(taken, prefix) << hex(text);
+            std::string expected = "x";
+            ASSERT_EQ(convertPrefix(Side{Form::utf8}, Side{to}, text.substr(0, taken), expected), taken);
+            ASSERT_EQ(hex(out), hex(expected)) << hex(text);
+        }
+    }
+    std::string out;
+    EXPECT_EQ(convertFew(Side{Form::utf8}, Side{Form::asciiCompatible}, "abc", out), 0U);
+    EXPECT_EQ(convertFew(Side{kvt::ex::detail::nativeUtf16}, Side{Form::utf8}, "a", out), 0U);
+    EXPECT_EQ(out, "");
 }
 
 TEST(Shortcut, AllCodePointsKeepTheirNumberOnAllWays) {

@@ -145,7 +145,7 @@ TEST(StreamDifferential, EachBadSequenceOfUtf8) {
     // The border of each kind of byte, so of each range that a byte behind another one may be in.
     const std::string_view bytes(
         "\x41\x80\x8F\x90\x9F\xA0\xBF\xC1\xC2\xDF\xE0\xE1\xED\xEF\xF0\xF1\xF4\xF5\xFF");
-    for (const std::string to : {"UTF-16LE", "windows-1252", "US-ASCII"}) {
+    for (const std::string to : {"UTF-16LE", "UTF-16BE", "UTF-32LE", "windows-1252", "US-ASCII"}) {
         std::string text;
         for (const char first : bytes) {
             for (const char second : bytes) {

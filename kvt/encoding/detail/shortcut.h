@@ -38,6 +38,11 @@ Side sideOf(Encoding encoding);
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
 
+/// Converts the first characters of UTF-8 to another Unicode form, one by one: as many as begin in the first few bytes, up
+/// to one that is not well-formed and complete. That is faster than registers where a text has bad bytes everywhere.
+/// Returns the bytes taken, 0 for other forms.
+std::size_t convertFew(Side from, Side to, std::string_view in, std::string& out);
+
 /// Is given a character that the target may lack and the bytes of the text before it, and returns what stands in its
 /// place; null where only ICU knows.
 using LoseCharacter = std::function<const std::string*(std::string_view character, std::size_t offset)>;
