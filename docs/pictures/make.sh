@@ -1,10 +1,12 @@
 #!/usr/bin/env bash
 # Makes the pictures that show data: which cells of the tutorial's table could not be translated, and what translating
-# costs beside other programs, from the figures in speed.tsv, which bench/translate_bench.sh writes.
+# costs beside other programs, from the figures in speed.tsv, which bench/translate_bench.sh writes; and how fast the library
+# converts beside ICU and iconv, from the table in bench/README.md.
 #
 #   docs/pictures/make.sh KVT FOLDER
 #
-# KVT is the program, and FOLDER, such as docs/pictures, gets lost.svg and speed.svg. Both are read on light and on dark.
+# KVT is the program, and FOLDER, such as docs/pictures, gets lost.svg, speed.svg and conversions.svg. All are read on light
+# and on dark.
 
 set -euo pipefail
 export LC_ALL=C.UTF-8
@@ -64,5 +66,42 @@ speed() {
         }' docs/pictures/speed.tsv
 }
 
+# Of the table, the rows of text that is not ASCII to or from UTF-8. A row without a pair has that of the row above.
+conversions() {
+    awk -F ' *[|] *' '
+        $2 ~ / to / || ($2 == "" && NF == 9) {
+            pair = $2 == "" ? pair : $2
+            if (pair ~ /UTF-8/ && $3 ~ /^(Latin|CJK)$/) {
+                ++rows
+                name[rows] = pair ", " $3
+                for (way = 1; way <= 3; ++way) {
+                    rate[rows, way] = $(3 + way)
+                    most = rate[rows, way] > most ? rate[rows, way] : most
+                }
+            }
+        }
+        /^`convert_limits_bench`/ { exit }
+        END {
+            split("kvt ICU iconv", ways, " ")
+            split("#5b8c5a #8ba4bd #b7b7b7", colour, " ")
+            print "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"0 0 700 " 40 + 48 * rows "\" font-family=\"sans-serif\" font-size=\"12\" fill=\"#777\">"
+            print "  <title>How fast text is converted, in GB/s of the source</title>"
+            for (way = 1; way <= 3; ++way) {
+                printf "  <rect x=\"%d\" y=\"10\" width=\"12\" height=\"12\" rx=\"3\" fill=\"%s\"/>\n", 160 + 80 * way, colour[way]
+                printf "  <text x=\"%d\" y=\"21\">%s</text>\n", 178 + 80 * way, ways[way]
+            }
+            for (r = 1; r <= rows; ++r) {
+                y = 48 * r - 12
+                printf "  <text x=\"230\" y=\"%d\" text-anchor=\"end\">%s</text>\n", y + 25, name[r]
+                for (way = 1; way <= 3; ++way) {
+                    printf "  <rect x=\"240\" y=\"%d\" width=\"%.1f\" height=\"11\" rx=\"3\" fill=\"%s\"/>\n", y + 13 * (way - 1), 1 + 380 * rate[r, way] / most, colour[way]
+                    printf "  <text x=\"%.1f\" y=\"%d\">%s</text>\n", 248 + 380 * rate[r, way] / most, y + 13 * way - 3, rate[r, way]
+                }
+            }
+            print "</svg>"
+        }' bench/README.md
+}
+
 lost >"$folder/lost.svg"
 speed >"$folder/speed.svg"
+conversions >"$folder/conversions.svg"

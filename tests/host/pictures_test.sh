@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# The pictures of data are what their script makes of the data now, and the table in docs/scale.md has the figures of the
-# picture.
+# The pictures of data are what their script makes of the data now, also of the table in bench/README.md, and the table in
+# docs/scale.md has the figures of its picture.
 #
 #   pictures_test.sh KVT
 
@@ -13,7 +13,7 @@ trap 'rm -rf -- "$work"' EXIT
 
 "$root/docs/pictures/make.sh" "$kvt" "$work"
 status=0
-for picture in lost.svg speed.svg; do
+for picture in lost.svg speed.svg conversions.svg; do
     diff "$root/docs/pictures/$picture" "$work/$picture" || status=1
 done
 while IFS=$'\t' read -r what rate; do
