@@ -47,18 +47,28 @@ private:
     std::string_view rest_;
 };
 
-/// Stops the fuzzer, with what was seen and what should have been.
-template <typename Actual, typename Expected>
-void requireEqual(const Actual& actual, const Expected& expected, const std::string& what) {
+/// Stops the fuzzer, with what was seen and what should have been; `what` is made into a text only then.
+template <typename Actual, typename Expected, typename... What>
+void requireEqual(const Actual& actual, const Expected& expected, const What&... what) {
     if (!(actual == expected)) {
-        std::cerr << what << "\nis:       " << actual << "\nexpected: " << expected << '\n';
+        (std::cerr << ... << what) << "\nis:       " << actual << "\nexpected: " << expected << '\n';
         std::abort();
     }
 }
 
-inline void require(bool condition, const std::string& what) {
+/// Bytes that are shown in hexadecimal.
+struct Hex {
+    std::string_view bytes;
+
+    friend std::ostream& operator<<(std::ostream& stream, const Hex& hex) {
+        return stream << kvt::test::hex(hex.bytes, 400);
+    }
+};
+
+template <typename... What>
+void require(bool condition, const What&... what) {
     if (!condition) {
-        std::cerr << what << '\n';
+        (std::cerr << ... << what) << '\n';
         std::abort();
     }
 }

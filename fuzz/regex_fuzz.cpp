@@ -19,23 +19,33 @@ namespace {
 constexpr std::size_t longestPattern = 48;
 constexpr std::size_t longestSubject = 64;
 
+struct Where {
+    const char* kind;
+    std::string_view pattern;
+    std::string_view subject;
+
+    friend std::ostream& operator<<(std::ostream& stream, const Where& where) {
+        return stream << where.kind << Hex{where.pattern} << " on " << Hex{where.subject};
+    }
+};
+
 void checkPerl(const std::string& pattern, std::string_view subject, std::uint64_t start) {
     boost::regex engine;
     URegex<28> regex;
     const EngineError error = errorOf([&] { engine = boost::regex(pattern); });
-    const std::string what = "pattern " + hex(pattern, 200) + " on " + hex(subject, 200);
+    const Where what{"pattern ", pattern, subject};
     requireEqual(errorOf([&] { regex = URegex<28>(units<28>(pattern)); }), error, what);
     requireEqual(static_cast<bool>(regex), error.code == -1, what);
     if (error.code != -1) {
         return;
     }
     const Found whole = matchedByEngine(engine, subject);
-    requireEqual(matchedBy(regex, subject), whole, "match, " + what);
+    requireEqual(matchedBy(regex, subject), whole, "match, ", what);
     const Found found = searchedByEngine(engine, subject, start);
-    requireEqual(searchedBy(URegex<0>(units<0>(pattern)), subject, start), found, "search, " + what);
+    requireEqual(searchedBy(URegex<0>(units<0>(pattern)), subject, start), found, "search, ", what);
     for (const Span& group : found.groups) {
         require(group.second == 0 || (group.first >= start && group.first + group.second <= subject.size()),
-                "a group outside of the subject, " + what);
+                "a group outside of the subject, ", what);
     }
 }
 
@@ -43,7 +53,7 @@ void checkLegacy(const std::string& pattern, std::string_view text, std::uint64_
     boost::regex engine;
     std::optional<ObsoleteRegexp> regexp;
     const EngineError error = errorOf([&] { engine = boost::regex(perlByHand(pattern)); });
-    const std::string what = "legacy pattern " + hex(pattern, 200) + " on " + hex(text, 200);
+    const Where what{"legacy pattern ", pattern, text};
     requireEqual(errorOf([&] { regexp.emplace(pattern.data(), pattern.size()); }), error, what);
     if (!regexp) {
         return;

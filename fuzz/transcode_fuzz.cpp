@@ -30,14 +30,13 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
         transcoder.transcode(kvt::future::string_view(text), out);
     });
     outcome.bytes = out;
-    requireEqual(outcome, kvt::test::expectedTranscode(from, to, text),
-                 from + " to " + to + " of " + kvt::test::hex(text));
+    requireEqual(outcome, kvt::test::expectedTranscode(from, to, text), from, " to ", to, " of ", Hex{text});
 
     const AnyString source{UStringView<30>(text), Encoding(from)};
     AnyString target{Encoding(to)};
     outcome = kvt::test::outcomeOf([&] { target.assign(source); });
     outcome.bytes = target.toStdString();
-    requireEqual(outcome, kvt::test::expectedAssign(from, to, text),
-                 from + " assigned to " + to + " of " + kvt::test::hex(text));
+    requireEqual(outcome, kvt::test::expectedAssign(from, to, text), from, " assigned to ", to, " of ",
+                 Hex{text});
     return 0;
 }

@@ -50,18 +50,18 @@ Outcome expected(const std::string& from, const std::string& to, std::string_vie
 
 template <std::uint32_t N>
 void checkConstruction(const std::string& from, const std::string& to, std::string_view bytes) {
-    requireEqual(construct<N>(bytes, from), expected(from, to, bytes),
-                 "UString<" + std::to_string(N) + "> from " + from + " " + kvt::test::hex(bytes));
+    requireEqual(construct<N>(bytes, from), expected(from, to, bytes), "UString<", N, "> from ", from, " ",
+                 Hex{bytes});
 }
 
 void checkWwjd(const std::string& from, std::string_view bytes) {
     const Outcome utf16 = expected(from, "UTF-16LE", bytes);
     const Outcome outcome = construct<29>(bytes, from);
-    requireEqual(outcome.number, utf16.number, "UString<29> from " + from + " " + kvt::test::hex(bytes));
+    requireEqual(outcome.number, utf16.number, "UString<29> from ", from, " ", Hex{bytes});
     if (utf16.number == 0) {
         std::u16string units(utf16.bytes.size() / 2, u'\0');
         utf16.bytes.copy(reinterpret_cast<char*>(units.data()), units.size() * 2);
-        requireEqual(outcome.bytes, kvt::test::reference::wwjdEncoded(units), "UString<29> from " + from);
+        requireEqual(outcome.bytes, kvt::test::reference::wwjdEncoded(units), "UString<29> from ", from);
     }
 }
 

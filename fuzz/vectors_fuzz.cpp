@@ -75,7 +75,7 @@ void checkConversion(Convert convert, const char* text, std::size_t units,
     const std::size_t written = convert(text, units, out.get(), expected.size());
     require(written == expected.size() &&
                 std::memcmp(out.get(), expected.data(), written * sizeof(Unit)) == 0,
-            "a conversion of " + kvt::test::hex({text, units}));
+            "a conversion of ", Hex{{text, units}});
 }
 
 template <typename Unit>
@@ -191,7 +191,7 @@ void checkCase(std::string_view text, std::size_t shift) {
         // A sigma is mapped by what stands around it, and ICU has mapped it already.
         require(std::string_view(out).substr(0, progress.written) ==
                     std::string_view(expected).substr(0, progress.written),
-                "case of " + kvt::test::hex(text));
+                "case of ", Hex{text});
     }
 }
 

@@ -131,10 +131,11 @@ std::string differenceInStream(const std::string& from, const std::string& to, s
                                const std::vector<std::size_t>& cuts) {
     StreamTranscoder stream{Encoding(from), Encoding(to)};
     const Result whole = converted(stream, text, text.size(), text.size());
-    const std::string where = from + " to " + to + " of " + std::to_string(text.size()) + " bytes " +
-                              hex(text, 60) + " ... " +
-                              hex(text.substr(text.size() - std::min(text.size(), std::size_t{60})));
-    const std::string what = where + ", with losses" + shown(whole.losses) + ": ";
+    const auto what = [&] {
+        return from + " to " + to + " of " + std::to_string(text.size()) + " bytes " + hex(text, 60) +
+               " ... " + hex(text.substr(text.size() - std::min(text.size(), std::size_t{60}))) +
+               ", with losses" + shown(whole.losses) + ": ";
+    };
     // Broken escape sequences of this one mean to ICU what the end of a call makes of them.
     if (from != "x11-compound-text") {
         std::string expected = transcoded(from, to, text);
@@ -145,24 +146,26 @@ std::string differenceInStream(const std::string& from, const std::string& to, s
             losses.badInput.emplace_back();
         }
         if (comparable(to, whole.bytes) != comparable(to, expected)) {
-            return what + hex(whole.bytes) + " in place of " + hex(expected);
+            return what() + hex(whole.bytes) + " in place of " + hex(expected);
         }
         const std::string wrong = wrongLosses(from, to, text, whole, losses);
         if (!wrong.empty()) {
-            return what + wrong;
+            return what() + wrong;
         }
     }
     for (const std::size_t cut : cuts) {
         for (const std::size_t others : {cut, text.size()}) {
             const Result result = converted(stream, text, cut, others);
-            const std::string blocks =
-                what + "in blocks of " + std::to_string(cut) + " and " + std::to_string(others) + ' ';
+            const auto blocks = [&] {
+                return what() + "in blocks of " + std::to_string(cut) + " and " + std::to_string(others) +
+                       ' ';
+            };
             if (comparable(to, result.bytes) != comparable(to, whole.bytes)) {
-                return blocks + hex(result.bytes) + " in place of " + hex(whole.bytes);
+                return blocks() + hex(result.bytes) + " in place of " + hex(whole.bytes);
             }
             if (!std::equal(result.losses.begin(), result.losses.end(), whole.losses.begin(),
                             whole.losses.end(), isSame)) {
-                return blocks + "the losses" + shown(result.losses);
+                return blocks() + "the losses" + shown(result.losses);
             }
         }
     }
