@@ -97,6 +97,13 @@ TEST(Add, KeepsTheOffsetAndTellsOfItsRepair) {
     });
 }
 
+TEST(Add, AFractionThatIsRoundedUpBehindTheLastYearIsOutOfRange) {
+    expectSums({
+        {__LINE__, "99991231235959.9999999999", "PT0S", outOfRange("10000", "year", "1000", "9999")},
+        {__LINE__, "99991231235959.9999999999", "-P1Y", outOfRange("10000", "year", "1000", "9999")},
+    });
+}
+
 TEST(Add, NothingIsCarriedBetweenTheIntervalsParts) {
     expectSums({
         {__LINE__, "20200101000000", "PT90M", success("20200101013000")},
