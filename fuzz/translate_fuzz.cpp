@@ -13,6 +13,8 @@
 
 #include <kvt/foundation/throwable.h>
 
+#include <map>
+#include <memory>
 #include <string>
 
 using namespace kvt::fuzz;
@@ -40,19 +42,55 @@ const std::vector<host::JobStep>& steps() {
     return all;
 }
 
-host::Plan makePlan(Input& input) {
-    constexpr const char* policies[] = {"keep", "empty", "skip"};
-    host::Job job;
-    job.input.encoding = input.pick(encodings);
-    job.output.encoding = input.pick(encodings);
-    job.onError = input.pick(policies);
-    job.input.hasHeader = false;
-    for (unsigned count = input.byte() % 5; count > 0; --count) {
-        job.steps.push_back(input.pick(steps()));
+struct JobAtWork {
+    explicit JobAtWork(const host::Job& job)
+        : plan(withNames(job)), worker(plan, true), decoder(plan.to, kvt::ex::Encoding::Utf8),
+          isInputCut(host::isCutUndecoded(plan.from.encoding, plan.in)),
+          isOutputCut(host::isCutUndecoded(plan.to, plan.out)) {}
+
+    static host::Plan withNames(const host::Job& job) {
+        host::Plan plan(job);
+        plan.names = {"1", "2"};
+        return plan;
     }
-    host::Plan plan(job);
-    plan.names = {"1", "2"};
-    return plan;
+
+    host::Plan plan;
+    host::BlockWorker worker;
+    kvt::ex::StreamTranscoder decoder; ///< of the output
+    bool isInputCut;
+    bool isOutputCut;
+};
+
+// Making a job takes a hundred times as long as a text takes to go through it: jobs are kept, and what a worker has done
+// before makes no difference. Null for a job that cannot be, as without a column that it needs.
+JobAtWork* jobOf(Input& input) {
+    constexpr const char* policies[] = {"keep", "empty", "skip"};
+    constexpr std::size_t mostKept = 2000;
+    static std::map<std::string, std::unique_ptr<JobAtWork>> kept;
+    std::string choices;
+    const auto choose = [&](std::size_t count) {
+        choices += static_cast<char>(input.byte() % count);
+        return static_cast<std::size_t>(static_cast<unsigned char>(choices.back()));
+    };
+    host::Job job;
+    job.input.encoding = encodings[choose(std::size(encodings))];
+    job.output.encoding = encodings[choose(std::size(encodings))];
+    job.onError = policies[choose(std::size(policies))];
+    job.input.hasHeader = false;
+    for (std::size_t count = choose(5); count > 0; --count) {
+        job.steps.push_back(steps()[choose(steps().size())]);
+    }
+    if (kept.size() == mostKept) {
+        kept.clear();
+    }
+    const auto [place, isNew] = kept.try_emplace(choices);
+    if (isNew) {
+        try {
+            place->second = std::make_unique<JobAtWork>(job);
+        } catch (const host::Failure&) {
+        }
+    }
+    return place->second.get();
 }
 
 // Blocks begin where the text of the one before ended.
@@ -66,12 +104,12 @@ host::SourceBlock blockOf(const host::Plan& plan, std::string_view bytes, std::u
     return block;
 }
 
-void requireTable(const host::Plan& plan, std::string_view output, std::size_t rows, std::size_t columns) {
+void requireTable(JobAtWork& job, std::string_view output, std::size_t rows) {
+    const std::size_t columns = job.worker.layout().columns().size();
     std::string text;
-    kvt::ex::StreamTranscoder decoder(plan.to, kvt::ex::Encoding::Utf8);
-    decoder.convert(output, text, {});
-    decoder.finish(text, {});
-    host::RowReader reader(plan.out, text);
+    job.decoder.convert(output, text, {});
+    job.decoder.finish(text, {});
+    host::RowReader reader(job.plan.out, text);
     std::size_t found = 0;
     for (; reader.next(); ++found) {
         require(reader.fault() == host::RowFault::None, "what was written has no fault");
@@ -84,31 +122,27 @@ void requireTable(const host::Plan& plan, std::string_view output, std::size_t r
 
 int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     Input input(data, size);
-    std::optional<host::Plan> made;
-    std::optional<host::BlockWorker> worker;
-    try {
-        made.emplace(makePlan(input));
-        worker.emplace(*made, true);
-    } catch (const host::Failure&) {
-        return 0; // a column that is not there any more
+    JobAtWork* const job = jobOf(input);
+    if (job == nullptr) {
+        return 0;
     }
-    const host::Plan& plan = *made;
+    const host::Plan& plan = job->plan;
     const std::string_view text = input.rest();
-    if (!host::isCutUndecoded(plan.from.encoding, plan.in)) {
+    if (!job->isInputCut) {
         return 0;
     }
 
     const host::SourceBlock block = blockOf(plan, text, 0);
     host::BlockResult whole;
-    worker->process(block, whole);
+    job->worker.process(block, whole);
     requireEqual(whole.counts.read, whole.counts.written + whole.counts.rejected + whole.counts.skipped,
                  "rows read");
     for (const host::CellFailure& failure : whole.failures) {
         require(failure.offset <= text.size() && failure.row < whole.rows, "the place of a failure");
     }
     // An encoding of the output may lack a delimiter or have states, and then this is not a matter of rows.
-    if (host::isCutUndecoded(plan.to, plan.out)) {
-        requireTable(plan, whole.output, whole.counts.written, worker->layout().columns().size());
+    if (job->isOutputCut) {
+        requireTable(*job, whole.output, whole.counts.written);
     }
 
     if (host::unitsOf(plan.from.encoding).width != 1) {
@@ -121,13 +155,13 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     const host::SourceBlock secondBlock = blockOf(plan, text.substr(cut), cut);
     host::BlockResult first;
     host::BlockResult second;
-    worker->process(firstBlock, first);
-    worker->process(secondBlock, second);
+    job->worker.process(firstBlock, first);
+    job->worker.process(secondBlock, second);
     requireEqual(first.rows + second.rows, whole.rows, "rows of both pieces");
     requireEqual(first.rejected + second.rejected, whole.rejected, "rejected rows of both pieces");
     requireEqual(first.failures.size() + second.failures.size(), whole.failures.size(),
                  "failures of both pieces");
-    if (host::isCutUndecoded(plan.to, plan.out)) {
+    if (job->isOutputCut) {
         requireEqual(std::string(first.output).append(second.output), std::string(whole.output),
                      "output of both pieces");
     }

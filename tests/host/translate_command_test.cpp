@@ -279,12 +279,21 @@ TEST_F(KvtTranslate, LostCharactersAreFailuresOfTheirCell) {
     EXPECT_EQ(bad.status, 1);
     EXPECT_EQ(bad.out, "a,b\n2,x\n");
     EXPECT_TRUE(contains(bad.err, "column b, byte 6")) << bad.err;
+    // Where bytes end that are no character is seen by the byte behind them, be that one of the next that are none.
+    const ChildResult adjacent = translate("a,b\n\xC5\xEC\x81x,1\n2,\xFF\n", {"--on-error", "keep"});
+    for (const char* said : {"bad bytes C5", "bad bytes EC 81", "bad bytes FF", "row 3, column b, byte 13"}) {
+        EXPECT_TRUE(contains(adjacent.err, said)) << adjacent.err;
+    }
     const ChildResult unwritable =
         translate("a,b\n1,Ł\n2,x\n", {"--to", "windows-1252", "--on-error", "empty"});
     EXPECT_EQ(unwritable.status, 1);
     EXPECT_EQ(unwritable.out, "a,b\n1,\n2,x\n");
     EXPECT_TRUE(contains(unwritable.err, "U+0141")) << unwritable.err;
     EXPECT_EQ(translate("a\nŁ\n", {"--to", "windows-1252"}).status, 2);
+    // A row that is left out is not written, whatever else of its block is.
+    const ChildResult leftOut = translate(
+        "d,b\nx,Ł\n01.02.2023,Ł\n", {"--to", "windows-1252", "--date", "d=%d.%m.%Y", "--on-error", "skip"});
+    EXPECT_TRUE(contains(leftOut.err, "2 failures")) << leftOut.err;
 }
 
 TEST_F(KvtTranslate, TooManyErrorsEndIt) {

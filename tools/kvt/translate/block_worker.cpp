@@ -7,6 +7,7 @@
 #include "base/text.h"
 #include "base/text_units.h"
 #include "convert/loss_report.h"
+#include "text/text_offsets.h"
 #include "translate/utf8_check.h"
 
 #include <algorithm>
@@ -146,12 +147,14 @@ void BlockWorker::placeLosses(const SourceBlock& block) {
     if (losses_.empty() || block.isDecoded) {
         return;
     }
-    SourcePlaces places(block.encoding);
-    places.add(block.bytes);
+    TextOffsets offsets(block.encoding);
+    offsets.add(block.bytes);
+    offsets.add({});
     auto loss = losses_.begin();
     for (std::size_t at = text_.find(replacement); at != std::string_view::npos && loss != losses_.end();
          at = text_.find(replacement, at + replacement.size())) {
-        if (places.at(at) == loss->loss.offset) {
+        offsets.passTo(at);
+        if (offsets.offsetOf(0) == loss->loss.offset) {
             loss->place = at;
             ++loss;
         }
@@ -225,12 +228,14 @@ void BlockWorker::takeRow(bool needsLineEnd, BlockResult& result) {
             return;
         }
     }
-    if (checksWriting_) {
+    const bool leavesOutFailed = plan_.onError == OnCellError::Stop || plan_.onError == OnCellError::Skip;
+    // What is not written need not be writable.
+    if (checksWriting_ && (cells_.failures().empty() || !leavesOutFailed)) {
         failUnwritableCells(result);
     }
     if (!cells_.failures().empty()) {
         takeFailures(result);
-        if (plan_.onError == OnCellError::Stop || plan_.onError == OnCellError::Skip) {
+        if (leavesOutFailed) {
             reject(result);
             return;
         }
