@@ -129,6 +129,14 @@ void EncodingGuess::add(std::string_view bytes) {
     }
 }
 
+const EncodingOpinion& EncodingGuess::likeliest() const {
+    return std::min_element(candidates_.begin(), candidates_.end(),
+                            [&](const Candidate& left, const Candidate& right) {
+                                return rankOf(left.opinion, isAscii_) < rankOf(right.opinion, isAscii_);
+                            })
+        ->opinion;
+}
+
 const std::vector<EncodingOpinion>& EncodingGuess::finish() {
     for (Candidate& candidate : candidates_) {
         take(candidate, {}, true);

@@ -33,6 +33,8 @@ public:
     explicit EncodingGuess(std::string_view beginning);
 
     void add(std::string_view bytes);
+    /// The best opinion of what there was so far.
+    const EncodingOpinion& likeliest() const;
     /// All opinions, the best one first; there is at least one.
     const std::vector<EncodingOpinion>& finish();
 

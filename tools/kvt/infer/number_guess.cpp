@@ -138,8 +138,8 @@ bool NumberGuess::add(std::string_view cell) {
             continue;
         }
         ++counts_[i];
-        if (examples_[i].empty() && digitsOf(cell) != cell.size()) {
-            examples_[i] = cell;
+        if (digitsOf(cell) != cell.size() && example(style).empty()) {
+            examples_.emplace_back(style, cell);
         }
         isNumber = true;
         hasCurrency = reading.hasCurrency;
@@ -148,6 +148,12 @@ bool NumberGuess::add(std::string_view cell) {
     withCurrency_ += hasCurrency ? 1 : 0;
     withLeadingZero_ += isNumber && hasLeadingZero(cell) ? 1 : 0;
     return isNumber;
+}
+
+std::string NumberGuess::example(NumberStyle style) const {
+    const auto found = std::find_if(examples_.begin(), examples_.end(),
+                                    [&](const auto& example) { return example.first == style; });
+    return found == examples_.end() ? std::string() : found->second;
 }
 
 NumberStyle NumberGuess::style() const {

@@ -7,6 +7,8 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 namespace host {
 
@@ -30,7 +32,7 @@ public:
     NumberStyle style() const;
     std::uint64_t cellsOf(NumberStyle style) const { return counts_[static_cast<std::size_t>(style)]; }
     /// A cell that other styles read otherwise or not at all; empty where there is none.
-    const std::string& example(NumberStyle style) const { return examples_[static_cast<std::size_t>(style)]; }
+    std::string example(NumberStyle style) const;
 
     /// Whole numbers with a zero in front, as in numbers of accounts and telephones.
     std::uint64_t withLeadingZero() const { return withLeadingZero_; }
@@ -39,7 +41,7 @@ public:
 
 private:
     std::array<std::uint64_t, numberStyles> counts_{};
-    std::array<std::string, numberStyles> examples_;
+    std::vector<std::pair<NumberStyle, std::string>> examples_; ///< few, as there may be many columns
     std::uint64_t cells_ = 0;
     std::uint64_t withLeadingZero_ = 0;
     std::uint64_t withCurrency_ = 0;

@@ -267,7 +267,7 @@ private:
         const auto place = static_cast<std::size_t>(style);
         remark(titleOf(index) + ": " + counted(numbers.cells(), "number", "numbers") + aboutEmpty(guess) +
                aboutOthers(guess) + ".");
-        const std::string& example = numbers.example(style);
+        const std::string example = numbers.example(style);
         remark("  " + grouped(numbers.cellsOf(style)) + " with " + words[place] +
                (example.empty() ? "" : ", such as " + shown(example)));
         if (style == NumberStyle::Plain) {

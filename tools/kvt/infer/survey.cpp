@@ -9,6 +9,7 @@
 #include "translate/row_reader.h"
 
 #include <algorithm>
+#include <optional>
 #include <set>
 #include <utility>
 
@@ -22,22 +23,66 @@ using OnBytes = std::function<void(std::uint64_t)>;
 constexpr std::size_t beginningSize = 1024 * 1024;
 // A row that is longer than that is not one of a table; mostly a quote was never closed.
 constexpr std::size_t longestRow = 64 * 1024 * 1024;
+// Each column costs memory for what is known of it.
+constexpr std::size_t mostColumns = 1'000'000;
 
-void guessEncoding(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
-    Input input(file.path());
+void refuseLongRow(const std::string& file, const RowBorders& borders) {
+    if (borders.size() - borders.border() <= longestRow) {
+        return;
+    }
+    const std::string problem = file + ": a row is longer than " + std::to_string(longestRow >> 20) + " MiB";
+    throw Failure(borders.isWithinQuotes()
+                      ? problem + "; the quote that opens at byte " + std::to_string(borders.openQuote()) +
+                            " of its text may never be closed"
+                      : problem);
+}
+
+// Looks for rows without an end while the encoding is not certain yet, so that not all of a file is read that will be
+// refused. Where encoding or form turn out to be others, it may see no such row; the second reading does.
+class RowWatch {
+public:
+    RowWatch(std::string file, kvt::ex::Encoding encoding, std::string_view beginning)
+        : file_(std::move(file)), decoder_(encoding, kvt::ex::Encoding::Utf8) {
+        decoder_.convert(beginning, text_, {});
+        borders_.emplace(guessTable(text_, false).form);
+        borders_->add(text_);
+    }
+
+    // Throws Failure.
+    void add(std::string_view bytes) {
+        text_.clear();
+        decoder_.convert(bytes, text_, {});
+        borders_->add(text_);
+        refuseLongRow(file_, *borders_);
+    }
+
+private:
+    std::string file_;
+    kvt::ex::StreamTranscoder decoder_;
+    std::string text_;
+    std::optional<RowBorders> borders_;
+};
+
+// `given` is the encoding where the user has named it.
+void guessEncoding(Survey& survey, TwiceRead& file, const std::optional<kvt::ex::Encoding>& given,
+                   const OnBytes& onBytes) {
     std::string beginning;
-    std::string_view block = input.read();
-    for (; !block.empty() && beginning.size() < beginningSize; block = input.read()) {
+    std::string_view block = file.next();
+    for (; !block.empty() && beginning.size() < beginningSize; block = file.next()) {
         beginning += block;
     }
     EncodingGuess guess(beginning);
     guess.add(beginning);
     survey.bytes = beginning.size();
     onBytes(beginning.size());
-    for (; !block.empty(); block = input.read()) {
-        guess.add(block);
-        survey.bytes += block.size();
-        onBytes(block.size());
+    if (!block.empty()) {
+        RowWatch watch(file.name(), given.value_or(guess.likeliest().encoding), beginning);
+        for (; !block.empty(); block = file.next()) {
+            watch.add(block);
+            guess.add(block);
+            survey.bytes += block.size();
+            onBytes(block.size());
+        }
     }
     survey.encodings = guess.finish();
     survey.isMarked = guess.isMarked();
@@ -69,14 +114,7 @@ public:
             if (isEnd_) {
                 return;
             }
-            if (text_.size() > longestRow) {
-                const std::string problem =
-                    survey_.file + ": a row is longer than " + std::to_string(longestRow >> 20) + " MiB";
-                throw Failure(borders.isWithinQuotes() ? problem + "; the quote that opens at byte " +
-                                                             std::to_string(borders.openQuote()) +
-                                                             " of its text may never be closed"
-                                                       : problem);
-            }
+            refuseLongRow(survey_.file, borders);
             const std::size_t old = text_.size();
             decode();
             borders.add(std::string_view(text_).substr(old));
@@ -137,7 +175,7 @@ void judgeHeader(Survey& survey, const std::vector<std::string>& first) {
         survey.aboutHeader = "there is no row";
         return;
     }
-    std::set<std::string> names;
+    std::set<std::string_view> names;
     for (const std::string& cell : first) {
         if (cell.empty() || !names.insert(cell).second || isData(cell)) {
             survey.aboutHeader = cell.empty()   ? "a cell of row 1 is empty"
@@ -167,6 +205,11 @@ void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
                 takeRow(survey, reader, scratch);
                 continue;
             }
+            if (reader.cellCount() > mostColumns) {
+                throw Failure(survey.file + ": row 1 has " + std::to_string(reader.cellCount()) +
+                              " cells; no more than " + std::to_string(mostColumns) +
+                              " columns are looked at");
+            }
             for (std::size_t i = 0; i < reader.cellCount(); ++i) {
                 first.emplace_back(textOfCell(reader.cell(i), survey.table.form, scratch));
             }
@@ -188,13 +231,17 @@ void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
 } // namespace
 
 Survey surveyFile(const std::string& path, const std::string& encoding, const OnBytes& onBytes) {
-    const TwiceRead file(path);
+    TwiceRead file(path);
     Survey survey;
     survey.file = file.name();
-    guessEncoding(survey, file, onBytes);
+    std::optional<EncodingOpinion> given;
     if (!encoding.empty()) {
+        given.emplace(textEncoding(encoding), encoding);
+    }
+    guessEncoding(survey, file, given ? std::optional(given->encoding) : std::nullopt, onBytes);
+    if (given) {
         survey.isEncodingGiven = true;
-        survey.encodings.insert(survey.encodings.begin(), EncodingOpinion(textEncoding(encoding), encoding));
+        survey.encodings.insert(survey.encodings.begin(), *given);
     }
     surveyRows(survey, file, onBytes);
     return survey;

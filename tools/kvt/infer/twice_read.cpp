@@ -1,12 +1,10 @@
 #include "infer/twice_read.h"
 
 #include "base/failure.h"
-#include "base/input.h"
 
 #include <cerrno>
 #include <cstdlib>
 #include <fcntl.h>
-#include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -44,22 +42,19 @@ void writeAll(int descriptor, std::string_view bytes) {
 
 } // namespace
 
-TwiceRead::TwiceRead(const std::string& path) : path_(path) {
-    Input input(path);
-    name_ = input.name();
-    if (path != "-" && isPlainFile(input.descriptor())) {
-        return;
+TwiceRead::TwiceRead(const std::string& path) : input_(path), path_(path) {
+    if (path == "-" || !isPlainFile(input_.descriptor())) {
+        copy_ = openUnnamed();
+        path_ = "/dev/fd/" + std::to_string(copy_);
     }
-    copy_ = openUnnamed();
-    try {
-        for (std::string_view block = input.read(); !block.empty(); block = input.read()) {
-            writeAll(copy_, block);
-        }
-    } catch (...) {
-        ::close(copy_);
-        throw;
+}
+
+std::string_view TwiceRead::next() {
+    const std::string_view bytes = input_.read();
+    if (copy_ >= 0) {
+        writeAll(copy_, bytes);
     }
-    path_ = "/dev/fd/" + std::to_string(copy_);
+    return bytes;
 }
 
 TwiceRead::~TwiceRead() {

@@ -1,27 +1,32 @@
-// A file that can be read more than once. Standard input and pipes cannot: they are copied to a file without a name,
-// which goes away with the object.
+// A file that is read twice. Standard input and pipes can be read once only: what comes from them is copied meanwhile to a
+// file without a name, which goes away with the object.
 #pragma once
 
+#include "base/input.h"
+
 #include <string>
+#include <string_view>
 
 namespace host {
 
 class TwiceRead {
 public:
-    /// Reads nothing of a plain file. Throws Failure.
+    /// Throws Failure when it cannot be opened.
     explicit TwiceRead(const std::string& path);
     TwiceRead(const TwiceRead&) = delete;
     TwiceRead& operator=(const TwiceRead&) = delete;
     ~TwiceRead();
 
-    /// To be opened, any number of times.
+    /// The next bytes of the first reading, valid until the next call, or none at the end. Throws Failure.
+    std::string_view next();
+    /// To be opened for the second reading, once the first one has come to the end.
     const std::string& path() const { return path_; }
     /// For people.
-    const std::string& name() const { return name_; }
+    const std::string& name() const { return input_.name(); }
 
 private:
+    Input input_;
     std::string path_;
-    std::string name_;
     int copy_ = -1;
 };
 
