@@ -41,6 +41,15 @@ void checkPerl(const std::string& pattern, std::string_view subject, std::uint64
     }
     const Found whole = matchedByEngine(engine, subject);
     requireEqual(matchedBy(regex, subject), whole, "match, ", what);
+    const UStringView<28> view(subject.data(), subject.size());
+    const Found first = searchedByEngine(engine, subject, 0);
+    bool matches = false;
+    requireEqual(errorOf([&] { matches = regex.matchesIn(view); }), first.error, "matchesIn, ", what);
+    requireEqual(matches, !first.groups.empty(), "matchesIn, ", what);
+    const std::uint64_t place = regex.passOver(view, start);
+    require(place >= start && place <= subject.size(), "a place to pass over outside of the subject, ", what);
+    require(place == start || searchedByEngine(engine, subject.substr(0, place), start) == Found(),
+            "what matches is passed over, ", what);
     const Found found = searchedByEngine(engine, subject, start);
     requireEqual(searchedBy(URegex<0>(units<0>(pattern)), subject, start), found, "search, ", what);
     for (const Span& group : found.groups) {
