@@ -74,8 +74,9 @@ TextResult formatByPattern(const UString<0>& value, const CanonicalRecord& recor
     }
     const SystemBytes patternBytes(pattern);
     TextBuffer text;
-    switch (
-        renderFields(text, patternBytes.view(), record.type, carriedFields(record), record.offset.minutes)) {
+    DateTimeFields carried;
+    const DateTimeFields& fields = carriedFields(record, carried);
+    switch (renderFields(text, patternBytes.view(), record.type, fields, record.offset.minutes)) {
     case WrittenPattern::WrongFlag:
         return complained(complaintAbout(pattern, record.type).value());
     case WrittenPattern::EpochBesideOffset:

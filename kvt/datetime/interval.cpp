@@ -139,30 +139,32 @@ Outcome<IntervalParts> readInterval(std::string_view given) {
 }
 
 void writeInterval(TextBuffer& text, const IntervalParts& parts) {
-    const auto put = [&](std::int64_t number, char designator) {
-        if (number > 0) {
-            text.putNumber(static_cast<std::uint64_t>(number));
-            text.put(designator);
-        }
-    };
     const bool hasSeconds = parts.seconds() > 0 || parts.nanoseconds() > 0;
     const bool hasTime = parts.hours() > 0 || parts.minutes() > 0 || hasSeconds;
     if (!hasTime && parts.years() <= 0 && parts.months() <= 0 && parts.days() <= 0) {
         return text.put("PT0S"); // without a sign
     }
+    constexpr std::size_t longestNumber = 20;
+    char* place = text.room(3 + 5 * (longestNumber + 1)); // "-P", "T", and all but the seconds
+    const auto put = [&](std::int64_t number, char designator) {
+        if (number > 0) {
+            place = writeNumber(place, static_cast<std::uint64_t>(number));
+            *place++ = designator;
+        }
+    };
     if (parts.negative()) {
-        text.put('-');
+        *place++ = '-';
     }
-    text.put('P');
+    *place++ = 'P';
     put(parts.years(), 'Y');
     put(parts.months(), 'M');
     put(parts.days(), 'D');
-    if (!hasTime) {
-        return;
+    if (hasTime) {
+        *place++ = 'T';
+        put(parts.hours(), 'H');
+        put(parts.minutes(), 'M');
     }
-    text.put('T');
-    put(parts.hours(), 'H');
-    put(parts.minutes(), 'M');
+    text.endAt(place);
     if (hasSeconds) {
         text.putSeconds(static_cast<std::uint64_t>(parts.seconds()),
                         static_cast<std::uint64_t>(parts.nanoseconds()));

@@ -149,16 +149,20 @@ TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept {
             hasOffset(record.type) ? std::optional(record.offset.minutes) : std::nullopt};
 }
 
-DateTimeFields carriedFields(const CanonicalRecord& record) noexcept {
-    const bool mayRunOver = record.lenient || record.fields.nanoseconds >= nanosPerSecond;
-    return mayRunOver ? fieldsFromCount(countOf(record.fields)) : record.fields;
+const DateTimeFields& carriedFields(const CanonicalRecord& record, DateTimeFields& carried) noexcept {
+    if (!record.lenient && record.fields.nanoseconds < nanosPerSecond) {
+        return record.fields;
+    }
+    carried = fieldsFromCount(countOf(record.fields));
+    return carried;
 }
 
 // ---- Writing
 
 void setAnswer(ValueAnswer& answer, const CanonicalRecord& record) noexcept {
     answer.kind = record.type;
-    answer.fields = carriedFields(record);
+    DateTimeFields carried;
+    answer.fields = carriedFields(record, carried);
     if (hasOffset(record.type)) {
         answer.offset = record.offset;
     }

@@ -19,6 +19,7 @@
 #include <hwy/highway.h>
 
 #include <algorithm>
+#include <atomic>
 
 HWY_BEFORE_NAMESPACE();
 namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
@@ -28,9 +29,12 @@ namespace kvt::ex::detail::vectors::HWY_NAMESPACE {
 class Padded {
 public:
     Padded(const char* text, std::size_t bytes) {
-        const hn::FixedTag<std::uint8_t, 16> d;
-        for (std::size_t i = 0; i < sizeof bytes_; i += 16) {
+        const hn::CappedTag<std::uint8_t, 32> d;
+        static_assert(sizeof bytes_ % hn::MaxLanes(d) == 0);
+        for (std::size_t i = 0; i < sizeof bytes_; i += hn::Lanes(d)) {
             hn::Store(hn::Zero(d), d, bytes_ + i);
+            // Without this the loop would become one instruction that stores a string, which takes long to begin.
+            std::atomic_signal_fence(std::memory_order_seq_cst);
         }
         copyShort(text, bytes, bytes_ + before);
     }

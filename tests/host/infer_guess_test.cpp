@@ -224,6 +224,7 @@ TEST(NumberGuess, TakesSignsAndCurrencies) {
         EXPECT_EQ(numbersOf({cell}).cells(), 1U) << cell;
     }
     EXPECT_EQ(numbersOf({"$1", "2"}).withCurrency(), 1U);
+    EXPECT_NE(numbersOf({"$1", "$2"}).style(), NumberStyle::Plain); // the sign has to go
 }
 
 TEST(NumberGuess, RefusesWhatIsNone) {

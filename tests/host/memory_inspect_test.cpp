@@ -7,6 +7,7 @@
 #include <nlohmann/json.hpp>
 
 #include <cstring>
+#include <set>
 #include <sys/stat.h>
 
 namespace kvt::test {
@@ -198,6 +199,19 @@ TEST_F(KvtMemoryInspect, SegmentsThatAreNotAsTheyShouldBeAreNamed) {
     EXPECT_TRUE(contains(result.out, "cut off\n")) << result.out;
 }
 
+TEST_F(KvtMemoryInspect, SegmentsInOneAnothersPlaceAreRefused) {
+    writeFile();
+    const std::string header = read("file").substr(0, 65536);
+    const std::uint64_t secondSegment = 131072;
+    for (std::uint64_t offset = 0; offset < header.size(); offset += 8) {
+        if (std::memcmp(header.data() + offset, &secondSegment, 8) == 0) {
+            put("file", offset, 65536); // where the first one is
+        }
+    }
+    EXPECT_EQ(failureOf("file"), "kvt: file: the header segment is damaged: its table has segments in one "
+                                 "another's place\n");
+}
+
 TEST_F(KvtMemoryInspect, BytesOfNoSegmentAreCounted) {
     writeFile();
     std::filesystem::resize_file(path("file"), 139264 + 5);
@@ -265,6 +279,7 @@ TEST_F(KvtMemoryInspect, NoDamageOfTheHeaderLeadsAstray) {
     writeFile();
     const std::string whole = read("file");
     int refused = 0;
+    std::set<std::string> reasons;
     for (std::uint64_t offset = 0; offset < 560; offset += 8) {
         for (const std::uint64_t value : {std::uint64_t{0}, std::uint64_t{1}, std::uint64_t{65528},
                                           ~std::uint64_t{0} << 4, std::uint64_t{1} << 62}) {
@@ -273,10 +288,18 @@ TEST_F(KvtMemoryInspect, NoDamageOfTheHeaderLeadsAstray) {
             const ChildResult result = kvt({"memory", "inspect", "file"});
             EXPECT_LE(result.status, 2) << offset << " " << value;
             EXPECT_EQ(result.status == 0, result.err.empty()) << offset << " " << value;
-            refused += result.status == 2 ? 1 : 0;
+            if (result.status == 2) {
+                ++refused;
+                reasons.insert(result.err.substr(result.err.rfind(": ") + 2));
+            }
         }
     }
     EXPECT_GT(refused, 60);
+    for (const std::string reason :
+         {"a pointer leads out of it\n", "a pointer is missing\n", "a list has no map\n",
+          "a list points beside its elements\n", "a list points beside its map\n"}) {
+        EXPECT_EQ(reasons.count(reason), 1u) << reason;
+    }
 }
 
 } // namespace kvt::test

@@ -6,9 +6,11 @@
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
+#include <linux/capability.h>
 #include <poll.h>
 #include <stdexcept>
 #include <sys/ioctl.h>
+#include <sys/prctl.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -70,6 +72,9 @@ int statusOf(int waited) {
     if (setup.mostFileBytes != 0) {
         const rlimit limit{setup.mostFileBytes, setup.mostFileBytes};
         ::setrlimit(RLIMIT_FSIZE, &limit);
+    }
+    if (setup.modesHold && ::geteuid() == 0 && ::prctl(PR_CAPBSET_DROP, CAP_DAC_OVERRIDE) != 0) {
+        ::_exit(125);
     }
     ::signal(SIGPIPE, SIG_DFL); // we ignore it ourselves
     if (setup.ignoredSignal != 0) {

@@ -61,9 +61,9 @@ Outcome<CanonicalRecord> readValue(std::string_view text);
 /// The instant of a record, without its offset a wall clock. Not for `Unsupported`, which has none.
 TemporalInstant instantWithOffset(const CanonicalRecord& record) noexcept;
 
-/// The numbers of a record within their bounds: what `lenient` or a rounded fraction let run over is carried. The year
-/// may be 10000 then.
-DateTimeFields carriedFields(const CanonicalRecord& record) noexcept;
+/// The numbers of a record within their bounds: its own or, where `lenient` or a rounded fraction let some run over,
+/// `carried`, which they are carried into. The year may be 10000 then.
+const DateTimeFields& carriedFields(const CanonicalRecord& record, DateTimeFields& carried) noexcept;
 
 /// A value as the answer of a function, before there is a text of it.
 struct ValueAnswer {

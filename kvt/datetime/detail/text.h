@@ -6,6 +6,7 @@
 
 #include <array>
 #include <bit>
+#include <charconv>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -104,6 +105,16 @@ inline char* writePair(char* place, unsigned number) noexcept {
     return place + 2;
 }
 
+/// Writes a number in decimal, of up to 20 digits, and returns where it ends.
+inline char* writeNumber(char* place, std::uint64_t number) noexcept {
+    if (number < 10) {
+        *place = static_cast<char>('0' + number);
+        return place + 1;
+    }
+    return number < 100 ? writePair(place, static_cast<unsigned>(number))
+                        : std::to_chars(place, place + 20, number).ptr;
+}
+
 /// A copy of a text of up to 40 bytes that needs no memory: a number in a failure.
 class ShortText {
 public:
@@ -165,6 +176,8 @@ public:
         size_ += count;
         return data_ + size_ - count;
     }
+    /// Ends the text at a place of the last room(), which was too much.
+    void endAt(const char* place) noexcept { size_ = static_cast<std::size_t>(place - data_); }
     /// "." and nine digits without the zeros at their end; nothing for zero. Below 1,000,000,000.
     void putFraction(std::uint64_t nanoseconds);
     /// Seconds and fraction as secondsFractionalToString(double) words their sum as a double.

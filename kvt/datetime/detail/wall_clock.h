@@ -33,8 +33,13 @@ private:
         return (date.year * 16 + date.month) * 32 + date.day;
     }
     static std::int64_t daysBetween(const CivilDate& from, const CivilDate& to) noexcept {
-        if (from.year == to.year && from.month == to.month) {
-            return std::int64_t{to.day} - std::int64_t{from.day};
+        const std::int64_t months = (to.year - from.year) * 12 + to.month - from.month;
+        const std::int64_t days = std::int64_t{to.day} - std::int64_t{from.day};
+        if (months == 0) {
+            return days;
+        }
+        if (months == 1) { // as most often where whole months were taken before
+            return days + lastDayOfMonth(from.year, from.month);
         }
         return daysFromCivil(to.year, to.month, to.day) - daysFromCivil(from.year, from.month, from.day);
     }

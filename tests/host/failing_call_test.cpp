@@ -1,0 +1,52 @@
+// What the system refuses late: when data are sent to the device, or when a file is closed.
+
+#include "host_test.h"
+
+namespace kvt::test {
+
+class KvtFailingCall : public HostTest {
+protected:
+    ChildSetup failing(const std::string& call, std::vector<std::string> arguments) const {
+        ChildSetup made = setup(std::move(arguments));
+        made.input = "text";
+        made.environment = {{"LD_PRELOAD", KVT_FAILING_CALLS},
+                            {"KVT_FAULT", call},
+                            {"ASAN_OPTIONS", "verify_asan_link_order=0"}};
+        return made;
+    }
+};
+
+const std::vector<std::string> toFile = {"convert", "--from", "UTF-8", "--to", "UTF-8", "-o", "out"};
+const std::vector<std::string> toStandardOutput = {"convert", "--from", "UTF-8", "--to", "UTF-8"};
+
+TEST_F(KvtFailingCall, ADeviceThatDoesNotTakeTheDataIsAFailure) {
+    write("out", "old");
+    const ChildResult result = runChild(failing("fsync", toFile));
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write out: Input/output error\n");
+    EXPECT_EQ(read("out"), "old");
+    EXPECT_EQ(names(), std::vector<std::string>{"out"});
+}
+
+TEST_F(KvtFailingCall, AFileThatCannotBeClosedIsAFailure) {
+    write("out", "old");
+    ChildResult result = runChild(failing("close", toFile));
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write out: No space left on device\n");
+    EXPECT_EQ(read("out"), "old");
+    EXPECT_EQ(names(), std::vector<std::string>{"out"});
+
+    ChildSetup made = failing("close", toStandardOutput);
+    made.outputFile = path("out");
+    result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write to standard output: No space left on device\n");
+}
+
+TEST_F(KvtFailingCall, AReadThatASignalEndedIsMadeAgain) {
+    const ChildResult result = runChild(failing("read", toStandardOutput));
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out, "text");
+}
+
+} // namespace kvt::test
