@@ -3,6 +3,7 @@
 // The files and ICU may be of different versions of Unicode. What is compared are the characters that both know;
 // case folding of a character never changes once it is assigned.
 #include <support/string_types.h>
+#include <support/unicode_data.h>
 
 #include <kvt/codec/wwjd.h>
 #include <kvt/string/ustring.h>
@@ -17,8 +18,6 @@
 #include <fstream>
 #include <map>
 #include <random>
-#include <sstream>
-#include <stdexcept>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -41,36 +40,6 @@ struct CaseTables {
     Mapping lower;
 };
 
-std::u32string codePoints(const std::string& field) {
-    std::u32string text;
-    std::istringstream words(field);
-    for (std::uint32_t value = 0; words >> std::hex >> value;) {
-        text += static_cast<char32_t>(value);
-    }
-    return text;
-}
-
-/// Calls `row` with the fields of each line, without comments.
-template <typename Row>
-void readFile(const std::string& name, Row row) {
-    std::ifstream file(KVT_UNICODE_DATA_DIR "/" + name);
-    if (!file) {
-        throw std::runtime_error("cannot read " KVT_UNICODE_DATA_DIR "/" + name +
-                                 ", which Debian's package unicode-data brings");
-    }
-    for (std::string line; std::getline(file, line);) {
-        std::vector<std::string> fields;
-        std::istringstream rest(line.substr(0, line.find('#')));
-        for (std::string field; std::getline(rest, field, ';');) {
-            const std::size_t first = field.find_first_not_of(' ');
-            fields.push_back(first == std::string::npos ? "" : field.substr(first));
-        }
-        if (fields.size() > 1) {
-            row(fields);
-        }
-    }
-}
-
 CaseTables readTables() {
     CaseTables tables;
     std::ifstream file(KVT_UNICODE_DATA_DIR "/CaseFolding.txt");
@@ -80,12 +49,12 @@ CaseTables readTables() {
     if (dash != std::string::npos) {
         u_versionFromString(tables.version.data(), firstLine.substr(dash + 1).c_str());
     }
-    readFile("CaseFolding.txt", [&](const std::vector<std::string>& fields) {
+    for (const auto& fields : unicodeRows("CaseFolding.txt")) {
         if (fields[1] == "C" || fields[1] == "F") {
             tables.folded[codePoints(fields[0])[0]] = codePoints(fields[2]);
         }
-    });
-    readFile("UnicodeData.txt", [&](const std::vector<std::string>& fields) {
+    }
+    for (const auto& fields : unicodeRows("UnicodeData.txt")) {
         const char32_t codePoint = codePoints(fields[0])[0];
         if (!fields[12].empty()) {
             tables.upper[codePoint] = codePoints(fields[12]);
@@ -93,14 +62,14 @@ CaseTables readTables() {
         if (fields.size() > 13 && !fields[13].empty()) {
             tables.lower[codePoint] = codePoints(fields[13]);
         }
-    });
-    readFile("SpecialCasing.txt", [&](const std::vector<std::string>& fields) {
+    }
+    for (const auto& fields : unicodeRows("SpecialCasing.txt")) {
         const bool isConditional = fields.size() > 4 && !fields[4].empty();
         if (!isConditional) {
             tables.lower[codePoints(fields[0])[0]] = codePoints(fields[1]);
             tables.upper[codePoints(fields[0])[0]] = codePoints(fields[3]);
         }
-    });
+    }
     return tables;
 }
 
