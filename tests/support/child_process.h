@@ -26,8 +26,8 @@ struct ChildSetup {
     bool readNothing = false;      ///< standard output is a pipe that nobody reads
     bool terminal = false;         ///< standard error is a terminal
     std::size_t mostFileBytes = 0; ///< no file may become longer; 0: no limit
-    bool modesHold = false;        ///< the superuser, too, can do with a file what its mode allows, and no more
-    int ignoredSignal = 0;         ///< a signal that the program is to find ignored
+    bool modesHold = false; ///< the superuser, too, can do with a file what its mode allows, and no more
+    int ignoredSignal = 0;  ///< a signal that the program is to find ignored
 };
 
 struct ChildResult {
