@@ -29,7 +29,8 @@ using detail::WallClock;
 
 /// Two values that can be compared, in UTC where they have an offset.
 struct Pair {
-    Pair() noexcept {} // NOLINT(modernize-use-equals-default): both clocks are written at once
+    // Not defaulted: that would clear both clocks before they are written.
+    Pair() noexcept {} // NOLINT(modernize-use-equals-default)
 
     WallClock first;
     WallClock second;

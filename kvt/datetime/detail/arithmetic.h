@@ -16,7 +16,8 @@ std::optional<DatePartRange> addInterval(DateTimeFields& fields, const IntervalP
 
 /// A length of time: years and months by the calendar, and what is left behind them.
 struct Difference {
-    Difference() noexcept {} // NOLINT(modernize-use-equals-default): as for a record, nothing is cleared
+    // Not defaulted: that would clear all of it before it is written.
+    Difference() noexcept {} // NOLINT(modernize-use-equals-default)
 
     bool backwards = false;
     std::int64_t years = 0;

@@ -67,7 +67,8 @@ const DateTimeFields& carriedFields(const CanonicalRecord& record, DateTimeField
 
 /// A value as the answer of a function, before there is a text of it.
 struct ValueAnswer {
-    ValueAnswer() noexcept {} // NOLINT(modernize-use-equals-default): as for a record
+    // Not defaulted, for the reason that a record's is not.
+    ValueAnswer() noexcept {} // NOLINT(modernize-use-equals-default)
 
     ReturnState state = ReturnState::Success;
     TemporalType kind = TemporalType::Unsupported; ///< of the text; it is empty for this one
