@@ -21,6 +21,7 @@
 #include <kvt/encoding/detail/unicode_vectors.h>
 #include <kvt/foundation/detail/append_in_place.h>
 #include <kvt/foundation/detail/utf.h>
+#include <kvt/platform/new_pages.h>
 
 #include <algorithm>
 #include <array>
@@ -289,6 +290,7 @@ void reserveForRest(std::basic_string<CharOut>& out, std::size_t written, std::s
     const double expected =
         static_cast<double>(written) / static_cast<double>(taken) * static_cast<double>(rest);
     out.reserve(out.size() + static_cast<std::size_t>(expected * 1.0625) + longestPiece / 2);
+    platform::fetchPages(out.data() + out.size(), (out.capacity() - out.size()) * sizeof(CharOut));
 }
 
 /// From a form without tables.

@@ -1,6 +1,8 @@
 // Appending to a string what is written straight into it.
 #pragma once
 
+#include <kvt/platform/new_pages.h>
+
 #include <cstddef>
 #include <string>
 
@@ -12,8 +14,12 @@ template <typename CharT, typename Write>
 void appendInPlace(std::basic_string<CharT>& text, std::size_t room, Write write) {
     const std::size_t size = text.size();
 #if defined(__cpp_lib_string_resize_and_overwrite)
-    text.resize_and_overwrite(size + room,
-                              [&](CharT* units, std::size_t) { return size + write(units + size); });
+    text.resize_and_overwrite(size + room, [&](CharT* units, std::size_t) {
+        if (room >= platform::manyNewBytes / sizeof(CharT)) {
+            platform::fetchPages(units + size, room * sizeof(CharT));
+        }
+        return size + write(units + size);
+    });
 #else
     text.resize(size + room);
     text.resize(size + write(text.data() + size));
