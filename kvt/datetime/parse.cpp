@@ -47,9 +47,14 @@ std::string expanded(std::string_view format) {
     return text;
 }
 
-// Whether there is one, or what looks like one behind "%%".
+// Whether there is one, or what looks like one behind "%%". A format is too short for a search by a call.
 bool hasTimeFlag(std::string_view format) {
-    return format.find("%T") != std::string_view::npos;
+    for (std::size_t i = 1; i < format.size(); ++i) {
+        if (format[i] == 'T' && format[i - 1] == '%') {
+            return true;
+        }
+    }
+    return false;
 }
 
 // Made in place, since a value that does not fit is nothing rare.
