@@ -209,6 +209,33 @@ TEST_F(KvtConvertOutput, AFullDiskIsAFailure) {
     }
 }
 
+// Much data is written on a thread of its own.
+TEST_F(KvtConvertOutput, MuchDataIsWrittenWholeOrAsFarAsItGoes) {
+    const std::string text(17 * 1024 * 1024, 'x');
+    write("text", text + "\u0141");
+    const std::vector<std::string> toUtf8 = {"convert", "--from", "UTF-8", "--to", "UTF-8", "text"};
+    EXPECT_EQ(runChild(setup(toUtf8)).out == text + "\u0141", true);
+
+    ChildSetup made = setup(toUtf8);
+    made.outputFile = "/dev/full";
+    ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write to standard output: No space left on device\n");
+
+    result = runChild(setup({"convert", "--from", "UTF-8", "--to", "US-ASCII", "text"}));
+    EXPECT_EQ(result.status, 2);
+    EXPECT_TRUE(contains(result.err, "ends before the loss")) << result.err;
+    EXPECT_EQ(result.out, text.substr(0, result.out.size()));
+    EXPECT_GT(result.out.size(), text.size() - 1024 * 1024);
+
+    made = setup({"convert", "--from", "UTF-8", "--to", "UTF-16LE", "-o", "out", "text"});
+    made.mostFileBytes = 1000000;
+    result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write out: File too large\n");
+    EXPECT_EQ(names(), std::vector<std::string>{"text"});
+}
+
 TEST_F(KvtConvertOutput, AFileThatGrowsTooLongIsAFailure) {
     write("out", "old");
     // Of the shorter one, the last write stores all but two bytes.

@@ -1,5 +1,6 @@
 #include "convert/conversion.h"
 
+#include "base/background_output.h"
 #include "base/failure.h"
 #include "base/messages.h"
 #include "base/text.h"
@@ -20,6 +21,9 @@ namespace {
 
 using kvt::ex::Encoding;
 using kvt::ex::Loss;
+
+// Bytes for which it pays to have a thread for the writing.
+constexpr std::uint64_t muchInput = 16 * 1024 * 1024;
 
 // As the library shows bytes in its failures.
 std::string escaped(std::string_view bytes) {
@@ -90,6 +94,9 @@ int Conversion::run() {
         throw Failure("--bom add: " + toName_ + " has no byte order mark");
     }
     output_ = openOutput(options_.output);
+    if (totalSize(options_.inputs).value_or(0) >= muchInput) {
+        output_ = std::make_unique<BackgroundOutput>(std::move(output_));
+    }
     report_ = openReport(options_);
     if (options_.mark == MarkPolicy::Add) {
         output_->write(mark);

@@ -1,0 +1,100 @@
+#include "base/background_output.h"
+
+#include "base/interrupt.h"
+
+#include <system_error>
+#include <utility>
+
+namespace host {
+
+namespace {
+
+constexpr std::size_t mostPieces = 4;
+
+} // namespace
+
+BackgroundOutput::BackgroundOutput(std::unique_ptr<Output> output) : output_(std::move(output)) {
+    // A signal ends the program on the thread that makes files and removes them.
+    SignalsHeldBack inWriter;
+    try {
+        writer_ = std::thread([this] { work(); });
+    } catch (const std::system_error&) {
+        // There may be no more threads. What is written is written at once then.
+    }
+}
+
+BackgroundOutput::~BackgroundOutput() {
+    finish();
+}
+
+void BackgroundOutput::write(std::string_view bytes) {
+    if (!writer_.joinable()) {
+        output_->write(bytes);
+        return;
+    }
+    std::string piece;
+    {
+        std::unique_lock lock(state_);
+        hasChanged_.wait(lock, [&] { return failure_ || pieces_.size() < mostPieces; });
+        if (failure_) {
+            std::rethrow_exception(failure_);
+        }
+        if (!spares_.empty()) {
+            piece = std::move(spares_.back());
+            spares_.pop_back();
+        }
+    }
+    piece.assign(bytes);
+    {
+        const std::lock_guard lock(state_);
+        pieces_.push_back(std::move(piece));
+    }
+    hasChanged_.notify_one();
+}
+
+void BackgroundOutput::commit() {
+    finish();
+    if (failure_) {
+        std::rethrow_exception(failure_);
+    }
+    output_->commit();
+}
+
+void BackgroundOutput::work() {
+    std::unique_lock lock(state_);
+    for (;;) {
+        hasChanged_.wait(lock, [&] { return isOver_ || !pieces_.empty(); });
+        if (pieces_.empty()) {
+            return;
+        }
+        std::string piece = std::move(pieces_.front());
+        lock.unlock();
+        std::exception_ptr failure;
+        try {
+            output_->write(piece);
+        } catch (...) {
+            failure = std::current_exception();
+        }
+        lock.lock();
+        pieces_.pop_front();
+        spares_.push_back(std::move(piece));
+        hasChanged_.notify_one();
+        if (failure) {
+            failure_ = failure;
+            return;
+        }
+    }
+}
+
+void BackgroundOutput::finish() {
+    if (writer_.joinable()) {
+        {
+            const std::lock_guard lock(state_);
+            isOver_ = true;
+        }
+        hasChanged_.notify_one();
+        writer_.join();
+    }
+}
+
+} // namespace host
