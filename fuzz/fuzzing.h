@@ -47,11 +47,12 @@ private:
     std::string_view rest_;
 };
 
-/// Stops the fuzzer, with what was seen and what should have been; `what` is made into a text only then.
+/// Stops the fuzzer, with what was seen and what should have been; `what` is made into a text only then. It goes to
+/// clog, since a fuzzer may listen to what others write to cerr.
 template <typename Actual, typename Expected, typename... What>
 void requireEqual(const Actual& actual, const Expected& expected, const What&... what) {
     if (!(actual == expected)) {
-        (std::cerr << ... << what) << "\nis:       " << actual << "\nexpected: " << expected << '\n';
+        (std::clog << ... << what) << "\nis:       " << actual << "\nexpected: " << expected << std::endl;
         std::abort();
     }
 }
@@ -68,7 +69,7 @@ struct Hex {
 template <typename... What>
 void require(bool condition, const What&... what) {
     if (!condition) {
-        (std::cerr << ... << what) << '\n';
+        (std::clog << ... << what) << std::endl;
         std::abort();
     }
 }
