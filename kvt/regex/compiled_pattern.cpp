@@ -63,6 +63,15 @@ bool CompiledPattern::search(std::string_view text, std::size_t start, boost::cm
     return searchIn({begin, begin, text.data() + text.size()}, boost::regex_constants::match_default, result);
 }
 
+bool CompiledPattern::matchesIn(std::string_view text) const {
+    // The engine, too, would find what the scan finds, if it does not give up before.
+    if (prefix_.isWholePattern && prefix_.isSureToEnd(engine_.size(), text.size(), prefix_.statesOfWay)) {
+        return scan_.find(text.data(), text.size(), 0) != text.size();
+    }
+    boost::cmatch result;
+    return search(text, 0, result);
+}
+
 std::size_t CompiledPattern::passOver(std::string_view text, std::size_t start) const {
     // What is sure to end without a try is so in each part of the text.
     return scan_ && prefix_.isSureToEnd(engine_.size(), text.size() - start, 0)

@@ -217,6 +217,41 @@ private:
     FixedPrefix& prefix_;
 };
 
+/// How many bytes each match has, where the pattern says of each of them alone which it may be.
+std::optional<std::size_t> sizeOfPlainPattern(const Engine& engine) {
+    std::size_t size = 0;
+    const states::re_syntax_base* state = engine.get_first_state();
+    while (state != nullptr) {
+        switch (state->type) {
+        case states::syntax_element_startmark:
+        case states::syntax_element_endmark:
+            break;
+        case states::syntax_element_literal:
+            size += as<states::re_literal>(state).length;
+            break;
+        case states::syntax_element_set:
+            ++size;
+            break;
+        case states::syntax_element_char_rep:
+        case states::syntax_element_short_set_rep: {
+            const auto& repeat = as<states::re_repeat>(state);
+            if (repeat.min != repeat.max || repeat.max > longestPrefix) {
+                return std::nullopt;
+            }
+            size += repeat.min;
+            state = repeat.alt.p;
+            continue;
+        }
+        case states::syntax_element_match:
+            return size;
+        default:
+            return std::nullopt;
+        }
+        state = state->next.p;
+    }
+    return std::nullopt;
+}
+
 bool haveCommonByte(const ByteSet& left, const ByteSet& right) {
     for (std::size_t i = 0; i < left.rows.size(); ++i) {
         if ((left.rows[i] & right.rows[i]) != 0) {
@@ -250,6 +285,7 @@ FixedPrefix fixedPrefix(const Engine& engine) {
         if (isRunOpen || !isRare(prefix.sets)) {
             prefix.sets.clear();
         }
+        prefix.isWholePattern = !prefix.sets.empty() && sizeOfPlainPattern(engine) == prefix.sets.size();
     }
     return prefix;
 }

@@ -128,8 +128,7 @@ void URegex<N>::searchAll(const UString<N>& subject,
 
 template <std::uint32_t N>
 bool URegex<N>::matchesIn(UStringView<N> text) const {
-    boost::cmatch result;
-    return d().pattern != nullptr && d().pattern->search({text.data(), text.size()}, 0, result);
+    return d().pattern != nullptr && d().pattern->matchesIn({text.data(), text.size()});
 }
 
 template <std::uint32_t N>

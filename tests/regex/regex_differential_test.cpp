@@ -228,6 +228,9 @@ const std::vector<Prefixed> prefixes = {
     {"q[[:alpha:]]\\w{2,4}", {"qab1", "qabcdef", "q1", "qa"}},
     {"[[:xdigit:]]{8}", {"9f3c0a1b", "9f3c0a1", "g"}},
     {"\\Qa.b\\E", {"a.b", "axb", "."}},
+    // As long as a beginning may be, and longer.
+    {"abcdefghijklmno[0-9]", {"abcdefghijklmno1", "abcdefghijklmno", "abcdefghijklmnop", "1"}},
+    {"abcdefghijklmno[0-9]{2}", {"abcdefghijklmno12", "abcdefghijklmno1", "abcdefghijklmno1x", "2"}},
     // Beginnings that begin with a run.
     {"\\d+-", {"12-", "1-", "-", "123", "1-2-", "0"}},
     {"(\\d{2,})-(\\d+)", {"12-3", "1-2", "1-", "-", "123", "12--"}},

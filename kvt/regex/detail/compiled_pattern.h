@@ -27,6 +27,8 @@ public:
     bool match(std::string_view text, boost::cmatch& result) const;
     /// Whether it matches somewhere from `start` on, which is at most the size; nothing before `start` is seen.
     bool search(std::string_view text, std::size_t start, boost::cmatch& result) const;
+    /// Whether it matches anywhere.
+    bool matchesIn(std::string_view text) const;
     /// Behind which place a match ends that begins at `start` or behind it, in the text or in a part of it that is
     /// searched by itself.
     std::size_t passOver(std::string_view text, std::size_t start) const;

@@ -26,6 +26,8 @@ struct FixedPrefix {
     /// Where the pattern begins with a run of bytes of a set, that set. It is the first of `sets`, too: there it stands
     /// for the last byte of the run, behind which no other of its bytes can stand.
     std::optional<ByteSet> run;
+    /// Whether the pattern takes what has the sets, all of it, and nothing else.
+    bool isWholePattern = false;
     /// In the order of the pattern, the parts of all its alternatives.
     std::vector<Part> parts;
     bool hasAlternatives = false;

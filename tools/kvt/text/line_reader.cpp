@@ -8,6 +8,7 @@
 #include <kvt/string/ustring.h>
 
 #include <algorithm>
+#include <cstring>
 #include <sstream>
 #include <utility>
 
@@ -151,8 +152,15 @@ void LineReader::passOver(std::size_t length) {
     }
     const std::string_view all = decoded_;
     std::size_t end = std::min(taken_ + length, whole_ - 1) + 1; // behind where a line ends, or its CR
-    while (end > taken_ && !isLineEnd(all[end - 1])) {
-        --end;
+    const bool hasReturns = nextOf('\r', return_) < end;
+    if (hasReturns) {
+        while (end > taken_ && !isLineEnd(all[end - 1])) {
+            --end;
+        }
+    } else {
+        const void* const last = ::memrchr(all.data() + taken_, '\n', end - taken_);
+        end = last == nullptr ? taken_
+                              : static_cast<std::size_t>(static_cast<const char*>(last) - all.data()) + 1;
     }
     if (end == taken_) {
         return;
@@ -162,7 +170,7 @@ void LineReader::passOver(std::size_t length) {
     }
     const std::string_view passed = all.substr(taken_, end - taken_);
     number_ += countOf(passed, '\n');
-    if (nextOf('\r', return_) < end) {
+    if (hasReturns) {
         number_ += countWhere(passed.size(), [bytes = passed.data()](std::size_t index) {
             const char byte = bytes[index];
             const char next = bytes[index + 1]; // behind the last one stands a zero
