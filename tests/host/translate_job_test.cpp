@@ -41,6 +41,13 @@ TEST(JobFile, HasAsciiOnlyOutsideOfStringsAndComments) {
     EXPECT_EQ(complaintAbout("\xEF\xBB\xBF[input]\nheader = true\n"), "none");
 }
 
+// The quote opens no string to TOML, so that its reader meets a letter where it looks for the end of a number.
+TEST(JobFile, MayHaveLettersWhereAValueIsBroken) {
+    for (const char* value : {"[13^\"\xCF\x9D\"]", "1.\"\xE3\x81\x82\"", "\"\"\"\\\xC3\xBC\"\"\""}) {
+        EXPECT_EQ(complaintAbout("x = " + std::string(value) + "\n").rfind("job.toml:1:", 0), 0U) << value;
+    }
+}
+
 TEST(JobFile, SaysAllThatAJobHas) {
     const Job job = readJob(R"(
 [input]
