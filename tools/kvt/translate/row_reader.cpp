@@ -40,28 +40,27 @@ bool RowReader::next() {
         if (ends_.size() - count_ <= static_cast<std::size_t>(width)) {
             ends_.resize(ends_.size() * 2 + static_cast<std::size_t>(2 * width));
         }
+        // All up to the first byte of another kind, that byte included.
+        const std::uint64_t others = ahead_ & others_;
+        const std::uint64_t ends = ahead_ & (others ^ (others - 1));
+        ahead_ ^= ends;
         const char** cellEnd = ends_.data() + count_;
-        const char* const block = block_;
-        const char* place = nullptr;
-        std::uint64_t ahead = ahead_;
-        const std::uint64_t others = others_;
-        bool isOther = false;
-        while (ahead != 0 && !isOther) {
-            place = block + std::countr_zero(ahead);
-            *cellEnd++ = place;
-            isOther = (ahead & (0 - ahead) & others) != 0;
-            ahead &= ahead - 1;
+        for (std::uint64_t left = ends; left != 0; left &= left - 1) {
+            *cellEnd++ = block_ + std::countr_zero(left);
         }
-        ahead_ = ahead;
-        count_ = static_cast<std::size_t>(cellEnd - ends_.data()) - (isOther ? 1 : 0);
-        if (!isOther) {
+        count_ = static_cast<std::size_t>(cellEnd - ends_.data());
+        if (others == 0) {
             if (end_ - block_ <= width) {
                 return endRow(end_);
             }
             lookAt(block_ + width);
-        } else if (*place == '\n' || *place == '\r') {
+            continue;
+        }
+        const char* const place = ends_[--count_];
+        if (*place == '\n' || *place == '\r') {
             return endRow(place);
-        } else if (*place == '\0') {
+        }
+        if (*place == '\0') {
             blame(RowFault::Nul, place);
         } else if (place == (count_ == 0 ? begin_ : ends_[count_ - 1] + 1) && !takeQuoted(place)) {
             return endRow(end_);
