@@ -1,8 +1,6 @@
 // The profiles of all encodings that text was converted from or to, and when their tables are built.
 #include <kvt/encoding/detail/encoding_profile.h>
 
-#include <kvt/encoding/detail/icu.h>
-
 namespace kvt::ex::detail {
 namespace {
 
@@ -35,6 +33,14 @@ Form EncodingProfile::findForm() {
     const Form form = icu::Converter(itself()).form();
     form_.store(form, std::memory_order_relaxed);
     return form;
+}
+
+icu::Converter::Nature EncodingProfile::nature() {
+    if (!isNatureKnown_.load(std::memory_order_acquire)) {
+        nature_.store(icu::Converter(itself()).nature(), std::memory_order_relaxed);
+        isNatureKnown_.store(true, std::memory_order_release);
+    }
+    return nature_.load(std::memory_order_relaxed);
 }
 
 template <typename Table>

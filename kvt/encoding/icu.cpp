@@ -169,6 +169,7 @@ private:
         ucnv_reset(converter_.get());
         ucnv_fromUnicode(converter_.get(), &target, target + bytes.size(), &source, source + text.size(),
                          nullptr, 1, &error);
+        requireMemory(error);
         bytes.resize(static_cast<std::size_t>(target - bytes.data()));
         return U_SUCCESS(error) ? std::optional(bytes) : std::nullopt;
     }
@@ -181,8 +182,16 @@ private:
         ucnv_reset(converter_.get());
         ucnv_toUnicode(converter_.get(), &target, target + text.size(), &source, source + bytes.size(),
                        nullptr, flush ? 1 : 0, &error);
+        requireMemory(error);
         text.resize(static_cast<std::size_t>(target - text.data()));
         return U_SUCCESS(error) ? std::optional(text) : std::nullopt;
+    }
+
+    // What is found out is kept for good.
+    static void requireMemory(UErrorCode error) {
+        if (error == U_MEMORY_ALLOCATION_ERROR) {
+            throw std::bad_alloc();
+        }
     }
 
     UErrorCode openError_ = U_ZERO_ERROR;

@@ -7,6 +7,7 @@
 //
 // The caller's blocks must not show in the result. So nothing rests on where a slice ended, and a slice is taken back
 // by copies of the converters that were made before it, or by a reset where that comes to the same.
+#include <kvt/encoding/detail/encoding_profile.h>
 #include <kvt/encoding/detail/stream_impl.h>
 
 #include <kvt/foundation/throwable.h>
@@ -46,7 +47,8 @@ StreamTranscoder::Impl::Impl(Encoding from, Encoding to)
     : from_(open(from)), to_(open(to)), fromSide_(detail::sideOf(from)), toSide_(detail::sideOf(to)),
       hasShortcut_(fromSide_.form != Form::other && toSide_.form != Form::other &&
                    (from != to || detail::unicodeForm(from) != Form::other)),
-      fromNature_(from_.nature()), isStateless_(fromNature_.isStateless && to_.nature().isStateless),
+      fromNature_(detail::profileOf(from).nature()),
+      isStateless_(fromNature_.isStateless && detail::profileOf(to).nature().isStateless),
       countsHeldBytes_(from_.countsHeldBytes() && !fromNature_.isBehind),
       canTakeCharacters_(hasShortcut_ && isStateless_ && countsHeldBytes_),
       substitution_(to_.substitution()) {

@@ -5,6 +5,7 @@
 #pragma once
 
 #include <kvt/encoding/detail/conversion_tables.h>
+#include <kvt/encoding/detail/icu.h>
 #include <kvt/encoding/detail/shortcut.h>
 #include <kvt/encoding/detail/stable_array.h>
 #include <kvt/encoding/encoding.h>
@@ -28,6 +29,9 @@ public:
         const Form form = form_.load(std::memory_order_relaxed);
         return form != unknownForm ? form : findForm();
     }
+    /// Found out at the first call, which takes as long as some hundred short texts. ICU can open the encoding. Throws
+    /// std::bad_alloc.
+    icu::Converter::Nature nature();
 
     /// Null as long as they are not built.
     const DecodingTable* decoding() const { return decoding_.table.load(std::memory_order_acquire); }
@@ -57,6 +61,8 @@ private:
     std::atomic<std::uint32_t> id_{Encoding::Unknown};
     static constexpr auto unknownForm = static_cast<Form>(0xFF);
     std::atomic<Form> form_{unknownForm};
+    std::atomic<bool> isNatureKnown_{false};
+    std::atomic<icu::Converter::Nature> nature_{};
     std::mutex building_;
     Lazy<DecodingTable> decoding_;
     Lazy<EncodingTable> encoding_;
