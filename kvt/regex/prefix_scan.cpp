@@ -14,6 +14,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <functional>
 #include <numeric>
 #include <string_view>
 #include <utility>
@@ -170,11 +171,14 @@ PrefixScan::Probe probeOf(const ByteSet& set, std::size_t offset) {
 } // namespace
 
 double ByteSet::frequency() const {
-    double sum = 0;
-    for (unsigned byte = 0; byte < 256; ++byte) {
-        sum += contains(static_cast<unsigned char>(byte)) ? weights[byte] : 0;
+    constexpr unsigned ofAll = std::accumulate(weights.begin(), weights.end(), 0U);
+    unsigned sum = 0;
+    for (std::size_t upper = 0; upper < rows.size(); ++upper) {
+        for (unsigned row = rows[upper]; row != 0; row &= row - 1) {
+            sum += weights[16 * upper + static_cast<std::size_t>(std::countr_zero(row))];
+        }
     }
-    return sum / std::accumulate(weights.begin(), weights.end(), 0.0);
+    return static_cast<double>(sum) / ofAll;
 }
 
 PrefixScan::PrefixScan(std::vector<ByteSet> sets) : sets_(std::move(sets)) {
@@ -186,9 +190,10 @@ PrefixScan::PrefixScan(std::vector<ByteSet> sets) : sets_(std::move(sets)) {
     std::vector<std::size_t> places(sets_.size());
     std::iota(places.begin(), places.end(), std::size_t{0});
     std::swap(places.back(), places[places.size() > 1 ? 1 : 0]);
-    std::stable_sort(places.begin(), places.end(), [&](std::size_t a, std::size_t b) {
-        return sets_[a].frequency() < sets_[b].frequency();
-    });
+    std::vector<double> frequencies(sets_.size());
+    std::transform(sets_.begin(), sets_.end(), frequencies.begin(), std::mem_fn(&ByteSet::frequency));
+    std::stable_sort(places.begin(), places.end(),
+                     [&](std::size_t a, std::size_t b) { return frequencies[a] < frequencies[b]; });
     const auto others = std::stable_partition(places.begin(), places.end(),
                                               [&](std::size_t place) { return sets_[place].count() == 1; });
     const auto bytes = static_cast<std::size_t>(others - places.begin());
