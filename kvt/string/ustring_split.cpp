@@ -6,6 +6,7 @@
 #include <kvt/string/ustring_array.h>
 
 #include <kvt/foundation/detail/append_in_place.h>
+#include <kvt/platform/new_pages.h>
 
 #include <algorithm>
 #include <array>
@@ -119,6 +120,7 @@ UStringArray<N> UString<N>::split(value_type delimiter, SplitBehaviour behaviour
         detail::vectors::countParts(text.data(), text.size(), delimiter, keepEmptyParts);
     UStringArray<N> pieces;
     pieces.reserve(std::min<std::uint64_t>(parts, maxCount) + 1);
+    platform::fetchPages(pieces.data(), static_cast<std::size_t>(pieces.capacity()) * sizeof(UString<N>));
     cutAtUnit<value_type>(text, delimiter, keepEmptyParts, maxCount,
                           [&pieces, text](const Span* spans, std::size_t count) {
                               UString<N>* piece = pieces.end();
