@@ -83,7 +83,7 @@ void holdThreads(Limits& limits) {
                     return regex.search(subject).groupCount();
                 }));
     holdThreads(limits, "getName",
-                repeated(50'000, [encoding = Encoding("macintosh")] { return encoding.getName(); }));
+                repeated(500'000, [encoding = Encoding("macintosh")] { return encoding.getName(); }));
     holdThreads(limits, "Encoding of a known name",
                 repeated(50'000, [name = string("macintosh")] { return Encoding(name); }));
 }
