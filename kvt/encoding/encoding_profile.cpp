@@ -37,10 +37,12 @@ Form EncodingProfile::findForm() {
 
 icu::Converter::Nature EncodingProfile::nature() {
     if (!isNatureKnown_.load(std::memory_order_acquire)) {
-        nature_.store(icu::Converter(itself()).nature(), std::memory_order_relaxed);
+        const icu::Converter::Nature found = icu::Converter(itself()).nature();
+        isStateless_.store(found.isStateless, std::memory_order_relaxed);
+        isBehind_.store(found.isBehind, std::memory_order_relaxed);
         isNatureKnown_.store(true, std::memory_order_release);
     }
-    return nature_.load(std::memory_order_relaxed);
+    return {isStateless_.load(std::memory_order_relaxed), isBehind_.load(std::memory_order_relaxed)};
 }
 
 template <typename Table>

@@ -62,7 +62,8 @@ private:
     static constexpr auto unknownForm = static_cast<Form>(0xFF);
     std::atomic<Form> form_{unknownForm};
     std::atomic<bool> isNatureKnown_{false};
-    std::atomic<icu::Converter::Nature> nature_{};
+    std::atomic<bool> isStateless_{false};
+    std::atomic<bool> isBehind_{false};
     std::mutex building_;
     Lazy<DecodingTable> decoding_;
     Lazy<EncodingTable> encoding_;
