@@ -10,6 +10,7 @@
 #include <iostream>
 #include <string>
 #include <string_view>
+#include <unistd.h>
 #include <vector>
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);
@@ -72,6 +73,11 @@ void require(bool condition, const What&... what) {
         (std::clog << ... << what) << std::endl;
         std::abort();
     }
+}
+
+/// Has temporary files lie in memory from now on, where the system can; a folder that was chosen stays.
+inline bool keepFilesInMemory() {
+    return ::access("/dev/shm", W_OK | X_OK) == 0 && ::setenv("TMPDIR", "/dev/shm", 0) == 0;
 }
 
 /// One converter of each kind that ICU has, by canonical names. The order is part of the corpus: add at the end.

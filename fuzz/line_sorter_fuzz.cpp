@@ -11,10 +11,8 @@
 #include <sort/workspace.h>
 
 #include <algorithm>
-#include <cstdlib>
 #include <map>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 using namespace kvt::fuzz;
@@ -29,9 +27,7 @@ public:
     std::string text;
 };
 
-// The folder of temporary files; one that was chosen stays.
-[[maybe_unused]] const bool inMemory =
-    ::access("/dev/shm", W_OK | X_OK) == 0 && ::setenv("TMPDIR", "/dev/shm", 0) == 0;
+[[maybe_unused]] const bool inMemory = keepFilesInMemory();
 
 std::vector<std::string> linesOf(std::string_view text, std::size_t most) {
     std::vector<std::string> lines;

@@ -19,6 +19,7 @@ namespace kvt::fuzz {
 class ZoneFolder {
 public:
     ZoneFolder() {
+        keepFilesInMemory();
         std::string name = (std::filesystem::temp_directory_path() / "kvt-zones-XXXXXX").string();
         require(::mkdtemp(name.data()) != nullptr, "a temporary folder");
         path_ = name;

@@ -71,6 +71,17 @@ TEST_F(InferCommand, SaysWhatIsWrongWithRows) {
 }
 
 // Only a row with an open quote can be blamed on one.
+// Without its quotes, the first cell would end within a character.
+TEST_F(InferCommand, TakesNoNamesFromABrokenRow) {
+    const std::string rows = "1.2.2003,x\n4.5.2006,y\n";
+    write("a.csv", "\"a\"b\xC3\xBC,b\n" + rows);
+    const auto result = kvt({"infer", path("a.csv")});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_NE(result.out.find("the first is row 1.\n"), std::string::npos) << result.out;
+    EXPECT_NE(result.out.find("# Column 1: 2 dates or times.\n"), std::string::npos) << result.out;
+    EXPECT_NE(result.out.find("do = \"date\"\ncolumn = \"1\"\n"), std::string::npos) << result.out;
+}
+
 TEST_F(InferCommand, NamesTheQuoteOfARowThatIsTooLong) {
     const std::string cell(70 << 20, 'x');
     write("plain.csv", "a,b\n1," + cell);

@@ -198,6 +198,7 @@ void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
     std::vector<std::string> first;
     std::string scratch;
     bool isFirst = true;
+    bool isFirstBroken = false;
     DecodedRows(survey, file, onBytes).forEach([&](std::string_view text) {
         RowReader reader(survey.table.form, text);
         while (reader.next()) {
@@ -210,6 +211,8 @@ void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
                               " cells; no more than " + std::to_string(mostColumns) +
                               " columns are looked at");
             }
+            isFirstBroken = reader.fault() != RowFault::None;
+            survey.brokenRows += isFirstBroken ? 1 : 0;
             for (std::size_t i = 0; i < reader.cellCount(); ++i) {
                 first.emplace_back(textOfCell(reader.cell(i), survey.table.form, scratch));
             }
@@ -218,6 +221,9 @@ void surveyRows(Survey& survey, const TwiceRead& file, const OnBytes& onBytes) {
     });
     judgeHeader(survey, first);
     for (std::size_t i = 0; i < first.size(); ++i) {
+        if (isFirstBroken) {
+            continue; // what its cells say is not certain, not even that it is text
+        }
         if (survey.hasHeader) {
             survey.columns[i].name = first[i];
         } else {
