@@ -52,6 +52,21 @@ TEST(BackgroundOutput, WritesAllInOrder) {
     EXPECT_EQ(behind.written, expected);
 }
 
+TEST(BackgroundOutput, TakesWhatItIsGiven) {
+    Behind behind;
+    std::string expected;
+    BackgroundOutput output(std::make_unique<Recorded>(behind));
+    std::string piece;
+    for (int i = 0; i < 1000; ++i) {
+        piece.append(static_cast<std::size_t>(i), static_cast<char>('a' + i % 26));
+        expected += piece;
+        output.writeAndClear(piece);
+        ASSERT_TRUE(piece.empty());
+    }
+    output.commit();
+    EXPECT_EQ(behind.written, expected);
+}
+
 TEST(BackgroundOutput, WithoutCommitAllIsWrittenAndNothingAppears) {
     Behind behind;
     { BackgroundOutput(std::make_unique<Recorded>(behind)).write("before the loss"); }

@@ -28,26 +28,27 @@ BackgroundOutput::~BackgroundOutput() {
 }
 
 void BackgroundOutput::write(std::string_view bytes) {
+    std::string piece(bytes);
+    writeAndClear(piece);
+}
+
+void BackgroundOutput::writeAndClear(std::string& bytes) {
     if (!writer_.joinable()) {
-        output_->write(bytes);
+        output_->writeAndClear(bytes);
         return;
     }
-    std::string piece;
     {
         std::unique_lock lock(state_);
         hasChanged_.wait(lock, [&] { return failure_ || pieces_.size() < mostPieces; });
         if (failure_) {
             std::rethrow_exception(failure_);
         }
+        pieces_.push_back(std::move(bytes));
+        bytes.clear();
         if (!spares_.empty()) {
-            piece = std::move(spares_.back());
+            bytes.swap(spares_.back());
             spares_.pop_back();
         }
-    }
-    piece.assign(bytes);
-    {
-        const std::lock_guard lock(state_);
-        pieces_.push_back(std::move(piece));
     }
     hasChanged_.notify_one();
 }
@@ -77,6 +78,7 @@ void BackgroundOutput::work() {
         }
         lock.lock();
         pieces_.pop_front();
+        piece.clear();
         spares_.push_back(std::move(piece));
         hasChanged_.notify_one();
         if (failure) {

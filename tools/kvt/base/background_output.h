@@ -27,6 +27,7 @@ public:
     ~BackgroundOutput() override;
 
     void write(std::string_view bytes) override;
+    void writeAndClear(std::string& bytes) override;
     void commit() override;
     bool writesInPlaceTo(int descriptor) const override { return output_->writesInPlaceTo(descriptor); }
 

@@ -16,6 +16,11 @@ public:
     virtual ~Output() = default;
     /// Throws Failure, or ClosedPipe when nobody reads standard output any more.
     virtual void write(std::string_view bytes) = 0;
+    /// The same; `bytes` is empty afterwards, and may have other memory.
+    virtual void writeAndClear(std::string& bytes) {
+        write(bytes);
+        bytes.clear();
+    }
     /// Sees to it that all is written, and makes a file appear. Without it, a file does not appear.
     virtual void commit() = 0;
     /// Whether `descriptor` reads the file that this output writes to in place.

@@ -190,8 +190,7 @@ void Conversion::writeConverted() {
     if (roundTrip_) {
         roundTrip_->addOutput(converted_);
     }
-    output_->write(converted_);
-    converted_.clear();
+    output_->writeAndClear(converted_);
     if (!reportLines_.empty()) {
         report_->write(reportLines_);
         reportLines_.clear();
