@@ -206,4 +206,21 @@ TEST(ParseTrace, HasOneForEachFormOfAKeyword) {
     }
 }
 
+TEST(ParseTrace, EndsWithTheKeywordThatSettlesIt) {
+    for (const char* const value : {"20200102", "20201302"}) { // read, or such a form but out of range
+        const auto traces = traceParse(ustring(value), "ZQT|ISO|ZQT", false);
+        ASSERT_EQ(traces.size(), 7u);
+        EXPECT_EQ(kvt::test::answerOf(traces[0].result),
+                  kvt::test::answerOf(parse(ustring(value), "ZQT", false)));
+        for (std::size_t i = 0; i < traces.size(); ++i) {
+            EXPECT_EQ(traces[i].wasTried, i == 0) << value << ": " << i;
+        }
+    }
+}
+
+TEST(ParseTrace, OfNothingReachesNothing) {
+    EXPECT_EQ(stepsOf("", "%Y-"), (std::vector<Step>{{"%Y", NotReached, "", ""}, {"-", NotReached, "", ""}}));
+    EXPECT_EQ(stepsOf("2020", ""), std::vector<Step>());
+}
+
 } // namespace

@@ -40,6 +40,20 @@ std::vector<Mixture> mixtures() {
           {"\xF0\x9F\x98x", "\xFF\xFD\0x"sv, {bad(0, "\xF0\x9F\x98")}},
           {"\xC0", "\xFF\xFD", {bad(0, "\xC0")}},
           {"\xED\xA0\x80", "\xFF\xFD\xFF\xFD\xFF\xFD", {bad(0, "\xED"), bad(1, "\xA0"), bad(2, "\x80")}}}},
+        // Behind a loss a few characters are taken without ICU, in whichever form is wanted.
+        {"UTF-8",
+         "UTF-16LE",
+         {{"a", "a\0"sv},
+          {"\u00e9", "\xE9\0"sv},
+          {"\u20ac", "\xAC\x20"},
+          {"\U0001F600", "\x3D\xD8\0\xDE"sv},
+          {"\xFF", "\xFD\xFF", {bad(0, "\xFF")}}}},
+        {"UTF-8",
+         "UTF-32LE",
+         {{"a", "a\0\0\0"sv},
+          {"\u20ac", "\xAC\x20\0\0"sv},
+          {"\U0001F600", "\x00\xF6\x01\0"sv},
+          {"\xFF", "\xFD\xFF\0\0"sv, {bad(0, "\xFF")}}}},
         {"UTF-8",
          "windows-1252",
          {{"abc", "abc"},
@@ -145,6 +159,27 @@ TEST(StreamTranscoderLosses, AreExactInLongMixturesOfGoodAndBad) {
                     ASSERT_EQ(result.losses[at], expected.losses[at])
                         << count << " pieces in blocks of " << size;
                 }
+            }
+        }
+    }
+}
+
+// Text goes by way of UTF-16 in pieces, none of which ends within a pair.
+TEST(StreamTranscoderLosses, APairAtTheEndOfAPieceIsOneCharacter) {
+    for (const char* const to : {"Shift_JIS", "GBK"}) {
+        StreamTranscoder stream(Encoding("UTF-16LE"), Encoding(to));
+        for (std::size_t before = 2040; before < 2056; ++before) {
+            std::string text;
+            for (std::size_t i = 0; i < before; ++i) {
+                text += "\x42\x30";
+            }
+            text += "\x3D\xD8\x00\xDE\x42\x30"sv;
+            const Streamed expected = streamed(stream, text, {2});
+            EXPECT_EQ(expected.losses, std::vector<Loss>{lost(2 * before, "\x3D\xD8\x00\xDE"sv, 0x1F600)});
+            for (int round = 0; round < 3; ++round) { // soon by tables
+                const Streamed result = streamed(stream, text, {text.size()});
+                EXPECT_EQ(printable(result.out), printable(expected.out)) << to;
+                EXPECT_EQ(result.losses, expected.losses) << to;
             }
         }
     }

@@ -92,6 +92,21 @@ TEST(UStringCaseIcu, TheResultGrowsToWhatIsNeededAndNeverShrinks) {
     expectAnswers<2>();
 }
 
+// Of a long text ICU is asked for the words that the tables leave to it.
+TEST(UStringCaseIcu, AFailureWithinALongTextIsOne) {
+    std::string words;
+    for (int i = 0; i < 500; ++i) {
+        words += "\u039f\u0394\u039f\u03a3 ";
+    }
+    const UString<0> text(words.data(), words.size());
+    const auto map = [&] { return text.getAsLowerCase(); };
+    EXPECT_EQ(failureOf(map).type, ""); // and the tables are made
+    InterceptedCaseMapping icu;
+    icu.answer(0, U_ILLEGAL_ARGUMENT_ERROR);
+    EXPECT_EQ(failureOf(map).type, "kvt::ex::UStringException");
+    EXPECT_EQ(icu.calls.size(), 1U);
+}
+
 TEST(UStringCaseIcu, AFailureOfTheLibrarysOwnKindKeepsItsClassAndItems) {
     const auto thrownBy = [](auto thrown) -> std::string {
         InterceptedCaseMapping icu;

@@ -90,6 +90,34 @@ TEST(UStringCaseLength, ZerosInsideAreMappedOver) {
     EXPECT_EQ(shown(UString<2>(UStringView<2>(u"a\0b", 3)).getAsUpperCase()), "A{0}B");
 }
 
+// Long enough for the tables, with a sigma, of which only ICU knows whether a word ends there.
+template <std::uint32_t N>
+void expectLongInPlace() {
+    std::string text;
+    for (int i = 0; i < 1000; ++i) {
+        text += "Stra\u00dfe \u03a3\u0391\u03a3 \u0130I\u0149 ";
+    }
+    const UString<N> source = UString<N>(UString<0>(text.data(), text.size()));
+    UString<N> upper = source;
+    upper.toUpperCase();
+    EXPECT_TRUE(upper == source.getAsUpperCase());
+    EXPECT_TRUE(upper.beginsWith(UString<N>(UString<0>("STRASSE \u03a3\u0391\u03a3 \u0130I\u02bcN S"))));
+    UString<N> lower = source;
+    lower.toLowerCase();
+    EXPECT_TRUE(lower == source.getAsLowerCase());
+    EXPECT_TRUE(lower.beginsWith(UString<N>(UString<0>("stra\u00dfe \u03c3\u03b1\u03c2 i\u0307i\u0149 s"))));
+    UString<N> folded = source;
+    folded.toFoldedCase();
+    EXPECT_TRUE(folded == source.getAsFoldedCase());
+    EXPECT_TRUE(folded.beginsWith(UString<N>(UString<0>("strasse \u03c3\u03b1\u03c3 i\u0307i\u02bcn s"))));
+}
+
+TEST(UStringCaseLength, ALongTextIsMappedInPlaceAsInACopy) {
+    expectLongInPlace<0>();
+    expectLongInPlace<2>();
+    expectLongInPlace<3>();
+}
+
 TEST(UStringCaseLength, AViewIsMappedToItsOwnEnd) {
     EXPECT_EQ(shown(UString<0>::getAsUpperCase(UStringView<0>("abcdef", 3))), "ABC");
     EXPECT_EQ(shown(UString<1>::getAsUpperCase(UStringView<1>("abcdef", 3))), "ABC");

@@ -75,6 +75,21 @@ TEST_F(UStringCaseProcess, AMapThatCannotBeOpenedIsTriedAgain) {
     EXPECT_EXIT(mapWhileTheMapCannotBeOpened(), ::testing::ExitedWithCode(0), "");
 }
 
+// It folds by way of UTF-8 where there is a map for that.
+[[noreturn]] void foldLongUtf16WhileTheMapCannotBeOpened() {
+    const std::string capitals(5000, 'A');
+    const UString<2> text = UString<0>(capitals.data(), capitals.size()).getAsUtf16();
+    setCaseMapStatus(U_MISSING_RESOURCE_ERROR);
+    const std::string without = text.getAsFoldedCase().getAsUtf8().toStdString();
+    setCaseMapStatus(U_ZERO_ERROR);
+    const std::string with = text.getAsFoldedCase().getAsUtf8().toStdString();
+    finish({{without, std::string(5000, 'a')}, {with, without}});
+}
+
+TEST_F(UStringCaseProcess, LongUtf16FoldsWithoutTheMapToo) {
+    EXPECT_EXIT(foldLongUtf16WhileTheMapCannotBeOpened(), ::testing::ExitedWithCode(0), "");
+}
+
 [[noreturn]] void mapNothingInUtf8() {
     UString<0>().toUpperCase();
     UString<0>::getAsFoldedCase(UStringView<0>());
