@@ -86,5 +86,15 @@ TEST(TrustPage, TablesAreThoseOfTheFilesInTestsTrust) {
     EXPECT_EQ(files, std::set<std::string>()) << "the page has no such table";
 }
 
+TEST(TrustPage, LinesThatNoTestCanRunStandInTheSources) {
+    const TrustTable left = readTrustFile(root + "/tests/trust/lines_that_no_test_can_run.tsv");
+    ASSERT_EQ(left.columns, (std::vector<std::string>{"file", "from the line", "lines", "why"}));
+    for (const std::vector<std::string>& row : left.rows) {
+        std::ifstream file(root + "/" + row[0]);
+        const std::string text{std::istreambuf_iterator<char>(file), {}};
+        EXPECT_NE(text.find(row[1] + "\n"), std::string::npos) << row[0] << ": " << row[1];
+    }
+}
+
 } // namespace
 } // namespace house
