@@ -64,10 +64,6 @@ std::size_t countDigits(std::string_view text) noexcept {
     return count;
 }
 
-bool allDigits(std::string_view text) noexcept {
-    return countDigits(text) == text.size();
-}
-
 std::uint64_t digitsValue(std::string_view digits) noexcept {
     std::uint64_t value = 0;
     for (; digits.size() >= 8; digits.remove_prefix(8)) {

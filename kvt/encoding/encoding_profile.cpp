@@ -19,11 +19,6 @@ bool hasSingleBytes(Form form) {
 
 constinit Profiles profiles;
 
-EncodingProfile::~EncodingProfile() {
-    delete decoding();
-    delete encoding();
-}
-
 Encoding EncodingProfile::itself() const {
     return static_cast<Encoding::Type>(id_.load(std::memory_order_relaxed));
 }

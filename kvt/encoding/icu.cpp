@@ -286,9 +286,6 @@ std::string Converter::substitution() const {
 }
 
 Form Converter::form() {
-    if (const Form unicode = unicodeForm(encoding_); unicode != Form::other) {
-        return unicode;
-    }
     if (!isOpen()) {
         return Form::other;
     }

@@ -327,16 +327,6 @@ UString<N> map(UStringView<N> view, const char* name, Storage storage) {
     }
 }
 
-// The same in place. A UString<30> converts the result into its own encoding.
-template <Mapping mapping, std::uint32_t N, typename Storage>
-UString<N> mapInto(const UString<N>& string, const char* name, Storage storage) {
-    UString<N> result = map<N, mapping>(string, name, storage);
-    if constexpr (N == Encoding::Unknown) {
-        return result.getAsEncoding(string.encoding());
-    }
-    return result;
-}
-
 } // namespace
 
 template <std::uint32_t N>
@@ -378,7 +368,7 @@ void UString<N>::toUpperCase() {
         std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
                        mapAscii<Mapping::upper>);
     } else {
-        *this = mapInto<Mapping::upper>(
+        *this = map<N, Mapping::upper>(
             *this, "toUpperCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }
@@ -389,7 +379,7 @@ void UString<N>::toLowerCase() {
         std::transform(this->storage_.begin(), this->storage_.end(), this->storage_.begin(),
                        mapAscii<Mapping::lower>);
     } else {
-        *this = mapInto<Mapping::lower>(
+        *this = map<N, Mapping::lower>(
             *this, "toLowerCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }
@@ -399,7 +389,7 @@ void UString<N>::toFoldedCase() {
     if constexpr (N == Encoding::UsAscii) {
         toLowerCase();
     } else {
-        *this = mapInto<Mapping::folded>(
+        *this = map<N, Mapping::folded>(
             *this, "toFoldedCase", [](UString & string) -> auto& { return string.storage_; });
     }
 }

@@ -59,9 +59,6 @@ inline std::uint64_t pairsOf(const char* digits) noexcept {
 /// How many digits a text begins with.
 std::size_t countDigits(std::string_view text) noexcept;
 
-/// True for the empty text.
-bool allDigits(std::string_view text) noexcept;
-
 /// The number of a text that holds digits only, at most 18 of them; 0 for the empty text.
 std::uint64_t digitsValue(std::string_view digits) noexcept;
 

@@ -22,7 +22,6 @@ public:
     EncodingProfile() = default;
     EncodingProfile(const EncodingProfile&) = delete;
     EncodingProfile& operator=(const EncodingProfile&) = delete;
-    ~EncodingProfile();
 
     /// Found out at the first call; `other` when ICU cannot open the encoding.
     Form form() {
