@@ -5,14 +5,20 @@
 
 #include "pattern_rows.h"
 
+#include <kvt/datetime/pattern_trace.h>
 #include <kvt/encoding/encoding.h>
 
 #include <cstdlib>
 #include <langinfo.h>
 
+namespace {
+
+const char* systemName = "ISO-8859-1"; // asked for once in a process; each test has its own
+
+} // namespace
+
 extern "C" char* nl_langinfo(nl_item) noexcept {
-    static char name[] = "ISO-8859-1";
-    return name;
+    return const_cast<char*>(systemName);
 }
 
 namespace {
@@ -83,6 +89,44 @@ TEST(SystemEncoding, FormatsComeBackAsText) {
         {"20200102", "\xC3\xA9", success("\xC3\xA9")},
         {"20200102", "%\xC3\xA9", failure(933079, {"%\xC3\xA9", "@DateTimeFormat()"})},
     });
+}
+
+TEST(SystemEncoding, ATraceCountsBytesOfTheValue) {
+    using namespace kvt::ex::datetime;
+    const auto traces = traceParse("\xC3\xA9"
+                                   "2020x",
+                                   "\xC3\xA9%Y%m", false);
+    ASSERT_EQ(traces.size(), 1u);
+    const auto& steps = traces[0].steps;
+    ASSERT_EQ(steps.size(), 3u);
+    EXPECT_EQ(steps[0].element, "\xC3\xA9");
+    EXPECT_EQ(steps[0].taken, "\xC3\xA9");
+    EXPECT_EQ(steps[0].at, 0u);
+    EXPECT_EQ(steps[1].taken, "2020");
+    EXPECT_EQ(steps[1].at, 2u);
+    EXPECT_EQ(steps[2].state, PatternStepState::Stopped);
+    EXPECT_EQ(steps[2].at, 6u);
+}
+
+// Characters of two bytes that differ in the second one only: the place where they part is within a character.
+TEST(SystemEncoding, HalfACharacterIsShownAsALoss) {
+    systemName = "EUC-JP";
+    expectParsed({
+        {"2020\u3042", "%Y\u3042%m", mismatch("%Y\u3042", "%m")},
+        {"2020\u3042", "%Y\u3044%m", mismatch("%Y\uFFFD", "\uFFFD%m")},
+    });
+}
+
+TEST(SystemEncoding, ATraceOfWhatItDoesNotHaveIsUnknown) {
+    using namespace kvt::ex::datetime;
+    const auto traces = traceParse("2020\xE5\xB9\xB4", "%Y-%m", false);
+    ASSERT_EQ(traces.size(), 1u);
+    ASSERT_EQ(traces[0].steps.size(), 3u);
+    for (const PatternStep& step : traces[0].steps) {
+        EXPECT_EQ(step.state, PatternStepState::Unknown);
+        EXPECT_TRUE(step.taken.isEmpty());
+    }
+    EXPECT_FALSE(traces[0].end);
 }
 
 } // namespace
