@@ -2,6 +2,7 @@
 #include <kvt/encoding/detail/conversion_tables.h>
 
 #include <kvt/encoding/detail/icu.h>
+#include <kvt/encoding/detail/short_ascii.h>
 #include <kvt/foundation/detail/utf.h>
 
 #include <algorithm>
@@ -124,13 +125,13 @@ DecodingTable::DecodingTable(Encoding encoding) : units_(pageSize, noUnit) {
             leads.push_back(first);
         }
     }
-    if (leads.empty()) {
-        return;
-    }
-    const std::vector<char16_t> singles = std::exchange(units_, std::vector<char16_t>(pageSize * pageSize));
-    for (std::size_t first = 0; first < pageSize; ++first) {
-        const auto page = units_.begin() + static_cast<std::ptrdiff_t>(first * pageSize);
-        std::fill(page, page + pageSize, singles[first]);
+    if (!leads.empty()) {
+        const std::vector<char16_t> singles =
+            std::exchange(units_, std::vector<char16_t>(pageSize * pageSize));
+        for (std::size_t first = 0; first < pageSize; ++first) {
+            const auto page = units_.begin() + static_cast<std::ptrdiff_t>(first * pageSize);
+            std::fill(page, page + pageSize, singles[first]);
+        }
     }
     for (const std::size_t first : leads) {
         pairs_[first / 64] |= std::uint64_t{1} << first % 64;
@@ -140,47 +141,100 @@ DecodingTable::DecodingTable(Encoding encoding) : units_(pageSize, noUnit) {
             units_[first * pageSize + second] = probe.read({bytes, 2}).unit.value_or(noUnit);
         }
     }
+    utf8_.reserve(units_.size());
+    std::transform(units_.begin(), units_.end(), std::back_inserter(utf8_), cellOf);
+}
+
+DecodingTable::Utf8Cell DecodingTable::cellOf(char16_t unit) {
+    Utf8Cell cell{};
+    if (unit != noUnit) {
+        cell.length = static_cast<std::uint8_t>(encodeUtf8(unit, cell.bytes));
+    }
+    return cell;
+}
+
+bool DecodingTable::put(char16_t unit, char16_t*& out) {
+    *out = unit;
+    out += unit != noUnit ? 1 : 0;
+    return unit != noUnit;
+}
+
+bool DecodingTable::put(const Utf8Cell& cell, char*& out) {
+    std::memcpy(out, &cell, sizeof cell);
+    out += cell.length;
+    return cell.length != 0;
 }
 
 std::size_t DecodingTable::read(std::string_view& in, char16_t* out, std::size_t room) const {
-    return units_.size() == pageSize ? readSingles(in, out, room) : readPairs(in, out, room);
+    return readAny(units_, in, out, room);
 }
 
-std::size_t DecodingTable::readSingles(std::string_view& in, char16_t* out, std::size_t room) const {
+std::size_t DecodingTable::readUtf8(std::string_view& in, char* out, std::size_t room) const {
+    return readAny(utf8_, in, out, room);
+}
+
+std::size_t DecodingTable::roomForUtf8(std::string_view text) const {
+    constexpr std::size_t longest = sizeof(Utf8Cell::bytes);
+    const std::size_t longer = keepsAscii_ ? countBeyondAscii(text) : text.size();
+    // The last character may be the shortest and is written as a cell, too.
+    return text.size() + (longest - 1) * longer + sizeof(Utf8Cell) - 1;
+}
+
+template <typename Cell, typename Unit>
+std::size_t DecodingTable::readAny(const std::vector<Cell>& cells, std::string_view& in, Unit* out,
+                                   std::size_t room) const {
+    const auto* const begin = reinterpret_cast<const unsigned char*>(in.data());
+    const unsigned char* const end = begin + in.size();
+    Unit* q = out;
+    const unsigned char* const stop = cells.size() == pageSize
+                                          ? readSingles(cells.data(), begin, end, q, out + room)
+                                          : readPairs(cells.data(), begin, end, q, out + room);
+    in.remove_prefix(static_cast<std::size_t>(stop - begin));
+    return static_cast<std::size_t>(q - out);
+}
+
+template <typename Cell, typename Unit>
+const unsigned char* DecodingTable::readSingles(const Cell* cells, const unsigned char* p,
+                                                const unsigned char* end, Unit*& q,
+                                                const Unit* outEnd) const {
     constexpr std::size_t block = 16;
-    const auto* const bytes = reinterpret_cast<const unsigned char*>(in.data());
-    const char16_t* const units = units_.data();
-    const std::size_t count = std::min(in.size(), room);
-    std::size_t i = 0;
-    for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
-        for (std::size_t place = i; place < i + block; ++place) {
-            out[place] = units[bytes[place]];
-            areKnown = areKnown && out[place] != noUnit;
+    constexpr std::size_t most = sizeof(Cell) / sizeof(Unit);
+    const bool keepsAscii = keepsAscii_;
+    Unit* out = q;
+    const auto room = [&] { return static_cast<std::size_t>(outEnd - out); };
+    bool goesOn = true;
+    while (goesOn && p < end) {
+        const std::size_t count = std::min(block, static_cast<std::size_t>(end - p));
+        if (keepsAscii && count == block && room() >= block && areAscii<block>(p)) {
+            out = std::copy(p, p + block, out);
+            p += block;
+            continue;
+        }
+        for (const unsigned char* const stop = p + count; p < stop; ++p) {
+            goesOn = room() >= most && put(cells[*p], out);
+            if (!goesOn) {
+                break;
+            }
         }
     }
-    while (i < count && (out[i] = units[bytes[i]]) != noUnit) {
-        ++i;
-    }
-    in.remove_prefix(i);
-    return i;
+    q = out;
+    return p;
 }
 
 // A block at a time, where nothing has to wait for the length of the character before; the rest one by one.
-std::size_t DecodingTable::readPairs(std::string_view& in, char16_t* out, std::size_t room) const {
+template <typename Cell, typename Unit>
+const unsigned char* DecodingTable::readPairs(const Cell* cells, const unsigned char* p,
+                                              const unsigned char* end, Unit*& q, const Unit* outEnd) const {
     constexpr std::size_t block = vectors::ByteSet::block;
-    const auto* const begin = reinterpret_cast<const unsigned char*>(in.data());
-    const unsigned char* const end = begin + in.size();
-    const unsigned char* p = begin;
-    const char16_t* const outEnd = out + room;
-    const char16_t* const units = units_.data();
-    char16_t* q = out;
+    constexpr std::size_t most = sizeof(Cell) / sizeof(Unit);
+    const bool keepsAscii = keepsAscii_;
+    Unit* out = q;
     bool areKnown = true;
     while (areKnown && static_cast<std::size_t>(end - p) > block &&
-           static_cast<std::size_t>(outEnd - q) >= block) {
-        if (keepsAscii_ && areAscii<block>(p)) {
-            std::copy(p, p + block, q);
+           static_cast<std::size_t>(outEnd - out) >= block * most) {
+        if (keepsAscii && areAscii<block>(p)) {
+            out = std::copy(p, p + block, out);
             p += block;
-            q += block;
             continue;
         }
         bool overhang = false;
@@ -188,23 +242,65 @@ std::size_t DecodingTable::readPairs(std::string_view& in, char16_t* out, std::s
         const unsigned char* next = p + block + (overhang ? 1 : 0);
         for (std::uint64_t starts = ~ends; starts != 0; starts &= starts - 1) {
             const unsigned char* const character = p + std::countr_zero(starts);
-            if ((*q = units[character[0] * pageSize + character[1]]) == noUnit) {
+            if (!put(cells[character[0] * pageSize + character[1]], out)) {
                 next = character;
                 areKnown = false;
                 break;
             }
-            ++q;
         }
         p = next;
     }
-    while (areKnown && p < end && q < outEnd) {
+    while (areKnown && p < end && static_cast<std::size_t>(outEnd - out) >= most) {
         const std::ptrdiff_t length = isPair(*p) ? 2 : 1;
-        areKnown = length <= end - p && (*q = units[p[0] * pageSize + p[length - 1]]) != noUnit;
+        areKnown = length <= end - p && put(cells[p[0] * pageSize + p[length - 1]], out);
         p += areKnown ? length : 0;
-        q += areKnown ? 1 : 0;
     }
-    in.remove_prefix(static_cast<std::size_t>(p - begin));
-    return static_cast<std::size_t>(q - out);
+    q = out;
+    return p;
+}
+
+// A branch for each length, which a processor foresees more often than not, and then need not wait for it.
+DecodingTable::Found DecodingTable::find(std::string_view text, Utf8Cell* cells) const {
+    const auto* p = reinterpret_cast<const unsigned char*>(text.data());
+    const unsigned char* const end = p + text.size();
+    const Utf8Cell* const table = utf8_.data();
+    Utf8Cell* next = cells;
+    std::size_t bytes = 0;
+    const auto take = [&](const Utf8Cell& cell) {
+        std::memcpy(next, &cell, sizeof cell);
+        ++next;
+        bytes += cell.length;
+        return cell.length != 0;
+    };
+    bool areKnown = true;
+    while (areKnown && p < end) {
+        if (isPair(*p)) {
+            areKnown = end - p > 1 && take(table[p[0] * pageSize + p[1]]);
+            p += 2;
+        } else {
+            areKnown = take(table[*p * pageSize]);
+            ++p;
+        }
+    }
+    return {static_cast<std::size_t>(next - cells), areKnown ? bytes : vectors::notWhole};
+}
+
+// Each cell is written whole, as long as the characters behind it fill what is too much.
+void DecodingTable::join(const Utf8Cell* cells, std::size_t count, char* out) {
+    std::size_t i = 0;
+    for (; i + 3 < count; ++i) {
+        put(cells[i], out);
+    }
+    for (; i < count; ++i) {
+        out[0] = cells[i].bytes[0];
+        if (cells[i].length > 1) {
+            out[1] = cells[i].bytes[1];
+        }
+        if (cells[i].length > 2) {
+            out[2] = cells[i].bytes[2];
+        }
+        out += cells[i].length;
+    }
 }
 
 std::size_t DecodingTable::bytesOf(std::string_view in, std::size_t units) const {
@@ -289,6 +385,56 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
         ++i;
     }
     return {i, i};
+}
+
+// A branch for each length here, too.
+std::size_t EncodingTable::writeUtf8(std::string_view& in, char* out, std::size_t room) const {
+    const std::uint16_t* const pageOf = pageOf_.data();
+    const std::uint16_t* const pages = pages_.data();
+    const unsigned char ascii = keepsAscii_ ? 0x80 : 0; // what is below needs no table
+    const char* p = in.data();
+    const char* const end = p + in.size();
+    char* q = out;
+    const char* const outEnd = out + room;
+    while (p < end && q < outEnd) {
+        const auto lead = static_cast<unsigned char>(*p);
+        if (lead < ascii) {
+            *q++ = *p++;
+            continue;
+        }
+        // All but the last six bits, which the last byte holds.
+        std::size_t page = lead / pageSize;
+        std::ptrdiff_t length = 1;
+        if (lead >= 0xE0) {
+            length = 3;
+            if (lead > 0xEF || end - p < 3 || !isContinuation(p[1]) || !isContinuation(p[2])) {
+                break;
+            }
+            page = (lead & 0x0FU) * pageSize | continuationBits(p[1]);
+            if (page < 0x800 / pageSize) {
+                break;
+            }
+        } else if (lead >= 0x80) {
+            length = 2;
+            if (lead < 0xC2 || end - p < 2 || !isContinuation(p[1])) {
+                break;
+            }
+            page = lead & 0x1F;
+        }
+        const std::uint16_t code = pages[pageOf[page] + continuationBits(p[length - 1])];
+        const std::ptrdiff_t bytes = code > 0xFF ? 2 : 1;
+        if (code == noCode || outEnd - q < bytes) {
+            break;
+        }
+        q[0] = static_cast<char>(code);
+        if (bytes == 2) {
+            q[1] = static_cast<char>(code >> 8);
+        }
+        p += length;
+        q += bytes;
+    }
+    in.remove_prefix(static_cast<std::size_t>(p - in.data()));
+    return static_cast<std::size_t>(q - out);
 }
 
 // Whether a character has one byte or two is no branch, since texts have both in no order that a processor could

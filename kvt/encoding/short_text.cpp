@@ -1,7 +1,7 @@
 // Short texts without ICU (see detail/short_text.h).
 //
-// All forms but ASCII go by way of UTF-16, and from there to the result in a buffer, so that the result can be made in one
-// piece without a pass that measures it.
+// All but ASCII is converted into a buffer, so that the result can be made in one piece without a pass that measures it:
+// in one step between Unicode forms and between UTF-8 and a table, else by way of UTF-16.
 #include <kvt/encoding/detail/short_text.h>
 
 #include <kvt/encoding/detail/copy_short.h>
@@ -57,6 +57,10 @@ bool convertAscii(Form from, Form to, std::string_view in, std::basic_string<Cha
 using vectors::notWhole;
 using vectors::shortRoom;
 
+std::size_t bytesOf(std::size_t units, std::size_t unitBytes) {
+    return units != notWhole ? units * unitBytes : notWhole;
+}
+
 /// Reads a short text as UTF-16, or nothing of it. Where it comes from UTF-16, it may be ill-formed.
 std::size_t readShort(Side from, std::string_view in, char16_t* units) {
     auto* const out = reinterpret_cast<char*>(units);
@@ -79,14 +83,9 @@ std::size_t readShort(Side from, std::string_view in, char16_t* units) {
 
 /// Writes UTF-16, which may be ill-formed, or nothing of it, and returns the bytes.
 std::size_t writeShort(Side to, const char* units, std::size_t count, char* out) {
-    if (to.form == Form::utf8) {
-        return vectors::shortUtf16ToUtf8(units, count, out);
-    }
-    if (to.form == nativeUtf32) {
-        const std::size_t written = vectors::shortUtf16ToUtf32(units, count, out);
-        return written != notWhole ? written * sizeof(char32_t) : notWhole;
-    }
-    return notWhole;
+    return to.form == Form::utf8    ? vectors::shortUtf16ToUtf8(units, count, out)
+           : to.form == nativeUtf32 ? bytesOf(vectors::shortUtf16ToUtf32(units, count, out), sizeof(char32_t))
+                                    : notWhole;
 }
 
 std::size_t writeByTable(const EncodingProfile& to, const char16_t* units, std::size_t count, char* out) {
@@ -98,54 +97,152 @@ std::size_t writeByTable(const EncodingProfile& to, const char16_t* units, std::
     return written.units == count ? written.bytes : notWhole;
 }
 
-template <typename CharOut>
-void appendBytes(std::basic_string<CharOut>& out, const void* bytes, std::size_t count) {
-    appendInPlace(out, count / sizeof(CharOut), [&](CharOut* place) {
-        copyShort(bytes, count, place);
-        return count / sizeof(CharOut);
-    });
+std::size_t convertByUtf16(Side from, Side to, std::string_view in, char* out) {
+    alignas(64) char16_t units[shortRoom];
+    const std::size_t count = readShort(from, in, units);
+    return count == notWhole    ? notWhole
+           : hasTables(to.form) ? writeByTable(*to.profile, units, count, out)
+                                : writeShort(to, reinterpret_cast<const char*>(units), count, out);
 }
 
-/// By way of a buffer, all of it or nothing.
-template <typename CharOut>
-bool convertBuffered(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
-    alignas(64) char16_t units[shortRoom];
-    alignas(64) char bytes[shortRoom * sizeof(char32_t)];
-    std::size_t written = notWhole;
+/// The bytes written, or `notWhole`.
+std::size_t convertTo(Side from, Side to, std::string_view in, char* out) {
+    if (from.form == nativeUtf16 && !hasTables(to.form)) {
+        return in.size() % sizeof(char16_t) == 0
+                   ? writeShort(to, in.data(), in.size() / sizeof(char16_t), out)
+                   : notWhole;
+    }
+    if (to.form == nativeUtf16) {
+        return bytesOf(readShort(from, in, reinterpret_cast<char16_t*>(out)), sizeof(char16_t));
+    }
     if (from.form == Form::utf8 && to.form == nativeUtf32) {
         // Beyond U+FFFF, too.
-        const std::size_t characters = vectors::shortUtf8ToUtf32(in.data(), in.size(), bytes);
-        written = characters != notWhole ? characters * sizeof(char32_t) : notWhole;
-    } else if (from.form == nativeUtf16 && !hasTables(to.form)) {
-        written = in.size() % sizeof(char16_t) == 0
-                      ? writeShort(to, in.data(), in.size() / sizeof(char16_t), bytes)
-                      : notWhole;
-    } else if (const std::size_t count = readShort(from, in, units); count != notWhole) {
-        if (to.form == nativeUtf16) {
-            appendBytes(out, units, count * sizeof(char16_t));
-            return true;
-        }
-        written = hasTables(to.form) ? writeByTable(*to.profile, units, count, bytes)
-                                     : writeShort(to, reinterpret_cast<const char*>(units), count, bytes);
+        return bytesOf(vectors::shortUtf8ToUtf32(in.data(), in.size(), out), sizeof(char32_t));
     }
-    if (written == notWhole) {
+    return convertByUtf16(from, to, in, out);
+}
+
+/// A table of single bytes.
+bool readSingles(const DecodingTable& table, std::string_view in, std::string& out) {
+    const std::size_t room = table.roomForUtf8(in);
+    const std::size_t before = out.size();
+    appendInPlace(out, room, [&](char* place) { return table.readUtf8(in, place, room); });
+    if (!in.empty()) {
+        out.resize(before);
+    }
+    return in.empty();
+}
+
+/// One of single bytes and of pairs.
+bool readPairs(const DecodingTable& table, std::string_view in, std::string& out) {
+    DecodingTable::Utf8Cell cells[vectors::shortText];
+    const DecodingTable::Found found = table.find(in, cells);
+    if (found.bytes == notWhole) {
         return false;
     }
-    appendBytes(out, bytes, written);
+    appendInPlace(out, found.bytes, [&](char* place) {
+        DecodingTable::join(cells, found.characters, place);
+        return found.bytes;
+    });
     return true;
+}
+
+/// First into what `out` has, since to allocate would take longer than to convert.
+bool writeFew(const EncodingTable& table, std::string_view in, std::string& out) {
+    const std::size_t before = out.size();
+    std::size_t room = out.capacity() - before;
+    const auto write = [&](char* place) { return table.writeUtf8(in, place, room); };
+    appendInPlace(out, room, write);
+    if (!in.empty()) {
+        room = table.roomFor({in.size(), in.size(), in.size(), in.size()});
+        appendInPlace(out, room, write);
+    }
+    if (!in.empty()) {
+        out.resize(before);
+    }
+    return in.empty();
+}
+
+/// By way of UTF-16 in registers, which is faster for more than a few characters.
+bool writeByUtf16(const EncodingTable& table, std::string_view in, std::string& out) {
+    alignas(64) char16_t units[shortRoom];
+    const std::size_t count = vectors::shortUtf8ToUtf16(in.data(), in.size(), reinterpret_cast<char*>(units));
+    if (count == notWhole) {
+        return false;
+    }
+    const std::size_t before = out.size();
+    const std::size_t room = table.roomFor({in.size(), in.size(), count, count});
+    EncodingTable::Written written{};
+    appendInPlace(out, room, [&](char* place) {
+        written = table.write(units, count, place, room);
+        return written.bytes;
+    });
+    if (written.units != count) {
+        out.resize(before);
+    }
+    return written.units == count;
+}
+
+/// Between UTF-8 and a form with tables.
+bool convertByTable(Side from, Side to, std::string_view in, std::string& out) {
+    if (from.form == Form::utf8) {
+        const EncodingTable* const table = to.profile->encoding();
+        constexpr std::size_t fewBytes = 32;
+        return table != nullptr &&
+               (in.size() <= fewBytes ? writeFew(*table, in, out) : writeByUtf16(*table, in, out));
+    }
+    const DecodingTable* const table = from.profile->decoding();
+    return table != nullptr &&
+           (table->hasPairs() ? readPairs(*table, in, out) : readSingles(*table, in, out));
+}
+
+bool isShort(Side from, Side to, std::size_t bytes, std::size_t unit) {
+    return bytes <= vectors::shortText * unitBytes(from.form) && (unit == 1 || unit == unitBytes(to.form));
 }
 
 } // namespace
 
 template <typename CharOut>
-bool convertShort(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
-    return in.size() <= vectors::shortText * unitBytes(from.form) &&
-           (sizeof(CharOut) == 1 || sizeof(CharOut) == unitBytes(to.form)) &&
-           (convertAscii(from.form, to.form, in, out) || convertBuffered(from, to, in, out));
+bool convertShortBuffered(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    alignas(64) char bytes[shortRoom * sizeof(char32_t)];
+    const std::size_t written =
+        isShort(from, to, in.size(), sizeof(CharOut)) ? convertTo(from, to, in, bytes) : notWhole;
+    if (written == notWhole) {
+        return false;
+    }
+    const std::size_t units = written / sizeof(CharOut);
+    appendInPlace(out, units, [&](CharOut* place) {
+        copyShort(bytes, written, place);
+        return units;
+    });
+    return true;
 }
 
-template bool convertShort(Side, Side, std::string_view, std::basic_string<char>&);
-template bool convertShort(Side, Side, std::string_view, std::basic_string<char16_t>&);
-template bool convertShort(Side, Side, std::string_view, std::basic_string<char32_t>&);
+template <typename CharOut>
+bool convertShort(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    if (!isShort(from, to, in.size(), sizeof(CharOut))) {
+        return false;
+    }
+    if (convertAscii(from.form, to.form, in, out)) {
+        return true;
+    }
+    if constexpr (sizeof(CharOut) == 1) {
+        if ((from.form == Form::utf8 && hasTables(to.form)) ||
+            (to.form == Form::utf8 && hasTables(from.form))) {
+            return convertByTable(from, to, in, out);
+        }
+    }
+    return convertShortBuffered(from, to, in, out);
+}
+
+#define KVT_INSTANTIATE(CharOut)                                                                             \
+    template bool convertShort(Side, Side, std::string_view, std::basic_string<CharOut>&);                   \
+    template bool convertShortBuffered(Side, Side, std::string_view, std::basic_string<CharOut>&);
+
+KVT_INSTANTIATE(char)
+KVT_INSTANTIATE(char16_t)
+KVT_INSTANTIATE(char32_t)
+
+#undef KVT_INSTANTIATE
 
 } // namespace kvt::ex::detail

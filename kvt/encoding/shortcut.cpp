@@ -2,10 +2,10 @@
 //
 // A conversion is measured first: how much of the input is well-formed and complete, and how long the result will be.
 // Then the result is made in one piece. Between UTF-8, UTF-16 and UTF-32 in the machine's byte order, that is one step
-// (detail/unicode_vectors.h). All other forms go by way of UTF-16, a pivot of some kilobytes at a time: the code pages
-// by their tables, which are read once only, so that what they hold is measured as UTF-16; the forms in the other byte
-// order by swapping. What is not well-formed, is cut off, or is more than the target's form can say, is left to ICU, so
-// this code decides nothing about substitutions.
+// (detail/unicode_vectors.h). A code page comes to UTF-8 by its table, which is read once only, a piece of some kilobytes
+// at a time. All other forms go by way of UTF-16, such a piece at a time: the code pages again by their tables, so that
+// what they hold is measured as UTF-16; the forms in the other byte order by swapping. What is not well-formed, is cut
+// off, or is more than the target's form can say, is left to ICU, so this code decides nothing about substitutions.
 //
 // What ICU does with the text that is taken here, and so must hold for these ways to be the same ones:
 //
@@ -324,6 +324,23 @@ std::size_t convertMeasured(Form from, Side to, std::string_view in, std::basic_
     return taken;
 }
 
+/// From a form with tables to UTF-8, the bytes of which they hold.
+std::size_t convertToUtf8(const DecodingTable& table, std::string_view in, std::string& out) {
+    const std::size_t before = out.size();
+    char piece[sizeof(Pivot)];
+    std::string_view rest = in;
+    std::size_t left = 0;
+    do {
+        left = rest.size();
+        out.append(piece, table.readUtf8(rest, piece, sizeof piece));
+        const std::size_t taken = in.size() - rest.size();
+        if (left == in.size() && taken != 0 && rest.size() > longestPiece) {
+            reserveForRest(out, out.size() - before, taken, rest.size());
+        }
+    } while (rest.size() < left && !rest.empty());
+    return in.size() - rest.size();
+}
+
 /// From a form with tables.
 template <typename CharOut>
 std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view in,
@@ -359,6 +376,11 @@ std::size_t convertDecoded(const DecodingTable& table, Side to, std::string_view
 
 template <typename CharOut>
 std::size_t convertBy(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    if constexpr (sizeof(CharOut) == 1) {
+        if (hasTables(from.form) && to.form == Form::utf8) {
+            return convertToUtf8(*from.profile->decoding(), in, out);
+        }
+    }
     return hasTables(from.form) ? convertDecoded(*from.profile->decoding(), to, in, out)
                                 : convertMeasured(from.form, to, in, out);
 }
@@ -448,12 +470,16 @@ bool lacksEncoding(Side side) {
 
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
-    if (from.form == Form::other || to.form == Form::other ||
-        (sizeof(CharOut) != 1 && sizeof(CharOut) != unitBytes(to.form))) {
+    if (from.form == Form::other || to.form == Form::other) {
         return 0;
     }
-    if (convertShort(from, to, in, out)) {
-        return in.size();
+    return convertShort(from, to, in, out) ? in.size() : convertPieces(from, to, in, out);
+}
+
+template <typename CharOut>
+std::size_t convertPieces(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out) {
+    if (sizeof(CharOut) != 1 && sizeof(CharOut) != unitBytes(to.form)) {
+        return 0;
     }
     from = lacksDecoding(from) ? withoutTables(from) : from;
     to = lacksEncoding(to) ? withoutTables(to) : to;
@@ -472,14 +498,6 @@ std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_st
         }
     }
     return taken == in.size() ? taken : taken + convertBy(from, to, in.substr(taken), out);
-}
-
-Side sideOf(Encoding encoding) {
-    if (const Form form = unicodeForm(encoding); form != Form::other) {
-        return {form};
-    }
-    EncodingProfile& profile = profileOf(encoding);
-    return {profile.form(), &profile};
 }
 
 std::size_t convertLossy(Side from, Side to, std::string_view in, std::string& out,
@@ -586,8 +604,14 @@ bool canGoOn(Side from, Side to, std::size_t bytes) {
     return canRead && canWrite;
 }
 
-template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);
-template std::size_t convertPrefix<char16_t>(Side, Side, std::string_view, std::basic_string<char16_t>&);
-template std::size_t convertPrefix<char32_t>(Side, Side, std::string_view, std::basic_string<char32_t>&);
+#define KVT_INSTANTIATE(CharOut)                                                                             \
+    template std::size_t convertPrefix(Side, Side, std::string_view, std::basic_string<CharOut>&);           \
+    template std::size_t convertPieces(Side, Side, std::string_view, std::basic_string<CharOut>&);
+
+KVT_INSTANTIATE(char)
+KVT_INSTANTIATE(char16_t)
+KVT_INSTANTIATE(char32_t)
+
+#undef KVT_INSTANTIATE
 
 } // namespace kvt::ex::detail

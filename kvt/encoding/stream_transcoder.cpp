@@ -10,6 +10,7 @@
 #include <kvt/encoding/detail/encoding_profile.h>
 #include <kvt/encoding/detail/stream_impl.h>
 
+#include <kvt/encoding/detail/encoding_profile.h>
 #include <kvt/foundation/throwable.h>
 
 #include <algorithm>

@@ -1,6 +1,7 @@
 // The converters of each thread.
 #include <kvt/encoding/detail/transcoder_helper.h>
 
+#include <kvt/encoding/detail/encoding_profile.h>
 #include <kvt/foundation/throwable.h>
 #include <kvt/platform/thread_end.h>
 

@@ -2,6 +2,8 @@
 #include <kvt/string/detail/convert_chars.h>
 
 #include <kvt/codec/wwjd.h>
+#include <kvt/encoding/detail/encoding_profile.h>
+#include <kvt/encoding/detail/short_text.h>
 #include <kvt/encoding/detail/shortcut.h>
 #include <kvt/encoding/icu_transcoder.h>
 #include <kvt/foundation/throwable.h>
@@ -25,22 +27,43 @@ void copyBytes(std::string_view bytes, std::basic_string<CharOut>& out) {
     }
 }
 
-// A text that is not long is converted before anything is asked about the converters of this thread, which would cost
-// more than the text. One that needs ICU is done again from its beginning.
+namespace {
+
+// Apart from what short texts run through, since it needs much of the stack.
 template <typename CharOut>
-void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+[[gnu::noinline]] void transcodeOther(Encoding from, Encoding to, std::string_view bytes,
+                                      std::basic_string<CharOut>& out) {
     constexpr std::size_t longText = 1024;
     if (bytes.size() <= longText && from != to) {
         const Side source = sideOf(from);
         const Side target = sideOf(to);
         if (source.form != Form::other && target.form != Form::other) {
             out.clear();
-            if (convertPrefix(source, target, bytes, out) == bytes.size()) {
+            if (convertPieces(source, target, bytes, out) == bytes.size()) {
                 return;
             }
         }
     }
     ICUTranscoder(from, to).transcode(bytes, out);
+}
+
+} // namespace
+
+// A text that is not long is converted before anything is asked about the converters of this thread, which would cost
+// more than the text. One that needs ICU is done again from its beginning.
+template <typename CharOut>
+void transcodeBytes(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    if (from != to) {
+        const Side source = sideOf(from);
+        const Side target = sideOf(to);
+        if (source.form != Form::other && target.form != Form::other) {
+            out.clear();
+            if (convertShort(source, target, bytes, out)) {
+                return;
+            }
+        }
+    }
+    transcodeOther(from, to, bytes, out);
 }
 
 template <typename CharOut>
@@ -77,11 +100,19 @@ void throwBinary(std::string_view bytes) {
     throw UStringBinaryTranscodingException(UString<28>(UStringView<28>(bytes)));
 }
 
+namespace {
+
+/// Whether an encoding's text is not what its converter says of it.
+bool hasRules(std::uint32_t evaluated) {
+    return evaluated == Encoding::UsAscii || evaluated == Encoding::Binary || evaluated == Encoding::Wwjd;
+}
+
 template <typename CharOut>
-void convertChars(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+[[gnu::noinline]] void convertByRules(Encoding from, Encoding to, std::string_view bytes,
+                                      std::basic_string<CharOut>& out) {
     const std::uint32_t source = from.evaluate();
     const std::uint32_t target = to.evaluate();
-    if (source == target || (target == Encoding::Binary && source != Encoding::Binary)) {
+    if (source == target || target == Encoding::Binary) {
         copyBytes(bytes, out);
     } else if (source == Encoding::Binary) {
         throwBinary(bytes);
@@ -94,8 +125,19 @@ void convertChars(Encoding from, Encoding to, std::string_view bytes, std::basic
         copyBytes(utf16ToWwjd(text), out);
     } else if (source == Encoding::UsAscii) {
         fromAscii(to, bytes, out);
-    } else if (target == Encoding::UsAscii) {
+    } else {
         toAsciiChecked(from, bytes, out);
+    }
+}
+
+} // namespace
+
+template <typename CharOut>
+void convertChars(Encoding from, Encoding to, std::string_view bytes, std::basic_string<CharOut>& out) {
+    const std::uint32_t source = from.evaluate();
+    const std::uint32_t target = to.evaluate();
+    if (source == target || hasRules(source) || hasRules(target)) {
+        convertByRules(from, to, bytes, out);
     } else {
         transcodeBytes(from, to, bytes, out);
     }

@@ -4,6 +4,7 @@
 
 #include <kvt/codec/wwjd.h>
 #include <kvt/encoding/detail/short_ascii.h>
+#include <kvt/encoding/detail/short_text.h>
 #include <kvt/foundation/throwable.h>
 
 #include <bit>
@@ -136,6 +137,13 @@ UString<N>& UString<N>::assign(const UString<M>& other) {
             this->storage_.clear();
             detail::appendAscii<detail::CodeUnit<M>, detail::CodeUnit<N>>(text, units, this->storage_);
             return *this;
+        }
+        if constexpr (N != Encoding::UsAscii && M != Encoding::UsAscii) {
+            this->storage_.clear();
+            if (detail::convertShortBuffered({detail::unicodeForm(M)}, {detail::unicodeForm(N)},
+                                             bytesOf(other.rawData(), units), this->storage_)) {
+                return *this;
+            }
         }
     }
     convertAlong(grid[gridIndex(M)][gridIndex(N)], other.encoding(), encoding(),

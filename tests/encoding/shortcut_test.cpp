@@ -5,6 +5,7 @@
 #include <kvt/encoding/detail/shortcut.h>
 
 #include <reference/icu_reference.h>
+#include <support/guarded_memory.h>
 
 #include <unicode/ucnv.h>
 #include <unicode/uset.h>
@@ -180,6 +181,35 @@ TEST_P(ShortcutPair, TakesAllOfALongTextFromAnyAlignmentToAnyLength) {
     }
 }
 
+// The result goes into what the string has, or into a new place; the text ends where memory does.
+TEST_P(ShortcutPair, TakesAShortTextOfEachLengthBehindWhatTheStringHolds) {
+    std::u16string filler;
+    for (const char16_t c : {u'x', u'\u00B0', u'y', u'z', u'\u4E2D', u'\u03B1', u'\u20AC'}) {
+        if (c < 0x80 || (!onlyAscii() && bothCanSay(c))) {
+            filler += c;
+        }
+    }
+    const Side source = from().side();
+    const Side target = to().side();
+    GuardedMemory memory(1 << 12);
+    for (std::size_t length = 1; length <= 131; ++length) {
+        std::u16string text;
+        for (std::size_t i = 0; i < length; ++i) {
+            text += filler[(i * i / 5 + length) % filler.size()];
+        }
+        const std::string bytes = encodeWithIcu(from().name, text);
+        const std::string expected = encodeWithIcu(to().name, text);
+        char* const in = memory.end() - bytes.size();
+        bytes.copy(in, bytes.size());
+        for (const std::size_t held : {0U, 1U, 7U, 15U, 16U, 60U}) {
+            std::string out(held, '!');
+            out.shrink_to_fit();
+            ASSERT_EQ(convertPrefix(source, target, {in, bytes.size()}, out), bytes.size()) << length;
+            ASSERT_EQ(hex(out, 1000), hex(std::string(held, '!') + expected, 1000)) << length;
+        }
+    }
+}
+
 TEST_P(ShortcutPair, StopsAtTheFirstBadPlaceWhereverItIsInABlock) {
     for (std::size_t place = 0; place < 70; ++place) {
         std::u16string text(place, u'x');
@@ -282,6 +312,34 @@ TEST(Shortcut, AllUtf8LeadsAndTrailsAreReadAsIcuReadsThem) {
                         ASSERT_EQ(whole, raw.calls == 0) << hex(text);
                         if (whole) {
                             ASSERT_EQ(hex(out), hex(raw.bytes)) << hex(text);
+                        }
+                    }
+                }
+            }
+        }
+    }
+}
+
+// The tables look at UTF-8 by themselves, near the end of a text in another way than before it.
+TEST(Shortcut, TablesTakeNoUtf8ThatIcuObjectsTo) {
+    const std::string_view trails("\x00\x7F\x80\x8F\x90\x9F\xA0\xBF\xC0\xFF", 10);
+    for (const NamedForm& form : forms) {
+        if (!form.hasTables()) {
+            continue;
+        }
+        const Side side = form.side();
+        for (int lead = 0x80; lead < 256; ++lead) {
+            for (const char first : trails) {
+                for (const char second : trails) {
+                    const char bytes[] = {static_cast<char>(lead), first, second};
+                    for (const std::string& text :
+                         {std::string(bytes, 1), std::string(bytes, 2), std::string(bytes, 3),
+                          std::string(bytes, 3) + "0123456789"}) {
+                        std::string out;
+                        if (convertPrefix(Side{Form::utf8}, side, text, out) == text.size()) {
+                            const Raw raw = convertWithIcu("UTF-8", form.name, text);
+                            ASSERT_EQ(raw.calls, 0) << form << ' ' << hex(text);
+                            ASSERT_EQ(hex(out), hex(raw.bytes)) << form << ' ' << hex(text);
                         }
                     }
                 }

@@ -1,7 +1,8 @@
 // What a code page makes of its bytes and of the characters, as tables, so that its text can be converted without ICU.
 //
 // The tables hold what ICU itself says of each character alone, and only what it converts without an objection: from
-// one byte or two to one unit of UTF-16, and back. For all else they say "ask ICU": for what is not text, for a
+// one byte or two to one unit of UTF-16, and back. From and to UTF-8 there is a way of its own, since most text comes
+// and goes that way. For all else they say "ask ICU": for what is not text, for a
 // character that only resembles one of the encoding's own, for longer characters, and for whatever could be joined with
 // the next. They are for encodings without a state, do not change once they are made, and can be read by any number of
 // threads.
@@ -19,7 +20,7 @@
 
 namespace kvt::ex::detail {
 
-/// From bytes to UTF-16.
+/// From bytes to UTF-16 and UTF-8.
 class DecodingTable {
 public:
     /// Asks ICU for each byte and each pair of bytes: some microseconds for an encoding of single bytes, about a
@@ -30,6 +31,28 @@ public:
     /// one. Returns the units written; none is a surrogate.
     std::size_t read(std::string_view& in, char16_t* out, std::size_t room) const;
 
+    /// The same as bytes of UTF-8, until there is no room for a whole cell. Returns the bytes written; what lies behind
+    /// them may be overwritten.
+    std::size_t readUtf8(std::string_view& in, char* out, std::size_t room) const;
+
+    /// The room that suffices for a text of single bytes as UTF-8.
+    std::size_t roomForUtf8(std::string_view text) const;
+
+    /// A character as UTF-8.
+    struct Utf8Cell {
+        char bytes[3];
+        std::uint8_t length; // 0: ask ICU
+    };
+    bool hasPairs() const { return utf8_.size() != pageSize; }
+    struct Found {
+        std::size_t characters;
+        std::size_t bytes; ///< of UTF-8; `vectors::notWhole` where the table does not know one of them
+    };
+    /// Looks up all characters of a text: as many cells as it has bytes, or fewer.
+    Found find(std::string_view text, Utf8Cell* cells) const;
+    /// Writes so many of them behind each other, and no byte more.
+    static void join(const Utf8Cell* cells, std::size_t count, char* out);
+
     /// The bytes of the first `units` characters of `in`, which the table knows.
     std::size_t bytesOf(std::string_view in, std::size_t units) const;
 
@@ -37,12 +60,25 @@ private:
     static constexpr char16_t noUnit = 0xFFFF; // ask ICU
     static constexpr std::size_t pageSize = 256;
 
+    static Utf8Cell cellOf(char16_t unit);
+    // Return whether the character is known.
+    static bool put(char16_t unit, char16_t*& out);
+    static bool put(const Utf8Cell& cell, char*& out);
+
     bool isPair(std::size_t first) const { return (pairs_[first / 64] >> first % 64 & 1) != 0; }
-    std::size_t readSingles(std::string_view& in, char16_t* out, std::size_t room) const;
-    std::size_t readPairs(std::string_view& in, char16_t* out, std::size_t room) const;
+    template <typename Cell, typename Unit>
+    std::size_t readAny(const std::vector<Cell>& cells, std::string_view& in, Unit* out,
+                        std::size_t room) const;
+    template <typename Cell, typename Unit>
+    const unsigned char* readSingles(const Cell* cells, const unsigned char* p, const unsigned char* end,
+                                     Unit*& q, const Unit* outEnd) const;
+    template <typename Cell, typename Unit>
+    const unsigned char* readPairs(const Cell* cells, const unsigned char* p, const unsigned char* end,
+                                   Unit*& q, const Unit* outEnd) const;
 
     // Without pairs the unit of each byte, else that of each byte and the next, which for a single byte is any one.
     std::vector<char16_t> units_;
+    std::vector<Utf8Cell> utf8_;           // the same
     std::array<std::uint64_t, 4> pairs_{}; // a bit for each byte that begins one
     vectors::ByteSet leads_;               // the same bytes
     bool keepsAscii_ = true;
@@ -66,6 +102,10 @@ public:
     };
     /// Writes characters until the table does not know one. `room` is that of the text.
     Written write(const char16_t* units, std::size_t count, char* out, std::size_t room) const;
+
+    /// Writes characters of UTF-8 and takes them from `in`, until there is no `room`, or the next one is not well-formed and
+    /// complete, or the table does not know it. Returns the bytes written.
+    std::size_t writeUtf8(std::string_view& in, char* out, std::size_t room) const;
 
 private:
     static constexpr std::uint16_t noCode = 0xFFFF; // ask ICU

@@ -88,4 +88,13 @@ inline EncodingProfile& profileOf(Encoding encoding) {
                                                                                 : makeProfile(encoding);
 }
 
+/// An encoding as the source or the target of a conversion. Throws std::bad_alloc.
+inline Side sideOf(Encoding encoding) {
+    if (const Form form = unicodeForm(encoding); form != Form::other) {
+        return {form};
+    }
+    EncodingProfile& profile = profileOf(encoding);
+    return {profile.form(), &profile};
+}
+
 } // namespace kvt::ex::detail

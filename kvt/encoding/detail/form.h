@@ -25,9 +25,9 @@ enum class Form : std::uint8_t {
 };
 
 /// The form of UTF-8, UTF-16 and UTF-32 with a stated byte order, which their numbers tell; `other` for all encodings
-/// whose converter has to be asked.
-inline Form unicodeForm(Encoding encoding) {
-    switch (encoding.evaluate()) {
+/// whose converter has to be asked. The number is an evaluated one.
+constexpr Form unicodeForm(std::uint32_t id) {
+    switch (id) {
     case Encoding::Utf8:
         return Form::utf8;
     case Encoding::Utf16LE:
@@ -41,6 +41,9 @@ inline Form unicodeForm(Encoding encoding) {
     default:
         return Form::other;
     }
+}
+inline Form unicodeForm(Encoding encoding) {
+    return unicodeForm(encoding.evaluate());
 }
 
 inline constexpr bool isLittle = std::endian::native == std::endian::little;

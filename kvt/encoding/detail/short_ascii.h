@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <cstring>
 #include <string>
+#include <string_view>
 
 namespace kvt::ex::detail {
 
@@ -34,26 +35,49 @@ bool isAscii(const char* text, std::size_t units) {
     return ((all | word) & beyond) == 0;
 }
 
+/// The bytes of a text that are not ASCII.
+inline std::size_t countBeyondAscii(std::string_view text) {
+    constexpr std::uint64_t ones = 0x0101010101010101U;
+    std::uint64_t word = 0;
+    std::size_t count = 0;
+    std::size_t i = 0;
+    for (; text.size() - i >= sizeof word; i += sizeof word) {
+        std::memcpy(&word, text.data() + i, sizeof word);
+        count += (word >> 7 & ones) * ones >> 56;
+    }
+    for (; i < text.size(); ++i) {
+        count += static_cast<unsigned char>(text[i]) >> 7;
+    }
+    return count;
+}
+
 /// Copies ASCII text to units of another size.
 template <typename From, typename To>
 void copyAscii(const char* from, char* to, std::size_t units) {
-    constexpr std::size_t block = 8;
-    const auto copy = [=](std::size_t begin, std::size_t count) {
-        for (std::size_t i = begin; i < begin + count; ++i) {
+    // A register of the wider units. From array to array, compilers see that nothing overlaps.
+    constexpr std::size_t block = 16 / (sizeof(From) > sizeof(To) ? sizeof(From) : sizeof(To));
+    const auto copyBlock = [=](std::size_t begin) {
+        From read[block];
+        To written[block];
+        std::memcpy(read, from + begin * sizeof(From), sizeof read);
+        for (std::size_t i = 0; i < block; ++i) {
+            written[i] = static_cast<To>(read[i]);
+        }
+        std::memcpy(to + begin * sizeof(To), written, sizeof written);
+    };
+    if (units < block) {
+        for (std::size_t i = 0; i < units; ++i) {
             From unit;
             std::memcpy(&unit, from + i * sizeof unit, sizeof unit);
             const auto same = static_cast<To>(unit);
             std::memcpy(to + i * sizeof same, &same, sizeof same);
         }
-    };
-    if (units < block) {
-        copy(0, units);
         return;
     }
     for (std::size_t i = 0; i + block < units; i += block) {
-        copy(i, block);
+        copyBlock(i);
     }
-    copy(units - block, block);
+    copyBlock(units - block); // overlaps the one before
 }
 
 /// Appends ASCII text of units of one size to `out` in units of another, which are those of `out` or are bytes there.

@@ -13,8 +13,18 @@ namespace kvt::ex::detail {
 template <typename CharOut>
 bool convertShort(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
 
-extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char>&);
-extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char16_t>&);
-extern template bool convertShort(Side, Side, std::string_view, std::basic_string<char32_t>&);
+/// The same for a text that the caller has found not to be ASCII; it only takes longer if it is.
+template <typename CharOut>
+bool convertShortBuffered(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
+
+#define KVT_DECLARE(CharOut)                                                                                 \
+    extern template bool convertShort(Side, Side, std::string_view, std::basic_string<CharOut>&);            \
+    extern template bool convertShortBuffered(Side, Side, std::string_view, std::basic_string<CharOut>&);
+
+KVT_DECLARE(char)
+KVT_DECLARE(char16_t)
+KVT_DECLARE(char32_t)
+
+#undef KVT_DECLARE
 
 } // namespace kvt::ex::detail

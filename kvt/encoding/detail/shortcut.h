@@ -28,15 +28,16 @@ struct Side {
     EncodingProfile* profile = nullptr; ///< where the form is one with tables
 };
 
-/// An encoding as the source or the target of a conversion. Throws std::bad_alloc.
-Side sideOf(Encoding encoding);
-
 /// Converts the longest prefix of the bytes `in` that needs no ICU, appends it to `out`, and returns the bytes taken
 /// from `in`; 0 when there is no shorter way between the two sides. Two sides of one encoding have to be Unicode forms.
 /// A unit of `out` must be as wide as the target's or be a byte; otherwise nothing is converted. Where a table is not
 /// built, only ASCII is.
 template <typename CharOut>
 std::size_t convertPrefix(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
+
+/// The same for a text that convertShort() was offered and did not take.
+template <typename CharOut>
+std::size_t convertPieces(Side from, Side to, std::string_view in, std::basic_string<CharOut>& out);
 
 /// Converts the first characters of UTF-8 to another Unicode form, one by one: as many as begin in the first few bytes, up
 /// to one that is not well-formed and complete. That is faster than registers where a text has bad bytes everywhere.
@@ -64,10 +65,14 @@ std::size_t characterLength(Side from, std::string_view in);
 /// there.
 bool canGoOn(Side from, Side to, std::size_t bytes);
 
-extern template std::size_t convertPrefix<char>(Side, Side, std::string_view, std::basic_string<char>&);
-extern template std::size_t convertPrefix<char16_t>(Side, Side, std::string_view,
-                                                    std::basic_string<char16_t>&);
-extern template std::size_t convertPrefix<char32_t>(Side, Side, std::string_view,
-                                                    std::basic_string<char32_t>&);
+#define KVT_DECLARE(CharOut)                                                                                 \
+    extern template std::size_t convertPrefix(Side, Side, std::string_view, std::basic_string<CharOut>&);    \
+    extern template std::size_t convertPieces(Side, Side, std::string_view, std::basic_string<CharOut>&);
+
+KVT_DECLARE(char)
+KVT_DECLARE(char16_t)
+KVT_DECLARE(char32_t)
+
+#undef KVT_DECLARE
 
 } // namespace kvt::ex::detail
