@@ -143,6 +143,13 @@ void addOtherCalls(std::vector<Call>& calls) {
         stream.convert(umlauts, out, onLoss);
         stream.finish(out, onLoss);
     });
+    add("StreamTranscoder of bad input", [] {
+        StreamTranscoder stream(Encoding("ISO-2022-JP"), Encoding::Utf8);
+        std::string out;
+        const auto onLoss = [](const Loss&) {};
+        stream.convert(damaged, out, onLoss);
+        stream.finish(out, onLoss);
+    });
     add("utf16ToWwjd", [] { (void)detail::utf16ToWwjd({wide.rawData(), wide.size()}); });
     add("wwjdToUtf16", [] { (void)detail::wwjdToUtf16({tokens.rawData(), tokens.size()}); });
     add("wwjdToBytes", [] { (void)detail::wwjdToBytes({tokens.rawData(), tokens.size()}); });
@@ -183,6 +190,7 @@ void addDateCalls(std::vector<Call>& calls) {
     static const DateTimeParts parts(2020, 1, 2, 3, 4, 5.5, "+01");
     static const IntervalParts intervalParts(1, 2, 3, 4, 5, 6.123456789, true);
     static const UString<0> interval("P1Y2M3DT4H5M6.123456789S");
+    static const std::string zoneFolder("/a folder of zones that is nowhere at all");
     const auto add = [&](const char* name, auto run) {
         calls.push_back({name, [run] {
                              try {
@@ -210,6 +218,7 @@ void addDateCalls(std::vector<Call>& calls) {
     add("timezoneGet", [] { (void)timezoneGet(value, UTCOffsetType::OffsetText); });
     add("timezoneSet", [] { (void)timezoneSet(value, zone, SetZoneMode::Convert); });
     add("timezoneRemove", [] { (void)timezoneRemove(value); });
+    add("setInstallPathWrapper", [] { setInstallPathWrapper(zoneFolder); });
 }
 
 // A file is made, and gone with its manager.
