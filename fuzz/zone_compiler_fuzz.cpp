@@ -124,6 +124,7 @@ bool isStricter(const std::string& reason) {
                                "is not a saving",
                                "UNTIL is not after",
                                "two lines for one day",
+                               "days change places",
                                "has no standard time",
                                "has too many lines",
                                "leads elsewhere",

@@ -9,7 +9,8 @@
 // - A word that is not a rule's name is read as a length of time, and a failure there leaves the zone half made; so
 //   does a rule without standard time.
 // - Of rules with one name it makes pieces of which any two stand in the same years or in none together, and goes from
-//   change to change by them, year by year. The work grows with the square of the pieces.
+//   change to change by them, year by year. The work grows with the square of the pieces. In each year it takes them in
+//   the order of the numbers of their days, as 8 for "Sun>=8" and 31 for "lastSun", where only the weekday says otherwise.
 // - It looks for the first and for the last change within a line of a zone, each from the beginning, and goes on from
 //   the first until it meets the last. They have to be in this order, also where the line's offset and saving are not
 //   those of the line before.
@@ -233,13 +234,30 @@ private:
 
     static void checkDays(const std::vector<PlacedRule>& lines) {
         for (std::size_t later = 1; later < lines.size(); ++later) {
-            const ZoneRule& rule = lines[later].rule;
             for (std::size_t earlier = 0; earlier < later; ++earlier) {
-                const ZoneRule& other = lines[earlier].rule;
-                if (rule.on == other.on && rule.from <= other.to && other.from <= rule.to) {
-                    fail(lines[later].place,
-                         "the rule " + quoted(rule.name) + " has two lines for one day of one year");
-                }
+                checkPair(lines[earlier].rule, lines[later]);
+            }
+        }
+    }
+
+    static void checkPair(const ZoneRule& other, const PlacedRule& line) {
+        const ZoneRule& rule = line.rule;
+        // A day of the week by a day of the month is at most in the month beside it.
+        if (std::max(rule.on.month, other.on.month) - std::min(rule.on.month, other.on.month) > 1) {
+            return;
+        }
+        constexpr int calendarRepeats = 400;
+        const int from = std::max(rule.from, other.from);
+        const int to = std::min({rule.to, other.to, from + calendarRepeats - 1});
+        const bool isBehind = std::pair(other.on.month, other.on.day) < std::pair(rule.on.month, rule.on.day);
+        for (int year = from; year <= to; ++year) {
+            const std::int64_t days = daysOf(rule.on, year) - daysOf(other.on, year);
+            if (days == 0) {
+                fail(line.place, "the rule " + quoted(rule.name) + " has two lines for one day of one year");
+            }
+            if ((days > 0) != isBehind) {
+                fail(line.place, "the rule " + quoted(rule.name) +
+                                     " has two lines of which the days change places in some years");
             }
         }
     }

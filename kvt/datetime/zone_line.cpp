@@ -188,7 +188,8 @@ bool isRuleName(std::string_view word) {
     return !isDigit(word[0]) && word[0] != '-' && word[0] != '+';
 }
 
-// Days since 1970 of a day in a year.
+} // namespace
+
 std::int64_t daysOf(const ZoneDay& day, int year) {
     const auto weekdayOf = [](std::int64_t days) {
         constexpr std::int64_t thursday = 4; // 1970-01-01
@@ -203,8 +204,6 @@ std::int64_t daysOf(const ZoneDay& day, int year) {
     const std::int64_t after = (day.weekday - weekdayOf(days) + 7) % 7;
     return day.kind == ZoneDay::Kind::OnOrAfter || after == 0 ? days + after : days + after - 7;
 }
-
-} // namespace
 
 ZoneWords zoneWords(std::string_view line) {
     ZoneWords words;

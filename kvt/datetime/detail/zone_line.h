@@ -43,6 +43,9 @@ struct ZoneDay {
     friend bool operator==(const ZoneDay&, const ZoneDay&) = default;
 };
 
+/// Days since 1970 of such a day in a year.
+std::int64_t daysOf(const ZoneDay& day, int year);
+
 /// Rule NAME FROM TO - IN ON AT SAVE LETTER
 struct ZoneRule {
     std::string_view name;
