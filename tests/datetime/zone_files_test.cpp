@@ -126,7 +126,7 @@ TEST(ZoneFiles, HaveAFaultInTheLineThatIsNamed) {
          "europe:5: \"0:00:01\" is not a saving in whole minutes from -1:00 to 2:00"},
         {__LINE__, "Rule X 1917 1920 - Jan 1 0 0 -\nRule X 1920 max - Jan 1 2 1 -\n",
          "europe:6: the rule \"X\" has two lines for one day of one year"},
-        {__LINE__, "Rule X 1917 1920 - Jan 7 0 0 -\nRule X 1920 max - Jan Sun>=1 2 1 -\n",
+        {__LINE__, "Rule X 1917 1920 - Jan 4 0 0 -\nRule X 1920 max - Jan Sun>=1 2 1 -\n",
          "europe:6: the rule \"X\" has two lines for one day of one year"},
         {__LINE__, "Rule X 1901 1917 - Apr Sat<=7 0 1 -\nRule X 1901 1920 - Apr Sun>=1 2 0 -\n",
          "europe:6: the rule \"X\" has two lines of which the days change places in some years"},
