@@ -183,17 +183,20 @@ bool writeByUtf16(const EncodingTable& table, std::string_view in, std::string& 
     return written.units == count;
 }
 
+// Up to so many bytes a table and UTF-8 need no registers between them.
+constexpr std::size_t fewBytes = 32;
+
 /// Between UTF-8 and a form with tables.
 bool convertByTable(Side from, Side to, std::string_view in, std::string& out) {
     if (from.form == Form::utf8) {
         const EncodingTable* const table = to.profile->encoding();
-        constexpr std::size_t fewBytes = 32;
         return table != nullptr &&
                (in.size() <= fewBytes ? writeFew(*table, in, out) : writeByUtf16(*table, in, out));
     }
     const DecodingTable* const table = from.profile->decoding();
-    return table != nullptr &&
-           (table->hasPairs() ? readPairs(*table, in, out) : readSingles(*table, in, out));
+    return table != nullptr && (table->hasPairs()       ? readPairs(*table, in, out)
+                                : in.size() <= fewBytes ? readSingles(*table, in, out)
+                                                        : convertShortBuffered(from, to, in, out));
 }
 
 bool isShort(Side from, Side to, std::size_t bytes, std::size_t unit) {
