@@ -114,6 +114,11 @@ ZoneDay readDay(std::string_view word, unsigned month, int from, int to) {
     if (day.day < 1 || day.day > lastDayOfMonth(from == to ? from : commonYear, month)) {
         bad(word, "is not a day of that month");
     }
+    // The `date` library looks for it in its own year.
+    if ((day.kind == ZoneDay::Kind::OnOrBefore && month == 1 && day.day < 7) ||
+        (day.kind == ZoneDay::Kind::OnOrAfter && month == 12 && day.day > 25)) {
+        bad(word, "is not a day of one year, but of two");
+    }
     return day;
 }
 

@@ -130,7 +130,11 @@ TEST(ZoneFiles, HaveAFaultInTheLineThatIsNamed) {
          "europe:6: the rule \"X\" has two lines for one day of one year"},
         {__LINE__, "Rule X 1901 1917 - Apr Sat<=7 0 1 -\nRule X 1901 1920 - Apr Sun>=1 2 0 -\n",
          "europe:6: the rule \"X\" has two lines of which the days change places in some years"},
+        {__LINE__, "Rule X 1917 only - Dec Sun>=26 0 0 -\n",
+         "europe:5: \"Sun>=26\" is not a day of one year, but of two"},
         // Zones.
+        {__LINE__, "Zone A -15:13:42 - LMT 1901 Jan Fri<=6\n",
+         "europe:5: \"Fri<=6\" is not a day of one year, but of two"},
         {__LINE__, "Zone\n", "europe:5: the zone has no name"},
         {__LINE__, "Zone A 0 -\n",
          "europe:5: a line of a zone has three to seven words behind its name, not 2"},
