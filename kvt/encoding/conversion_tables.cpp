@@ -201,23 +201,21 @@ const unsigned char* DecodingTable::readSingles(const Cell* cells, const unsigne
     constexpr std::size_t most = sizeof(Cell) / sizeof(Unit);
     const bool keepsAscii = keepsAscii_;
     Unit* out = q;
-    const auto hasRoomFor = [&](std::size_t characters) {
-        return static_cast<std::size_t>(outEnd - out) >= characters * most;
-    };
-    bool areKnown = true;
-    while (areKnown && static_cast<std::size_t>(end - p) >= block && hasRoomFor(block)) {
-        if (keepsAscii && areAscii<block>(p)) {
+    const auto room = [&] { return static_cast<std::size_t>(outEnd - out); };
+    bool goesOn = true;
+    while (goesOn && p < end) {
+        const std::size_t count = std::min(block, static_cast<std::size_t>(end - p));
+        if (keepsAscii && count == block && room() >= block && areAscii<block>(p)) {
             out = std::copy(p, p + block, out);
             p += block;
             continue;
         }
-        for (const unsigned char* const stop = p + block; areKnown && p < stop; p += areKnown ? 1 : 0) {
-            areKnown = put(cells[*p], out);
+        for (const unsigned char* const stop = p + count; p < stop; ++p) {
+            goesOn = room() >= most && put(cells[*p], out);
+            if (!goesOn) {
+                break;
+            }
         }
-    }
-    while (areKnown && p < end && hasRoomFor(1)) {
-        areKnown = put(cells[*p], out);
-        p += areKnown ? 1 : 0;
     }
     q = out;
     return p;
