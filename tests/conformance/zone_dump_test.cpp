@@ -41,8 +41,8 @@ bool readChange(const std::string& line, Change& change) {
     const char* const months = "JanFebMarAprMayJunJulAugSepOctNovDec";
     const auto number = static_cast<unsigned>((std::strstr(months, month) - months) / 3 + 1);
     using namespace std::chrono;
-    change.moment =
-        sys_days(std::chrono::year(year) / number / day) + hours(hour) + minutes(minute) + seconds(second);
+    change.moment = sys_days(std::chrono::year(year) / std::chrono::month(number) / day) + hours(hour) +
+                    minutes(minute) + seconds(second);
     change.offset = std::stol(line.substr(offset + 7));
     return true;
 }

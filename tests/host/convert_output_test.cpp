@@ -239,9 +239,9 @@ TEST_F(KvtConvertOutput, MuchDataIsWrittenWholeOrAsFarAsItGoes) {
 TEST_F(KvtConvertOutput, AFileThatGrowsTooLongIsAFailure) {
     write("out", "old");
     // Of the shorter one, the last write stores all but two bytes.
-    for (const std::size_t characters : {300000, 50001}) {
+    for (const int characters : {300000, 50001}) {
         ChildSetup made = setup({"convert", "--from", "UTF-8", "--to", "UTF-16LE", "-o", "out"});
-        made.input = std::string(characters, 'x');
+        made.input = std::string(static_cast<std::size_t>(characters), 'x');
         made.mostFileBytes = 100000;
         const ChildResult result = runChild(made);
         EXPECT_EQ(result.status, 2);

@@ -122,7 +122,9 @@ TEST_F(RealTables, HaveDatesThatGoToIsoAndBack) {
         const std::string delimiter = delimiterOf(table);
         const auto inferred = kvt({"infer", table.string()});
         ASSERT_EQ(inferred.status, 0) << table << inferred.err;
-        for (const auto& [column, format] : dateColumns(inferred.out)) {
+        for (const auto& dated : dateColumns(inferred.out)) {
+            const std::string& column = dated.first;
+            const std::string& format = dated.second;
             const std::string pivot = format.find("%y") == std::string::npos ? "" : "50";
             const auto steps = [&](const std::vector<std::string>& formats) {
                 std::vector<std::string> arguments = {"translate", "--delimiter", delimiter, "--on-error",
