@@ -290,7 +290,7 @@ void holdScaling(Limits& limits, const std::string& name, Work work) {
 } // namespace
 
 int main(int argc, char** argv) {
-    Limits large(31, 1);
+    Limits large(9, 8);
     holdConversions(large, textBytes, "1 MiB", 0);
     holdLosses(large);
     holdBadInput(large);

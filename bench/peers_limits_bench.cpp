@@ -316,7 +316,7 @@ void holdFiles(Limits& limits) {
 } // namespace
 
 int main(int argc, char** argv) {
-    Limits large(31, 1);
+    Limits large(15, 4);
     for (const Text& text : {kvt::bench::ascii, kvt::bench::latin, kvt::bench::japanese}) {
         holdConversions(large, text);
         holdCase(large, text);

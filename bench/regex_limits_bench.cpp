@@ -57,7 +57,7 @@ void hold(Limits& limits, const std::string& name, const std::string& pattern, c
 } // namespace
 
 int main(int argc, char** argv) {
-    Limits large(31, 1);
+    Limits large(9, 8);
     const std::string log = logText(1 << 20);
     hold(large, "1 MiB, a date", "\\d{4}-\\d\\d-\\d\\d \\d\\d:\\d\\d", log, Bound::atLeast, 30);
     hold(large, "1 MiB, a date in groups", "(\\d{4})-(\\d\\d)-(\\d\\d)", log, Bound::atLeast, 30);

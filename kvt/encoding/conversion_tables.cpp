@@ -153,16 +153,13 @@ DecodingTable::Utf8Cell DecodingTable::cellOf(char16_t unit) {
     return cell;
 }
 
-bool DecodingTable::put(char16_t unit, char16_t*& out) {
-    *out = unit;
-    out += unit != noUnit ? 1 : 0;
-    return unit != noUnit;
+void DecodingTable::put(char16_t unit, char16_t*& out) {
+    *out++ = unit;
 }
 
-bool DecodingTable::put(const Utf8Cell& cell, char*& out) {
+void DecodingTable::put(const Utf8Cell& cell, char*& out) {
     std::memcpy(out, &cell, sizeof cell);
     out += cell.length;
-    return cell.length != 0;
 }
 
 std::size_t DecodingTable::read(std::string_view& in, char16_t* out, std::size_t room) const {
@@ -202,20 +199,27 @@ const unsigned char* DecodingTable::readSingles(const Cell* cells, const unsigne
     const bool keepsAscii = keepsAscii_;
     Unit* out = q;
     const auto room = [&] { return static_cast<std::size_t>(outEnd - out); };
-    bool goesOn = true;
-    while (goesOn && p < end) {
-        const std::size_t count = std::min(block, static_cast<std::size_t>(end - p));
-        if (keepsAscii && count == block && room() >= block && areAscii<block>(p)) {
+    bool areKnown = true;
+    while (areKnown && static_cast<std::size_t>(end - p) >= block && room() >= block * most) {
+        if (keepsAscii && areAscii<block>(p)) {
             out = std::copy(p, p + block, out);
             p += block;
             continue;
         }
-        for (const unsigned char* const stop = p + count; p < stop; ++p) {
-            goesOn = room() >= most && put(cells[*p], out);
-            if (!goesOn) {
-                break;
-            }
+        Unit* const before = out;
+        for (std::size_t i = 0; i < block; ++i) {
+            const Cell cell = cells[p[i]];
+            areKnown &= isKnown(cell);
+            put(cell, out);
         }
+        if (areKnown) {
+            p += block;
+        } else {
+            out = before;
+        }
+    }
+    for (; p < end && room() >= most && isKnown(cells[*p]); ++p) {
+        put(cells[*p], out);
     }
     q = out;
     return p;
@@ -242,18 +246,24 @@ const unsigned char* DecodingTable::readPairs(const Cell* cells, const unsigned 
         const unsigned char* next = p + block + (overhang ? 1 : 0);
         for (std::uint64_t starts = ~ends; starts != 0; starts &= starts - 1) {
             const unsigned char* const character = p + std::countr_zero(starts);
-            if (!put(cells[character[0] * pageSize + character[1]], out)) {
+            const Cell cell = cells[character[0] * pageSize + character[1]];
+            if (!isKnown(cell)) {
                 next = character;
                 areKnown = false;
                 break;
             }
+            put(cell, out);
         }
         p = next;
     }
     while (areKnown && p < end && static_cast<std::size_t>(outEnd - out) >= most) {
         const std::ptrdiff_t length = isPair(*p) ? 2 : 1;
-        areKnown = length <= end - p && put(cells[p[0] * pageSize + p[length - 1]], out);
-        p += areKnown ? length : 0;
+        const Cell* const cell = length <= end - p ? &cells[p[0] * pageSize + p[length - 1]] : nullptr;
+        areKnown = cell != nullptr && isKnown(*cell);
+        if (areKnown) {
+            put(*cell, out);
+            p += length;
+        }
     }
     q = out;
     return p;
@@ -313,7 +323,7 @@ std::size_t DecodingTable::bytesOf(std::string_view in, std::size_t units) const
 
 // ---- To bytes ----------------------------------------------------------------------------------------------------
 
-EncodingTable::EncodingTable(Encoding encoding) : pages_(pageSize, noCode) {
+EncodingTable::EncodingTable(Encoding encoding) : codes_(firstSupplementary, noCode) {
     Probe probe(encoding);
     if (!probe.isOpen()) {
         return;
@@ -342,12 +352,7 @@ void EncodingTable::add(char16_t unit, std::string_view bytes) {
     if (bytes.size() == 2 && (second == 0 || code == noCode)) {
         return;
     }
-    std::uint16_t& page = pageOf_[unit / pageSize];
-    if (page == 0) {
-        page = static_cast<std::uint16_t>(pages_.size());
-        pages_.resize(pages_.size() + pageSize, noCode);
-    }
-    pages_[page + unit % pageSize] = static_cast<std::uint16_t>(code);
+    codes_[unit] = static_cast<std::uint16_t>(code);
     longest_ = std::max(longest_, bytes.size());
     isWithinUtf8_ = isWithinUtf8_ && (bytes.size() == 1 || unit >= 0x80);
 }
@@ -366,31 +371,28 @@ EncodingTable::Written EncodingTable::write(const char16_t* units, std::size_t c
 EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::size_t count,
                                                    char* out) const {
     constexpr std::size_t block = 16;
-    // Kept here, since a write of bytes could change the tables for all that the compiler knows.
-    const std::uint16_t* const pageOf = pageOf_.data();
-    const std::uint16_t* const pages = pages_.data();
-    const auto put = [=](std::size_t i) {
-        const std::uint16_t code = pages[pageOf[units[i] / pageSize] + units[i] % pageSize];
-        out[i] = static_cast<char>(code);
-        return code;
-    };
+    // Kept here, since a write of bytes could change the table for all that the compiler knows.
+    const std::uint16_t* const codes = codes_.data();
     const bool isWorthACall = keepsAscii_ && count > vectors::shortText;
     std::size_t i = isWorthACall ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
     for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
+        unsigned all = 0;
         for (std::size_t place = i; place < i + block; ++place) {
-            areKnown = put(place) != noCode && areKnown;
+            const std::uint16_t code = codes[units[place]];
+            out[place] = static_cast<char>(code);
+            all |= code;
         }
+        areKnown = all <= 0xFF;
     }
-    while (i < count && put(i) != noCode) {
-        ++i;
+    for (; i < count && codes[units[i]] != noCode; ++i) {
+        out[i] = static_cast<char>(codes[units[i]]);
     }
     return {i, i};
 }
 
 // A branch for each length here, too.
 std::size_t EncodingTable::writeUtf8(std::string_view& in, char* out, std::size_t room) const {
-    const std::uint16_t* const pageOf = pageOf_.data();
-    const std::uint16_t* const pages = pages_.data();
+    const std::uint16_t* const codes = codes_.data();
     const unsigned char ascii = keepsAscii_ ? 0x80 : 0; // what is below needs no table
     const char* p = in.data();
     const char* const end = p + in.size();
@@ -402,16 +404,15 @@ std::size_t EncodingTable::writeUtf8(std::string_view& in, char* out, std::size_
             *q++ = *p++;
             continue;
         }
-        // All but the last six bits, which the last byte holds.
-        std::size_t page = lead / pageSize;
+        std::size_t unit = lead;
         std::ptrdiff_t length = 1;
         if (lead >= 0xE0) {
             length = 3;
             if (lead > 0xEF || end - p < 3 || !isContinuation(p[1]) || !isContinuation(p[2])) {
                 break;
             }
-            page = (lead & 0x0FU) * pageSize | continuationBits(p[1]);
-            if (page < 0x800 / pageSize) {
+            unit = (lead & 0x0FU) << 12 | continuationBits(p[1]) << 6 | continuationBits(p[2]);
+            if (unit < 0x800) {
                 break;
             }
         } else if (lead >= 0x80) {
@@ -419,9 +420,9 @@ std::size_t EncodingTable::writeUtf8(std::string_view& in, char* out, std::size_
             if (lead < 0xC2 || end - p < 2 || !isContinuation(p[1])) {
                 break;
             }
-            page = lead & 0x1F;
+            unit = (lead & 0x1FU) << 6 | continuationBits(p[1]);
         }
-        const std::uint16_t code = pages[pageOf[page] + continuationBits(p[length - 1])];
+        const std::uint16_t code = codes[unit];
         const std::ptrdiff_t bytes = code > 0xFF ? 2 : 1;
         if (code == noCode || outEnd - q < bytes) {
             break;
@@ -441,8 +442,7 @@ std::size_t EncodingTable::writeUtf8(std::string_view& in, char* out, std::size_
 // foresee.
 EncodingTable::Written EncodingTable::writePairs(const char16_t* units, std::size_t count, char* out) const {
     constexpr std::size_t block = 16;
-    const std::uint16_t* const pageOf = pageOf_.data();
-    const std::uint16_t* const pages = pages_.data();
+    const std::uint16_t* const codes = codes_.data();
     char* q = out;
     std::size_t i = 0;
     while (i < count) {
@@ -455,7 +455,7 @@ EncodingTable::Written EncodingTable::writePairs(const char16_t* units, std::siz
         // Two bytes are written for all but the last character, behind which there may be no room.
         const std::size_t stop = std::min(i + block, count - 1);
         for (; i < stop; ++i) {
-            const unsigned code = pages[pageOf[units[i] / pageSize] + units[i] % pageSize];
+            const unsigned code = codes[units[i]];
             if (code == noCode) {
                 return {i, static_cast<std::size_t>(q - out)};
             }

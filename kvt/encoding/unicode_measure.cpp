@@ -140,6 +140,23 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
     return extent;
 }
 
+#if KVT_HAS_VECTORS
+/// The units of the first registers, four at a time, that hold nothing but ASCII.
+HWY_INLINE std::size_t asciiBlocks(Units16 d, const std::uint16_t* p, const std::uint16_t* end) {
+    const std::size_t N = hn::Lanes(d);
+    const std::uint16_t* const begin = p;
+    while (static_cast<std::size_t>(end - p) >= 4 * N) {
+        const auto any = hn::Or(hn::Or(hn::LoadU(d, p), hn::LoadU(d, p + N)),
+                                hn::Or(hn::LoadU(d, p + 2 * N), hn::LoadU(d, p + 3 * N)));
+        if (!hn::AllTrue(d, hn::Lt(any, hn::Set(d, 0x80)))) {
+            break;
+        }
+        p += 4 * N;
+    }
+    return static_cast<std::size_t>(p - begin);
+}
+#endif
+
 Extent measureUtf16(const char* text, std::size_t units) {
     const auto* const begin = reinterpret_cast<const std::uint16_t*>(text);
     const std::uint16_t* const end = begin + units;
@@ -154,7 +171,8 @@ Extent measureUtf16(const char* text, std::size_t units) {
     const auto half = hn::Set(d, 0xFC00);
     while (static_cast<std::size_t>(end - p) >= N) {
         const auto v = hn::LoadU(d, p);
-        beyondAscii += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F)));
+        const std::size_t beyond = hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7F)));
+        beyondAscii += beyond;
         beyondAscii += hn::CountTrue(d, hn::Gt(v, hn::Set(d, 0x7FF)));
         const auto isSurrogate = hn::Eq(hn::And(v, surrogateMask), hn::Set(d, 0xD800));
         if (HWY_UNLIKELY(!hn::AllFalse(d, isSurrogate) ||
@@ -178,6 +196,9 @@ Extent measureUtf16(const char* text, std::size_t units) {
             extent.utf32 -= hn::CountTrue(d, isLow);
         }
         p += N;
+        if (beyond == 0) {
+            p += asciiBlocks(d, p, end);
+        }
     }
 #endif
     std::size_t taken = static_cast<std::size_t>(p - begin);

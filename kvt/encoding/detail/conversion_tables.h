@@ -61,9 +61,10 @@ private:
     static constexpr std::size_t pageSize = 256;
 
     static Utf8Cell cellOf(char16_t unit);
-    // Return whether the character is known.
-    static bool put(char16_t unit, char16_t*& out);
-    static bool put(const Utf8Cell& cell, char*& out);
+    static bool isKnown(char16_t unit) { return unit != noUnit; }
+    static bool isKnown(const Utf8Cell& cell) { return cell.length != 0; }
+    static void put(char16_t unit, char16_t*& out);
+    static void put(const Utf8Cell& cell, char*& out);
 
     bool isPair(std::size_t first) const { return (pairs_[first / 64] >> first % 64 & 1) != 0; }
     template <typename Cell, typename Unit>
@@ -109,18 +110,16 @@ public:
 
 private:
     static constexpr std::uint16_t noCode = 0xFFFF; // ask ICU
-    static constexpr std::size_t pageSize = 64;     // as many as the last byte of UTF-8 tells apart
 
     void add(char16_t unit, std::string_view bytes);
-    std::uint16_t codeOf(char16_t unit) const { return pages_[pageOf_[unit / pageSize] + unit % pageSize]; }
+    std::uint16_t codeOf(char16_t unit) const { return codes_[unit]; }
     Written writeSingles(const char16_t* units, std::size_t count, char* out) const;
     Written writePairs(const char16_t* units, std::size_t count, char* out) const;
 
-    // For a unit without its last six bits the place where its page begins. The first page is empty.
-    std::array<std::uint16_t, 0x10000 / pageSize> pageOf_{};
-    std::vector<std::uint16_t> pages_; // one byte as its number, two with the second one above
-    std::size_t longest_ = 1;          // bytes of a character
-    bool isWithinUtf8_ = true;         // no character is longer than in UTF-8
+    // For each unit one byte as its number, two with the second one above. Most of the 128 KiB are never looked at.
+    std::vector<std::uint16_t> codes_;
+    std::size_t longest_ = 1;  // bytes of a character
+    bool isWithinUtf8_ = true; // no character is longer than in UTF-8
     bool keepsAscii_ = true;
 };
 
