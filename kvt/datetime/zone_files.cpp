@@ -113,6 +113,10 @@ private:
     };
 
     void readLine(std::string_view line) {
+        // In a comment, too: zeros are what a disk puts in the place of text that it lost, line ends included.
+        if (line.find('\0') != std::string_view::npos) {
+            fail(place_, "a line has a byte of zero");
+        }
         if (line.empty() || line[0] == '#') {
             return;
         }

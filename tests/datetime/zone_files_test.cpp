@@ -33,7 +33,7 @@ std::string faultBehind(const std::string& lines) {
 
 TEST(ZoneFiles, AreGoodInAllThatTheLanguageHas) {
     EXPECT_EQ(faultBehind(""), "good");
-    EXPECT_EQ(faultBehind("# a comment of any bytes: \xC3\xBC \x01 \"\n"
+    EXPECT_EQ(faultBehind("# a comment of any bytes but zero: \xC3\xBC \x01 \"\n"
                           "\n"
                           "Link\tEurope/Here\tHere # why\n"
                           "Link Here There\n"
@@ -182,6 +182,9 @@ TEST(ZoneFiles, HaveAFaultInTheLineThatIsNamed) {
         SCOPED_TRACE(row.row);
         EXPECT_EQ(faultBehind(row.lines), row.fault);
     }
+    // Zeros are no text, where nobody reads it either.
+    EXPECT_EQ(faultBehind(std::string("Link Europe/Here A\0\n", 20)), "europe:5: a line has a byte of zero");
+    EXPECT_EQ(faultBehind(std::string("\n# x\0y\n", 7)), "europe:6: a line has a byte of zero");
 }
 
 TEST(ZoneFiles, AreLookedOverTogether) {
