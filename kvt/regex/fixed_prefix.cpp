@@ -220,8 +220,7 @@ private:
 /// How many bytes each match has, where the pattern says of each of them alone which it may be.
 std::optional<std::size_t> sizeOfPlainPattern(const Engine& engine) {
     std::size_t size = 0;
-    const states::re_syntax_base* state = engine.get_first_state();
-    while (state != nullptr) {
+    for (const auto* state = engine.get_first_state();;) {
         switch (state->type) {
         case states::syntax_element_startmark:
         case states::syntax_element_endmark:
@@ -249,7 +248,6 @@ std::optional<std::size_t> sizeOfPlainPattern(const Engine& engine) {
         }
         state = state->next.p;
     }
-    return std::nullopt;
 }
 
 bool haveCommonByte(const ByteSet& left, const ByteSet& right) {

@@ -282,6 +282,8 @@ TEST(URegexMatch, IsAValue) {
     EXPECT_EQ(groupsOf(first), (Spans{{1, 1}, {none, 0}}));
     const URegexMatch<0> moved = std::move(copy);
     EXPECT_EQ(moved.text(1), UString<0>("b"));
+    ASSERT_EQ(moved.groups().size(), 2U);
+    EXPECT_EQ(moved.groups()[1], moved.group(1));
 }
 
 TEST(URegexFailure, APatternThatCannotBeCompiledThrowsTheEnginesOwn) {

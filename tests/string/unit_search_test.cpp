@@ -126,6 +126,7 @@ TYPED_TEST(UnitSearch, TakesSpansWithoutAnAddress) {
     EXPECT_EQ(rfindUnits(Units<Unit>(text), none, notFound), 3u);
     EXPECT_EQ(rfindUnits(none, Units<Unit>(text), 0), notFound);
     EXPECT_EQ(findUnit(none, Unit{'a'}, 0), notFound);
+    EXPECT_EQ(findUnit(text.data(), text.data(), Unit{'a'}), nullptr);
     EXPECT_EQ(rfindUnit(none, Unit{'a'}, notFound), notFound);
     EXPECT_TRUE(sameUnits(none, none));
     EXPECT_TRUE(sameUnits(none, Units<Unit>(text).substr(3)));

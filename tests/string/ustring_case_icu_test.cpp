@@ -154,5 +154,14 @@ TEST(UStringCaseIcu, Utf16FollowsTheDefaultLocale) {
     EXPECT_EQ(shown(plainFold), "i");
 }
 
+TEST(UStringCaseIcu, Utf16ThatIsNotWellFormedIsFoldedToo) {
+    std::u16string text(1000, u'A');
+    text[500] = u'\xD800';
+    std::u16string folded(1000, u'a');
+    folded[500] = u'\xD800';
+    const UString<2> result = UString<2>(text.data(), text.size()).getAsFoldedCase();
+    EXPECT_EQ(std::u16string(result.rawData(), result.size()), folded);
+}
+
 } // namespace
 } // namespace kvt::test
