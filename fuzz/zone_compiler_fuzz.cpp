@@ -125,6 +125,7 @@ bool isStricter(const std::string& reason) {
                                "UNTIL is not after",
                                "two lines for one day",
                                "days change places",
+                               "name the same day",
                                "has no standard time",
                                "has too many lines",
                                "leads elsewhere",

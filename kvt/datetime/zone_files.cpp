@@ -253,13 +253,20 @@ private:
         constexpr int calendarRepeats = 400;
         const int from = std::max(rule.from, other.from);
         const int to = std::min({rule.to, other.to, from + calendarRepeats - 1});
-        const bool isBehind = std::pair(other.on.month, other.on.day) < std::pair(rule.on.month, rule.on.day);
+        // The `date` library goes by the days that are named, and gives those of one name in any order.
+        const auto named = std::pair(rule.on.month, rule.on.day);
+        const auto otherNamed = std::pair(other.on.month, other.on.day);
         for (int year = from; year <= to; ++year) {
             const std::int64_t days = daysOf(rule.on, year) - daysOf(other.on, year);
             if (days == 0) {
                 fail(line.place, "the rule " + quoted(rule.name) + " has two lines for one day of one year");
             }
-            if ((days > 0) != isBehind) {
+            if (named == otherNamed) {
+                fail(line.place,
+                     "the rule " + quoted(rule.name) +
+                         " has two lines of one year that name the same day, as \"1\" and \"Sun>=1\"");
+            }
+            if ((days > 0) != (otherNamed < named)) {
                 fail(line.place, "the rule " + quoted(rule.name) +
                                      " has two lines of which the days change places in some years");
             }

@@ -130,6 +130,12 @@ TEST(ZoneFiles, HaveAFaultInTheLineThatIsNamed) {
          "europe:6: the rule \"X\" has two lines for one day of one year"},
         {__LINE__, "Rule X 1901 1917 - Apr Sat<=7 0 1 -\nRule X 1901 1920 - Apr Sun>=1 2 0 -\n",
          "europe:6: the rule \"X\" has two lines of which the days change places in some years"},
+        {__LINE__, "Rule X 1901 1920 - Sep Sun>=1 2 0 -\nRule X 1911 only - Sep 1 0 0 -\n",
+         "europe:6: the rule \"X\" has two lines of one year that name the same day, as \"1\" and "
+         "\"Sun>=1\""},
+        {__LINE__, "Rule X 1911 only - Sep 1 0 0 -\nRule X 1901 1920 - Sep Sun>=1 2 0 -\n",
+         "europe:6: the rule \"X\" has two lines of one year that name the same day, as \"1\" and "
+         "\"Sun>=1\""},
         {__LINE__, "Rule X 1917 only - Dec Sun>=26 0 0 -\n",
          "europe:5: \"Sun>=26\" is not a day of one year, but of two"},
         // Zones.
