@@ -181,7 +181,7 @@ void checkCase(std::string_view text, std::size_t shift) {
         std::string out(expected.size(), '\0');
         error = U_ZERO_ERROR;
         const vectors::CaseProgress progress = vectors::mapCase(
-            detail::caseTable(mapping, caseMap), placed.data(), text.size(), 0, out.data(), out.size());
+            *detail::caseTable(mapping, caseMap), placed.data(), text.size(), 0, out.data(), out.size());
         const std::int32_t length = detail::caseFunction(mapping)(
             caseMap, expected.data(), static_cast<std::int32_t>(expected.size()), placed.data(),
             static_cast<std::int32_t>(text.size()), &error);

@@ -19,6 +19,7 @@ namespace {
 class Probe final : private icu::LossListener {
 public:
     explicit Probe(Encoding encoding) : converter_(encoding) {
+        converter_.requireMemory();
         if (converter_.isOpen()) {
             converter_.setListener(*this);
         }

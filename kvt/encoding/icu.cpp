@@ -238,6 +238,7 @@ Converter::Converter(Encoding encoding) : encoding_(encoding) {
     }
     UErrorCode error = U_ZERO_ERROR;
     converter_.reset(ucnv_open(name.data(), &error));
+    lacksMemory_ = error == U_MEMORY_ALLOCATION_ERROR;
     // Compound text is left with ICU's own substitution: once another is set, ucnv_close frees what is not its own.
     if (converter_ == nullptr || unicodeForm(encoding) != Form::other ||
         ucnv_getType(converter_.get()) == UCNV_COMPOUND_TEXT) {
@@ -285,7 +286,14 @@ std::string Converter::substitution() const {
     return U_SUCCESS(error) ? std::string(bytes.data(), static_cast<std::size_t>(length)) : std::string();
 }
 
+void Converter::requireMemory() const {
+    if (lacksMemory_) {
+        throw std::bad_alloc();
+    }
+}
+
 Form Converter::form() {
+    requireMemory();
     if (!isOpen()) {
         return Form::other;
     }

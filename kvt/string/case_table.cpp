@@ -15,9 +15,11 @@ namespace {
 
 constexpr std::uint32_t capitalSigma = 0x3A3;
 
+struct LacksMemory {}; // ICU does
+
 void check(UErrorCode status) {
     if (U_FAILURE(status)) {
-        throw std::bad_alloc(); // the one reason
+        throw LacksMemory(); // the one reason
     }
 }
 
@@ -153,8 +155,10 @@ CaseFunction caseFunction(CaseMapping mapping) noexcept {
     }
 }
 
+namespace {
+
 // Never destroyed, so that destructors of static objects can map text.
-const CaseTable& caseTable(CaseMapping mapping, const UCaseMap* caseMap) {
+const CaseTable& madeTable(CaseMapping mapping, const UCaseMap* caseMap) {
     const auto make = [=] { return new CaseTable(TableMaker(mapping, caseMap).make()); };
     switch (mapping) {
     case CaseMapping::upper: {
@@ -169,6 +173,16 @@ const CaseTable& caseTable(CaseMapping mapping, const UCaseMap* caseMap) {
         static const CaseTable& folded = *make();
         return folded;
     }
+    }
+}
+
+} // namespace
+
+const CaseTable* caseTable(CaseMapping mapping, const UCaseMap* caseMap) {
+    try {
+        return &madeTable(mapping, caseMap);
+    } catch (const LacksMemory&) {
+        return nullptr;
     }
 }
 

@@ -102,8 +102,8 @@ UString<N> icuStringHelper(UStringView<N> source, Map map) {
 /// A text of UTF-8 that is mapped by a table, and by ICU where the table does not know.
 class MappingByTable {
 public:
-    MappingByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text)
-        : table_(detail::caseTable(mapping, caseMap)), caseMap_(caseMap), text_(text) {}
+    MappingByTable(const detail::CaseTable& table, const UCaseMap* caseMap, std::string_view text)
+        : table_(table), caseMap_(caseMap), text_(text) {}
 
     bool isDone() const { return taken_ == text_.size() && left_.empty(); }
 
@@ -180,9 +180,9 @@ constexpr std::size_t leastForTable = 1024;
 constexpr std::size_t mostForTable = std::numeric_limits<std::int32_t>::max() / 4;
 
 /// What the text becomes; just as long as it is.
-std::string mappedByTable(Mapping mapping, const UCaseMap* caseMap, std::string_view text) {
+std::string mappedByTable(const detail::CaseTable& table, const UCaseMap* caseMap, std::string_view text) {
     std::string out;
-    MappingByTable mapped(mapping, caseMap, text);
+    MappingByTable mapped(table, caseMap, text);
     detail::appendInPlace(out, text.size(), [&](char* to) { return mapped.write(to, text.size()); });
     if (!mapped.isDone()) {
         const std::size_t rest = mapped.measure();
@@ -198,14 +198,16 @@ std::u16string foldedByTable(std::u16string_view text) {
     std::u16string out;
     const detail::vectors::Extent extent = detail::vectors::measureUtf16(bytesOf(text.data()), text.size());
     const UCaseMap* const caseMap = extent.taken == text.size() ? caseMapIfAny() : nullptr;
-    if (caseMap == nullptr) {
+    const detail::CaseTable* const table =
+        caseMap != nullptr ? detail::caseTable(Mapping::folded, caseMap) : nullptr;
+    if (table == nullptr) {
         return out;
     }
     std::string utf8;
     detail::appendInPlace(utf8, extent.utf8, [&](char* to) {
         return detail::vectors::utf16ToUtf8(bytesOf(text.data()), text.size(), to, extent.utf8);
     });
-    utf8 = mappedByTable(Mapping::folded, caseMap, utf8);
+    utf8 = mappedByTable(*table, caseMap, utf8);
     const std::size_t units = detail::vectors::measureUtf8(utf8.data(), utf8.size()).utf16;
     detail::appendInPlace(out, units, [&](char16_t* to) {
         return detail::vectors::utf8ToUtf16(utf8.data(), utf8.size(), reinterpret_cast<char*>(to), units);
@@ -217,9 +219,10 @@ std::u16string foldedByTable(std::u16string_view text) {
 template <typename Storage>
 UString<0> mapUtf8(Mapping mapping, UStringView<0> source, Storage storage) {
     const UCaseMap* const caseMap = source.isEmpty() ? nullptr : defaultCaseMap();
-    if (source.size() >= leastForTable && source.size() <= mostForTable) {
+    const bool isForTable = source.size() >= leastForTable && source.size() <= mostForTable;
+    if (const detail::CaseTable* const table = isForTable ? detail::caseTable(mapping, caseMap) : nullptr) {
         UString<0> result;
-        storage(result) = mappedByTable(mapping, caseMap, {source.data(), source.size()});
+        storage(result) = mappedByTable(*table, caseMap, {source.data(), source.size()});
         storage(result).resize(std::max(storage(result).size(), source.size()));
         return result;
     }

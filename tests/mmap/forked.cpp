@@ -1,6 +1,8 @@
 // The text comes back through a pipe, and how the process ended through waitpid.
 #include <mmap/forked.h>
 
+#include <support/count_lines.h>
+
 #include <array>
 #include <cstddef>
 #include <exception>
@@ -29,6 +31,7 @@ void writeAll(int descriptor, std::string_view text) {
     } catch (const std::exception& failure) {
         writeAll(descriptor, std::string("threw ") + failure.what());
     }
+    countLines();
     ::_exit(0);
 }
 

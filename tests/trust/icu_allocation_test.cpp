@@ -62,6 +62,19 @@ const std::vector<Call> calls = {
     {"IBM037", [] { return converted("IBM037"); }},
     {"SCSU", [] { return converted("SCSU"); }},
     {"UTF-16", [] { return UString<0>(UString<2>(UString<0>(text.c_str()))).toStdString(); }},
+    {"folding of UTF-16",
+     [] {
+         const std::u16string letters(2000, u'\xC4');
+         return UString<0>(UString<2>(letters.data(), letters.size()).getAsFoldedCase()).toStdString();
+     }},
+    {"upper case of a long text",
+     [] {
+         std::string letters;
+         for (int i = 0; i < 1000; ++i) {
+             letters += "\xC3\xA4";
+         }
+         return UString<0>(letters.c_str()).getAsUpperCase().toStdString();
+     }},
     {"upper case", [] { return UString<0>(text.c_str()).getAsUpperCase().toStdString(); }},
     {"folding", [] { return UString<0>(text.c_str()).getAsFoldedCase().toStdString(); }},
     {"a stream",

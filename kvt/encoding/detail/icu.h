@@ -58,11 +58,15 @@ public:
     void setListener(LossListener& listener);
     void reset();
 
+    /// Throws std::bad_alloc where that is why it is not open, for those who keep what they find out.
+    void requireMemory() const;
+
     /// The bytes of the longest character.
     int maxCharSize() const;
     /// The bytes that stand for a lost character; empty when ICU does not know.
     std::string substitution() const;
-    /// How text of this encoding can be converted without ICU. Not to be called within a conversion.
+    /// How text of this encoding can be converted without ICU. Not to be called within a conversion. Throws
+    /// std::bad_alloc.
     Form form();
 
     struct Range {
@@ -117,6 +121,7 @@ private:
     std::unique_ptr<UConverter, Close> converter_;
     Encoding encoding_ = Encoding::Unknown;
     LossListener* listener_ = nullptr;
+    bool lacksMemory_ = false; ///< that is why it is not open
 };
 
 } // namespace kvt::ex::detail::icu

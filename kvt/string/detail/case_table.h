@@ -29,9 +29,9 @@ struct CaseTable {
     std::vector<std::uint64_t> characters;
 };
 
-/// The table of a mapping, made of what `caseMap` gives at the first call; any thread. Throws
-/// std::bad_alloc.
-const CaseTable& caseTable(CaseMapping mapping, const UCaseMap* caseMap);
+/// The table of a mapping, made of what `caseMap` gives at the first call; any thread. Null where ICU has no memory for
+/// what it is made of, which may be so for good: it can map text all the same. Throws std::bad_alloc.
+const CaseTable* caseTable(CaseMapping mapping, const UCaseMap* caseMap);
 
 /// ICU's function for a mapping.
 using CaseFunction = std::int32_t (*)(const UCaseMap*, char*, std::int32_t, const char*, std::int32_t,
