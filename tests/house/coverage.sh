@@ -24,15 +24,16 @@ uncounted='Header|CompileFail|NaturalLines\.compile|Consumer|Gdb|Exports|Mutatio
 unbounded='HostileInput|KvtKilled|KilledChild|UStringGuaranteeDeathTest|RealTables|Cluster'
 # These compare with a second implementation over all there is, or from many seeds, which takes long where nothing is
 # optimised. A part of their cases runs the same lines.
-exhaustive='Shard/ConversionTables|Each/UnicodeVectors|Shard/IcuDifferential|Forms/ShortcutPair'
-exhaustive+='|Shards/PatternAgreement|DamagedZoneFolder|SingleByteTables|Pair/UnicodeDifferential|WwjdDecode|Shortcut'
-exhaustive+='|Each/CaseTable|Shard/StreamDifferential|StreamDifferential|From/FormatAgreement|UStringCaseData'
-exhaustive+='|RegexDifferential|LegacyPattern|Each/PrefixScanOn|ParseZQTDateTime|FormatRoundTrip'
+exhaustive='Shard/ConversionTables|Each/UnicodeVectors|Shard/IcuDifferential'
+exhaustive+='|Shards/PatternAgreement|DamagedZoneFolder|SingleByteTables|Pair/UnicodeDifferential|WwjdDecode'
+exhaustive+='|Each/CaseTable|From/FormatAgreement|UStringCaseData|ParseZQTDateTime|FormatRoundTrip'
 exhaustive+='|Encoding/TableDifferential|Utf8Check|Conformance.*'
 seeds='Part/FloatTextSample\..*/[1-7]|Seeds/MatchesModel\..*/[1-3]'
 
 run_tests() {
     local failed=0
+    # Where a test limits how long files may be, the counts are cut off as well, which is not to be said among its output.
+    export GCOV_ERROR_FILE=/dev/null
     # The inputs that were found and some hundred damaged ones; `./dev fuzz` is for more.
     for fuzzer in "$folder"/fuzz/*_fuzz; do
         name=$(basename -- "$fuzzer" _fuzz)
@@ -40,9 +41,9 @@ run_tests() {
     done
     # The pages that tests read were written during the build, before anything counted.
     "$folder/tools/kvt/kvt_pages" "$folder/written_pages" 0 2000-01-01 || failed=1
-    ctest --preset coverage -j "$(nproc)" --timeout 600 --output-log "$folder/tests.log" \
+    ctest --preset coverage -j "$(nproc)" --timeout 1800 --output-log "$folder/tests.log" \
         -E "^((Fuzz|$uncounted|$unbounded|$exhaustive)(\.|\$)|$seeds)" || failed=1
-    GTEST_TOTAL_SHARDS=8 GTEST_SHARD_INDEX=0 ctest --preset coverage -j "$(nproc)" --timeout 600 \
+    GTEST_TOTAL_SHARDS=8 GTEST_SHARD_INDEX=0 ctest --preset coverage -j "$(nproc)" --timeout 1800 \
         --output-log "$folder/parts_of_tests.log" -R "^($exhaustive)(\.|\$)" || failed=1
     return "$failed"
 }
