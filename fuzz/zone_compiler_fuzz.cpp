@@ -126,6 +126,7 @@ bool isStricter(const std::string& reason) {
                                "two lines for one day",
                                "days change places",
                                "name the same day",
+                               "less than two days apart",
                                "has no standard time",
                                "has too many lines",
                                "leads elsewhere",

@@ -244,34 +244,66 @@ private:
         }
     }
 
+    /// Seconds since 1970, by the clock that the rule names.
+    static std::int64_t momentOf(const ZoneRule& rule, int year) {
+        constexpr std::int64_t secondsPerDay = 86400;
+        return daysOf(rule.on, year) * secondsPerDay + rule.atSeconds;
+    }
+
     static void checkPair(const ZoneRule& other, const PlacedRule& line) {
         const ZoneRule& rule = line.rule;
+        const unsigned monthsApart =
+            std::max(rule.on.month, other.on.month) - std::min(rule.on.month, other.on.month);
         // A day of the week by a day of the month is at most in the month beside it.
-        if (std::max(rule.on.month, other.on.month) - std::min(rule.on.month, other.on.month) > 1) {
-            return;
+        if (monthsApart <= 1) {
+            checkYears(other, line);
+        } else if (monthsApart == 11) {
+            const bool isLate = rule.on.month == 12;
+            checkTurnOfYear(isLate ? rule : other, isLate ? other : rule, line);
         }
-        constexpr int calendarRepeats = 400;
+    }
+
+    static void checkYears(const ZoneRule& other, const PlacedRule& line) {
+        const ZoneRule& rule = line.rule;
         const int from = std::max(rule.from, other.from);
         const int to = std::min({rule.to, other.to, from + calendarRepeats - 1});
         // The `date` library goes by the days that are named, and gives those of one name in any order.
         const auto named = std::pair(rule.on.month, rule.on.day);
         const auto otherNamed = std::pair(other.on.month, other.on.day);
         for (int year = from; year <= to; ++year) {
-            const std::int64_t days = daysOf(rule.on, year) - daysOf(other.on, year);
-            if (days == 0) {
-                fail(line.place, "the rule " + quoted(rule.name) + " has two lines for one day of one year");
+            if (daysOf(rule.on, year) == daysOf(other.on, year)) {
+                failPair(line, " for one day of one year");
             }
             if (named == otherNamed) {
-                fail(line.place,
-                     "the rule " + quoted(rule.name) +
-                         " has two lines of one year that name the same day, as \"1\" and \"Sun>=1\"");
+                failPair(line, " of one year that name the same day, as \"1\" and \"Sun>=1\"");
             }
-            if ((days > 0) != (otherNamed < named)) {
-                fail(line.place, "the rule " + quoted(rule.name) +
-                                     " has two lines of which the days change places in some years");
+            const std::int64_t apart = momentOf(rule, year) - momentOf(other, year);
+            if ((apart > 0) != (otherNamed < named)) {
+                failPair(line, " of which the days change places in some years");
+            }
+            if (std::abs(apart) < leastApart) {
+                failPair(line, " that are less than two days apart");
             }
         }
     }
+
+    static void checkTurnOfYear(const ZoneRule& december, const ZoneRule& january, const PlacedRule& line) {
+        const int from = std::max(december.from, january.from - 1);
+        const int to = std::min({december.to, january.to - 1, from + calendarRepeats - 1});
+        for (int year = from; year <= to; ++year) {
+            if (momentOf(january, year + 1) - momentOf(december, year) < leastApart) {
+                failPair(line, " that are less than two days apart");
+            }
+        }
+    }
+
+    [[noreturn]] static void failPair(const PlacedRule& line, const char* what) {
+        fail(line.place, "the rule " + quoted(line.rule.name) + " has two lines" + what);
+    }
+
+    static constexpr int calendarRepeats = 400; // years
+    // Seconds. Which of two lines comes first may depend on their clocks, and on what the other one does to them.
+    static constexpr std::int64_t leastApart = 2 * 86400;
 
     Place place_;
     std::string_view zone_;            ///< the one in hand

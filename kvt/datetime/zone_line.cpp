@@ -252,7 +252,7 @@ ZoneRule readZoneRule(const ZoneWords& words) {
         bad(words.word[4], "stands where a \"-\" should");
     }
     rule.on = readDay(words.word[6], readMonth(words.word[5]), rule.from, rule.to);
-    readTime(words.word[7]);
+    rule.atSeconds = readTime(words.word[7]).seconds;
     rule.saveMinutes = readSaveMinutes(words.word[8]);
     return rule;
 }

@@ -136,6 +136,14 @@ TEST(ZoneFiles, HaveAFaultInTheLineThatIsNamed) {
         {__LINE__, "Rule X 1911 only - Sep 1 0 0 -\nRule X 1901 1920 - Sep Sun>=1 2 0 -\n",
          "europe:6: the rule \"X\" has two lines of one year that name the same day, as \"1\" and "
          "\"Sun>=1\""},
+        {__LINE__, "Rule X 1917 1920 - Apr 30 23:59:59 1 -\nRule X 1920 max - May 1 0 0 -\n",
+         "europe:6: the rule \"X\" has two lines that are less than two days apart"},
+        {__LINE__, "Rule X 1917 1920 - Apr 29 0:00:01 1 -\nRule X 1920 max - May 1 0 0 -\n",
+         "europe:6: the rule \"X\" has two lines that are less than two days apart"},
+        {__LINE__, "Rule X 1917 1920 - Jan 1 0 1 -\nRule X 1919 only - Dec 31 0 0 -\n",
+         "europe:6: the rule \"X\" has two lines that are less than two days apart"},
+        {__LINE__, "Rule X 1917 1920 - Oct 1 167 1 -\nRule X 1920 max - Oct 2 0 0 -\n",
+         "europe:6: the rule \"X\" has two lines of which the days change places in some years"},
         {__LINE__, "Rule X 1917 only - Dec Sun>=26 0 0 -\n",
          "europe:5: \"Sun>=26\" is not a day of one year, but of two"},
         // Zones.
@@ -215,9 +223,9 @@ TEST(ZoneFiles, HaveRulesThatAreLoadedSoon) {
         if (i == 40) {
             EXPECT_EQ(faultBehind(lines), "good");
         }
-        const std::string month = i < 28 ? "Jan" : i < 56 ? "Mar" : "May";
-        lines += "Rule X " + std::to_string(1900 + i) + " max - " + month + " " + std::to_string(i % 28 + 1) +
-                 " 0 0 -\n";
+        constexpr const char* months[] = {"Jan", "Feb", "Mar", "Apr", "May", "Jun", "Jul"};
+        lines += "Rule X " + std::to_string(1900 + i) + " max - " + months[i / 9] + " " +
+                 std::to_string(i % 9 * 3 + 1) + " 0 0 -\n";
     }
     EXPECT_EQ(faultBehind(lines), "europe:24: the rule \"X\" has too many lines");
 }

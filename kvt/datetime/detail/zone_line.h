@@ -52,6 +52,7 @@ struct ZoneRule {
     int from = 0;
     int to = 0;
     ZoneDay on;
+    std::int64_t atSeconds = 0; ///< of the clock that is named: of the place, of its standard time, or of UTC
     std::int64_t saveMinutes = 0;
 };
 
