@@ -87,7 +87,7 @@ constexpr bool keepsAscii(std::uint32_t type) {
 }
 
 // The units of a text that is short enough to be looked at before anything else.
-constexpr std::size_t shortText = 64;
+constexpr std::size_t shortText = 128;
 
 } // namespace
 
