@@ -60,12 +60,10 @@ public:
         const Layout::Column source = layout.at(column_);
         column_ = source.name;
         source_ = source.slot;
-        const std::string place =
-            source.slot < layout.inputCount() ? std::to_string(source.slot + 1) : source.name;
         for (const std::string& name : names_) {
-            slots_.push_back(layout.add(name, &place));
+            slots_.push_back(layout.add(name, source_));
         }
-        layout.drop(place);
+        layout.dropSlot(source_);
     }
 
     bool apply(RowCells& row) override {
@@ -113,12 +111,12 @@ public:
         : name_(std::move(name)), columns_(std::move(columns)), separator_(std::move(separator)) {}
 
     void bind(Layout& layout) override {
-        target_ = layout.add(name_, &columns_.front());
         for (const std::string& column : columns_) {
             sources_.push_back(layout.at(column).slot);
         }
-        for (const std::string& column : columns_) {
-            layout.drop(column);
+        target_ = layout.add(name_, sources_.front());
+        for (const std::size_t slot : sources_) {
+            layout.dropSlot(slot);
         }
     }
 

@@ -70,10 +70,15 @@ void Layout::rename(const std::string& column, const std::string& name) {
     columns_[indexOf(column)].name = name;
 }
 
-std::size_t Layout::add(const std::string& name, const std::string* before) {
-    const std::size_t index = before == nullptr ? columns_.size() : indexOf(*before);
-    columns_.insert(columns_.begin() + static_cast<std::ptrdiff_t>(index), Column{name, slotCount_});
+std::size_t Layout::add(const std::string& name, std::size_t before) {
+    const auto place = std::find_if(columns_.begin(), columns_.end(),
+                                    [&](const Column& other) { return other.slot == before; });
+    columns_.insert(place, Column{name, slotCount_});
     return slotCount_++;
+}
+
+void Layout::dropSlot(std::size_t slot) {
+    std::erase_if(columns_, [&](const Column& other) { return other.slot == slot; });
 }
 
 } // namespace host

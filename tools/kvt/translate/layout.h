@@ -37,8 +37,12 @@ public:
     /// Only these stay, in this order.
     void keep(const std::vector<std::string>& columns);
     void rename(const std::string& column, const std::string& name);
-    /// A new column before `column`, or behind the last one where there is none. Gives its slot.
-    std::size_t add(const std::string& name, const std::string* before = nullptr);
+
+    // For steps that know the slot of a column, whatever others are called by now.
+
+    /// A new column before that of the slot `before`. Gives its slot.
+    std::size_t add(const std::string& name, std::size_t before);
+    void dropSlot(std::size_t slot);
 
 private:
     std::size_t indexOf(const std::string& column) const;
