@@ -49,4 +49,41 @@ TEST_F(KvtFailingCall, AReadThatASignalEndedIsMadeAgain) {
     EXPECT_EQ(result.out, "text");
 }
 
+TEST_F(KvtFailingCall, WhatDoesNotWaitIsTriedAgain) {
+    for (const char* call : {"early read", "write", "early write"}) {
+        const ChildResult result = runChild(failing(call, toStandardOutput));
+        EXPECT_EQ(result.status, 0) << call << result.err;
+        EXPECT_EQ(result.out, "text") << call;
+        EXPECT_EQ(result.err, "") << call;
+    }
+    // What is said of a failure, too, and what is copied because it is read twice.
+    const ChildResult said = runChild(failing("write", {"explain", "1"}));
+    EXPECT_EQ(said.status, 2);
+    EXPECT_TRUE(said.err.starts_with("kvt: ")) << said.err;
+    const ChildResult copied = runChild(failing("write", {"infer"}));
+    EXPECT_EQ(copied.status, 0) << copied.err;
+    EXPECT_TRUE(contains(copied.out, "standard input seems to be: 4 bytes, 0 rows.")) << copied.out;
+}
+
+TEST_F(KvtFailingCall, AFileThatCannotTakeItsNameIsAFailure) {
+    write("out", "old");
+    const ChildResult result = runChild(failing("rename", toFile));
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "kvt: cannot write out: Input/output error\n");
+    EXPECT_EQ(read("out"), "old");
+    EXPECT_EQ(names(), std::vector<std::string>{"out"});
+}
+
+TEST_F(KvtFailingCall, AFileOfSegmentsThatCannotBeReadIsAFailure) {
+    write("file", std::string(8192, '\0'));
+    const std::vector<std::string> inspect = {"memory", "inspect", "file"};
+    EXPECT_EQ(runChild(failing("pread", inspect)).err, "kvt: file: it cannot be read: Input/output error\n");
+    EXPECT_EQ(runChild(failing("short pread", inspect)).err,
+              "kvt: file: it became shorter while it was read\n");
+    const ChildResult plain = kvt(inspect);
+    const ChildResult interrupted = runChild(failing("interrupted pread", inspect));
+    EXPECT_EQ(interrupted.status, plain.status);
+    EXPECT_EQ(interrupted.err, plain.err);
+}
+
 } // namespace kvt::test

@@ -15,6 +15,14 @@ bool isFaulty(std::string_view call) {
     return fault != nullptr && fault == call;
 }
 
+// At the first call only.
+bool isFaultyOnce(std::string_view call) {
+    static bool wasFaulty = false;
+    const bool isFirst = !wasFaulty && isFaulty(call);
+    wasFaulty = wasFaulty || isFirst;
+    return isFirst;
+}
+
 bool isWrittenFile(int descriptor) {
     struct stat file {};
     return ::fstat(descriptor, &file) == 0 && S_ISREG(file.st_mode) &&
@@ -45,15 +53,48 @@ int close(int descriptor) {
     return result;
 }
 
-// The first of standard input ends by a signal before there is anything to read.
+// The first of standard input ends by a signal before there is anything to read, or finds nothing yet where the input
+// does not wait.
 ssize_t read(int descriptor, void* buffer, size_t bytes) {
-    static bool wasInterrupted = false;
-    if (!wasInterrupted && descriptor == STDIN_FILENO && isFaulty("read")) {
-        wasInterrupted = true;
-        errno = EINTR;
+    if (descriptor == STDIN_FILENO && (isFaultyOnce("read") || isFaultyOnce("early read"))) {
+        errno = isFaulty("read") ? EINTR : EAGAIN;
         return -1;
     }
     return ::syscall(SYS_read, descriptor, buffer, bytes);
+}
+
+// The same of what is written: by a signal, or where there is no room yet.
+ssize_t write(int descriptor, const void* buffer, size_t bytes) {
+    if (isFaultyOnce("write") || isFaultyOnce("early write")) {
+        errno = isFaulty("write") ? EINTR : EAGAIN;
+        return -1;
+    }
+    return ::syscall(SYS_write, descriptor, buffer, bytes);
+}
+
+// A file of which nothing can be read, one that became shorter, and a signal.
+ssize_t pread(int descriptor, void* buffer, size_t bytes, off_t offset) {
+    if (isFaulty("pread")) {
+        errno = EIO;
+        return -1;
+    }
+    if (isFaulty("short pread")) {
+        return 0;
+    }
+    if (isFaultyOnce("interrupted pread")) {
+        errno = EINTR;
+        return -1;
+    }
+    return ::syscall(SYS_pread64, descriptor, buffer, bytes, offset);
+}
+
+// A new name for what was written.
+int rename(const char* from, const char* to) {
+    if (isFaulty("rename")) {
+        errno = EIO;
+        return -1;
+    }
+    return static_cast<int>(::syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, 0));
 }
 
 } // extern "C"
