@@ -1,9 +1,10 @@
 // Works held to limits beside other ways of doing them.
 //
 // All ways are measured in turn, a short while each, and that many times over, so that what the machine does meanwhile
-// falls on all of them alike. What counts is the processor's time, in which waiting for a processor has no part, or the
-// clock's where ways take several threads. A row is the median of the ratios of its two ways within a round. A row that
-// misses its limit is marked, and the exit status is then 1.
+// falls on all of them alike. A way is called several times in a row, as users call it, and once before that. What counts is
+// the processor's time, in which waiting for a processor has no part, or the clock's where ways take several threads. A row
+// is the median of the ratios of its two ways within a round. A row that misses its limit is marked, and the exit status is
+// then 1.
 //
 //     --benchmark_filter=REGEX   only the rows whose work it finds
 //     --quick                    a fifth of the rounds

@@ -101,7 +101,7 @@ void addSize(Limits& limits, const std::string& name, std::size_t size, const Wa
 // Memory that is new to the process costs as much again as what is written to it, in large texts only; so what they are
 // beside is large, too.
 template <typename Function>
-void holdSizes(Limits& limits, const std::string& name, Function function) {
+void holdSizes(Limits& limits, const std::string& name, Function function, Bound bound = Bound::atMost) {
     const auto nameOf = [&](const char* size) {
         return "a MiB in texts of " + std::string(size) + ": " + name;
     };
@@ -113,12 +113,16 @@ void holdSizes(Limits& limits, const std::string& name, Function function) {
     add("1 MiB", mebibyte);
     add("16 MiB", 16 * mebibyte);
     add("256 MiB", 256 * mebibyte);
-    limits.hold({nameOf("1 KiB"), nameOf("1 MiB"), Bound::atMost, 2});
+    limits.hold({nameOf("1 KiB"), nameOf("1 MiB"), bound, 2});
     limits.hold({nameOf("16 MiB"), nameOf("1 MiB")});
-    limits.hold({nameOf("256 MiB"), nameOf("16 MiB"), Bound::atMost, 1.5});
+    limits.hold({nameOf("256 MiB"), nameOf("16 MiB"), bound, 1.5});
 }
 
 void holdSizes(Limits& limits) {
+    // What the system takes for the memory of a result, whoever makes it.
+    holdSizes(
+        limits, "copy", [](const UString<0>& text) { return std::string(text.rawData(), text.size()); },
+        Bound::shown);
     holdSizes(limits, "UTF-8 to UTF-16", [](const UString<0>& text) { return UString<2>(text); });
     holdSizes(limits, "fold", [](const UString<0>& text) { return text.getAsFoldedCase(); });
     holdSizes(limits, "hash", [](const UString<0>& text) { return text.hash(); });
