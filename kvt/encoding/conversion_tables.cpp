@@ -96,6 +96,39 @@ bool areAscii(const char16_t* p) {
     return (all & 0xFF80FF80FF80FF80U) == 0;
 }
 
+constexpr bool isLatin(std::size_t number) {
+    return number >= 0xA0 && number <= 0xFF;
+}
+
+/// Whether each byte is ASCII or one of the letters and signs of Latin-1.
+template <std::size_t bytes>
+bool areLatin(const unsigned char* p) {
+    constexpr std::uint64_t ones = 0x0101010101010101U;
+    std::uint64_t any = 0;
+    for (std::size_t i = 0; i < bytes; i += 8) {
+        std::uint64_t word = 0;
+        std::memcpy(&word, p + i, sizeof word);
+        word = (word & 0xE0 * ones) ^ 0x80 * ones; // zero for one of the others
+        any |= (word - ones) & ~word;
+    }
+    return (any & 0x80 * ones) == 0;
+}
+
+template <std::size_t units>
+bool areLatin(const char16_t* p) {
+    constexpr std::uint64_t ones = 0x0001000100010001U;
+    std::uint64_t all = 0;
+    std::uint64_t any = 0;
+    for (std::size_t i = 0; i < units; i += 4) {
+        std::uint64_t word = 0;
+        std::memcpy(&word, p + i, sizeof word);
+        all |= word;
+        word = (word & 0xE0 * ones) ^ 0x80 * ones;
+        any |= (word - ones) & ~word;
+    }
+    return (all & 0xFF00 * ones) == 0 && (any & 0x8000 * ones) == 0;
+}
+
 /// The bytes that end a pair, in a block that begins with a character: those behind a byte that begins one, where that
 /// is no end itself. In a run of such bytes that is every second one, behind it the next byte if the run's length is
 /// odd. The carry of an addition runs through each of them (as G. Langdale and D. Lemire find what a run of backslashes
@@ -122,6 +155,7 @@ DecodingTable::DecodingTable(Encoding encoding) : units_(pageSize, noUnit) {
         const Probe::Read alone = probe.read({&byte, 1});
         units_[first] = alone.unit.value_or(noUnit);
         keepsAscii_ = keepsAscii_ && (first >= 0x80 || units_[first] == first);
+        keepsLatin_ = keepsLatin_ && (!isLatin(first) || units_[first] == first);
         if (alone.isBeginning) {
             leads.push_back(first);
         }
@@ -197,12 +231,14 @@ const unsigned char* DecodingTable::readSingles(const Cell* cells, const unsigne
                                                 const Unit* outEnd) const {
     constexpr std::size_t block = 16;
     constexpr std::size_t most = sizeof(Cell) / sizeof(Unit);
-    const bool keepsAscii = keepsAscii_;
+    // As UTF-8, letters beyond ASCII are others.
+    const bool keepsLatin = keepsAscii_ && keepsLatin_ && sizeof(Unit) != 1;
+    const bool keepsAscii = keepsAscii_ && !keepsLatin;
     Unit* out = q;
     const auto room = [&] { return static_cast<std::size_t>(outEnd - out); };
     bool areKnown = true;
     while (areKnown && static_cast<std::size_t>(end - p) >= block && room() >= block * most) {
-        if (keepsAscii && areAscii<block>(p)) {
+        if ((keepsAscii && areAscii<block>(p)) || (keepsLatin && areLatin<block>(p))) {
             out = std::copy(p, p + block, out);
             p += block;
             continue;
@@ -337,8 +373,9 @@ EncodingTable::EncodingTable(Encoding encoding) : codes_(firstSupplementary, noC
             }
         }
     }
-    for (char16_t unit = 0; unit < 0x80; ++unit) {
-        keepsAscii_ = keepsAscii_ && codeOf(unit) == unit;
+    for (char16_t unit = 0; unit <= 0xFF; ++unit) {
+        keepsAscii_ = keepsAscii_ && (unit >= 0x80 || codeOf(unit) == unit);
+        keepsLatin_ = keepsLatin_ && (!isLatin(unit) || codeOf(unit) == unit);
     }
 }
 
@@ -376,7 +413,12 @@ EncodingTable::Written EncodingTable::writeSingles(const char16_t* units, std::s
     const std::uint16_t* const codes = codes_.data();
     const bool isWorthACall = keepsAscii_ && count > vectors::shortText;
     std::size_t i = isWorthACall ? vectors::narrowAscii(reinterpret_cast<const char*>(units), count, out) : 0;
+    const bool keepsLatin = keepsAscii_ && keepsLatin_;
     for (bool areKnown = true; areKnown && i + block <= count; i += areKnown ? block : 0) {
+        if (keepsLatin && areLatin<block>(units + i)) {
+            std::copy(units + i, units + i + block, out + i);
+            continue;
+        }
         unsigned all = 0;
         for (std::size_t place = i; place < i + block; ++place) {
             const std::uint16_t code = codes[units[place]];

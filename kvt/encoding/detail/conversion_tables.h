@@ -83,6 +83,7 @@ private:
     std::array<std::uint64_t, 4> pairs_{}; // a bit for each byte that begins one
     vectors::ByteSet leads_;               // the same bytes
     bool keepsAscii_ = true;
+    bool keepsLatin_ = true; // what Latin-1 has from A0 on
 };
 
 /// From UTF-16 to bytes.
@@ -121,6 +122,7 @@ private:
     std::size_t longest_ = 1;  // bytes of a character
     bool isWithinUtf8_ = true; // no character is longer than in UTF-8
     bool keepsAscii_ = true;
+    bool keepsLatin_ = true; // what Latin-1 has from A0 on
 };
 
 } // namespace kvt::ex::detail
