@@ -232,7 +232,7 @@ const unsigned char* DecodingTable::readSingles(const Cell* cells, const unsigne
     constexpr std::size_t block = 16;
     constexpr std::size_t most = sizeof(Cell) / sizeof(Unit);
     // As UTF-8, letters beyond ASCII are others.
-    const bool keepsLatin = keepsAscii_ && keepsLatin_ && sizeof(Unit) != 1;
+    const bool keepsLatin = this->keepsLatin() && sizeof(Unit) != 1;
     const bool keepsAscii = keepsAscii_ && !keepsLatin;
     Unit* out = q;
     const auto room = [&] { return static_cast<std::size_t>(outEnd - out); };

@@ -326,12 +326,21 @@ std::size_t convertMeasured(Form from, Side to, std::string_view in, std::basic_
 /// From a form with tables to UTF-8, the bytes of which they hold.
 std::size_t convertToUtf8(const DecodingTable& table, std::string_view in, std::string& out) {
     const std::size_t before = out.size();
-    char piece[sizeof(Pivot)];
+    Pivot pivot;
+    char piece[3 * pivotUnits];
+    // Where most letters need no look-up, registers of UTF-16 between are faster.
+    const auto read = [&](std::string_view& text) {
+        if (!table.keepsLatin()) {
+            return table.readUtf8(text, piece, sizeof piece);
+        }
+        const std::size_t units = table.read(text, pivot.data(), pivotUnits);
+        return vectors::utf16ToUtf8(reinterpret_cast<const char*>(pivot.data()), units, piece, sizeof piece);
+    };
     std::string_view rest = in;
     std::size_t left = 0;
     do {
         left = rest.size();
-        out.append(piece, table.readUtf8(rest, piece, sizeof piece));
+        out.append(piece, read(rest));
         const std::size_t taken = in.size() - rest.size();
         if (left == in.size() && taken != 0 && rest.size() > longestPiece) {
             reserveForRest(out, out.size() - before, taken, rest.size());

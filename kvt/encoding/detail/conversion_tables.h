@@ -44,6 +44,8 @@ public:
         std::uint8_t length; // 0: ask ICU
     };
     bool hasPairs() const { return utf8_.size() != pageSize; }
+    /// Whether ASCII, and what Latin-1 has from A0 on, are the bytes of their numbers, and all else is single bytes.
+    bool keepsLatin() const { return !hasPairs() && keepsAscii_ && keepsLatin_; }
     struct Found {
         std::size_t characters;
         std::size_t bytes; ///< of UTF-8; `vectors::notWhole` where the table does not know one of them
