@@ -86,4 +86,24 @@ TEST_F(KvtFailingCall, AFileOfSegmentsThatCannotBeReadIsAFailure) {
     EXPECT_EQ(interrupted.err, plain.err);
 }
 
+TEST_F(KvtFailingCall, WhereThereAreNoMoreThreadsOneDoesAllOfIt) {
+    ChildSetup made = failing("pthread_create", {"translate", "--threads", "4", "--case", "1=upper"});
+    made.input = "a\n";
+    std::string expected = "a\n";
+    for (int row = 0; row < 100'000; ++row) {
+        made.input += "x\nyz\n";
+        expected += "X\nYZ\n";
+    }
+    ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_TRUE(result.out == expected);
+    std::vector<std::string> arguments = toStandardOutput;
+    for (const char* name : {"-o", "out"}) {
+        arguments.emplace_back(name);
+    }
+    result = runChild(failing("pthread_create", arguments));
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(read("out"), "text");
+}
+
 } // namespace kvt::test

@@ -86,4 +86,89 @@ TEST_F(KvtOddCircumstance, MoreColumnsThanAreLookedAtAreRefused) {
               "kvt: standard input: row 1 has 1000001 cells; no more than 1000000 columns are looked at\n");
 }
 
+TEST_F(KvtOddCircumstance, ASurveySaysWhyItTakesAFormOfRows) {
+    const ChildResult quoted = kvt({"infer"}, "'a';'b'\n'1;5';'2'\n'x;y';'3'\n");
+    EXPECT_TRUE(contains(quoted.out, "# No cell stands in double quotes.\nquote = \"'\"\n")) << quoted.out;
+    const std::string table = "name,b\n1,2\n3,4\n5,6\n";
+    for (const std::string encoding : {"UTF-32BE", "UTF-32LE", "UTF-16BE", "UTF-16LE"}) {
+        const ChildResult wide = kvt({"infer"}, convert("UTF-8", encoding, table).out);
+        EXPECT_TRUE(contains(wide.out, "encoding = \"" + encoding + "\"\n")) << wide.out;
+    }
+}
+
+TEST_F(KvtOddCircumstance, PlacesThatTakeNoFileAreNamed) {
+    write("plain", "x");
+    std::filesystem::create_symlink("loop", path("loop"));
+    const std::pair<const char*, const char*> rows[] = {
+        {"plain/x", "cannot write plain/x: Not a directory"},
+        {"loop", "cannot write loop: Too many levels of symbolic links"},
+        {"/dev/fd/x", "cannot create /dev/fd/x: No such file or directory"},
+        {"/dev/fd/1234567", "cannot create /dev/fd/1234567: No such file or directory"},
+    };
+    for (const auto& [place, said] : rows) {
+        const ChildResult result = kvt({"text", "upper", "-o", place}, "a\n");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.err, std::string("kvt: ") + said + "\n");
+    }
+    EXPECT_EQ(names(), (std::vector<std::string>{"loop", "plain"}));
+}
+
+TEST_F(KvtOddCircumstance, AStandardStreamThatIsClosedIsNoFileThatWasOpenedSince) {
+    const auto shell = [&](const std::string& line) {
+        ChildSetup made;
+        made.command = {"/bin/sh", "-c", line};
+        made.folder = folder_.string();
+        return runChild(made);
+    };
+    const std::string command = std::string("'") + KVT_PROGRAM + "' text upper ";
+    write("in", "a\n");
+    EXPECT_EQ(shell(command + "<&-").err, "kvt: cannot read standard input: Bad file descriptor\n");
+    EXPECT_EQ(shell(command + "in >&-").err, "kvt: cannot write to standard output: Bad file descriptor\n");
+    const ChildResult unsaid = shell(command + "none 2>&-");
+    EXPECT_EQ(unsaid.status, 2);
+    EXPECT_EQ(unsaid.out, "");
+    EXPECT_EQ(shell(command + "in -o out <&- 2>&-").status, 0);
+    EXPECT_EQ(read("out"), "A\n");
+}
+
+TEST_F(KvtOddCircumstance, WhatIsNoDateStandsAtTheEndAsItStood) {
+    const ChildResult result = kvt({"sort", "--date", "%d.%m.%Y"}, "1.1.2020\n\xFF\n1.1.2019\n\n31.2.2018\n");
+    EXPECT_EQ(result.out, "1.1.2019\n1.1.2020\n\xFF\n\n31.2.2018\n");
+    EXPECT_TRUE(contains(result.err, "3 lines have no date of that format")) << result.err;
+}
+
+TEST_F(KvtOddCircumstance, NumbersThatAreNoneStandAtTheEnd) {
+    const ChildResult result =
+        kvt({"sort", "--number"}, "1e\n1e+\n.\n1e99999999999999999999\n0e5\n-inf\n1e-3\ninfinity\n2.50\n");
+    EXPECT_TRUE(result.out.starts_with("-inf\n0e5\n1e-3\n2.50\n")) << result.out;
+}
+
+TEST_F(KvtOddCircumstance, AZoneDatabaseThatCannotBeKeptIsAsIfThereWereNone) {
+    for (const char* call : {"rename", "mkdtemp"}) {
+        ChildSetup made = setup({"date", "zone", "set", "20200131120000", "Europe/Berlin"});
+        made.environment = {{"HOME", path("home")},
+                            {"XDG_CACHE_HOME", path("cache")},
+                            {"LD_PRELOAD", KVT_FAILING_CALLS},
+                            {"KVT_FAULT", call},
+                            {"ASAN_OPTIONS", "verify_asan_link_order=0"}};
+        const ChildResult result = runChild(made);
+        EXPECT_EQ(result.status, 2) << call;
+        EXPECT_TRUE(contains(result.err, "kvt doctor")) << result.err;
+        EXPECT_TRUE(std::filesystem::is_empty(path("cache/kvt"))) << call;
+    }
+}
+
+TEST_F(KvtOddCircumstance, AWorkspaceThatCannotGrowIsRemoved) {
+    ChildSetup made = setup({"sort", "--memory", "100K"});
+    made.environment = {{"TMPDIR", folder_.string()}};
+    for (int line = 0; line < 20'000; ++line) {
+        made.input += std::to_string(line) + " is a line\n";
+    }
+    made.mostFileBytes = 1;
+    const ChildResult result = runChild(made);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_TRUE(contains(result.err, "the workspace " + folder_.string())) << result.err;
+    EXPECT_TRUE(names().empty());
+}
+
 } // namespace kvt::test

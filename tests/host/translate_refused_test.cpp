@@ -182,6 +182,46 @@ TEST_F(KvtTranslateRefused, ARegularExpressionThatTakesTooLongIsAFailureOfTheCel
     }
 }
 
+TEST_F(KvtTranslateRefused, BadBytesOfAnEncodingWithStatesAreFailuresOfTheirCells) {
+    write("in", "k,d\n\x1B$B4A\x1B(B,x\n\x1B$B\x7F\x7F"
+                "4A\x1B(B,1\nb,\xFF\nc,2\n");
+    const ChildResult result = translate(
+        "", {"--from", "ISO-2022-JP", "--number", "d", "--on-error", "keep", "--report", "report.csv", "in"});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_EQ(result.out, "k,d\n漢,x\n\uFFFD漢,1\nb,\uFFFD\nc,2\n");
+    EXPECT_EQ(read("report.csv"),
+              "file,row,column,offset,value,number,text\n"
+              "in,2,d,13,x,920005,\"\"\"x\"\" is not a number as it is written in en.\"\n"
+              "in,3,k,15,\uFFFD漢,910002,\"The bytes \"\"\\x7F\\x7F\"\" are not valid "
+              "ISO-2022-JP.\"\n"
+              "in,4,d,30,\uFFFD,910002,\"The bytes \"\"\\xFF\"\" are not valid ISO-2022-JP.\"\n");
+    EXPECT_TRUE(contains(result.err, "2 losses between ISO-2022-JP and UTF-8:\n       1  bad bytes 7F 7F\n"))
+        << result.err;
+    // Rejected rows are in the encoding of the input.
+    write("good", "k,d\n\x1B$B4A\x1B(B,x\n1,2\n");
+    EXPECT_EQ(translate("", {"--from", "ISO-2022-JP", "--number", "d", "--reject", "bad", "good"}).out,
+              "k,d\n1,2\n");
+    EXPECT_EQ(read("bad"), "k,d\n\x1B$B4A\x1B(B,x\n");
+}
+
+TEST_F(KvtTranslateRefused, BytesThatDoNotShowAreNamedByTheirNumber) {
+    const ChildResult result =
+        kvt({"convert", "--from", "ISO-2022-JP", "--to", "UTF-8"}, "\x1B$B\x7F\x7F\x1B(B\n");
+    EXPECT_TRUE(contains(result.err, "The bytes \"\\x7F\\x7F\" are not valid ISO-2022-JP")) << result.err;
+}
+
+TEST_F(KvtTranslateRefused, AFailedCellIsLeftAloneByTheStepsBehind) {
+    EXPECT_EQ(translate("a\nx\n1\n", {"--number", "a", "--where", "a~^[0-9]$", "--on-error", "keep"}).out,
+              "a\nx\n1\n");
+    EXPECT_EQ(translate("a\nx y\n1\n", {"--number", "a", "--split", "a= :p,q", "--on-error", "keep"}).out,
+              "p,q\n,\n1,\n");
+}
+
+TEST_F(KvtTranslateRefused, LettersBecomeSmallOrTheFormThatTextsShare) {
+    EXPECT_EQ(out("a\nÄSß\n", {"--case", "a=lower"}), "a\näsß\n");
+    EXPECT_EQ(out("a\nÄSß\n", {"--case", "a=fold"}), "a\nässs\n");
+}
+
 TEST_F(KvtTranslateRefused, AGroupThatTookNoPartIsReplacedByNothing) {
     EXPECT_EQ(out("a\nxb\nb\n", {"--replace", "a=/(x)?(b)/<$1$2>/"}), "a\n<xb>\n<b>\n");
 }

@@ -2,7 +2,9 @@
 // systems, which a test cannot have. KVT_FAULT names the call.
 #include <cerrno>
 #include <cstdlib>
+#include <dlfcn.h>
 #include <fcntl.h>
+#include <pthread.h>
 #include <string_view>
 #include <sys/stat.h>
 #include <sys/syscall.h>
@@ -95,6 +97,24 @@ int rename(const char* from, const char* to) {
         return -1;
     }
     return static_cast<int>(::syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, 0));
+}
+
+// No folder can be made.
+char* mkdtemp(char* path) {
+    if (isFaulty("mkdtemp")) {
+        errno = ENOSPC;
+        return nullptr;
+    }
+    using Make = char* (*)(char*);
+    static const auto make = reinterpret_cast<Make>(::dlsym(RTLD_NEXT, "mkdtemp"));
+    return make(path);
+}
+
+// There are as many threads as there may be.
+int pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*run)(void*), void* argument) {
+    using Create = int (*)(pthread_t*, const pthread_attr_t*, void* (*)(void*), void*);
+    static const auto create = reinterpret_cast<Create>(::dlsym(RTLD_NEXT, "pthread_create"));
+    return isFaulty("pthread_create") ? EAGAIN : create(thread, attributes, run, argument);
 }
 
 } // extern "C"

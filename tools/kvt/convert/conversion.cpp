@@ -29,7 +29,7 @@ constexpr std::uint64_t muchInput = 16 * 1024 * 1024;
 std::string escaped(std::string_view bytes) {
     std::string text;
     for (const char byte : bytes) {
-        text += byte >= 32 && isAscii(byte) ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
+        text += byte >= 32 && byte < 127 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
     }
     return text;
 }

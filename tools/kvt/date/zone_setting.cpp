@@ -80,11 +80,6 @@ datetime::SetZoneMode zoneMode(const std::string& what, const std::string& typed
     return choose(what, typed, modeChoices);
 }
 
-bool isZoneMode(const std::string& typed) {
-    return std::any_of(modeChoices.begin(), modeChoices.end(),
-                       [&](const auto& choice) { return choice.first == typed; });
-}
-
 ZoneSetting::ZoneSetting(const std::string& zone, datetime::SetZoneMode mode,
                          const ZoneDatabaseOption& database)
     : zone_(toUString(zone)), mode_(mode) {

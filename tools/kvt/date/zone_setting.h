@@ -16,8 +16,6 @@ class ZoneDatabaseOption;
 
 /// The mode of that name, which was given for `what`. Throws Failure.
 kvt::ex::datetime::SetZoneMode zoneMode(const std::string& what, const std::string& typed);
-/// Whether there is a mode of that name.
-bool isZoneMode(const std::string& typed);
 
 class ZoneSetting {
 public:

@@ -1,6 +1,5 @@
 #include "infer/table_guess.h"
 
-#include "translate/cell_text.h"
 #include "translate/row_reader.h"
 
 #include <algorithm>
@@ -70,18 +69,6 @@ TableGuess guessTable(std::string_view text, bool isWhole) {
         best = rankOf(best) <= rankOf(other) ? other : best;
     }
     return best;
-}
-
-std::vector<std::string> firstRow(std::string_view text, const RowForm& form) {
-    std::vector<std::string> cells;
-    std::string scratch;
-    RowReader reader(form, text);
-    if (reader.next() && reader.fault() == RowFault::None) {
-        for (std::size_t i = 0; i < reader.cellCount(); ++i) {
-            cells.emplace_back(textOfCell(reader.cell(i), form, scratch));
-        }
-    }
-    return cells;
 }
 
 } // namespace host

@@ -21,7 +21,4 @@ struct TableGuess {
 /// `text` is UTF-8, and its last row may be cut unless the text `isWhole`.
 TableGuess guessTable(std::string_view text, bool isWhole);
 
-/// The cells of the first row as text. Empty for an empty text.
-std::vector<std::string> firstRow(std::string_view text, const RowForm& form);
-
 } // namespace host

@@ -42,7 +42,7 @@ std::string encoded(std::string_view text, Encoding to) {
 std::string escaped(std::string_view bytes) {
     std::string text;
     for (const char byte : bytes) {
-        text += byte >= 32 && isAscii(byte) ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
+        text += byte >= 32 && byte < 127 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
     }
     return text;
 }

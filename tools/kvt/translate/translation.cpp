@@ -19,6 +19,7 @@
 #include <map>
 #include <memory>
 #include <mutex>
+#include <system_error>
 #include <thread>
 
 namespace host {
@@ -46,8 +47,12 @@ public:
         mostAhead_ = threads == 1 ? 1 : 3 * threads;
         {
             std::vector<std::jthread> others;
-            for (std::size_t index = 1; index < threads; ++index) {
-                others.emplace_back([this, &worker = *workers[index]] { work(worker); });
+            try {
+                for (std::size_t index = 1; index < threads; ++index) {
+                    others.emplace_back([this, &worker = *workers[index]] { work(worker); });
+                }
+            } catch (const std::system_error&) {
+                // There may be no more threads. Those that there are do all of it then.
             }
             work(*workers.front());
         }
