@@ -302,4 +302,21 @@ TEST_F(KvtMemoryInspect, NoDamageOfTheHeaderLeadsAstray) {
     }
 }
 
+TEST_F(KvtMemoryInspect, ASegmentForWhichTheFileCouldNotGrowLiesNowhere) {
+    {
+        memory_manager made = manager("file");
+        made.create_segment(8192);
+    }
+    // The row of its table: where it lies, and how long it is.
+    const std::uint64_t row[] = {65536, 8192};
+    const std::size_t at = read("file").find(std::string(reinterpret_cast<const char*>(row), sizeof row));
+    ASSERT_NE(at, std::string::npos);
+    put("file", at, ~std::uint64_t{0});
+    const nlohmann::json segment = inspect()["segments"][0];
+    EXPECT_EQ(segment["state"], "not made");
+    EXPECT_TRUE(segment["offset"].is_null());
+    EXPECT_EQ(segment["size"], 8192);
+    EXPECT_TRUE(contains(kvt({"memory", "inspect", "file"}).out, "not made"));
+}
+
 } // namespace kvt::test

@@ -171,4 +171,12 @@ TEST_F(KvtOddCircumstance, AWorkspaceThatCannotGrowIsRemoved) {
     EXPECT_TRUE(names().empty());
 }
 
+TEST_F(KvtOddCircumstance, GroupsThatTookNoPartAreNamedByFileAndLineToo) {
+    write("one", "ab\ncd\n");
+    write("two", "c\n");
+    EXPECT_EQ(kvt({"match", "--groups", "(b)|c", "one", "two"}).out,
+              "one:1:2:1:0:1:b\none:1:2:1:1:1:b\none:2:1:3:0:1:c\none:2:-:-:1:-:\n"
+              "two:1:1:0:0:1:c\ntwo:1:-:-:1:-:\n");
+}
+
 } // namespace kvt::test

@@ -5,6 +5,7 @@
 #include <translate/icu_data.h>
 #include <translate/number_reader.h>
 #include <translate/row_borders.h>
+#include <translate/step_table.h>
 
 #include <gtest/gtest.h>
 
@@ -233,6 +234,23 @@ TEST(LanguageData, NormalizesToTheFormThatIsNamed) {
             "\u0635\u0644\u0649 \u0627\u0644\u0644\u0647 \u0639\u0644\u064A\u0647 \u0648\u0633\u0644\u0645";
     }
     EXPECT_EQ(makeNormalizer("nfkc")->normalized(text), grown);
+}
+
+TEST(StepTable, ArgumentsThatStandTwiceOrAreUnknownAreRefused) {
+    const auto complaint = [](const std::string& name, const StepArguments& arguments) {
+        try {
+            makeStep(name, arguments, {});
+            return std::string("none");
+        } catch (const Failure& failure) {
+            return std::string(failure.what());
+        }
+    };
+    EXPECT_EQ(complaint("drop", {{"columns", "a"}}), "none");
+    EXPECT_EQ(complaint("drop", {{"columns", "a"}, {"columns", "b"}}), "'drop' has 'columns' twice");
+    EXPECT_EQ(complaint("drop", {{"colums", "a"}}), "'drop' takes no 'colums'. Did you mean 'columns'?");
+    EXPECT_EQ(complaint("drop", {{"columns", ""}}), "'drop' needs 'columns'");
+    EXPECT_EQ(complaint("sort", {}), "'sort' needs 'columns'");
+    EXPECT_EQ(complaint("dorp", {}), "there is no step 'dorp'. Did you mean 'drop'?");
 }
 
 TEST(RowBorders, AWatchedPlaceHasTheFirstBorderFromThereOn) {
