@@ -10,14 +10,15 @@ export LC_ALL=C.UTF-8
 cd -- "$(dirname -- "${BASH_SOURCE[0]}")/../.."
 
 folder=$PWD/$1
-SOURCE_DATE_EPOCH=$(git -c safe.directory="$PWD" log -1 --format=%ct)
+commit=$(git -c safe.directory="$PWD" rev-parse HEAD) # of now, whatever is committed meanwhile
+SOURCE_DATE_EPOCH=$(git -c safe.directory="$PWD" log -1 --format=%ct "$commit")
 export SOURCE_DATE_EPOCH CCACHE_DISABLE=1
 
 # The names of the folders differ in length, too.
 for copy in first the_second_one; do
     rm -rf "${folder:?}/$copy"
     mkdir -p "$folder/$copy"
-    git -c safe.directory="$PWD" archive HEAD | tar -x -C "$folder/$copy"
+    git -c safe.directory="$PWD" archive "$commit" | tar -x -C "$folder/$copy"
     [[ ! -d .deps ]] || cp -r .deps "$folder/$copy/.deps"
     (
         cd "$folder/$copy"
