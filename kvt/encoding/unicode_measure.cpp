@@ -142,9 +142,10 @@ Extent measureUtf8(const char* text, std::size_t bytes) {
 
 #if KVT_HAS_VECTORS
 /// The units of the first registers, four at a time, that hold nothing but ASCII.
-HWY_INLINE std::size_t asciiBlocks(Units16 d, const std::uint16_t* p, const std::uint16_t* end) {
+template <class D>
+HWY_INLINE std::size_t asciiBlocks(D d, const hn::TFromD<D>* p, const hn::TFromD<D>* end) {
     const std::size_t N = hn::Lanes(d);
-    const std::uint16_t* const begin = p;
+    const auto* const begin = p;
     while (static_cast<std::size_t>(end - p) >= 4 * N) {
         const auto any = hn::Or(hn::Or(hn::LoadU(d, p), hn::LoadU(d, p + N)),
                                 hn::Or(hn::LoadU(d, p + 2 * N), hn::LoadU(d, p + 3 * N)));
@@ -283,16 +284,7 @@ std::size_t asciiPrefix(const char* text, std::size_t bytes) {
     const std::uint8_t* const end = begin + bytes;
     const std::uint8_t* p = begin;
 #if KVT_HAS_VECTORS
-    const Bytes d;
-    const std::size_t N = hn::Lanes(d);
-    while (static_cast<std::size_t>(end - p) >= 4 * N) {
-        const auto any = hn::Or(hn::Or(hn::LoadU(d, p), hn::LoadU(d, p + N)),
-                                hn::Or(hn::LoadU(d, p + 2 * N), hn::LoadU(d, p + 3 * N)));
-        if (!hn::AllTrue(d, hn::Lt(any, hn::Set(d, 0x80)))) {
-            break;
-        }
-        p += 4 * N;
-    }
+    p += asciiBlocks(Bytes(), p, end);
 #endif
     for (std::uint64_t word = 0; static_cast<std::size_t>(end - p) >= sizeof word; p += sizeof word) {
         std::memcpy(&word, p, sizeof word);

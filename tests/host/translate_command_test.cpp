@@ -1,6 +1,6 @@
 // `kvt translate` as its users run it.
 
-#include "host_test.h"
+#include "translate_test.h"
 
 #include <nlohmann/json.hpp>
 
@@ -19,18 +19,7 @@ nlohmann::json firstLine(const std::string& text) {
 
 } // namespace
 
-class KvtTranslate : public HostTest {
-protected:
-    ChildResult translate(const std::string& input, std::vector<std::string> arguments) const {
-        arguments.insert(arguments.begin(), "translate");
-        return kvt(std::move(arguments), input);
-    }
-    std::string out(const std::string& input, std::vector<std::string> arguments) const {
-        const ChildResult result = translate(input, std::move(arguments));
-        EXPECT_EQ(result.status, 0) << result.err;
-        return result.out;
-    }
-};
+class KvtTranslate : public TranslateTest {};
 
 // ---- Rows
 

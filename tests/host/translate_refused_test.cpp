@@ -1,24 +1,11 @@
 // What `kvt translate` refuses before it reads, what it says of rows and cells that it cannot do, and the jobs at the
 // edge of what it takes.
 
-#include "host_test.h"
-
-#include <utility>
+#include "translate_test.h"
 
 namespace kvt::test {
 
-class KvtTranslateRefused : public HostTest {
-protected:
-    ChildResult translate(const std::string& input, std::vector<std::string> arguments) const {
-        arguments.insert(arguments.begin(), "translate");
-        return kvt(std::move(arguments), input);
-    }
-    std::string out(const std::string& input, std::vector<std::string> arguments) const {
-        const ChildResult result = translate(input, std::move(arguments));
-        EXPECT_EQ(result.status, 0) << result.err;
-        return result.out;
-    }
-};
+class KvtTranslateRefused : public TranslateTest {};
 
 TEST_F(KvtTranslateRefused, OptionsThatSayNoStep) {
     const std::string replace =
