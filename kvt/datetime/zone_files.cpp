@@ -246,7 +246,6 @@ private:
 
     /// Seconds since 1970, by the clock that the rule names.
     static std::int64_t momentOf(const ZoneRule& rule, int year) {
-        constexpr std::int64_t secondsPerDay = 86400;
         return daysOf(rule.on, year) * secondsPerDay + rule.atSeconds;
     }
 
@@ -281,9 +280,7 @@ private:
             if ((apart > 0) != (otherNamed < named)) {
                 failPair(line, " of which the days change places in some years");
             }
-            if (std::abs(apart) < leastApart) {
-                failPair(line, " that are less than two days apart");
-            }
+            requireApart(std::abs(apart), line);
         }
     }
 
@@ -291,9 +288,14 @@ private:
         const int from = std::max(december.from, january.from - 1);
         const int to = std::min({december.to, january.to - 1, from + calendarRepeats - 1});
         for (int year = from; year <= to; ++year) {
-            if (momentOf(january, year + 1) - momentOf(december, year) < leastApart) {
-                failPair(line, " that are less than two days apart");
-            }
+            requireApart(momentOf(january, year + 1) - momentOf(december, year), line);
+        }
+    }
+
+    // Which of two lines comes first may depend on their clocks, and on what the other one does to them.
+    static void requireApart(std::int64_t seconds, const PlacedRule& line) {
+        if (seconds < 2 * secondsPerDay) {
+            failPair(line, " that are less than two days apart");
         }
     }
 
@@ -302,8 +304,7 @@ private:
     }
 
     static constexpr int calendarRepeats = 400; // years
-    // Seconds. Which of two lines comes first may depend on their clocks, and on what the other one does to them.
-    static constexpr std::int64_t leastApart = 2 * 86400;
+    static constexpr std::int64_t secondsPerDay = 86400;
 
     Place place_;
     std::string_view zone_;            ///< the one in hand

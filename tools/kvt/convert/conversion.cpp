@@ -25,15 +25,6 @@ using kvt::ex::Loss;
 // Bytes for which it pays to have a thread for the writing.
 constexpr std::uint64_t muchInput = 16 * 1024 * 1024;
 
-// As the library shows bytes in its failures.
-std::string escaped(std::string_view bytes) {
-    std::string text;
-    for (const char byte : bytes) {
-        text += byte >= 32 && byte < 127 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
-    }
-    return text;
-}
-
 // A report that replaces an input or is replaced by the output would be lost work.
 std::unique_ptr<Output> openReport(const ConvertOptions& options) {
     if (options.report.empty()) {
@@ -254,7 +245,7 @@ void Conversion::explainStop(const Stopped& stopped) {
     const Loss& loss = stopped.loss;
     const bool bad = loss.kind == Loss::BadInput;
     const std::string sentence =
-        bad ? describe(910002, {escaped(loss.bytes), fromName_})
+        bad ? describe(910002, {escapedBytes(loss.bytes), fromName_})
             : describe(910003, {printable(std::u32string_view(&loss.codePoint, 1)), fromName_, toName_});
     diagnostics_.fail(describe(stopped.place) + ": " + sentence);
     diagnostics_.line("     lost:        " + describeLost(loss));

@@ -26,6 +26,14 @@ std::string describeLost(const kvt::ex::Loss& loss) {
     return text + " (" + hexBytes(loss.bytes) + ")";
 }
 
+std::string escapedBytes(std::string_view bytes) {
+    std::string text;
+    for (const char byte : bytes) {
+        text += byte >= 32 && byte < 127 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
+    }
+    return text;
+}
+
 std::string describeLoss(const kvt::ex::Loss& loss, const Place& place, const std::string& from,
                          const std::string& to) {
     return describe(place) + ": " + describeLost(loss) +

@@ -7,11 +7,15 @@
 
 #include <optional>
 #include <string>
+#include <string_view>
 
 namespace host {
 
 /// `U+0141 LATIN CAPITAL LETTER L WITH STROKE "Ł" (C5 81)`, or `bad bytes FF`.
 std::string describeLost(const kvt::ex::Loss& loss);
+
+/// The bytes as failures show them: what can be printed in ASCII as it is, the others as `\xFF`.
+std::string escapedBytes(std::string_view bytes);
 
 /// `, written as "L"`; nothing where a substitution was written.
 std::string describeWritten(const std::optional<std::u32string>& written);

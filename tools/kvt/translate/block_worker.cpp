@@ -39,14 +39,6 @@ std::string encoded(std::string_view text, Encoding to) {
     return out;
 }
 
-std::string escaped(std::string_view bytes) {
-    std::string text;
-    for (const char byte : bytes) {
-        text += byte >= 32 && byte < 127 ? std::string(1, byte) : "\\x" + hexBytes({&byte, 1});
-    }
-    return text;
-}
-
 } // namespace
 
 RowCounts& RowCounts::operator+=(const RowCounts& other) {
@@ -286,7 +278,7 @@ void BlockWorker::failLostCells(BlockResult& result) {
             if (!cells_.hasFailed(slot)) {
                 cells_.fail(slot, plan_.names[slot],
                             makeProblem(problem_number::badBytes,
-                                        {escaped(loss.bytes), std::string(decodes_.getName())}));
+                                        {escapedBytes(loss.bytes), std::string(decodes_.getName())}));
             }
         }
     }
